@@ -19,6 +19,10 @@ class TQChannelBase;
 class TQChannelFolder;
 class TQChannelRef;
 
+// A keyframe as the framework sees it: opaque, valid only for the channel that issued it and
+// only until that keyframe is deleted (getKeyframe on it is the liveness test).
+using TQKeyframeHandle = void*;
+
 // Identifier of a channel among its siblings; paths of TQChannelRef are chains of these.
 using TQChannelId = uint32_t;
 
