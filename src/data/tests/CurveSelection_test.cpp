@@ -1,0 +1,98 @@
+#include "src/data/TQCurveSelection.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+TQKeyframeHandle handle(uintptr_t n) { return reinterpret_cast<TQKeyframeHandle>(n); }
+
+TQCurveSelectionPtr entry(uintptr_t h, uint64_t flag, uint32_t curve, int64_t frame = 0) {
+    auto e = std::make_shared<TQCurveSelection>();
+    e->setHandle(handle(h));
+    e->setFlags(flag);
+    e->setCurveId(curve);
+    e->setKeypointUV(CMTimeMake(frame, 30), 0.5);
+    return e;
+}
+
+}  // namespace
+
+TEST(TQCurveSelection, isKeypoint__excludesOtherKindsRatherThanMatchingKeypoint) {
+    EXPECT_TRUE(entry(7, 0, 1)->isKeypoint()) << "a handle with no flag counts as a keypoint";
+    EXPECT_FALSE(entry(0, TQSelectionKeypoint, 1)->isKeypoint()) << "no handle, no keypoint";
+    EXPECT_FALSE(entry(7, TQSelectionInTangent, 1)->isKeypoint());
+    EXPECT_TRUE(entry(7, TQSelectionInTangent, 1)->isTangent());
+    EXPECT_TRUE(entry(0, TQSelectionCurve, 1)->isCurve());
+}
+
+TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
+    auto tangent = entry(7, TQSelectionOutTangent, 1, 12);
+    CMTime u{};
+    double v = 0;
+    EXPECT_FALSE(tangent->getKeypointUV(&u, &v));
+    EXPECT_EQ(CMTimeCompare(u, CMTimeMake(12, 30)), 0);
+    EXPECT_DOUBLE_EQ(v, 0.5);
+    EXPECT_FALSE(tangent->setKeypointTangents(1, 2, 3, 4));
+    double t[4] = {};
+    tangent->getKeypointTangents(&t[0], &t[1], &t[2], &t[3]);
+    EXPECT_EQ(t[3], 4.0);
+}
+
+TEST(TQCurveSelection, compare__usesStoredTimes) {
+    auto early = entry(1, TQSelectionKeypoint, 1, 3), late = entry(2, TQSelectionKeypoint, 1, 9);
+    EXPECT_EQ(early->compareKeypointAscending(*late), -1);
+    EXPECT_EQ(early->compareKeypointDescending(*late), 1);
+    EXPECT_EQ(late->compareKeypointAscending(*late), 0);
+}
+
+TEST(TQCurveSelectionList, equality__curveEntriesOfDifferentCurvesAreOne) {
+    TQCurveSelectionList list;
+    auto a = entry(0, TQSelectionCurve, 1), b = entry(0, TQSelectionCurve, 2);
+    list.addSelection(a);
+    list.addSelection(b);
+    EXPECT_TRUE(list.isSelection(*b));
+    list.delSelection(*b);
+    EXPECT_TRUE(list.empty()) << "delSelection removes every equal entry, whatever its curve";
+}
+
+TEST(TQCurveSelectionList, queries__tangentCountsAsSelectedKeypoint) {
+    TQCurveSelectionList list;
+    list.addSelection(entry(5, TQSelectionInTangent, 3));
+    EXPECT_TRUE(list.isKeypointSelected(handle(5)));
+    EXPECT_TRUE(list.isCurveSelected(3));
+    EXPECT_FALSE(list.isCurveSelected(4));
+    EXPECT_EQ(list.selectionAtIndex(1), nullptr) << "out of range answers null";
+}
+
+TEST(TQCurveSelectionList, purge__takesEqualEntriesOfOtherCurvesAlong) {
+    TQCurveSelectionList list;
+    list.addSelection(entry(5, TQSelectionKeypoint, 1));
+    list.addSelection(entry(5, TQSelectionKeypoint, 2));  // same handle and kind, other curve
+    list.addSelection(entry(6, TQSelectionKeypoint, 2));
+    {
+        TQCurveSelectionList untouched;
+        untouched.setSelection(list);
+        untouched.purge(99);
+        EXPECT_EQ(untouched.size(), 3u) << "purge of an absent curve changes nothing";
+    }
+    list.purge(1);
+    ASSERT_EQ(list.size(), 1u);
+    EXPECT_EQ(list.selectionAtIndex(0)->getHandle(), handle(6));
+}
+
+TEST(TQCurveSelectionList, copyVersusSetSelection__deepAndShared) {
+    TQCurveSelectionList list;
+    list.addSelection(entry(5, TQSelectionKeypoint, 1));
+    auto deep = list.copy();
+    deep->selectionAtIndex(0)->setFlags(TQSelectionCurve);
+    EXPECT_EQ(list.selectionAtIndex(0)->getFlags(), TQSelectionKeypoint) << "copy is deep";
+
+    TQCurveSelectionList shared;
+    shared.setSelection(list);
+    shared.selectionAtIndex(0)->setFlags(TQSelectionCurve);
+    EXPECT_EQ(list.selectionAtIndex(0)->getFlags(), TQSelectionCurve) << "setSelection shares entries";
+
+    list.addSelectionFront(entry(9, TQSelectionKeypoint, 1));
+    EXPECT_EQ(list.selectionAtIndex(0)->getHandle(), handle(9));
+    EXPECT_EQ(shared.size(), 1u) << "the lists themselves stay separate";
+}
