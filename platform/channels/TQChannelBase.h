@@ -18,6 +18,7 @@
 class TQChannelBase;
 class TQChannelFolder;
 class TQChannelRef;
+class TQFactory;
 
 // A keyframe as the framework sees it: opaque, valid only for the channel that issued it and
 // only until that keyframe is deleted (getKeyframe on it is the liveness test).
@@ -86,6 +87,12 @@ public:
 class TQObjectManipulator {
 public:
     virtual ~TQObjectManipulator() = default;
+    // A value edit of `channel` opens (beginValueEdit); a manipulator that groups edits into
+    // undo steps names the step with `undoText`. Manipulators that don't care keep this.
+    virtual void beginValueEdit(TQChannelBase& channel, const BNString& undoText) {
+        (void)channel;
+        (void)undoText;
+    }
 };
 
 class TQChannelBase {
@@ -136,6 +143,10 @@ public:
 
     // Deep copy owned by the caller, destroyed through the virtual destructor.
     virtual TQChannelBase* cloneChannel() const = 0;
+    // The factory of this node's class, whose identifier names the class in saved data. The
+    // base answers the plain channel's factory for a TQChannel and null for a class of the
+    // host that has none; every class of this library overrides it.
+    virtual const TQFactory* getFactory() const;
 
     // Announces a change: the nearest change observer at or above this node is told.
     virtual void noteWillChange(bool notify = true);
