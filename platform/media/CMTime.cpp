@@ -74,11 +74,12 @@ CMTime addNumeric(const CMTime& a, const CMTime& b, bool subtract) {
     if (l <= std::numeric_limits<CMTimeScale>::max()) {
         return fromRational(a.value * (l / a.timescale) + bv * (l / b.timescale), l);
     }
-    // The common timescale does not fit: use the finer of the two and round.
+    // The common timescale does not fit: use the finer of the two and round. The flag
+    // tells of a real loss only; whole multiples convert exactly.
     const CMTimeScale scale = a.timescale > b.timescale ? a.timescale : b.timescale;
-    const i128 av = divRound(static_cast<i128>(a.value) * scale, a.timescale);
-    const i128 bs = divRound(bv * scale, b.timescale);
-    return fromWide(av + bs, scale, true);
+    const i128 an = static_cast<i128>(a.value) * scale, bn = bv * scale;
+    const bool inexact = an % a.timescale != 0 || bn % b.timescale != 0;
+    return fromWide(divRound(an, a.timescale) + divRound(bn, b.timescale), scale, inexact);
 }
 
 // Rank of a time's kind in the total order of CMTimeCompare.
@@ -144,12 +145,14 @@ CMTime CMTimeMultiplyByFloat64(const CMTime& time, double multiplier) {
     }
     if (multiplier == 1.0) return time;
     const long double product = static_cast<long double>(time.value) * multiplier;
+    if (std::isnan(product)) return kCMTimeIndefinite;  // zero times infinity
     if (!std::isfinite(product) || product >= 9.2233720368547758e18L)
         return product > 0 ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
     if (product <= -9.2233720368547758e18L) return kCMTimeNegativeInfinity;
     const long double rounded = std::round(product);
     CMTime r = CMTimeMake(static_cast<CMTimeValue>(rounded), time.timescale);
     if (rounded != product) r.flags |= kCMTimeFlags_HasBeenRounded;
+    r.flags |= time.flags & kCMTimeFlags_HasBeenRounded;
     return r;
 }
 
@@ -263,6 +266,7 @@ CMTime operator/(const CMTime& time, double divisor) {
         const long double rounded = std::round(q);
         CMTime r = CMTimeMake(static_cast<CMTimeValue>(rounded), time.timescale);
         if (rounded != q) r.flags |= kCMTimeFlags_HasBeenRounded;
+        r.flags |= time.flags & kCMTimeFlags_HasBeenRounded;
         return r;
     }
     return CMTimeMultiplyByFloat64(time, 1.0 / divisor);

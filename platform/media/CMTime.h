@@ -4,8 +4,9 @@
 //
 // Arithmetic is exact while the result fits: sums of two timescales use their least common
 // multiple when it fits in 32 bits; otherwise the larger timescale is used and the result is
-// rounded to nearest (kCMTimeFlags_HasBeenRounded is set). A value that would not fit in
-// 64 bits even then saturates to the infinity of its sign.
+// rounded to nearest (kCMTimeFlags_HasBeenRounded is set when that loses anything). A value
+// that would not fit in 64 bits even then saturates to the infinity of its sign. Once set,
+// the rounded flag is carried through later arithmetic.
 //
 // Non-numeric times, and what every operation answers for them:
 //   invalid   (flags without Valid; includes the all-zero time a missing host yields)
@@ -82,7 +83,8 @@ CMTime CMTimeMakeWithSeconds(double seconds, CMTimeScale preferredTimescale);
 CMTime CMTimeAdd(const CMTime& lhs, const CMTime& rhs);
 CMTime CMTimeSubtract(const CMTime& lhs, const CMTime& rhs);
 CMTime CMTimeMultiply(const CMTime& time, int32_t multiplier);
-// Keeps the time's timescale, rounding to nearest; NaN gives invalid.
+// Keeps the time's timescale, rounding to nearest; NaN gives invalid, and zero times an
+// infinity (either way round) gives indefinite.
 CMTime CMTimeMultiplyByFloat64(const CMTime& time, double multiplier);
 // Exact re-expression in another timescale where possible, rounded to nearest otherwise.
 CMTime CMTimeConvertScale(const CMTime& time, CMTimeScale newTimescale);
