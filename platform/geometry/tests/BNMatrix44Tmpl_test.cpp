@@ -1,4 +1,5 @@
 #include "platform/geometry/BNMatrix44Tmpl.h"
+#include "platform/geometry/BNViewProjection.h"
 #include "platform/geometry/CGGeometry.h"
 
 #include <gtest/gtest.h>
@@ -8,38 +9,23 @@
 namespace {
 
 constexpr double kExact = 1e-12;
-constexpr float kFloatTol = 1e-6f;
+constexpr double kFloatUlp = 1.1920928955078125e-7;  // FLT_EPSILON
 
 // The view's mapping, as the curve views do it: the projection of the last frame is kept
 // column-major in single precision, made row-major, and applied to double vectors.
 struct FrameProjection {
     float columnMajor[16];
-    double drawableW;
-    double drawableH;
+    CGSize drawable;
 
     static FrameProjection forVolume(const CGRect& volume, double w, double h) {
-        FrameProjection p{{}, w, h};
-        const auto m = BNMatrix44f::orthoZeroToOne(
-            static_cast<float>(volume.origin.x), static_cast<float>(volume.origin.x + volume.size.width),
-            static_cast<float>(volume.origin.y), static_cast<float>(volume.origin.y + volume.size.height),
-            -1.0f, 1.0f);
-        m.toColumnMajor(p.columnMajor);
+        FrameProjection p{{}, CGSizeMake(w, h)};
+        BNViewVolumeProjection(volume).toColumnMajor(p.columnMajor);
         return p;
     }
 
     BNMatrix44f rowMajor() const { return BNMatrix44f::fromColumnMajor(columnMajor); }
-
-    CGPoint screenOf(CGPoint world) const {
-        const auto v = rowMajor().transformPoint(world.x, world.y, 0.0);
-        return {(v.x * 0.5 + 0.5) * drawableW, (v.y * 0.5 + 0.5) * drawableH};
-    }
-
-    CGPoint worldOf(CGPoint screen) const {
-        const BNMatrix44f inverse = rowMajor().inverted();
-        const auto v = inverse.transform(
-            BNVector4Tmpl<double>{2.0 * screen.x / drawableW - 1.0, 2.0 * screen.y / drawableH - 1.0, -1.0, 1.0});
-        return {v.x / v.w, v.y / v.w};
-    }
+    CGPoint screenOf(CGPoint world) const { return BNProjectionWorldToScreen(rowMajor(), drawable, world); }
+    CGPoint worldOf(CGPoint screen) const { return BNProjectionScreenToWorld(rowMajor(), drawable, screen); }
 };
 
 void expectMatrixNear(const BNMatrix44d& a, const BNMatrix44d& b, double tol, const char* what) {
@@ -66,6 +52,21 @@ TEST_F(OrthoProjection, ortho__matchesConventionalMatrix) {
     EXPECT_FLOAT_EQ(z01.at(2, 3), 0.5f) << "depth offset of the curve views' projection";
     EXPECT_FLOAT_EQ(z01.at(0, 0), 0.02f);
     EXPECT_FLOAT_EQ(z01.at(1, 3), 0.0f);
+}
+
+TEST_F(OrthoProjection, viewVolumeProjection__matchesDepthZeroToOneOrtho) {
+    const CGRect volume = CGRectMake(0.0, -62.5, 100.0, 125.0);
+    const BNMatrix44f view = BNViewVolumeProjection(volume);
+    const BNMatrix44f ortho = BNMatrix44f::orthoZeroToOne(0.0f, 100.0f, -62.5f, 62.5f, -1.0f, 1.0f);
+    for (int r = 0; r < 4; ++r)
+        for (int c = 0; c < 4; ++c)
+            EXPECT_FLOAT_EQ(view.at(r, c), ortho.at(r, c)) << "element (" << r << ", " << c << ")";
+    EXPECT_EQ(BNViewVolumeProjection(CGRectMake(5.0, 0.0, 0.0, 1.0)), BNMatrix44f::zero())
+        << "a volume without width has no projection";
+    // Translation in single precision: -(L + R)/(R - L) of the float edges.
+    const BNMatrix44f far = BNViewVolumeProjection(CGRectMake(3600.1, 0.0, 0.3, 1.0));
+    const float l = 3600.1f, r = static_cast<float>(3600.1 + 0.3);
+    EXPECT_EQ(far.at(0, 3), -(l + r) / (r - l));
 }
 
 TEST_F(OrthoProjection, ortho__degenerateExtentGivesZeroMatrix) {
@@ -98,10 +99,10 @@ TEST_F(OrthoProjection, roundTrip__worldToScreenToWorld) {
     for (const Case& c : cases) {
         SCOPED_TRACE(c.name);
         const FrameProjection p = FrameProjection::forVolume(c.volume, w, h);
-        // Single precision limits the answer to about a float ulp of the larger of the
+        // Single precision limits the answer to a few float ulps of the larger of the
         // volume's edges, expressed in world units.
-        const double tolX = 8.0 * kFloatTol * std::fmax(std::fabs(c.volume.origin.x), c.volume.size.width);
-        const double tolY = 8.0 * kFloatTol * std::fmax(std::fabs(c.volume.origin.y), c.volume.size.height);
+        const double tolX = 16.0 * kFloatUlp * std::fmax(std::fabs(c.volume.origin.x), c.volume.size.width);
+        const double tolY = 16.0 * kFloatUlp * std::fmax(std::fabs(c.volume.origin.y), c.volume.size.height);
         for (double fx : {0.0, 0.125, 0.5, 0.9}) {
             for (double fy : {0.0, 0.3, 1.0}) {
                 const CGPoint world{c.volume.origin.x + fx * c.volume.size.width,
@@ -119,7 +120,7 @@ TEST_F(OrthoProjection, roundTrip__worldToScreenToWorld) {
 
 TEST_F(OrthoProjection, roundTrip__zeroMatrixAnswersNaN) {
     // Before the first frame there is no projection: the mapping must say "no answer".
-    FrameProjection p{{}, 800.0, 600.0};
+    FrameProjection p{{}, CGSizeMake(800.0, 600.0)};
     const CGPoint world = p.worldOf({10.0, 20.0});
     EXPECT_TRUE(std::isnan(world.x) && std::isnan(world.y)) << "zero projection must give NaN world points";
     const CGPoint screen = p.screenOf({1.0, 2.0});
