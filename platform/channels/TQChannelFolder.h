@@ -46,7 +46,7 @@ public:
     TQChannelBase* getChild(size_t index) const;
     // First child (in display order) with this id, or null. Cheap: folders with many children
     // keep an index by id, rebuilt on the first lookup after a change of the children.
-    TQChannelBase* findChild(TQChannelId channelId) const;
+    virtual TQChannelBase* findChild(TQChannelId channelId) const;
     std::optional<size_t> indexOfChild(const TQChannelBase* child) const;
 
     // Appends a child (null appends an empty slot) and takes ownership; a child that still
@@ -66,9 +66,10 @@ public:
     void removeAllChildren();
 
     // --- Fold flags.
-    bool testFoldFlag(uint32_t flag) const { return (_foldFlags & flag) != 0; }
-    void setFoldFlag(uint32_t flag) { _foldFlags |= flag; }
-    void resetFoldFlag(uint32_t flag) { _foldFlags &= ~flag; }
+    // testFoldFlag is true when any bit of the word is set.
+    virtual bool testFoldFlag(uint32_t flag) const { return (_foldFlags & flag) != 0; }
+    virtual void setFoldFlag(uint32_t flag) { _foldFlags |= flag; }
+    virtual void resetFoldFlag(uint32_t flag) { _foldFlags &= ~flag; }
     uint32_t getFoldFlags() const { return _foldFlags; }
 
     // Appends every TQChannel below this folder, depth first in display order. A descendant
