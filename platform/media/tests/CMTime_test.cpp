@@ -117,6 +117,25 @@ TEST_F(CMTimeArithmetic, compareAndSeconds__totalOrderOverKinds) {
     EXPECT_NEAR(CMTimeGetSeconds(CMTimeMake(-3, 4)), -0.75, kSecondsTol);
 }
 
+TEST_F(CMTimeArithmetic, convertScaleAndRanges__roundingAndHalfOpenEnd) {
+    {
+        const CMTime t = CMTimeConvertScale(CMTimeMake(1, 3), kChannelTimescale);
+        EXPECT_TRUE(isTime(t, 87381, kChannelTimescale));
+        EXPECT_TRUE(rounded(t));
+    }
+    EXPECT_FALSE(rounded(CMTimeConvertScale(CMTimeMake(1, 2), kChannelTimescale))) << "1/2 is exact at 2^18";
+    EXPECT_TRUE(CMTIME_IS_INVALID(CMTimeConvertScale(CMTimeMake(1, 2), 0)));
+    EXPECT_TRUE(CMTIME_IS_POSITIVE_INFINITY(CMTimeConvertScale(kCMTimePositiveInfinity, 600)));
+    EXPECT_TRUE(CMTIME_IS_POSITIVE_INFINITY(CMTimeConvertScale(CMTimeMake(kMaxValue, 1), 2)));
+
+    const CMTimeRange r = CMTimeRangeMake(CMTimeMake(1, 1), CMTimeMake(1, 2));
+    EXPECT_TRUE(CMTimeRangeContainsTime(r, CMTimeMake(1, 1))) << "start is inside";
+    EXPECT_TRUE(CMTimeRangeContainsTime(r, CMTimeMake(1499, 1000)));
+    EXPECT_FALSE(CMTimeRangeContainsTime(r, CMTimeMake(3, 2))) << "end is outside";
+    EXPECT_FALSE(CMTimeRangeContainsTime(kCMTimeRangeInvalid, kCMTimeZero));
+    EXPECT_TRUE(CMTIME_IS_POSITIVE_INFINITY(CMTimeRangeGetEnd(CMTimeRangeMake(kCMTimeZero, kCMTimePositiveInfinity))));
+}
+
 class CMTimeSafer : public ::testing::Test {
 protected:
     const CMTime allZero{};  // what a missing host delegate answers for the current time
