@@ -171,10 +171,13 @@ public:
     void setTimeExtent(const BNTimeRange& extent) { _timeExtent = extent; }
 
 protected:
-    // Subclasses copy and compare their own state and chain to their base.
+    // Subclasses copy and compare their own state and chain to their base. The base's state
+    // is the flags, the lock, the info and the value range.
     virtual void assignState(const TQChannelBase& other);
     virtual bool equalState(const TQChannelBase& other) const;
-    // Used by the copy operations of subclasses.
+    // Used by the copy operations of subclasses: name, id, own time offset, time extent and
+    // X axis label. The change observer and the object manipulator belong to the host's
+    // attachment of this very node and are never copied.
     void copyIdentityFrom(const TQChannelBase& other);
 
 private:

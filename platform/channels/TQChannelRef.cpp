@@ -90,3 +90,21 @@ bool operator==(const TQChannelRef& a, const TQChannelRef& b) {
     if (!a._valid) return a._invalidText == b._invalidText;
     return a._ids == b._ids;
 }
+
+bool operator<(const TQChannelRef& a, const TQChannelRef& b) {
+    if (a._valid != b._valid) return a._valid;
+    if (!a._valid) return a._invalidText < b._invalidText;
+    return a._ids < b._ids;
+}
+
+size_t TQChannelRef::hash() const {
+    if (!_valid) return std::hash<BNString>{}(_invalidText);
+    // FNV-1a over the ids; paths are short, so this stays cheap.
+    uint64_t h = 0xcbf29ce484222325ull;
+    for (const TQChannelId id : _ids) {
+        h ^= id;
+        h *= 0x100000001b3ull;
+    }
+    h ^= _ids.size();
+    return static_cast<size_t>(h);
+}

@@ -13,6 +13,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <vector>
 
 #include "platform/channels/TQChannelBase.h"
@@ -43,9 +44,19 @@ public:
     BNString getText() const;
 
     friend bool operator==(const TQChannelRef& a, const TQChannelRef& b);
+    // A strict order for sorted containers and sorted walks: valid references by their ids
+    // lexicographically (a folder before what lies below it), then invalid ones by text.
+    friend bool operator<(const TQChannelRef& a, const TQChannelRef& b);
+    // Consistent with ==, for hashed containers.
+    size_t hash() const;
 
 private:
     std::vector<TQChannelId> _ids;
     BNString _invalidText;  // only for invalid references
     bool _valid = false;
+};
+
+template <>
+struct std::hash<TQChannelRef> {
+    size_t operator()(const TQChannelRef& ref) const noexcept { return ref.hash(); }
 };
