@@ -1,0 +1,126 @@
+#include "host/TQHostAppDelegate.h"
+
+TQHostAppDelegate::TQHostAppDelegate(TQHostObjectFamily family)
+    : _scene(family),
+      _sceneRoot(&_scene.root()),
+      _undo([this] { return _sceneRoot; }),
+      _displayRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(10, 1))) {
+    _clock.setPlayRange(_displayRange);
+    _scene.root().setChangeObserver(this);
+}
+
+TQHostAppDelegate::~TQHostAppDelegate() {
+    // The scene dies after this body; channels destroyed with it must not call back here.
+    _scene.root().setChangeObserver(nullptr);
+}
+
+// --- Scene ---
+
+TQChannelObjectRootBase* TQHostAppDelegate::addObject(const BNString& name,
+                                                      const TQHostObjectOptions& options) {
+    TQChannelObjectRootBase* object = _scene.addObject(name, options);
+    object->setRootCurrentTime(_clock.currentTime());
+    _notifications.post(kTQNotifySceneChanged);
+    return object;
+}
+
+bool TQHostAppDelegate::removeObject(const TQChannelBase* object) {
+    const bool wasSelected = _scene.isObjectSelected(object);
+    if (!_scene.removeObject(object)) return false;
+    _notifications.post(wasSelected ? kTQNotifySceneChanged | kTQNotifyObjectSelectionChanged
+                                    : kTQNotifySceneChanged);
+    return true;
+}
+
+void TQHostAppDelegate::resetScene(TQHostObjectFamily family) {
+    _clock.stop();
+    _scene.reset(family);
+    _undo.clear();
+    _tracker.reset();
+    _notifications.post(kTQNotifySceneReset);
+}
+
+// --- Selection ---
+
+void TQHostAppDelegate::selectObject(const TQChannelBase* object, bool extend) {
+    if (_scene.selectObject(object, extend)) _notifications.post(kTQNotifyObjectSelectionChanged);
+}
+
+void TQHostAppDelegate::deselectObject(const TQChannelBase* object) {
+    if (_scene.deselectObject(object)) _notifications.post(kTQNotifyObjectSelectionChanged);
+}
+
+void TQHostAppDelegate::setSelectedObjects(const std::vector<TQChannelBase*>& objects) {
+    if (_scene.setSelection(objects)) _notifications.post(kTQNotifyObjectSelectionChanged);
+}
+
+void TQHostAppDelegate::clearObjectSelection() {
+    if (_scene.clearSelection()) _notifications.post(kTQNotifyObjectSelectionChanged);
+}
+
+// --- Time ---
+
+bool TQHostAppDelegate::setFrameDuration(const CMTime& duration) {
+    if (!CMTIME_IS_NUMERIC(duration) || CMTimeCompare(duration, kCMTimeZero) <= 0) return false;
+    _frameDuration = duration;
+    return true;
+}
+
+bool TQHostAppDelegate::setDisplayRange(const CMTimeRange& range) {
+    if (!_clock.setPlayRange(range)) return false;
+    _displayRange = range;
+    _notifications.post(kTQNotifyPlayRangeChanged);
+    return true;
+}
+
+bool TQHostAppDelegate::setSecondsPerTextStep(const CMTime& step) {
+    if (!CMTIME_IS_NUMERIC(step) || CMTimeCompare(step, kCMTimeZero) <= 0) return false;
+    _secondsPerTextStep = step;
+    return true;
+}
+
+void TQHostAppDelegate::setCurrentTime(const CMTime& time) {
+    if (_clock.setCurrentTime(time)) syncObjectTimes();
+}
+
+void TQHostAppDelegate::tick(const CMTime& elapsed) {
+    if (!_clock.tick(elapsed)) return;
+    syncObjectTimes();
+    _notifications.post(kTQNotifyHostTimeChanged);
+}
+
+void TQHostAppDelegate::syncObjectTimes() {
+    for (TQChannelObjectRootBase* object : _scene.objects())
+        object->setRootCurrentTime(_clock.currentTime());
+}
+
+void TQHostAppDelegate::abort() {
+    ++_abortCount;
+    _clock.stop();
+}
+
+void TQHostAppDelegate::unsuppressEventCoalescing() {
+    // An unmatched release is tolerated: a press may have begun before this host existed.
+    if (_coalescingSuppressed > 0) --_coalescingSuppressed;
+}
+
+// --- Undo ---
+
+bool TQHostAppDelegate::undo() {
+    if (!_undo.undo()) return false;
+    _notifications.post(kTQNotifyChannelsChanged);
+    return true;
+}
+
+bool TQHostAppDelegate::redo() {
+    if (!_undo.redo()) return false;
+    _notifications.post(kTQNotifyChannelsChanged);
+    return true;
+}
+
+// --- Change observation ---
+
+void TQHostAppDelegate::channelWillChange(TQChannelBase& channel) {
+    _tracker.channelWillChange(channel, _sceneRoot);
+    _undo.channelWillChange(channel);
+}

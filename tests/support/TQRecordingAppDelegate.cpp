@@ -1,0 +1,282 @@
+#include "tests/support/TQRecordingAppDelegate.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdio>
+
+namespace {
+
+constexpr std::array<std::string_view, 9> kBracketOperations = {
+    "startCaptureModifiedChannels", "endCaptureModifiedChannels", "willChangeChannel",
+    "didChangeChannel", "willSetChannelValue", "didSetChannelValue", "addChannelToUndo",
+    "addToUndo", "postNotification"};
+
+bool isBracketOperation(std::string_view operation) {
+    return std::find(kBracketOperations.begin(), kBracketOperations.end(), operation) !=
+           kBracketOperations.end();
+}
+
+}  // namespace
+
+std::string TQDelegateCall::describe() const {
+    if (operation == "postNotification") {
+        char hex[16];
+        std::snprintf(hex, sizeof hex, "0x%x", static_cast<unsigned>(word));
+        return operation + "(" + hex + ")";
+    }
+    if (operation == "addToUndo")
+        return operation + "(" + std::to_string(type) + "," + std::to_string(action) + "," + text +
+               ")";
+    if (operation == "addChannelToUndo") return operation + "(" + channelName + "," + text + ")";
+    if (operation == "startCaptureModifiedChannels") return operation + "(" + text + ")";
+    if (channel || !channelName.empty()) return operation + "(" + channelName + ")";
+    if (operation == "setCurrentTime") {
+        char seconds[32];
+        std::snprintf(seconds, sizeof seconds, "%g", CMTimeGetSeconds(time));
+        return operation + "(" + seconds + ")";
+    }
+    return operation + "()";
+}
+
+TQDelegateCall& TQRecordingAppDelegate::record(std::string_view operation) {
+    TQDelegateCall& call = _calls.emplace_back();
+    call.operation = operation;
+    return call;
+}
+
+TQDelegateCall& TQRecordingAppDelegate::recordChannel(std::string_view operation,
+                                                      const TQChannelBase* channel) {
+    TQDelegateCall& call = record(operation);
+    call.channel = channel;
+    call.channelName = channel ? channel->getName() : std::string("null");
+    return call;
+}
+
+std::vector<std::string> TQRecordingAppDelegate::describedCalls() const {
+    std::vector<std::string> out;
+    out.reserve(_calls.size());
+    for (const auto& call : _calls) out.push_back(call.describe());
+    return out;
+}
+
+std::vector<std::string> TQRecordingAppDelegate::bracketSequence() const {
+    std::vector<std::string> out;
+    for (const auto& call : _calls)
+        if (isBracketOperation(call.operation)) out.push_back(call.describe());
+    return out;
+}
+
+size_t TQRecordingAppDelegate::count(std::string_view operation) const {
+    return static_cast<size_t>(std::count_if(_calls.begin(), _calls.end(),
+                                             [&](const auto& c) { return c.operation == operation; }));
+}
+
+int TQRecordingAppDelegate::captureBalance() const {
+    return static_cast<int>(count("startCaptureModifiedChannels")) -
+           static_cast<int>(count("endCaptureModifiedChannels"));
+}
+
+void TQRecordingAppDelegate::addReceiver(TQNotificationReceiver* receiver) {
+    if (receiver && std::find(_receivers.begin(), _receivers.end(), receiver) == _receivers.end())
+        _receivers.push_back(receiver);
+}
+
+void TQRecordingAppDelegate::removeReceiver(TQNotificationReceiver* receiver) {
+    std::erase(_receivers, receiver);
+}
+
+// --- Scene and time ---
+
+TQChannelBase* TQRecordingAppDelegate::sceneChannelRoot() {
+    record("sceneChannelRoot");
+    return _forward ? _forward->sceneChannelRoot() : answers.sceneChannelRoot;
+}
+
+CMTime TQRecordingAppDelegate::currentTime() {
+    record("currentTime");
+    return _forward ? _forward->currentTime() : answers.currentTime;
+}
+
+void TQRecordingAppDelegate::setCurrentTime(const CMTime& time) {
+    record("setCurrentTime").time = time;
+    if (_forward)
+        _forward->setCurrentTime(time);
+    else
+        answers.currentTime = time;
+}
+
+CMTime TQRecordingAppDelegate::getFrameDuration() {
+    record("getFrameDuration");
+    return _forward ? _forward->getFrameDuration() : answers.frameDuration;
+}
+
+CMTimeRange TQRecordingAppDelegate::displayRange() {
+    record("displayRange");
+    return _forward ? _forward->displayRange() : answers.displayRange;
+}
+
+bool TQRecordingAppDelegate::isPlaying() {
+    record("isPlaying");
+    return _forward ? _forward->isPlaying() : answers.playing;
+}
+
+uint32_t TQRecordingAppDelegate::firstFrameNumber() {
+    record("firstFrameNumber");
+    return _forward ? _forward->firstFrameNumber() : answers.firstFrameNumber;
+}
+
+uint32_t TQRecordingAppDelegate::startTimecode() {
+    record("startTimecode");
+    return _forward ? _forward->startTimecode() : answers.startTimecode;
+}
+
+CMTime TQRecordingAppDelegate::secondsPerTextStep() {
+    record("secondsPerTextStep");
+    return _forward ? _forward->secondsPerTextStep() : answers.secondsPerTextStep;
+}
+
+bool TQRecordingAppDelegate::shouldDisplayTimeAsFrames() {
+    record("shouldDisplayTimeAsFrames");
+    return _forward ? _forward->shouldDisplayTimeAsFrames() : answers.displayTimeAsFrames;
+}
+
+bool TQRecordingAppDelegate::isKestrel() {
+    record("isKestrel");
+    return _forward ? _forward->isKestrel() : answers.kestrel;
+}
+
+void TQRecordingAppDelegate::abort() {
+    record("abort");
+    if (_forward)
+        _forward->abort();
+    else
+        answers.playing = false;
+}
+
+void TQRecordingAppDelegate::suppressEventCoalescing() {
+    record("suppressEventCoalescing");
+    if (_forward) _forward->suppressEventCoalescing();
+}
+
+void TQRecordingAppDelegate::unsuppressEventCoalescing() {
+    record("unsuppressEventCoalescing");
+    if (_forward) _forward->unsuppressEventCoalescing();
+}
+
+// --- Object selection ---
+
+bool TQRecordingAppDelegate::objectsSelectedInScene() {
+    record("objectsSelectedInScene");
+    return _forward ? _forward->objectsSelectedInScene() : !answers.selectedObjects.empty();
+}
+
+std::vector<TQChannelBase*> TQRecordingAppDelegate::selectedObjectsRootChannels() {
+    record("selectedObjectsRootChannels");
+    return _forward ? _forward->selectedObjectsRootChannels() : answers.selectedObjects;
+}
+
+bool TQRecordingAppDelegate::isObjectSelected(const TQChannelBase* objectRoot) {
+    recordChannel("isObjectSelected", objectRoot);
+    if (_forward) return _forward->isObjectSelected(objectRoot);
+    return objectRoot && std::find(answers.selectedObjects.begin(), answers.selectedObjects.end(),
+                                   objectRoot) != answers.selectedObjects.end();
+}
+
+// --- Change tracking ---
+
+bool TQRecordingAppDelegate::wasChannelModified(const TQChannelBase* channel) {
+    recordChannel("wasChannelModified", channel);
+    if (_forward) return _forward->wasChannelModified(channel);
+    return channel && std::find(answers.modified.begin(), answers.modified.end(), channel) !=
+                          answers.modified.end();
+}
+
+std::vector<TQChannelRef> TQRecordingAppDelegate::modifiedChannels() {
+    record("modifiedChannels");
+    if (_forward) return _forward->modifiedChannels();
+    std::vector<TQChannelRef> refs;
+    for (const TQChannelBase* channel : answers.modified)
+        refs.emplace_back(channel, answers.sceneChannelRoot);
+    return refs;
+}
+
+void TQRecordingAppDelegate::resetModifiedChannels() {
+    record("resetModifiedChannels");
+    if (_forward)
+        _forward->resetModifiedChannels();
+    else
+        answers.modified.clear();
+}
+
+void TQRecordingAppDelegate::postNotification(TQNotificationWord word) {
+    record("postNotification").word = word;
+    if (_forward) {
+        _forward->postNotification(word);
+        return;
+    }
+    // A copy: a receiver may add or remove receivers from inside notify.
+    const std::vector<TQNotificationReceiver*> receivers = _receivers;
+    for (TQNotificationReceiver* receiver : receivers)
+        if (std::find(_receivers.begin(), _receivers.end(), receiver) != _receivers.end())
+            receiver->notify(word);
+}
+
+// --- Edit brackets and undo ---
+
+void TQRecordingAppDelegate::startCaptureModifiedChannels(const BNString& undoDescription) {
+    record("startCaptureModifiedChannels").text = undoDescription;
+    if (_forward) _forward->startCaptureModifiedChannels(undoDescription);
+}
+
+void TQRecordingAppDelegate::endCaptureModifiedChannels() {
+    record("endCaptureModifiedChannels");
+    if (_forward) _forward->endCaptureModifiedChannels();
+}
+
+void TQRecordingAppDelegate::willChangeChannel(const TQChannelBase* channel) {
+    recordChannel("willChangeChannel", channel);
+    if (_forward) _forward->willChangeChannel(channel);
+}
+
+void TQRecordingAppDelegate::didChangeChannel(const TQChannelBase* channel) {
+    recordChannel("didChangeChannel", channel);
+    if (_forward) _forward->didChangeChannel(channel);
+}
+
+void TQRecordingAppDelegate::willSetChannelValue(const TQChannelBase* channel) {
+    recordChannel("willSetChannelValue", channel);
+    if (_forward) _forward->willSetChannelValue(channel);
+}
+
+void TQRecordingAppDelegate::didSetChannelValue(const TQChannelBase* channel) {
+    recordChannel("didSetChannelValue", channel);
+    if (_forward) _forward->didSetChannelValue(channel);
+}
+
+void TQRecordingAppDelegate::addChannelToUndo(const TQChannelBase* channel,
+                                              const BNString& undoDescription) {
+    recordChannel("addChannelToUndo", channel).text = undoDescription;
+    if (_forward) _forward->addChannelToUndo(channel, undoDescription);
+}
+
+void TQRecordingAppDelegate::addToUndo(void* object, uint32_t type, uint32_t action,
+                                       const BNString& undoDescription) {
+    TQDelegateCall& call = record("addToUndo");
+    call.object = object;
+    call.type = type;
+    call.action = action;
+    call.text = undoDescription;
+    if (_forward) _forward->addToUndo(object, type, action, undoDescription);
+}
+
+// --- Persistence ---
+
+TQCurveSetListSerializer* TQRecordingAppDelegate::getCurveSetListSerializer() {
+    record("getCurveSetListSerializer");
+    return _forward ? _forward->getCurveSetListSerializer() : answers.curveSetListSerializer;
+}
+
+double TQRecordingAppDelegate::version() {
+    record("version");
+    return _forward ? _forward->version() : answers.version;
+}

@@ -1,0 +1,125 @@
+#pragma once
+// A host delegate for tests: it records every call with its arguments, in order, so that a
+// test can compare a whole bracket sequence with the order the contract lays down.
+//
+// It answers in one of two ways:
+//   - forwarding: every call goes on to another delegate (the reference host, say) after it
+//     is recorded, and that delegate's answer comes back;
+//   - standalone: calls are answered from `answers`, which a test fills in. Posted words are
+//     then handed to the receivers added with addReceiver, in order, on the spot.
+//
+// Channels are recorded by pointer (compare by identity only; the channel may be gone) and
+// by the name they had at the moment of the call, which is what describe() prints.
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "src/contract/TQCurveEditorAppDelegate.h"
+
+struct TQDelegateCall {
+    std::string operation;  // the operation's name, as in the contract
+    const TQChannelBase* channel = nullptr;
+    std::string channelName;
+    std::string text;  // an undo description
+    TQNotificationWord word = 0;
+    uint32_t type = 0;
+    uint32_t action = 0;
+    const void* object = nullptr;
+    CMTime time = kCMTimeInvalid;
+
+    // "willChangeChannel(X)", "postNotification(0x8)", "startCaptureModifiedChannels(Undo
+    // Move Keypoint)", "addToUndo(2,0,Curve Editor Undo Remove Channel)", "currentTime()".
+    std::string describe() const;
+};
+
+class TQRecordingAppDelegate : public TQCurveEditorAppDelegate {
+public:
+    // What a standalone recorder answers.
+    struct Answers {
+        TQChannelBase* sceneChannelRoot = nullptr;
+        CMTime currentTime = kCMTimeZero;
+        CMTime frameDuration = CMTimeMake(1, 30);
+        CMTimeRange displayRange = CMTimeRangeMake(kCMTimeZero, CMTimeMake(10, 1));
+        bool playing = false;
+        uint32_t firstFrameNumber = 0;
+        uint32_t startTimecode = 0;
+        CMTime secondsPerTextStep = CMTimeMake(1, 1);
+        bool displayTimeAsFrames = false;
+        bool kestrel = true;
+        std::vector<TQChannelBase*> selectedObjects;
+        // Channels reported as modified; resetModifiedChannels empties it.
+        std::vector<const TQChannelBase*> modified;
+        TQCurveSetListSerializer* curveSetListSerializer = nullptr;
+        double version = 1.0;
+    };
+
+    explicit TQRecordingAppDelegate(TQCurveEditorAppDelegate* forwardTo = nullptr)
+        : _forward(forwardTo) {}
+
+    Answers answers;
+
+    // --- Reading the record ---
+    const std::vector<TQDelegateCall>& calls() const { return _calls; }
+    void clearCalls() { _calls.clear(); }
+    // Every call, described.
+    std::vector<std::string> describedCalls() const;
+    // Only the calls of the edit bracket: start and end of capture, the four will/did
+    // announcements, the two undo recordings and postNotification, described.
+    std::vector<std::string> bracketSequence() const;
+    size_t count(std::string_view operation) const;
+    // Starts minus ends so far: 0 when every bracket that opened has closed.
+    int captureBalance() const;
+
+    // --- Standalone delivery of posted words (not owned) ---
+    void addReceiver(TQNotificationReceiver* receiver);
+    void removeReceiver(TQNotificationReceiver* receiver);
+
+    // --- The contract ---
+    TQChannelBase* sceneChannelRoot() override;
+    CMTime currentTime() override;
+    void setCurrentTime(const CMTime& time) override;
+    CMTime getFrameDuration() override;
+    CMTimeRange displayRange() override;
+    bool isPlaying() override;
+    uint32_t firstFrameNumber() override;
+    uint32_t startTimecode() override;
+    CMTime secondsPerTextStep() override;
+    bool shouldDisplayTimeAsFrames() override;
+    bool isKestrel() override;
+    void abort() override;
+    void suppressEventCoalescing() override;
+    void unsuppressEventCoalescing() override;
+
+    bool objectsSelectedInScene() override;
+    std::vector<TQChannelBase*> selectedObjectsRootChannels() override;
+    bool isObjectSelected(const TQChannelBase* objectRoot) override;
+
+    bool wasChannelModified(const TQChannelBase* channel) override;
+    std::vector<TQChannelRef> modifiedChannels() override;
+    void resetModifiedChannels() override;
+    void postNotification(TQNotificationWord word) override;
+
+    void startCaptureModifiedChannels(const BNString& undoDescription) override;
+    void endCaptureModifiedChannels() override;
+    void willChangeChannel(const TQChannelBase* channel) override;
+    void didChangeChannel(const TQChannelBase* channel) override;
+    void willSetChannelValue(const TQChannelBase* channel) override;
+    void didSetChannelValue(const TQChannelBase* channel) override;
+    void addChannelToUndo(const TQChannelBase* channel, const BNString& undoDescription) override;
+    void addToUndo(void* object, uint32_t type, uint32_t action,
+                   const BNString& undoDescription) override;
+
+    TQCurveSetListSerializer* getCurveSetListSerializer() override;
+    double version() override;
+
+private:
+    TQDelegateCall& record(std::string_view operation);
+    TQDelegateCall& recordChannel(std::string_view operation, const TQChannelBase* channel);
+
+    TQCurveEditorAppDelegate* _forward;
+    std::vector<TQDelegateCall> _calls;
+    std::vector<TQNotificationReceiver*> _receivers;
+};
