@@ -74,6 +74,14 @@ public:
     TQChannel(const BNString& name, TQChannelId channelId, double defaultValue = 0.0);
     ~TQChannel() override;
 
+    // Assignment copies the animation state (TQChannelBase::operator=), also between two
+    // TQChannel references, where the implicit copy assignment would otherwise be chosen.
+    using TQChannelBase::operator=;
+    TQChannel& operator=(const TQChannel& other) {
+        TQChannelBase::operator=(other);
+        return *this;
+    }
+
     // ---- Keyframe reading -------------------------------------------------------------------
 
     // Handles in time order (equal times in arrival order). With enabledOnly, only the

@@ -1,0 +1,105 @@
+#include "platform/channels/internal/TQChannelData.h"
+
+#include <atomic>
+
+namespace tq_internal {
+
+bool sameState(const TQKeyframeRecord& a, const TQKeyframeRecord& b) {
+    return CMTimeIdentical(a.time, b.time) && a.value == b.value && a.inU == b.inU &&
+           a.inV == b.inV && a.outU == b.outU && a.outV == b.outV &&
+           a.interpolation == b.interpolation && a.locked == b.locked &&
+           a.enabled == b.enabled && a.broken == b.broken && a.scaled == b.scaled;
+}
+
+uint64_t nextKeyframeSerial() {
+    // Shared by all channels, so that a handle from one channel can never name a keyframe of
+    // another, not even after an assignment of state copies serials across.
+    static std::atomic<uint64_t> counter{0};
+    return ++counter;
+}
+
+long TQChannelData::indexOf(const void* handle) const {
+    const uint64_t serial = serialOf(handle);
+    if (serial == 0) return -1;
+    if (!indexValid) {
+        index.clear();
+        index.reserve(keys.size());
+        for (size_t i = 0; i < keys.size(); ++i) index.emplace(keys[i].serial, i);
+        indexValid = true;
+    }
+    const auto it = index.find(serial);
+    return it == index.end() ? -1 : long(it->second);
+}
+
+const TQKeyframeRecord* TQChannelData::find(const void* handle) const {
+    const long i = indexOf(handle);
+    return i < 0 ? nullptr : &keys[size_t(i)];
+}
+
+TQKeyframeRecord* TQChannelData::find(const void* handle) {
+    const long i = indexOf(handle);
+    return i < 0 ? nullptr : &keys[size_t(i)];
+}
+
+size_t TQChannelData::lowerBound(const CMTime& time) const {
+    size_t lo = 0, hi = keys.size();
+    while (lo < hi) {
+        const size_t mid = lo + (hi - lo) / 2;
+        if (CMTimeCompare(keys[mid].time, time) < 0) {
+            lo = mid + 1;
+        } else {
+            hi = mid;
+        }
+    }
+    return lo;
+}
+
+size_t TQChannelData::upperBound(const CMTime& time) const {
+    size_t lo = 0, hi = keys.size();
+    while (lo < hi) {
+        const size_t mid = lo + (hi - lo) / 2;
+        if (CMTimeCompare(keys[mid].time, time) <= 0) {
+            lo = mid + 1;
+        } else {
+            hi = mid;
+        }
+    }
+    return lo;
+}
+
+long TQChannelData::lastAt(const CMTime& time) const {
+    const size_t ub = upperBound(time);
+    if (ub == 0 || CMTimeCompare(keys[ub - 1].time, time) != 0) return -1;
+    return long(ub - 1);
+}
+
+size_t TQChannelData::insert(const TQKeyframeRecord& record) {
+    const size_t position = upperBound(record.time);
+    keys.insert(keys.begin() + long(position), record);
+    orderChanged();
+    return position;
+}
+
+void TQChannelData::eraseAt(size_t position) {
+    if (position >= keys.size()) return;
+    keys.erase(keys.begin() + long(position));
+    orderChanged();
+}
+
+size_t TQChannelData::retime(size_t position, const CMTime& time) {
+    TQKeyframeRecord record = keys[position];
+    keys.erase(keys.begin() + long(position));
+    record.time = time;
+    record.seconds = CMTimeGetSeconds(time);
+    return insert(record);
+}
+
+const CurveCache& TQChannelData::curve() const {
+    if (!cacheValid) {
+        cache.build(keys, discrete, initialValue, extrapolationBefore, extrapolationAfter);
+        cacheValid = true;
+    }
+    return cache;
+}
+
+}  // namespace tq_internal

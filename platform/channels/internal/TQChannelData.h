@@ -1,0 +1,89 @@
+#pragma once
+// Internal: the state behind a TQChannel. The keyframe table is a vector kept in time order
+// (equal times in arrival order); handles map to positions through an index that is rebuilt
+// lazily after the order changes, and the evaluation cache is rebuilt lazily after any edit.
+
+#include <cstdint>
+#include <memory>
+#include <unordered_map>
+#include <vector>
+
+#include "platform/channels/TQChannelBehavior.h"
+#include "platform/channels/internal/TQCurveCache.h"
+#include "platform/media/CMTime.h"
+
+namespace tq_internal {
+
+struct TQKeyframeRecord {
+    uint64_t serial = 0;  // the handle; process-wide, never reused
+    CMTime time = kCMTimeZero;
+    double seconds = 0.0;  // CMTimeGetSeconds(time), cached for evaluation
+    double value = 0.0;
+    double inU = 0.0;  // input handle offset; u <= 0 when well formed
+    double inV = 0.0;
+    double outU = 0.0;  // output handle offset; u >= 0 when well formed
+    double outV = 0.0;
+    unsigned interpolation = 4;
+    bool locked = false;
+    bool enabled = true;
+    bool broken = false;
+    bool scaled = false;
+};
+
+// Field by field, times with CMTimeIdentical; the serial is identity, not state.
+bool sameState(const TQKeyframeRecord& a, const TQKeyframeRecord& b);
+
+uint64_t nextKeyframeSerial();
+
+inline void* handleOf(uint64_t serial) {
+    return reinterpret_cast<void*>(static_cast<uintptr_t>(serial));
+}
+inline uint64_t serialOf(const void* handle) {
+    return static_cast<uint64_t>(reinterpret_cast<uintptr_t>(handle));
+}
+
+struct TQChannelData {
+    std::vector<TQKeyframeRecord> keys;
+    double initialValue = 0.0;
+    double defaultValue = 0.0;
+    double sliderMaximum = 100.0;
+    unsigned defaultInterpolation = 4;
+    unsigned extrapolationBefore = 0;
+    unsigned extrapolationAfter = 0;
+    bool animationEnabled = true;
+    bool discrete = false;
+    bool rigged = false;
+    CMTime currentAxisTime = kCMTimeZero;
+    std::vector<std::unique_ptr<TQChannelBehavior>> behaviors;
+
+    // Position of a live handle in `keys`, or -1.
+    long indexOf(const void* handle) const;
+    const TQKeyframeRecord* find(const void* handle) const;
+    TQKeyframeRecord* find(const void* handle);
+
+    // Inserts after every keyframe at an equal or earlier time; answers the position.
+    size_t insert(const TQKeyframeRecord& record);
+    void eraseAt(size_t position);
+    // Takes the keyframe at `position` out and puts it back at `time`, arriving last there.
+    size_t retime(size_t position, const CMTime& time);
+    // First position whose time is not earlier than `time` / later than `time`.
+    size_t lowerBound(const CMTime& time) const;
+    size_t upperBound(const CMTime& time) const;
+    // Last keyframe of the run exactly at `time`, or -1.
+    long lastAt(const CMTime& time) const;
+
+    // Call after any change of the keyframes' order or membership / of anything evaluated.
+    void orderChanged() {
+        indexValid = false;
+        cacheValid = false;
+    }
+    void curveChanged() { cacheValid = false; }
+    const CurveCache& curve() const;
+
+    mutable std::unordered_map<uint64_t, size_t> index;
+    mutable bool indexValid = false;
+    mutable CurveCache cache;
+    mutable bool cacheValid = false;
+};
+
+}  // namespace tq_internal
