@@ -1,0 +1,178 @@
+// The scene's object model in both families, selection, change tracking and the sample scene.
+#include <gtest/gtest.h>
+
+#include <set>
+
+#include "host/TQHostAppDelegate.h"
+#include "host/TQHostSampleScene.h"
+#include "platform/channels/TQChannelTypes.h"
+
+namespace {
+
+constexpr TQHostProperty kAllProperties[] = {
+    TQHostProperty::Position, TQHostProperty::Scale,   TQHostProperty::Rotation,
+    TQHostProperty::Shear,    TQHostProperty::Pivot,   TQHostProperty::Opacity,
+    TQHostProperty::Retiming};
+
+class SceneFamilies : public ::testing::TestWithParam<TQHostObjectFamily> {};
+
+TEST_P(SceneFamilies, pathTables__resolveToKeyframableChannelsOfEveryObject) {
+    const TQHostObjectFamily family = GetParam();
+    TQHostScene scene(family);
+    TQChannelObjectRootBase* first = scene.addObject("A");
+    TQChannelObjectRootBase* second = scene.addObject("B");
+    ASSERT_NE(first->getChannelId(), second->getChannelId());
+
+    for (TQHostProperty property : kAllProperties) {
+        for (const BNString& path : TQHostPropertyPaths(family, property)) {
+            auto* channel = dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(second));
+            ASSERT_NE(channel, nullptr) << path << " does not name a channel";
+            EXPECT_TRUE(channel->canKeyframe()) << path;
+            EXPECT_EQ(channel->getChannelRoot(), second) << path;
+            EXPECT_EQ(channel->getRef(true), TQChannelRef(path))
+                << "the relative reference of " << path << " must be the table's text";
+        }
+    }
+    EXPECT_EQ(TQHostPropertyPaths(family, TQHostProperty::Shear).empty(),
+              family == TQHostObjectFamily::Other);
+    EXPECT_EQ(scene.isKestrel(), family == TQHostObjectFamily::Kestrel);
+}
+
+TEST_P(SceneFamilies, typedChannels__giveEveryDowncastSomethingToFind) {
+    TQHostScene scene(GetParam());
+    TQChannelBase* object = scene.addObject("A");
+    const TQHostTypedChannelPaths& paths = TQHostTypedPaths(GetParam());
+    auto at = [&](const BNString& path) { return TQChannelRef(path).getChannel(object); };
+
+    EXPECT_NE(dynamic_cast<TQChannelBool*>(at(paths.visible)), nullptr);
+    EXPECT_NE(dynamic_cast<TQChannelDecibel*>(at(paths.volume)), nullptr);
+    EXPECT_NE(dynamic_cast<TQChannel2D*>(at(paths.offset)), nullptr);
+    EXPECT_NE(dynamic_cast<TQChannel2DOverRange*>(at(paths.gradient)), nullptr);
+    EXPECT_NE(dynamic_cast<TQChannelScaleOverRange*>(at(paths.taper)), nullptr);
+    EXPECT_NE(dynamic_cast<TQChannelCurve*>(at(paths.softness)), nullptr);
+    EXPECT_NE(dynamic_cast<TQChannelBlindData*>(at(paths.fontIndex)), nullptr);
+    auto* orientation = dynamic_cast<TQChannelRotation3D*>(at(paths.orientation));
+    ASSERT_NE(orientation, nullptr);
+    EXPECT_TRUE(orientation->isQuaternionMode());
+    EXPECT_NE(dynamic_cast<TQChannelAngle*>(orientation->getAngleChannel(kTQComponentZ)), nullptr);
+}
+
+TEST_P(SceneFamilies, sampleScene__holdsAFewHundredKeyframesPerObjectOfEveryKind) {
+    TQHostScene scene(GetParam());
+    TQHostPopulateSampleScene(scene);
+    ASSERT_EQ(scene.numberOfObjects(), 4u);
+
+    size_t behaviours = 0;
+    for (TQChannelObjectRootBase* object : scene.objects()) {
+        std::vector<TQChannelBase*> channels;
+        object->getAllDescendantsFlattened(channels, 0, true);
+        size_t keys = 0;
+        std::set<unsigned> kinds;
+        for (TQChannelBase* base : channels) {
+            auto* channel = static_cast<TQChannel*>(base);
+            keys += channel->numberOfKeyframes();
+            behaviours += channel->numberOfBehaviors();
+            for (TQKeyframeHandle key : channel->getKeyframes(false))
+                kinds.insert(channel->getKeyframeInterpolation(key));
+        }
+        EXPECT_GE(keys, 250u) << object->getName();
+        EXPECT_LE(keys, 600u) << object->getName();
+        for (unsigned kind : {0u, 1u, 4u, 6u, 13u, 14u, 15u, 16u, 17u})
+            EXPECT_TRUE(kinds.contains(kind)) << object->getName() << " lacks interpolation " << kind;
+    }
+    EXPECT_EQ(behaviours, 2u) << "only the behaviour object carries behaviours";
+    TQChannelObjectRootBase* late = scene.objectNamed(kTQHostSampleOffsetObject);
+    ASSERT_NE(late, nullptr);
+    EXPECT_EQ(CMTimeGetSeconds(late->timeOffset()), 1.0);
+}
+
+INSTANTIATE_TEST_SUITE_P(BothFamilies, SceneFamilies,
+                         ::testing::Values(TQHostObjectFamily::Kestrel, TQHostObjectFamily::Other));
+
+class HostDelegate : public ::testing::Test {
+protected:
+    void SetUp() override {
+        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel, {3, 3, 0.2});
+        objects = host.scene().objects();
+        const auto& positions = TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
+        x = TQChannelRef(positions[0]).getChannel(objects[0]);
+        z = TQChannelRef(positions[2]).getChannel(objects[0]);
+        otherX = TQChannelRef(positions[0]).getChannel(objects[1]);
+    }
+    TQHostAppDelegate host;
+    std::vector<TQChannelObjectRootBase*> objects;
+    TQChannelBase* x = nullptr;
+    TQChannelBase* z = nullptr;
+    TQChannelBase* otherX = nullptr;
+};
+
+TEST_F(HostDelegate, modifiedSet__isExactlyWhatChangedSinceTheLastReset) {
+    EXPECT_TRUE(host.modifiedChannels().empty()) << "loading must start with a clean set";
+    x->noteWillChange(true);
+    z->noteWillChange(true);
+    x->noteWillChange(true);  // a drag announces again at every step
+
+    const std::vector<TQChannelRef> modified = host.modifiedChannels();
+    ASSERT_EQ(modified.size(), 2u);
+    EXPECT_EQ(modified[0].getChannel(host.sceneChannelRoot()), x);
+    EXPECT_EQ(modified[1].getChannel(host.sceneChannelRoot()), z);
+    EXPECT_TRUE(host.wasChannelModified(x));
+    EXPECT_FALSE(host.wasChannelModified(otherX)) << "same place, other object: not modified";
+    EXPECT_TRUE(host.wasChannelModified(objects[0])) << "an object root holding a change";
+    EXPECT_FALSE(host.wasChannelModified(objects[1]));
+    EXPECT_FALSE(host.wasChannelModified(nullptr));
+
+    {  // A compound announced as a whole covers its components.
+        TQChannelBase* position = x->getParent();
+        host.resetModifiedChannels();
+        position->noteWillChange(true);
+        EXPECT_TRUE(host.wasChannelModified(z));
+        EXPECT_EQ(host.modifiedChannels().size(), 1u);
+    }
+
+    host.resetModifiedChannels();
+    EXPECT_FALSE(host.wasChannelModified(x));
+    EXPECT_TRUE(host.modifiedChannels().empty());
+}
+
+TEST_F(HostDelegate, destroyedChannel__isNotReportedThroughAReusedAddress) {
+    x->noteWillChange(true);
+    const TQChannelBase* stale = x;
+    ASSERT_TRUE(host.removeObject(objects[0]));
+    EXPECT_FALSE(host.wasChannelModified(stale)) << "a removed channel no longer counts";
+    ASSERT_EQ(host.modifiedChannels().size(), 1u);
+    EXPECT_EQ(host.modifiedChannels()[0].getChannel(host.sceneChannelRoot()), nullptr);
+}
+
+TEST_F(HostDelegate, selectionAndTime__answerAndPostTheHostWords) {
+    struct Words : TQNotificationReceiver {
+        std::vector<TQNotificationWord> seen;
+        void notify(TQNotificationWord word) override { seen.push_back(word); }
+    } words;
+    host.addNotificationReceiver(&words);
+
+    EXPECT_TRUE(host.objectsSelectedInScene());
+    host.selectObject(objects[1], true);
+    host.selectObject(objects[1], true);  // no change, no word
+    EXPECT_EQ(host.selectedObjectsRootChannels(),
+              (std::vector<TQChannelBase*>{objects[0], objects[1]}));
+    EXPECT_TRUE(host.isObjectSelected(objects[1]));
+    EXPECT_FALSE(host.isObjectSelected(x)) << "only object roots are objects";
+    host.clearObjectSelection();
+    EXPECT_FALSE(host.objectsSelectedInScene());
+
+    host.setCurrentTime(CMTimeMake(3, 1));
+    EXPECT_EQ(CMTimeGetSeconds(objects[2]->getRootCurrentTime(false)), 3.0);
+    host.play();
+    host.tick(CMTimeMake(1, 30));
+    EXPECT_TRUE(host.isPlaying());
+    host.abort();
+    EXPECT_FALSE(host.isPlaying()) << "abort stops playback";
+
+    EXPECT_EQ(words.seen, (std::vector<TQNotificationWord>{kTQNotifyObjectSelectionChanged,
+                                                           kTQNotifyObjectSelectionChanged,
+                                                           kTQNotifyHostTimeChanged}));
+    host.removeNotificationReceiver(&words);
+}
+
+}  // namespace
