@@ -1,0 +1,192 @@
+#include "src/data/TQCurveEditorItem.h"
+
+#include <gtest/gtest.h>
+
+#include "platform/channels/TQChannelBehavior.h"
+#include "platform/channels/TQChannelObjectRootBase.h"
+#include "platform/channels/TQCompoundChannel.h"
+#include "tests/support/TQRecordingAppDelegate.h"
+
+namespace {
+
+constexpr double kTol = 1e-9;
+
+CMTime sec(double s) { return TQTarnTimeForChannelSeconds(s, 0x40000); }
+
+// scene
+//   Cube (object root, id 7)
+//     Opacity (id 202)
+//     Transform (folder, id 100)
+//       Position (compound, id 101): X (1), Y (2)
+//       Extra (folder, id 300): Deep (1)
+class ItemFixture : public ::testing::Test {
+protected:
+    void SetUp() override {
+        scene = std::make_unique<TQChannelFolder>("Scene", 0);
+        cube = static_cast<TQChannelObjectRootBase*>(
+            scene->addChild(std::make_unique<TQChannelObjectRootBase>("Cube", 7)));
+        opacity = static_cast<TQChannel*>(cube->addChild(std::make_unique<TQChannel>("Opacity", 202)));
+        transform = static_cast<TQChannelFolder*>(
+            cube->addChild(std::make_unique<TQChannelFolder>("Transform", 100)));
+        position = static_cast<TQCompoundChannel*>(
+            transform->addChild(std::make_unique<TQCompoundChannel>("Position", 101)));
+        x = static_cast<TQChannel*>(position->addChild(std::make_unique<TQChannel>("X", 1)));
+        y = static_cast<TQChannel*>(position->addChild(std::make_unique<TQChannel>("Y", 2)));
+        extra = static_cast<TQChannelFolder*>(
+            transform->addChild(std::make_unique<TQChannelFolder>("Extra", 300)));
+        deep = static_cast<TQChannel*>(extra->addChild(std::make_unique<TQChannel>("Deep", 1)));
+        host.answers.sceneChannelRoot = scene.get();
+        TQCurveEditorItem::resetColorIndex();
+    }
+
+    TQCurveEditorChannelItemPtr channelItem(TQChannelBase* c, double samples = 0) {
+        auto item = std::make_shared<TQCurveEditorChannelItem>();
+        item->initWithChannel(c, samples, &host, 1);
+        return item;
+    }
+
+    TQRecordingAppDelegate host;
+    std::unique_ptr<TQChannelFolder> scene;
+    TQChannelObjectRootBase* cube = nullptr;
+    TQChannel* opacity = nullptr;
+    TQChannelFolder* transform = nullptr;
+    TQCompoundChannel* position = nullptr;
+    TQChannel* x = nullptr;
+    TQChannel* y = nullptr;
+    TQChannelFolder* extra = nullptr;
+    TQChannel* deep = nullptr;
+};
+
+}  // namespace
+
+TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
+    EXPECT_EQ(channelItem(x)->simpleName(), "Position.X") << "a component reads compound dot component";
+    EXPECT_EQ(channelItem(x)->rootName(), std::optional<BNString>("Cube"));
+    EXPECT_EQ(channelItem(opacity)->simpleName(), "Opacity") << "naming stops at the object root";
+    EXPECT_EQ(channelItem(deep)->simpleName(), "Extra.Deep") << "the parent folder is named";
+    cube->setFlag(kTQChannelFlagNameInDisplayName);
+    EXPECT_EQ(channelItem(opacity)->simpleName(), "Cube.Opacity") << "a flagged root names itself";
+    EXPECT_EQ(channelItem(deep)->simpleName(), "Extra.Deep");
+    EXPECT_EQ(channelItem(x)->simpleName(), "Cube.Transform.Position.X")
+        << "a flagged root above the parent takes part";
+}
+
+TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
+    auto root = std::make_shared<TQCurveEditorFolderItem>();
+    root->initWithChannel(cube, 10, &host, 1);
+    std::vector<BNString> names;
+    for (const auto& c : root->children()) names.push_back(c->simpleName());
+    EXPECT_EQ(names, (std::vector<BNString>{"Opacity", "Position.X", "Position.Y", "Extra.Deep"}));
+    EXPECT_FALSE(root->isCollapsed()) << "building a folder item opens its folder";
+    {
+        deep->setFlag(kTQChannelFlagHidden);
+        auto again = std::make_shared<TQCurveEditorFolderItem>();
+        again->initWithChannel(cube, 10, &host, 1);
+        EXPECT_EQ(again->numberOfChildren(), 3u) << "hidden channels are excluded";
+    }
+}
+
+TEST_F(ItemFixture, colours__wrapAfterEight) {
+    std::vector<TQCurveEditorChannelItemPtr> items;
+    for (int i = 0; i < 9; ++i) items.push_back(channelItem(opacity));
+    EXPECT_EQ(items[7]->colorIndex(), 7u);
+    EXPECT_EQ(items[8]->colorIndex(), 0u) << "the ninth item after a reset wraps to colour 0";
+    EXPECT_NE(items[0]->channelId(), items[1]->channelId());
+}
+
+TEST_F(ItemFixture, copy__newIdentitySameColourNoSamples) {
+    opacity->setKeyframe(sec(0), 1.0);
+    opacity->setKeyframe(sec(1), 2.0);
+    auto item = channelItem(opacity, 8);
+    item->setColorIndex(5);
+    item->refreshOriginalCurve(kCMTimeZero, sec(0.25));
+    ASSERT_NE(item->samplesV(), nullptr);
+    auto copy = std::static_pointer_cast<TQCurveEditorChannelItem>(item->copy());
+    EXPECT_NE(copy->channelId(), item->channelId());
+    EXPECT_EQ(copy->colorIndex(), 5u);
+    EXPECT_EQ(copy->samplesV(), nullptr) << "samples are not copied";
+    EXPECT_TRUE(copy->isEqual(*item));
+}
+
+TEST_F(ItemFixture, refreshOriginalCurve__pinsSamplesOntoKeyframes) {
+    // Samples at 0, 1, 2, 3, 4 seconds (count 5).
+    opacity->setKeyframe(sec(0), 0.0);
+    opacity->setKeyframe(sec(1.4), 3.0);  // between samples 1 and 2: takes sample 2
+    opacity->setKeyframe(sec(1.6), 4.0);  // same gap: takes sample 3, whose value is lost
+    opacity->setKeyframe(sec(9), 7.0);    // past the last sample: changes nothing
+    auto item = channelItem(opacity, 5);
+    item->refreshOriginalCurve(kCMTimeZero, sec(1));
+    ASSERT_EQ(item->numberOfSamples(), 5u);
+    const CMTime* u = item->samplesU();
+    const double* v = item->samplesV();
+    EXPECT_EQ(CMTimeCompare(u[2], sec(1.4)), 0);
+    EXPECT_NEAR(v[2], 3.0, kTol);
+    EXPECT_EQ(CMTimeCompare(u[3], sec(1.6)), 0);
+    EXPECT_NEAR(v[3], 4.0, kTol);
+    EXPECT_EQ(CMTimeCompare(u[4], sec(4)), 0) << "a keyframe past the last sample pins nothing";
+    EXPECT_NEAR(v[4], opacity->getCurveValue(sec(4)), kTol);
+    EXPECT_EQ(item->originalCurveDirty(), 0);
+    EXPECT_EQ(item->processedSamplesV(), nullptr) << "both curves go stale together";
+
+    const double* before = item->samplesV();
+    item->refreshOriginalCurve(kCMTimeZero, sec(1));
+    EXPECT_EQ(item->samplesV(), before) << "a clean curve is not fetched again";
+}
+
+TEST_F(ItemFixture, maxY__processedCurveWidensAtMostFiveTimes) {
+    opacity->setKeyframe(sec(0), 0.0);
+    opacity->setKeyframe(sec(1), 1.0);
+    opacity->addBehavior(std::make_unique<TQOscillateBehavior>(100.0, 1.0));
+    auto item = channelItem(opacity);
+    EXPECT_NEAR(item->maxY(), 5.0, kTol) << "range 0..1 and a peak near 100 widen to 5";
+    EXPECT_NEAR(item->minY(), -4.0, kTol) << "the minimum mirrors it: 1 + (0 - 1) * 5";
+    EXPECT_EQ(item->processedCurveDirty(), 1) << "samples taken to measure are not for drawing";
+}
+
+TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
+    auto empty = std::make_shared<TQCurveEditorFolderItem>();
+    empty->initWithRoot(cube, 0, &host, 1);
+    EXPECT_EQ(empty->isEnabledItem(), 1);
+    EXPECT_TRUE(empty->isAnimatedChannel());
+
+    auto root = std::make_shared<TQCurveEditorFolderItem>();
+    root->initWithChannel(cube, 0, &host, 1);
+    EXPECT_EQ(root->isEnabledItem(), 1) << "new items enable their curves";
+    root->childrenAtIndex(0)->enableItem(0);
+    EXPECT_EQ(root->isEnabledItem(), -1) << "children that disagree";
+    EXPECT_EQ(root->childrenAtIndex(99), nullptr);
+}
+
+TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
+    opacity->setKeyframe(sec(0), 1.0);
+    auto item = channelItem(opacity, 4);
+    item->takeCurveSnapshot(1);
+    EXPECT_EQ(item->numberOfSamplesSnapshot(), 0u) << "no samples yet: nothing taken";
+    item->refreshOriginalCurve(kCMTimeZero, sec(1));
+    item->takeCurveSnapshot(1);
+    ASSERT_EQ(item->numberOfSamplesSnapshot(), 4u);
+    ASSERT_NE(item->snapshotChannel(), nullptr);
+    EXPECT_TRUE(*item->snapshotChannel() == *opacity);
+    item->setOriginalCurveDirty(1);
+    item->takeCurveSnapshot(1);
+    EXPECT_EQ(item->numberOfSamplesSnapshot(), 4u) << "an earlier ghost survives";
+
+    cube->removeChild(opacity);  // the channel vanishes under the live item
+    EXPECT_EQ(item->channel(), nullptr);
+    EXPECT_FALSE(item->isValid());
+    EXPECT_TRUE(item->isHidden());
+    EXPECT_EQ(item->numberOfKeypoints(), 0u);
+    EXPECT_EQ(item->minY(), 0.0);
+    item->refreshOriginalCurve(kCMTimeZero, sec(1));
+    EXPECT_EQ(item->numberOfSamples(), 0u);
+    item->takeCurveSnapshot(1);
+    EXPECT_EQ(item->numberOfSamplesSnapshot(), 0u);
+    EXPECT_EQ(item->snapshotChannel(), nullptr);
+}
+
+TEST_F(ItemFixture, compound__componentsOwnFirst) {
+    auto item = channelItem(y);
+    EXPECT_TRUE(item->isCompound());
+    EXPECT_EQ(item->compoundChannelComponents(), (std::vector<TQChannelBase*>{y, x}));
+    EXPECT_FALSE(channelItem(opacity)->isCompound());
+}
