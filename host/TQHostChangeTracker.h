@@ -25,6 +25,8 @@ public:
     // scene (no path from the root) is not recorded.
     void channelWillChange(const TQChannelBase& channel, const TQChannelBase* sceneRoot);
 
+    // `channel` must be live (or null): its ancestors are walked. Callers resolve it from a
+    // reference just before asking, as the framework does.
     bool wasChannelModified(const TQChannelBase* channel, const TQChannelBase* sceneRoot) const;
     const std::vector<TQChannelRef>& modifiedChannels() const { return _announced; }
     bool isEmpty() const { return _announced.empty(); }

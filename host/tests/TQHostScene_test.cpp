@@ -135,13 +135,14 @@ TEST_F(HostDelegate, modifiedSet__isExactlyWhatChangedSinceTheLastReset) {
     EXPECT_TRUE(host.modifiedChannels().empty());
 }
 
-TEST_F(HostDelegate, destroyedChannel__isNotReportedThroughAReusedAddress) {
+TEST_F(HostDelegate, removedObject__leavesAReferenceThatResolvesToNothing) {
     x->noteWillChange(true);
-    const TQChannelBase* stale = x;
     ASSERT_TRUE(host.removeObject(objects[0]));
-    EXPECT_FALSE(host.wasChannelModified(stale)) << "a removed channel no longer counts";
     ASSERT_EQ(host.modifiedChannels().size(), 1u);
-    EXPECT_EQ(host.modifiedChannels()[0].getChannel(host.sceneChannelRoot()), nullptr);
+    EXPECT_EQ(host.modifiedChannels()[0].getChannel(host.sceneChannelRoot()), nullptr)
+        << "a removed channel's reference must resolve to nothing";
+    EXPECT_FALSE(host.wasChannelModified(otherX));
+    EXPECT_FALSE(host.wasChannelModified(objects[1]));
 }
 
 TEST_F(HostDelegate, selectionAndTime__answerAndPostTheHostWords) {
