@@ -137,7 +137,11 @@ void buildOther(TQChannelObjectRootBase& root) {
 
 BNString path(std::initializer_list<TQChannelId> ids) {
     BNString text = ".";
-    for (TQChannelId id : ids) text += "/" + std::to_string(id);
+    for (TQChannelId id : ids) {
+        // Appended piece by piece: '"/" + to_string' trips a false -Wrestrict of GCC 12 at -O3.
+        text += '/';
+        text += std::to_string(id);
+    }
     return text;
 }
 

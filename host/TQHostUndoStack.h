@@ -94,7 +94,10 @@ public:
     // Forgets the history; an open step stays open.
     void clear();
 
-    // Steps kept beyond this many are forgotten, oldest first; 0 keeps every step.
+    // Steps kept beyond this many are forgotten, oldest first; 0 keeps every step. Each step
+    // holds two whole snapshots of each of its channels, so the default bounds the memory
+    // a long session takes.
+    static constexpr size_t kDefaultLevelsOfUndo = 250;
     void setLevelsOfUndo(size_t levels);
     size_t levelsOfUndo() const { return _levels; }
 
@@ -133,7 +136,7 @@ private:
     std::unique_ptr<Step> _pending;  // an addChannelStep waiting for its "after" state
     int _depth = 0;
     bool _applying = false;
-    size_t _levels = 0;
+    size_t _levels = kDefaultLevelsOfUndo;
     std::vector<std::unique_ptr<Step>> _undo;  // oldest first
     std::vector<std::unique_ptr<Step>> _redo;  // the next redo last
     std::unordered_map<const void*, TQHostUndoClient*> _clients;
