@@ -112,6 +112,18 @@ TEST_F(HostUndo, stepWithoutChange__leavesTheHistoryAsItWas) {
     EXPECT_FALSE(host.canRedo()) << "a kept step clears redo";
 }
 
+TEST_F(HostUndo, levelsOfUndo__forgetTheOldestSteps) {
+    host.undoStack().setLevelsOfUndo(2);
+    bracketedEdit("One", {x}, 1.0);
+    bracketedEdit("Two", {x}, 2.0);
+    bracketedEdit("Three", {x}, 3.0);
+    EXPECT_EQ(host.undoStack().undoCount(), 2u);
+    ASSERT_TRUE(host.undo());
+    ASSERT_TRUE(host.undo());
+    EXPECT_FALSE(host.canUndo()) << "the oldest step must be gone";
+    EXPECT_EQ(host.redoDescription(), "Two");
+}
+
 TEST_F(HostUndo, unannouncedChange__isCapturedAtItsNoteWillChange) {
     auto before = snapshot(opacity);
     host.startCaptureModifiedChannels("Nudge");
