@@ -76,19 +76,28 @@ long TQChannelData::lastAt(const CMTime& time) const {
 size_t TQChannelData::insert(const TQKeyframeRecord& record) {
     const size_t position = upperBound(record.time);
     keys.insert(keys.begin() + long(position), record);
-    orderChanged();
+    cacheValid = false;
+    // Keep the index in step for the keyframes that shifted: as cheap as the vector's own
+    // shift, and O(1) for the common append at the end.
+    if (indexValid) {
+        for (size_t i = position; i < keys.size(); ++i) index[keys[i].serial] = i;
+    }
     return position;
 }
 
 void TQChannelData::eraseAt(size_t position) {
     if (position >= keys.size()) return;
+    if (indexValid) index.erase(keys[position].serial);
     keys.erase(keys.begin() + long(position));
-    orderChanged();
+    cacheValid = false;
+    if (indexValid) {
+        for (size_t i = position; i < keys.size(); ++i) index[keys[i].serial] = i;
+    }
 }
 
 size_t TQChannelData::retime(size_t position, const CMTime& time) {
     TQKeyframeRecord record = keys[position];
-    keys.erase(keys.begin() + long(position));
+    eraseAt(position);
     record.time = time;
     record.seconds = CMTimeGetSeconds(time);
     return insert(record);

@@ -135,8 +135,11 @@ double expShape(double s) { return std::expm1(kShapeCurvature * s) / std::expm1(
 
 double logShape(double s) { return 1.0 - expShape(1.0 - s); }
 
-double solveBezierParameter(const CurveSegment& seg, double target, double guess) {
-    const double tr = target - seg.t0;
+namespace {
+
+// Bracketed Newton: the safe path. A step that leaves the bracket, or a flat derivative,
+// falls back to bisection, so it always converges on a monotone segment.
+double solveBracketed(const CurveSegment& seg, double tr, double guess) {
     double lo = 0.0;
     double hi = 1.0;
     double s = std::clamp(guess, 0.0, 1.0);
@@ -157,6 +160,32 @@ double solveBezierParameter(const CurveSegment& seg, double target, double guess
         if (std::fabs(step) <= kNewtonStepTolerance || hi - lo <= 1e-15) return s;
     }
     return s;
+}
+
+// Halley steps converge cubically: from the chord's parameter three of them reach machine
+// precision on all but sharply bent segments. A last step this small leaves an error of
+// about its cube.
+constexpr int kHalleySteps = 3;
+constexpr double kHalleyStepTolerance = 1e-5;
+
+}  // namespace
+
+double solveBezierParameter(const CurveSegment& seg, double target, double guess) {
+    const double tr = target - seg.t0;
+    // Fixed steps without data-dependent branches, so that the solves of neighbouring
+    // samples overlap in the processor; the bracketed solver takes what they leave unsettled.
+    double s = std::clamp(guess, 0.0, 1.0);
+    double step = 1.0;
+    for (int k = 0; k < kHalleySteps; ++k) {
+        const double f = bezierTime(seg, s) - tr;
+        const double d = bezierTimeSlope(seg, s);
+        const double d2 = 2.0 * seg.x[1] + 6.0 * seg.x[2] * s;
+        const double den = 2.0 * d * d - f * d2;
+        step = den > 0.0 ? 2.0 * f * d / den : 1.0;
+        s = std::clamp(s - step, 0.0, 1.0);
+    }
+    if (std::fabs(step) <= kHalleyStepTolerance) return s;
+    return solveBracketed(seg, tr, s);
 }
 
 void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
@@ -326,14 +355,123 @@ double CurveCache::evaluate(double seconds, CurveCursor& cursor, bool extrapolat
     return evaluateInside(seconds, cursor);
 }
 
+namespace {
+
+// Samples solved together from one warm start. Within a block no sample waits for another,
+// so their Newton steps overlap in the processor instead of forming one long chain.
+constexpr unsigned kBlock = 8;
+
+// Corrections of the block's warm starts, and the size the last of them must be under for
+// the block's answer to stand (the error left is a small multiple of it times O(h)).
+constexpr int kBlockSteps = 2;
+// How far in s the warm start's series is trusted; farther samples are solved cold.
+constexpr double kWarmReach = 0.05;
+constexpr double kBlockStepTolerance = 1e-10;
+
+}  // namespace
+
+unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
+                                     CMTimeValue stepValue, double scale, unsigned remaining,
+                                     double* values) const {
+    // First sample of the run: a cold solve from the chord's parameter.
+    double lastT = double(value) / scale;
+    double lastS = solveBezierParameter(seg, lastT, (lastT - seg.t0) * seg.invDt);
+    values[0] = polynomial(seg, lastS);
+    unsigned done = 1;
+    value += stepValue;
+
+    double secs[kBlock];
+    double params[kBlock];
+    bool unsettled[kBlock];
+    while (done < remaining) {
+        unsigned n = 0;
+        for (; n < kBlock && done + n < remaining; ++n) {
+            const double t = double(value + CMTimeValue(n) * stepValue) / scale;
+            if (!(t < seg.t1)) break;
+            secs[n] = t;
+        }
+        if (n == 0) break;
+        // Warm start: the inverse's Taylor series to second order around the last solved
+        // sample, s(t + h) = s + h / x' - x'' h^2 / (2 x'^3), which is accurate to O(h^3).
+        const double d1 = bezierTimeSlope(seg, lastS);
+        if (!(d1 > 1e-6 * (seg.t1 - seg.t0))) {
+            for (unsigned m = 0; m < n; ++m) {
+                params[m] = solveBezierParameter(seg, secs[m], (secs[m] - seg.t0) * seg.invDt);
+            }
+        } else {
+            const double r = 1.0 / d1;
+            const double curl = (2.0 * seg.x[1] + 6.0 * seg.x[2] * lastS) * 0.5 * r;
+            const double tr0 = seg.t0;
+            for (unsigned m = 0; m < n; ++m) {
+                const double ds = (secs[m] - lastT) * r;
+                if (!(std::fabs(ds) <= kWarmReach)) {  // too far for the series: start cold
+                    params[m] = (secs[m] - seg.t0) * seg.invDt;
+                    unsettled[m] = true;
+                    continue;
+                }
+                double sp = lastS + ds - curl * ds * ds;
+                // Newton with the slope taken once, at the warm start: it is within O(h^2)
+                // of the slope at the root, so each step gains far more than the step's
+                // size, at one division per sample.
+                const double rm = 1.0 / bezierTimeSlope(seg, std::clamp(sp, 0.0, 1.0));
+                double step = 0.0;
+                for (int k = 0; k < kBlockSteps; ++k) {
+                    step = (bezierTime(seg, sp) - (secs[m] - tr0)) * rm;
+                    sp = std::clamp(sp - step, 0.0, 1.0);
+                }
+                params[m] = sp;
+                unsettled[m] = !(std::fabs(step) <= kBlockStepTolerance);
+            }
+            // Where the curve bends hard within the block (or the samples lie far apart in
+            // the segment), the warm start was not close enough: solve those samples alone.
+            for (unsigned m = 0; m < n; ++m) {
+                if (unsettled[m]) params[m] = solveBezierParameter(seg, secs[m], params[m]);
+            }
+        }
+        for (unsigned m = 0; m < n; ++m) values[done + m] = polynomial(seg, params[m]);
+        lastS = params[n - 1];
+        lastT = secs[n - 1];
+        done += n;
+        value += CMTimeValue(n) * stepValue;
+        if (n < kBlock) break;
+    }
+    return done;
+}
+
 void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeScale timescale,
                         CMTimeEpoch epoch, unsigned count, CMTime* times, double* values) const {
-    CurveCursor cursor;
+    if (times) {
+        CMTimeValue v = startValue;
+        for (unsigned i = 0; i < count; ++i, v += stepValue) {
+            times[i] = CMTime{v, timescale, kCMTimeFlags_Valid, epoch};
+        }
+    }
+    if (!values) return;
     const double scale = double(timescale);
-    CMTimeValue v = startValue;
-    for (unsigned i = 0; i < count; ++i, v += stepValue) {
-        if (times) times[i] = CMTime{v, timescale, kCMTimeFlags_Valid, epoch};
-        if (values) values[i] = evaluate(double(v) / scale, cursor, true);
+    CurveCursor cursor;
+    unsigned i = 0;
+    while (i < count) {
+        const CMTimeValue v = startValue + CMTimeValue(i) * stepValue;
+        const double t = double(v) / scale;
+        if (_keyCount >= 2 && t >= _firstT && t < _lastT && !_segments.empty()) {
+            const size_t k = locate(t, cursor);
+            cursor.segment = k;
+            const CurveSegment& seg = _segments[k];
+            if (seg.kind == SegmentKind::Bezier) {
+                if (!(double(v + stepValue) / scale < seg.t1)) {
+                    // The only sample in this segment: a cold solve, nothing to warm.
+                    values[i] =
+                        polynomial(seg, solveBezierParameter(seg, t, (t - seg.t0) * seg.invDt));
+                    ++i;
+                    continue;
+                }
+                // Every sample of the run inside this segment at once.
+                i += sampleBezierRun(seg, v, stepValue, scale, count - i, values + i);
+                continue;
+            }
+        }
+        values[i] = evaluate(t, cursor, true);
+        ++i;
     }
 }
 

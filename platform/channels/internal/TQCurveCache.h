@@ -60,6 +60,10 @@ private:
     double evaluateInside(double seconds, CurveCursor& cursor) const;
     double evaluateOutside(double seconds, bool before, CurveCursor& cursor) const;
     size_t locate(double seconds, CurveCursor& cursor) const;
+    // Samples the run of evenly spaced times, from `value` on, that fall in one Bezier
+    // segment; answers how many it wrote (at least one).
+    unsigned sampleBezierRun(const CurveSegment& seg, CMTimeValue value, CMTimeValue stepValue,
+                             double scale, unsigned remaining, double* values) const;
 
     std::vector<CurveSegment> _segments;
     std::vector<double> _starts;  // t0 of each segment, for the binary search
