@@ -170,22 +170,55 @@ constexpr double kHalleyStepTolerance = 1e-5;
 
 }  // namespace
 
+namespace {
+
+// One Halley step for time(s) = tr; answers the step taken (1 when the step is undefined,
+// which marks the sample as unsettled).
+inline double halleyStep(const CurveSegment& seg, double tr, double& s) {
+    const double f = bezierTime(seg, s) - tr;
+    const double d = bezierTimeSlope(seg, s);
+    const double d2 = 2.0 * seg.x[1] + 6.0 * seg.x[2] * s;
+    const double den = 2.0 * d * d - f * d2;
+    const double step = den > 0.0 ? 2.0 * f * d / den : 1.0;
+    s = std::clamp(s - step, 0.0, 1.0);
+    return step;
+}
+
+}  // namespace
+
 double solveBezierParameter(const CurveSegment& seg, double target, double guess) {
     const double tr = target - seg.t0;
-    // Fixed steps without data-dependent branches, so that the solves of neighbouring
-    // samples overlap in the processor; the bracketed solver takes what they leave unsettled.
+    // Fixed steps without data-dependent branches; the bracketed solver takes what they
+    // leave unsettled.
     double s = std::clamp(guess, 0.0, 1.0);
     double step = 1.0;
-    for (int k = 0; k < kHalleySteps; ++k) {
-        const double f = bezierTime(seg, s) - tr;
-        const double d = bezierTimeSlope(seg, s);
-        const double d2 = 2.0 * seg.x[1] + 6.0 * seg.x[2] * s;
-        const double den = 2.0 * d * d - f * d2;
-        step = den > 0.0 ? 2.0 * f * d / den : 1.0;
-        s = std::clamp(s - step, 0.0, 1.0);
-    }
+    for (int k = 0; k < kHalleySteps; ++k) step = halleyStep(seg, tr, s);
     if (std::fabs(step) <= kHalleyStepTolerance) return s;
     return solveBracketed(seg, tr, s);
+}
+
+void CurveCache::solveColdBatch(const ColdSample* batch, unsigned n, double* values,
+                                double* solved) const {
+    // The same steps as solveBezierParameter, with the samples interleaved step by step: the
+    // samples lie in different segments and don't depend on each other, so the processor
+    // runs their chains side by side.
+    double s[kColdBatch];
+    double step[kColdBatch];
+    double tr[kColdBatch];
+    for (unsigned m = 0; m < n; ++m) {
+        tr[m] = batch[m].seconds - batch[m].segment->t0;
+        const double guess = batch[m].guess >= 0.0 ? batch[m].guess : tr[m] * batch[m].segment->invDt;
+        s[m] = std::clamp(guess, 0.0, 1.0);
+    }
+    for (int k = 0; k < kHalleySteps; ++k) {
+        for (unsigned m = 0; m < n; ++m) step[m] = halleyStep(*batch[m].segment, tr[m], s[m]);
+    }
+    for (unsigned m = 0; m < n; ++m) {
+        const CurveSegment& seg = *batch[m].segment;
+        if (!(std::fabs(step[m]) <= kHalleyStepTolerance)) s[m] = solveBracketed(seg, tr[m], s[m]);
+        values[batch[m].index] = polynomial(seg, s[m]);
+        if (solved) solved[m] = s[m];
+    }
 }
 
 void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
@@ -363,7 +396,9 @@ constexpr unsigned kBlock = 8;
 
 // Corrections of the block's warm starts, and the size the last of them must be under for
 // the block's answer to stand (the error left is a small multiple of it times O(h)).
-constexpr int kBlockSteps = 2;
+constexpr int kBlockSteps = 3;
+// Samples this close to the end of their segment are solved cold.
+constexpr CMTimeValue kShortRun = 3;
 // How far in s the warm start's series is trusted; farther samples are solved cold.
 constexpr double kWarmReach = 0.05;
 constexpr double kBlockStepTolerance = 1e-10;
@@ -395,8 +430,9 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
         // sample, s(t + h) = s + h / x' - x'' h^2 / (2 x'^3), which is accurate to O(h^3).
         const double d1 = bezierTimeSlope(seg, lastS);
         if (!(d1 > 1e-6 * (seg.t1 - seg.t0))) {
-            for (unsigned m = 0; m < n; ++m) {
-                params[m] = solveBezierParameter(seg, secs[m], (secs[m] - seg.t0) * seg.invDt);
+            for (unsigned m = 0; m < n; ++m) {  // no slope to extrapolate with: all cold
+                params[m] = -1.0;
+                unsettled[m] = true;
             }
         } else {
             const double r = 1.0 / d1;
@@ -405,7 +441,7 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
             for (unsigned m = 0; m < n; ++m) {
                 const double ds = (secs[m] - lastT) * r;
                 if (!(std::fabs(ds) <= kWarmReach)) {  // too far for the series: start cold
-                    params[m] = (secs[m] - seg.t0) * seg.invDt;
+                    params[m] = -1.0;
                     unsettled[m] = true;
                     continue;
                 }
@@ -422,13 +458,24 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
                 params[m] = sp;
                 unsettled[m] = !(std::fabs(step) <= kBlockStepTolerance);
             }
-            // Where the curve bends hard within the block (or the samples lie far apart in
-            // the segment), the warm start was not close enough: solve those samples alone.
-            for (unsigned m = 0; m < n; ++m) {
-                if (unsettled[m]) params[m] = solveBezierParameter(seg, secs[m], params[m]);
+        }
+        // Where the curve bends hard within the block, or the samples lie far apart in the
+        // segment, the warm start was not close enough: those samples are solved like cold
+        // ones, from where the block got to.
+        ColdSample rest[kBlock];
+        unsigned restCount = 0;
+        for (unsigned m = 0; m < n; ++m) {
+            if (unsettled[m]) {
+                rest[restCount++] = ColdSample{&seg, secs[m], done + m, params[m]};
+            } else {
+                values[done + m] = polynomial(seg, params[m]);
             }
         }
-        for (unsigned m = 0; m < n; ++m) values[done + m] = polynomial(seg, params[m]);
+        if (restCount > 0) {
+            double solved[kBlock];
+            solveColdBatch(rest, restCount, values, solved);
+            for (unsigned m = 0; m < restCount; ++m) params[rest[m].index - done] = solved[m];
+        }
         lastS = params[n - 1];
         lastT = secs[n - 1];
         done += n;
@@ -449,6 +496,8 @@ void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeSca
     if (!values) return;
     const double scale = double(timescale);
     CurveCursor cursor;
+    ColdSample cold[kColdBatch];
+    unsigned coldCount = 0;
     unsigned i = 0;
     while (i < count) {
         const CMTimeValue v = startValue + CMTimeValue(i) * stepValue;
@@ -458,10 +507,14 @@ void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeSca
             cursor.segment = k;
             const CurveSegment& seg = _segments[k];
             if (seg.kind == SegmentKind::Bezier) {
-                if (!(double(v + stepValue) / scale < seg.t1)) {
-                    // The only sample in this segment: a cold solve, nothing to warm.
-                    values[i] =
-                        polynomial(seg, solveBezierParameter(seg, t, (t - seg.t0) * seg.invDt));
+                if (!(double(v + kShortRun * stepValue) / scale < seg.t1)) {
+                    // One of the last few samples in this segment: too few to gain from a
+                    // warm start. Solved with the next few such samples, side by side.
+                    cold[coldCount++] = ColdSample{&seg, t, i, -1.0};
+                    if (coldCount == kColdBatch) {
+                        solveColdBatch(cold, coldCount, values);
+                        coldCount = 0;
+                    }
                     ++i;
                     continue;
                 }
@@ -473,6 +526,7 @@ void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeSca
         values[i] = evaluate(t, cursor, true);
         ++i;
     }
+    solveColdBatch(cold, coldCount, values);
 }
 
 }  // namespace tq_internal

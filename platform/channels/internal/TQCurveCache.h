@@ -38,6 +38,15 @@ struct CurveCursor {
     double lastT = 0.0;
 };
 
+// A sample waiting for a cold solve in its segment.
+struct ColdSample {
+    const CurveSegment* segment;
+    double seconds;
+    unsigned index;  // where its value goes
+    double guess;    // a parameter to start from, or negative for the chord's
+};
+inline constexpr unsigned kColdBatch = 8;
+
 class CurveCache {
 public:
     // Rebuilds from keyframes in table order. Disabled keyframes are left out; of keyframes
@@ -62,6 +71,10 @@ private:
     size_t locate(double seconds, CurveCursor& cursor) const;
     // Samples the run of evenly spaced times, from `value` on, that fall in one Bezier
     // segment; answers how many it wrote (at least one).
+    // Solves the samples side by side and writes their values; `solved`, if given, receives
+    // their parameters in batch order.
+    void solveColdBatch(const ColdSample* batch, unsigned n, double* values,
+                        double* solved = nullptr) const;
     unsigned sampleBezierRun(const CurveSegment& seg, CMTimeValue value, CMTimeValue stepValue,
                              double scale, unsigned remaining, double* values) const;
 

@@ -1,5 +1,8 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <vector>
+
 #include "platform/channels/internal/TQCurveCache.h"
 #include "platform/channels/tests/CurveCatalogue.h"
 
@@ -68,6 +71,52 @@ TEST_F(CurveInterpolation, bezier__honours_handle_directions) {
     EXPECT_GT(peak, 10.0) << "level-raising handles must lift the curve above the keyframe";
     // Slope leaving the first keyframe is the handle's direction, 12 / 0.5.
     EXPECT_NEAR((at(*c, kProbe) - at(*c, 0.0)) / kProbe, 24.0, 24.0 * kSlopeTolerance);
+}
+
+// Reference value of a Bezier segment by bisection on its control points, with the handle
+// reach clamped to the segment as the channel does.
+double referenceBezier(const TQChannel& c, TQKeyframeHandle a, TQKeyframeHandle b, double t) {
+    CMTime ta, tb;
+    double va = 0, vb = 0, ou = 0, ov = 0, iu = 0, iv = 0;
+    c.getKeyframe(a, &ta, &va);
+    c.getKeyframe(b, &tb, &vb);
+    c.getKeyframeOutputTangents(a, &ou, &ov);
+    c.getKeyframeInputTangents(b, &iu, &iv);
+    const double t0 = CMTimeGetSeconds(ta), t3 = CMTimeGetSeconds(tb), dt = t3 - t0;
+    auto clampReach = [&](double reach, double rise, double& r, double& v) {
+        r = std::clamp(reach, 0.0, dt);
+        v = reach > dt ? rise * dt / reach : rise;
+    };
+    double ro, vo, ri, vi;
+    clampReach(ou, ov, ro, vo);
+    clampReach(-iu, iv, ri, vi);
+    const double x[4] = {t0, t0 + ro, t3 - ri, t3}, y[4] = {va, va + vo, vb + vi, vb};
+    auto bez = [](const double* p, double s) {
+        const double u = 1 - s;
+        return u * u * u * p[0] + 3 * u * u * s * p[1] + 3 * u * s * s * p[2] + s * s * s * p[3];
+    };
+    double lo = 0, hi = 1;
+    for (int i = 0; i < 200; ++i) (bez(x, 0.5 * (lo + hi)) < t ? lo : hi) = 0.5 * (lo + hi);
+    return bez(y, 0.5 * (lo + hi));
+}
+
+TEST_F(CurveInterpolation, bezier__matches_an_independent_bisection_on_its_control_points) {
+    auto c = dense(60);
+    const std::vector<TQKeyframeHandle> keys = c->getKeyframes(true);
+    for (size_t k = 0; k + 1 < keys.size(); ++k) {
+        CMTime ta, tb;
+        c->getKeyframe(keys[k], &ta, nullptr);
+        c->getKeyframe(keys[k + 1], &tb, nullptr);
+        // Off the segment's middle: handles reaching across the whole segment make time stand
+        // still there (a vertical tangent), where no solver can pin the value in doubles.
+        for (double f = 0.03; f < 1.0; f += 0.0625) {
+            const CMTime time = CMTimeMakeWithSeconds(
+                CMTimeGetSeconds(ta) + f * (CMTimeGetSeconds(tb) - CMTimeGetSeconds(ta)), 1000000000);
+            const double t = CMTimeGetSeconds(time);
+            EXPECT_NEAR(c->getCurveValue(time), referenceBezier(*c, keys[k], keys[k + 1], t), 1e-7)
+                << "segment " << k << " at fraction " << f;
+        }
+    }
 }
 
 TEST_F(CurveInterpolation, bezier__broken_handles_make_a_cusp) {

@@ -44,6 +44,22 @@ TEST_F(SamplingCurve, keyframed_samples__match_point_queries_on_every_catalogue_
     }
 }
 
+TEST_F(SamplingCurve, every_density__from_many_segments_per_sample_to_many_samples_per_segment) {
+    auto c = dense(400);  // segments of 0.1 s to 0.6 s
+    CMTime first, last;
+    c->getFirstKeyframe(&first, nullptr);
+    c->getLastKeyframe(&last, nullptr);
+    const double span = CMTimeGetSeconds(last) - CMTimeGetSeconds(first);
+    for (unsigned n : {100u, 1000u, 5000u, 60000u}) {
+        Samples s = sample(*c, first, TQTarnTimeForChannelSeconds(span / n, 1000000000), n);
+        ASSERT_EQ(s.count, n);
+        for (unsigned i = 0; i < s.count; ++i) {
+            ASSERT_NEAR(s.values[i], c->getCurveValue(s.times[i]), kValueTolerance)
+                << n << " samples, sample " << i;
+        }
+    }
+}
+
 TEST_F(SamplingCurve, dense_backwards_cursor__ping_pong_walks_back_through_segments) {
     auto c = dense(2000);
     c->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter);
