@@ -1,0 +1,260 @@
+#pragma once
+// The view on which curves are shown and edited: one rectangle of world coordinates, the view
+// volume, is mapped onto the drawable, and zoom, pan, auto-zoom and framing change that
+// rectangle. World x is time in seconds on the editor's axis; world y is the view's own
+// vertical space, into which each channel is normalised by its item's scale and offset
+// (computeVerticalTickMarks).
+//
+// Horizontal position and zoom belong to the display range that the controller decides: the
+// view asks the controller for a range, reads back what was applied, and copies it into the
+// view volume. Vertical position and zoom belong to the view.
+//
+// Toolkit-neutral: the view's size, backing scale, redraw requests and cursor come from an
+// RWViewHost; delayed calls and the clock from the RWServices of platform/ui (injectable).
+// Screen coordinates are drawable pixels, origin at the bottom left, y up.
+//
+// Lifetime: the controller, the view host, the clock and the timer are not owned; each must
+// outlive the view or be detached (set to null) first. The view owns its three selection
+// lists and its render controller.
+
+#include <cstdint>
+#include <memory>
+
+#include "platform/draw/HXDRenderController.h"
+#include "platform/geometry/CGGeometry.h"
+#include "platform/media/CMTime.h"
+#include "platform/ui/RWEvent.h"
+#include "platform/ui/RWServices.h"
+#include "src/contract/TQNotificationWords.h"
+#include "src/data/TQCurveSelection.h"
+
+class TQCurveEditorCtrlBase;
+class TQCurveEditorItem;
+class TQCurveEditorChannelItem;
+
+class TQCurveEditorViewBase {
+public:
+    // Zero volumes; a subclass's constructor sets them.
+    TQCurveEditorViewBase();
+    virtual ~TQCurveEditorViewBase();
+    TQCurveEditorViewBase(const TQCurveEditorViewBase&) = delete;
+    TQCurveEditorViewBase& operator=(const TQCurveEditorViewBase&) = delete;
+
+    // ---- Wiring ----
+
+    TQCurveEditorCtrlBase* getController() const { return _controller; }
+    void setController(TQCurveEditorCtrlBase* controller) { _controller = controller; }
+    RWViewHost* viewHost() const { return _viewHost; }
+    // Also takes the host's backing (viewDidChangeBackingProperties).
+    void setViewHost(RWViewHost* host);
+    // Null restores the process-wide service.
+    void setClock(RWClock* clock) { _clock = clock; }
+    void setTimer(RWTimerService* timer) { _timer = timer; }
+    RWClock& clock() const;
+    RWTimerService& timer() const;
+
+    // ---- Size and backing ----
+
+    // Bounds of the view in points (zero without a host).
+    CGRect bounds() const;
+    // Width of the view in points: the sample count of new items follows it.
+    double width() const { return bounds().size.width; }
+    // The host resized the view: the backing follows, the view volume stays (resizing shows
+    // the same world rectangle).
+    virtual void setFrameSize(const CGSize& size);
+    // Takes the drawable size (bounds in backing pixels) and scale from the host, if the view
+    // is in a window.
+    virtual void viewDidChangeBackingProperties();
+    CGSize drawableSize() const { return _drawableSize; }
+    double contentsScale() const { return _contentsScale; }
+
+    // ---- Projection of the last frame ----
+
+    // Installs the orthographic projection of _currentViewVolume on the render controller,
+    // with the pixel scale (volume extent over bounds extent). Done at every frame.
+    virtual void drawProjection();
+    HXDRenderController* renderController() const { return _renderController.get(); }
+
+    // ---- Mapping (through the projection of the last frame; NaN before the first) ----
+
+    CGPoint getPointWorld(const CGPoint& screen) const;
+    CGPoint getPointScreen(const CGPoint& world) const;
+    CGPoint getSizeWorld(const CGPoint& size) const;
+    CGPoint getSizeScreen(const CGPoint& size) const;
+    // The world point moved onto the nearest whole drawable pixel.
+    CGPoint adjustWorldPointToScreen(const CGPoint& world) const;
+    CGPoint getOffsetFromLastWorld(double dx, double deltaY) const;
+    CGPoint getOffsetFromOriginWorld(double dx, double deltaY) const;
+    CGPoint getMouseOrigin() const { return _mouseOrigin; }
+
+    // ---- View volume and zoom ----
+
+    // Drag zoom about _mouseOrigin by a pointer movement in pixels.
+    virtual void zoom(double dx, double y);
+    // Absolute zoom about the centre; a factor of exactly 1 leaves that axis alone.
+    virtual void zoomWithFactor(double fx, double y);
+    // From the vertical scroller: p = 0 is the top of the controller's maximum view volume.
+    virtual void setVerticalZoom(double zoom, double offsetPercentage);
+    // Pan by a pointer movement in pixels; never to the left of time zero.
+    virtual void pan(double dx, double y);
+    // Page pan from a scroller, in fractions of the view.
+    virtual void panWithPage(double px, double y);
+    // Fit every curve vertically, and in time as well with includeTime.
+    virtual void frameAll(char includeTime);
+    // Fit vertically to the curves if due (_needsAutoZoom) or forced.
+    virtual void performAutoZoom(bool force);
+    virtual double getZoomPadding() const { return 0.05; }
+    virtual void resetZoom();
+    virtual void resetPan();
+    virtual void resetZoomX();
+    virtual void resetZoomY();
+    virtual void resetPanX();
+    virtual void resetPanY();
+    // Pans by the wheel, folding in every wheel event already queued.
+    virtual void scrollWheel(const RWEvent& event);
+    // Auto-zoom and auto-pan exclude each other when set through this.
+    void setAutoZoom(char autoZoom) {
+        _autoZoom = autoZoom;
+        _autoPan = autoZoom ? 0 : 1;
+    }
+    void setAutoPan(char autoPan) { _autoPan = autoPan; }
+    void setNeedsAutoZoom(char needs) { _needsAutoZoom = needs; }
+    char needsAutoZoom() const { return _needsAutoZoom; }
+
+    // ---- Plain accessors ----
+
+    const CGRect& getCurrentViewVolume() const { return _currentViewVolume; }
+    const CGRect& getOriginalViewVolume() const { return _originalViewVolume; }
+    const CGRect& getSelectionViewVolume() const { return _selectionViewVolume; }
+    // Used by subclasses at creation and by the timeline as the initial time changes; no
+    // notification is sent.
+    void setCurrentViewVolume(const CGRect& volume) { _currentViewVolume = volume; }
+    void setOriginalViewVolume(const CGRect& volume) { _originalViewVolume = volume; }
+    double zoomX() const { return _zoomFactorX; }
+    double zoomY() const { return _zoomFactorY; }
+    double maxZoomY() const { return _maxZoomY; }
+    double gridZoomX() const { return _gridZoomX; }
+    double gridZoomY() const { return _gridZoomY; }
+    double gridSpacingX() const { return _gridSpacingX; }
+    double gridSpacingY() const { return _gridSpacingY; }
+    void setGridSpacingX(double spacing) { _gridSpacingX = spacing; }
+    void setGridSpacingY(double spacing) { _gridSpacingY = spacing; }
+    double gridScaleY() const { return _gridScaleY; }
+    double gridOffsetY() const { return _gridOffsetY; }
+    double minDeltaU() const { return _minDeltaU; }
+    char printScale() const { return _printScale; }
+    char autoZoom() const { return _autoZoom; }
+    char autoPan() const { return _autoPan; }
+    char canPanHorizontally() const { return _canPanHorizontally; }
+    char canPanVertically() const { return _canPanVertically; }
+    void setCanPanHorizontally(char can) { _canPanHorizontally = can; }
+    void setCanPanVertically(char can) { _canPanVertically = can; }
+    char hasFixedScale() const { return _hasFixedScale; }
+    void setHasFixedScale(char fixed) { _hasFixedScale = fixed; }
+    CMTimeRange getTotalRange() const { return _totalRange; }
+    CMTimeRange getDisplayRange() const { return _displayRange; }
+    // Null pointers leave that part as it is.
+    virtual void setDisplayRange(const CMTime* start, const CMTime* duration);
+    void setTotalRange(const CMTime* start, const CMTime* duration);
+    // The host's playhead through the controller's delegate; zero without one.
+    CMTime currentTime() const;
+    CMTime getCurveEditorCurrentTime() const { return currentTime(); }
+    void setCurrentTime(const CMTime& time);
+
+    // ---- Selection (the controller reads and repairs these) ----
+
+    // _selection, after its stored keypoint times and values were refreshed from the
+    // channels (prepareSelectedHandles). Never null.
+    TQCurveSelectionList* getSelection();
+    TQCurveSelectionList* getCurrentSelection() const { return _currentSelection.get(); }
+    TQCurveSelectionList* getPreviousSelection() const { return _previousSelection.get(); }
+    // Stores each keypoint entry's live time and value (entries without a channel are left).
+    void prepareSelectedHandles();
+
+    // ---- Redraw and dirty marks ----
+
+    // Asks the host for a redraw when the flag is set.
+    virtual void setNeedsDisplay(char needs);
+    void setOriginalCurveDirty(TQCurveEditorItem* item, char enable);
+    void setProcessedCurveDirty(TQCurveEditorItem* item, char enable);
+    // Every item with a channel that the host reports as modified.
+    void setVisibleOriginalCurveDirty(char dirty);
+    void setAllOriginalCurveDirty(char dirty);
+    // Marks every item for a new vertical mapping at the next tick pass.
+    void setAllOriginalCurveScaleDirty(char dirty);
+
+    // ---- Vertical mapping ----
+
+    // Per-item scaleY and offsetY of the items marked updateScale.
+    virtual void computeVerticalTickMarks();
+    virtual uint32_t numberOfTickMarks() const { return 10; }
+
+    // ---- Tools ----
+
+    // Forgets the box, redraws, posts kTQNotifyToolChangedWord.
+    virtual void currentToolChanged();
+    // Forgets the box: its corners, the flag, the rubber band.
+    virtual void resetBoxDeformation();
+    char fourCornerBoxInitialized() const { return _fourCornerBoxInitialized; }
+
+protected:
+    // Posts through the controller's delegate; nothing without one.
+    void postNotification(TQNotificationWord word) const;
+    // After a change of the view volume that moves or zooms it.
+    void volumeChanged(bool markCurvesDirty);
+    // The display range's start and duration, in seconds, into x and width.
+    void takeHorizontalFromDisplayRange();
+
+    // ---- Fields of the view volume, in declaration order ----
+    TQCurveEditorCtrlBase* _controller = nullptr;  // not owned
+    CGRect _currentViewVolume = CGRectZero;
+    CGRect _originalViewVolume = CGRectZero;
+    CGRect _selectionViewVolume = CGRectZero;
+    double _maxZoomX = 32.0;  // set and never read: the horizontal zoom has no limit here
+    double _maxZoomY = 128.0;
+    double _zoomFactorX = 1.0;
+    double _zoomFactorY = 1.0;
+    double _gridZoomX = 1.0;
+    double _gridZoomY = 1.0;
+    double _gridSpacingX = 0.0;
+    double _gridSpacingY = 0.0;
+    double _gridScaleY = 0.0;
+    double _gridOffsetY = 0.0;
+    double _minDeltaU = 1.0;
+    char _printScale = 0;
+    char _canPanVertically = 1;
+    char _canPanHorizontally = 1;
+    char _autoZoom = 1;
+    char _autoPan = 1;
+    char _hasFixedScale = 0;
+    char _needsAutoZoom = 0;
+    CMTimeRange _displayRange = kCMTimeRangeZero;
+    CMTimeRange _totalRange = kCMTimeRangeZero;
+    CMTime _currentTime = kCMTimeZero;  // kept, not read: currentTime asks the host
+    CMTime _lastTime = kCMTimeInvalid;
+
+    // ---- Gesture state (the mouse code sets it) ----
+    CGPoint _mouseOrigin;   // where the gesture began, drawable pixels
+    CGPoint _lastMousePos;  // running pointer position of the gesture, drawable pixels
+    char _selecting = 0;
+
+    // ---- Selection lists, owned, never null ----
+    std::shared_ptr<TQCurveSelectionList> _selection;
+    std::shared_ptr<TQCurveSelectionList> _currentSelection;
+    std::shared_ptr<TQCurveSelectionList> _previousSelection;
+
+    // ---- Box of the box tool ----
+    CGPoint _fourCornersTopLeft;
+    CGPoint _fourCornersTopRight;
+    CGPoint _fourCornersBottomLeft;
+    CGPoint _fourCornersBottomRight;
+    char _fourCornerBoxInitialized = 0;
+
+    // ---- Backing and frame ----
+    RWViewHost* _viewHost = nullptr;  // not owned
+    RWClock* _clock = nullptr;         // not owned; null: the process-wide clock
+    RWTimerService* _timer = nullptr;  // not owned; null: the process-wide timer
+    CGSize _drawableSize = CGSizeZero;
+    double _contentsScale = 1.0;
+    std::unique_ptr<HXDRenderController> _renderController;
+};
