@@ -316,8 +316,8 @@ void TQChannel::getSamples(const TQSampleContext* context, const CMTime& start,
     for (const auto& behavior : _d->behaviors) {
         if (context->enabledBehaviorsOnly && !behavior->isEnabled()) continue;
         if (context->selectedBehaviorsOnly && !behavior->isSelected()) continue;
-        CMTimeValue v = startValue;
-        for (unsigned i = 0; i < n; ++i, v += stepValue) {
+        for (unsigned i = 0; i < n; ++i) {
+            const CMTimeValue v = startValue + CMTimeValue(i) * stepValue;
             outValues[i] = behavior->apply(double(v) / double(timescale), outValues[i]);
         }
     }

@@ -413,7 +413,6 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
     double lastS = solveBezierParameter(seg, lastT, (lastT - seg.t0) * seg.invDt);
     values[0] = polynomial(seg, lastS);
     unsigned done = 1;
-    value += stepValue;
 
     double secs[kBlock];
     double params[kBlock];
@@ -421,7 +420,8 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
     while (done < remaining) {
         unsigned n = 0;
         for (; n < kBlock && done + n < remaining; ++n) {
-            const double t = double(value + CMTimeValue(n) * stepValue) / scale;
+            // Sample done + n exists (it is below `remaining`), so its time value fits.
+            const double t = double(value + CMTimeValue(done + n) * stepValue) / scale;
             if (!(t < seg.t1)) break;
             secs[n] = t;
         }
@@ -479,7 +479,6 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
         lastS = params[n - 1];
         lastT = secs[n - 1];
         done += n;
-        value += CMTimeValue(n) * stepValue;
         if (n < kBlock) break;
     }
     return done;
@@ -488,9 +487,9 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
 void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeScale timescale,
                         CMTimeEpoch epoch, unsigned count, CMTime* times, double* values) const {
     if (times) {
-        CMTimeValue v = startValue;
-        for (unsigned i = 0; i < count; ++i, v += stepValue) {
-            times[i] = CMTime{v, timescale, kCMTimeFlags_Valid, epoch};
+        for (unsigned i = 0; i < count; ++i) {
+            times[i] = CMTime{startValue + CMTimeValue(i) * stepValue, timescale,
+                              kCMTimeFlags_Valid, epoch};
         }
     }
     if (!values) return;
@@ -507,7 +506,7 @@ void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeSca
             cursor.segment = k;
             const CurveSegment& seg = _segments[k];
             if (seg.kind == SegmentKind::Bezier) {
-                if (!(double(v + kShortRun * stepValue) / scale < seg.t1)) {
+                if (!(t + double(kShortRun * stepValue) / scale < seg.t1)) {
                     // One of the last few samples in this segment: too few to gain from a
                     // warm start. Solved with the next few such samples, side by side.
                     cold[coldCount++] = ColdSample{&seg, t, i, -1.0};
