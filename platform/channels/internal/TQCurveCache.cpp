@@ -13,10 +13,6 @@ namespace {
 // Curvature of the Exp and Log shapes: the Exp segment reaches half its rise at s = 0.83.
 constexpr double kShapeCurvature = 4.0;
 
-// Steps tried from the cursor's segment before a binary search: samples usually land in the
-// same or the next segment.
-constexpr int kCursorWalk = 4;
-
 // Newton stops when its step in s is this small: convergence is quadratic near a simple
 // root, so the error left is far below it.
 constexpr double kNewtonStepTolerance = 1e-12;
@@ -304,23 +300,32 @@ void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
 }
 
 size_t CurveCache::locate(double seconds, CurveCursor& cursor) const {
-    const size_t n = _segments.size();
-    size_t i = cursor.segment < n ? cursor.segment : 0;
-    const CurveSegment* seg = &_segments[i];
-    if (seconds >= seg->t0 && seconds < seg->t1) return i;
-    if (seconds >= seg->t1) {
-        for (int step = 0; step < kCursorWalk && i + 1 < n; ++step) {
-            seg = &_segments[++i];
-            if (seconds < seg->t1) return i;
+    // Galloping search from the cursor's segment: O(log d) for a sample d segments away, so a
+    // sorted walk costs what the segments crossed cost, and stays within nearby memory.
+    const size_t n = _starts.size();
+    const size_t i = cursor.segment < n ? cursor.segment : 0;
+    const double* starts = _starts.data();
+    if (seconds >= starts[i]) {
+        if (i + 1 == n || seconds < starts[i + 1]) return i;
+        if (i + 2 == n || seconds < starts[i + 2]) return i + 1;  // the usual next segment
+        size_t lo = i + 2;
+        size_t step = 1;
+        while (lo + step < n && starts[lo + step] <= seconds) {
+            lo += step;
+            step *= 2;
         }
-    } else {
-        for (int step = 0; step < kCursorWalk && i > 0; ++step) {
-            seg = &_segments[--i];
-            if (seconds >= seg->t0) return i;
-        }
+        const size_t hi = std::min(lo + step, n);
+        return size_t(std::upper_bound(starts + lo, starts + hi, seconds) - starts) - 1;
     }
-    const auto it = std::upper_bound(_starts.begin(), _starts.end(), seconds);
-    return it == _starts.begin() ? 0 : size_t(it - _starts.begin()) - 1;
+    size_t hi = i;  // the answer lies below hi
+    size_t step = 1;
+    while (hi >= step && starts[hi - step] > seconds) {
+        hi -= step;
+        step *= 2;
+    }
+    const size_t lo = hi >= step ? hi - step : 0;
+    const size_t k = size_t(std::upper_bound(starts + lo, starts + hi, seconds) - starts);
+    return k == 0 ? 0 : k - 1;
 }
 
 double CurveCache::evaluateInside(double seconds, CurveCursor& cursor) const {
@@ -394,13 +399,13 @@ namespace {
 // so their Newton steps overlap in the processor instead of forming one long chain.
 constexpr unsigned kBlock = 8;
 
-// Corrections of the block's warm starts, and the size the last of them must be under for
-// the block's answer to stand (the error left is a small multiple of it times O(h)).
-constexpr int kBlockSteps = 3;
 // Samples this close to the end of their segment are solved cold.
 constexpr CMTimeValue kShortRun = 3;
 // How far in s the warm start's series is trusted; farther samples are solved cold.
 constexpr double kWarmReach = 0.05;
+// Corrections of each warm start, and the size the last must be under for the block's answer
+// to stand: the error left is that step times about |x''/x'| times the warm start's error.
+constexpr int kBlockSteps = 3;
 constexpr double kBlockStepTolerance = 1e-10;
 
 }  // namespace
