@@ -1,0 +1,107 @@
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "platform/ui/RWMenu.h"
+
+namespace {
+
+// Records the actions it receives; enables only the actions it is told to.
+class RecordingTarget : public RWActionTarget {
+public:
+    bool performAction(const std::string& action, RWMenuItem& sender) override {
+        performed.push_back(action);
+        if (removeSenderOnAction && sender.menu()) sender.menu()->removeItem(sender);
+        return action != "unknown:";
+    }
+    bool validateMenuItem(RWMenuItem& item) override {
+        item.setState(item.action() == enabledAction ? RWOnState : RWOffState);
+        return item.action() == enabledAction;
+    }
+    std::vector<std::string> performed;
+    std::string enabledAction;
+    bool removeSenderOnAction = false;
+};
+
+class RWMenuTest : public ::testing::Test {};
+
+TEST_F(RWMenuTest, addItem__movesAnItemOutOfItsOldMenuAndKeepsBackReferences) {
+    RWMenu first("first");
+    RWMenu second("second");
+    RWMenuItemPtr item = first.addItemWithTitle("Delete", "menuDelete:");
+    ASSERT_EQ(item->menu(), &first);
+
+    second.addItem(item);
+    EXPECT_EQ(first.numberOfItems(), 0) << "an item lives in one menu only";
+    EXPECT_EQ(second.indexOfItem(*item), 0);
+    EXPECT_EQ(item->menu(), &second);
+}
+
+TEST_F(RWMenuTest, submenu__knowsItsSupermenuUntilDetached) {
+    RWMenu top("top");
+    auto sub = std::make_shared<RWMenu>("sub");
+    RWMenuItemPtr holder = top.addItemWithTitle("Interpolation", "");
+    top.setSubmenuForItem(sub, *holder);
+    EXPECT_EQ(sub->supermenu(), &top);
+    EXPECT_TRUE(holder->hasSubmenu());
+
+    top.removeItemAtIndex(0);
+    EXPECT_EQ(sub->supermenu(), nullptr) << "a removed item's submenu must not point at the old menu";
+    EXPECT_EQ(holder->menu(), nullptr);
+}
+
+TEST_F(RWMenuTest, lookups__outOfRangeAndMissingAnswerNullOrMinusOne) {
+    RWMenu menu;
+    menu.addItemWithTitle("A", "a:")->setTag(7);
+    menu.insertItemAtIndex(std::make_shared<RWMenuItem>("B", "b:"), 99);  // appended
+    EXPECT_EQ(menu.itemAtIndex(1)->title(), "B");
+    EXPECT_EQ(menu.itemAtIndex(-1), nullptr);
+    EXPECT_EQ(menu.itemAtIndex(2), nullptr);
+    EXPECT_EQ(menu.itemWithTag(7)->title(), "A");
+    EXPECT_EQ(menu.itemWithTag(8), nullptr);
+    EXPECT_EQ(menu.indexOfItemWithTitle("C"), -1);
+    menu.removeItemAtIndex(5);  // no-op
+    EXPECT_EQ(menu.numberOfItems(), 2);
+}
+
+TEST_F(RWMenuTest, update__enablesThroughTheTargetAndRecursesIntoSubmenus) {
+    RecordingTarget target;
+    target.enabledAction = "menuReverse:";
+    RWMenu menu;
+    RWMenuItemPtr reverse = menu.addItemWithTitle("Reverse", "menuReverse:");
+    RWMenuItemPtr lock = menu.addItemWithTitle("Lock", "menuLock:");
+    RWMenuItemPtr orphan = menu.addItemWithTitle("No target", "menuLock:");
+    reverse->setTarget(&target);
+    lock->setTarget(&target);
+    auto sub = std::make_shared<RWMenu>();
+    RWMenuItemPtr inner = sub->addItemWithTitle("Inner", "menuReverse:");
+    inner->setTarget(&target);
+    inner->setEnabled(false);
+    menu.addItemWithTitle("Sub", "")->setSubmenu(sub);
+
+    menu.update();
+    EXPECT_TRUE(reverse->isEnabled());
+    EXPECT_EQ(reverse->state(), RWOnState) << "validation may set the state";
+    EXPECT_FALSE(lock->isEnabled());
+    EXPECT_FALSE(orphan->isEnabled()) << "an action without a target cannot run";
+    EXPECT_TRUE(inner->isEnabled()) << "submenus are validated too";
+}
+
+TEST_F(RWMenuTest, performActionForItemAtIndex__skipsDisabledAndSurvivesSelfRemoval) {
+    RecordingTarget target;
+    target.removeSenderOnAction = true;
+    RWMenu menu;
+    RWMenuItemPtr off = menu.addItemWithTitle("Off", "off:");
+    off->setTarget(&target);
+    off->setEnabled(false);
+    menu.addItemWithTitle("On", "on:")->setTarget(&target);
+
+    EXPECT_FALSE(menu.performActionForItemAtIndex(0));
+    EXPECT_TRUE(menu.performActionForItemAtIndex(1));
+    EXPECT_EQ(target.performed, std::vector<std::string>{"on:"});
+    EXPECT_EQ(menu.numberOfItems(), 1) << "the action removed its own item";
+    EXPECT_FALSE(menu.performActionForItemAtIndex(3));
+}
+
+}  // namespace

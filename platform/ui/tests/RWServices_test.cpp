@@ -1,0 +1,121 @@
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "platform/ui/RWServices.h"
+#include "platform/ui/testing/RWTestDoubles.h"
+
+namespace {
+
+class RWUserDefaultsTest : public ::testing::Test {
+protected:
+    RWMemoryUserDefaults defaults;
+};
+
+TEST_F(RWUserDefaultsTest, readers__convertBetweenNumbersBooleansAndTexts) {
+    defaults.setObject(std::string("YES"), "text-yes");
+    defaults.setObject(std::string("2.5"), "text-number");
+    defaults.setObject(std::string("abc"), "text-word");
+    defaults.setDouble(3.75, "double");
+    defaults.setBool(true, "bool");
+
+    EXPECT_TRUE(defaults.boolForKey("text-yes"));
+    EXPECT_DOUBLE_EQ(defaults.doubleForKey("text-number"), 2.5);
+    EXPECT_EQ(defaults.integerForKey("double"), 3) << "doubles truncate to integers";
+    EXPECT_EQ(defaults.integerForKey("bool"), 1);
+    EXPECT_FALSE(defaults.boolForKey("text-word")) << "a text that is no number reads as false";
+    EXPECT_EQ(defaults.stringForKey("double"), "") << "numbers are not formatted as texts";
+    EXPECT_FALSE(defaults.boolForKey("missing"));
+}
+
+TEST_F(RWUserDefaultsTest, registeredDefaults__standBelowStoredValuesAndComeBackOnRemoval) {
+    defaults.registerDefaults({{"TQPreferenceManager::flag", RWDefaultsValue{true}}});
+    EXPECT_TRUE(defaults.boolForKey("TQPreferenceManager::flag"));
+    defaults.setBool(false, "TQPreferenceManager::flag");
+    EXPECT_FALSE(defaults.boolForKey("TQPreferenceManager::flag"));
+    defaults.removeObjectForKey("TQPreferenceManager::flag");
+    EXPECT_TRUE(defaults.boolForKey("TQPreferenceManager::flag"));
+}
+
+TEST(RWPasteboardTest, clearContents__dropsEveryTypeAndCountsChanges) {
+    RWMemoryPasteboard board;
+    const int64_t before = board.changeCount();
+    board.setString("a", "public.text");
+    board.setString("b", "TQCurveEditorPrivateDrag");
+    board.setString("c", "public.text");  // replaces, keeps the order of first writing
+    EXPECT_EQ(board.types(), (std::vector<std::string>{"public.text", "TQCurveEditorPrivateDrag"}));
+    EXPECT_EQ(board.stringForType("public.text"), "c");
+    EXPECT_EQ(board.availableTypeFromArray({"x", "TQCurveEditorPrivateDrag"}), "TQCurveEditorPrivateDrag");
+
+    EXPECT_EQ(board.clearContents(), before + 1);
+    EXPECT_TRUE(board.types().empty());
+    EXPECT_FALSE(board.dataForType("public.text").has_value());
+}
+
+TEST(RWTimerTest, manualTimer__runsBlocksInDueOrderOnlyWhenTheClockPassesThem) {
+    RWManualClock clock;
+    RWManualTimer timer(clock);
+    std::vector<int> ran;
+    timer.dispatchAfter(33333333, [&] { ran.push_back(2); });
+    timer.dispatchAfter(10000000, [&] { ran.push_back(1); });
+    timer.dispatchAfter(33333333, [&] {
+        ran.push_back(3);
+        // Added while running; due at once, so it runs in the same drain.
+        timer.dispatchAfter(0, [&] { ran.push_back(4); });
+    });
+
+    EXPECT_EQ(timer.advance(0.005), 0u) << "nothing is due after 5 ms";
+    EXPECT_EQ(timer.advance(0.030), 4u);
+    EXPECT_EQ(ran, (std::vector<int>{1, 2, 3, 4})) << "equal due times run in dispatch order";
+    EXPECT_EQ(timer.pendingCount(), 0u);
+    EXPECT_EQ(timer.requests().front(), 33333333u);
+}
+
+TEST(RWModalTest, scriptedModal__answersWhatTheScriptEndsWithAndNests) {
+    RWScriptedModal modal;
+    RWWindow outer;
+    outer.setTitle("outer");
+    RWWindow inner;
+    inner.setTitle("inner");
+    modal.pushScript([&](RWWindow&, RWModalService& m) {
+        EXPECT_EQ(m.runModalForWindow(inner), RWModalResponseAbort) << "the inner run has no script left";
+        m.stopModalWithCode(RWModalResponseOK);
+        m.abortModal();  // too late: the first end wins
+    });
+
+    EXPECT_EQ(modal.runModalForWindow(outer), RWModalResponseOK);
+    EXPECT_EQ(modal.runs(), (std::vector<std::string>{"outer", "inner"}));
+}
+
+TEST(RWServicesTest, install__replacesOnlyTheGivenServicesUntilReset) {
+    RWManualClock clock(42.0);
+    RWScriptedModal modal;
+    RWInstallServices({&clock, nullptr, &modal, nullptr, nullptr});
+    EXPECT_DOUBLE_EQ(RWApplicationServices().clock->now(), 42.0);
+    EXPECT_EQ(RWApplicationServices().modal, &modal);
+    EXPECT_NE(RWApplicationServices().timer, nullptr) << "unset services keep the headless ones";
+    RWResetServices();
+    EXPECT_NE(RWApplicationServices().clock, &clock);
+    RWWindow window;
+    EXPECT_EQ(RWApplicationServices().modal->runModalForWindow(window), RWModalResponseAbort)
+        << "headless modal runs abort at once";
+}
+
+TEST(RWStubViewHostTest, nextEventMatchingMask__takesOnlyMatchingEventsInOrder) {
+    RWStubViewHost host;
+    host.queueEvent(RWEvent::scrollWheelEvent(1, 2));
+    host.queueEvent(RWEvent::keyEvent(RWEventType::KeyDown, "a"));
+    host.queueEvent(RWEvent::scrollWheelEvent(3, 4));
+    EXPECT_EQ(RWEventMaskScrollWheel, 0x400000u);
+
+    auto first = host.nextEventMatchingMask(RWEventMaskScrollWheel);
+    auto second = host.nextEventMatchingMask(RWEventMaskScrollWheel);
+    ASSERT_TRUE(first && second);
+    EXPECT_DOUBLE_EQ(first->deltaX(), 1.0);
+    EXPECT_DOUBLE_EQ(second->deltaY(), 4.0);
+    EXPECT_FALSE(host.nextEventMatchingMask(RWEventMaskScrollWheel).has_value());
+    EXPECT_EQ(host.queuedCount(), 1u) << "the key event stays queued";
+}
+
+}  // namespace
