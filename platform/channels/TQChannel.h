@@ -136,10 +136,11 @@ public:
     // time). The caller's arrays have room for count + 1 entries; either pointer may be null.
     // The count comes back 0 when start is not a numeric time or step is not a positive
     // numeric time, and smaller when the sample times would leave the range of CMTime.
-    // A null context samples the keyframed curve alone; a context the processed curve.
-    // Cost: O(log n) to find the first segment, then a walk proportional to the keyframes
-    // crossed plus the samples; nothing is allocated once the curve's evaluation cache is
-    // built (an edit invalidates the cache, the next read rebuilds it in O(n)).
+    // A null context samples the keyframed curve alone (what getCurveValue answers); a context
+    // the processed curve (what getValueAsDouble answers, with the context's behaviours).
+    // Cost: O(log n) to find the first segment, then a galloping walk proportional to the
+    // segments crossed plus the samples; nothing is allocated once the curve's evaluation
+    // cache is built (an edit invalidates the cache, the next read rebuilds it in O(n)).
     virtual void getSamples(const TQSampleContext* context, const CMTime& start,
                             const CMTime& step, unsigned& count, CMTime** times,
                             double** values) const;
@@ -151,8 +152,9 @@ public:
     // Disabled keyframes are skipped; disabled animation does not matter here (see
     // getValueAsDouble). Non-numeric time: the initial value.
     virtual double getCurveValue(const CMTime& time, bool extrapolate = true) const;
-    // The channel's value: the processed curve at time + subFrameSeconds, or the initial value
-    // while animation is disabled.
+    // The channel's value: the processed curve at time + subFrameSeconds. While animation is
+    // disabled the initial value stands in for the keyframed curve; enabled behaviours still
+    // apply on top of it.
     virtual double getValueAsDouble(const CMTime& time, double subFrameSeconds = 0.0) const;
     virtual double getInitialValue() const;
     virtual void setInitialValue(double value, bool notify = false);

@@ -405,7 +405,7 @@ constexpr CMTimeValue kShortRun = 3;
 constexpr double kWarmReach = 0.05;
 // Corrections of each warm start, and the size the last must be under for the block's answer
 // to stand: the error left is that step times about |x''/x'| times the warm start's error.
-constexpr int kBlockSteps = 3;
+constexpr int kBlockSteps = 2;
 constexpr double kBlockStepTolerance = 1e-10;
 
 }  // namespace
