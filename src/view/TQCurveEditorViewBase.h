@@ -86,6 +86,14 @@ public:
     CGPoint getOffsetFromLastWorld(double dx, double deltaY) const;
     CGPoint getOffsetFromOriginWorld(double dx, double deltaY) const;
     CGPoint getMouseOrigin() const { return _mouseOrigin; }
+    // Starts a gesture at a drawable pixel: both the origin and the running position.
+    void setMouseOrigin(const CGPoint& screen) {
+        _mouseOrigin = screen;
+        _lastMousePos = screen;
+    }
+    CGPoint getLastMousePos() const { return _lastMousePos; }
+    // Advances the running position of the gesture.
+    void updateDrag(double dx, double y) { _lastMousePos = _lastMousePos + CGPointMake(dx, y); }
 
     // ---- View volume and zoom ----
 

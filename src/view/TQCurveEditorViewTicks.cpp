@@ -41,8 +41,9 @@ void TQCurveEditorViewBase::computeVerticalTickMarks() {
     const double S = _gridSpacingY;
     const double Z = _zoomFactorY;
     // Without a label step (a view that draws no grid) or a usable zoom there is no tick to
-    // fit: the items keep their mapping and stay marked for when there is.
-    if (!(S > 0.0) || !(T > 0.0) || !(Z > 0.0) || !std::isfinite(S * T / Z)) return;
+    // fit: such a view shows values as they are (scale 1, offset 0), and the items stay
+    // marked so that they are fitted once there is a grid.
+    const bool unfitted = !(S > 0.0) || !(T > 0.0) || !(Z > 0.0) || !std::isfinite(S * T / Z);
 
     const uint32_t count = _controller->numberOfChannelItems();
     for (uint32_t i = 0; i < count; ++i) {
@@ -54,6 +55,11 @@ void TQCurveEditorViewBase::computeVerticalTickMarks() {
         if (!channel) break;  // the walk ends at the first item whose channel is gone
         auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
         if (!channelItem || !channelItem->updateScale()) continue;
+        if (unfitted) {
+            channelItem->setScaleY(1.0);
+            channelItem->setOffsetY(0.0);
+            continue;
+        }
 
         const double conv = channelItem->conversionFactor();
         const double t = tickStepOf(*channel);
