@@ -1,0 +1,241 @@
+// Moving keypoints: the edit drag (moveSelected), the nudges (offsetSelected), the curve drag
+// (offsetCurve), and the time sort of box-deformation keypoints.
+//
+// A channel keeps its keyframes in time order and finds them by time, so several keypoints
+// moved in one step must not run through each other: they move in the order of their live
+// times, the one leading the direction of travel first. Linked compound components move once
+// per call however many of them are selected.
+
+#include <algorithm>
+#include <functional>
+#include <unordered_set>
+#include <vector>
+
+#include "src/engine/TQCurveEditorCtrlBase.h"
+
+namespace {
+
+struct OrderedEntry {
+    TQCurveSelection* entry = nullptr;
+    CMTime time = kCMTimeZero;  // live channel time of the entry's keyframe (no offset)
+};
+
+bool isLaterThanZero(const CMTime& t) { return CMTimeCompare(t, kCMTimeZero) > 0; }
+bool isZero(const CMTime& t) { return CMTimeCompare(t, kCMTimeZero) == 0; }
+
+}  // namespace
+
+// The ordered list: the entries sorted by the live channel time of their keyframes, equal
+// times in list order. The original insertion walk (each entry goes before the first one that
+// is strictly later) yields exactly a stable sort, which is what runs here: one channel read
+// per entry and O(n log n), instead of two reads per comparison in a quadratic walk.
+//
+// An entry whose keyframe cannot be read (a curve segment entry) sorts as time 0; it is
+// skipped by the moves, and a stable sort keeps the others' relative order whatever its key.
+// Offsets are left out on purpose, even between curves with different offsets.
+static std::vector<OrderedEntry> buildOrderedList(
+    const std::vector<TQCurveSelection*>& entries,
+    const std::function<TQChannel*(const TQCurveSelection&)>& channelOf) {
+    std::vector<OrderedEntry> ordered;
+    ordered.reserve(entries.size());
+    for (TQCurveSelection* entry : entries) {
+        OrderedEntry o{entry, kCMTimeZero};
+        if (TQChannel* channel = channelOf(*entry)) {
+            CMTime t = kCMTimeZero;
+            if (channel->getKeyframe(entry->getHandle(), &t, nullptr)) o.time = t;
+        }
+        ordered.push_back(o);
+    }
+    std::stable_sort(ordered.begin(), ordered.end(), [](const OrderedEntry& a, const OrderedEntry& b) {
+        return CMTimeCompare(a.time, b.time) < 0;
+    });
+    return ordered;
+}
+
+void TQCurveEditorCtrlBase::moveSelected(TQCurveSelectionList* list, CMTime x, double y,
+                                         char useSelectionOrder, char isConstraining) {
+    if (!list) return;
+    validateSelection(list);
+    if (list->empty()) return;
+
+    const TQCurveSelectionPtr anchor = list->selectionAtIndex(0);
+    TQCurveEditorChannelItem* anchorItem = itemForEntry(*anchor);
+    TQChannel* anchorChannel = anchorItem ? anchorItem->channel() : nullptr;
+    if (!anchorChannel) return;
+
+    if (anchor->isCurve()) {
+        // The segment is taken at x as it came: no conversion to channel time here.
+        const double value = convertToChannelCoords(anchorItem, y);
+        anchorChannel->noteWillChange(true);
+        anchorChannel->setCurveSegmentValue(x, value, false);
+        markDirty(anchorItem);
+        return;
+    }
+
+    // The anchor's present place. A tangent entry reads its keypoint's handle too.
+    const CMTime anchorOffset = anchorChannel->timeOffset();
+    CMTime anchorTime = kCMTimeInvalid;
+    double anchorValue = 0.0;
+    if (!anchorChannel->getKeyframe(anchor->getHandle(), &anchorTime, &anchorValue)) return;
+    // A vertical constraint holds the time and so puts no rounding on it; a free move puts
+    // the anchor on the grid.
+    const CMTime target = isConstraining ? x : convertToCurveEditorAxis(x);
+    const CMTime dt =
+        BN_CMTimeSaferSubtract(target, BN_CMTimeSaferAdd(anchorTime, anchorOffset));
+    const double anchorV = convertFromChannelCoords(anchorItem, anchorValue);
+
+    // With useSelectionOrder clear the anchor itself is not moved: the one caller passes true,
+    // and the others are moved relative to it all the same.
+    std::vector<TQCurveSelection*> entries;
+    entries.reserve(list->size());
+    const auto& array = list->getSelectionArray();
+    for (size_t i = useSelectionOrder ? 0 : 1; i < array.size(); ++i) entries.push_back(array[i].get());
+    std::vector<OrderedEntry> ordered =
+        buildOrderedList(entries, [this](const TQCurveSelection& e) { return channelForEntry(e); });
+    if (ordered.empty()) return;
+    // Forward: the latest keypoint first; backward: the earliest first.
+    if (isLaterThanZero(dt)) std::reverse(ordered.begin(), ordered.end());
+
+    const bool moveInTime = !isZero(dt);
+    const bool singleEntry = ordered.size() == 1;
+    // Keyframes of linked components already carried along by an earlier entry of this call.
+    std::unordered_set<TQKeyframeHandle> moved;
+
+    for (const OrderedEntry& o : ordered) {
+        TQCurveSelection& entry = *o.entry;
+        if (!entry.isKeypoint()) continue;
+        TQCurveEditorChannelItem* item = itemForEntry(entry);
+        TQChannel* channel = item ? item->channel() : nullptr;
+        if (!channel) continue;
+        const TQKeyframeHandle handle = entry.getHandle();
+        const CMTime offset = channel->timeOffset();
+        CMTime time = kCMTimeInvalid;
+        double value = 0.0;
+        // A handle can die within the call when a linked move resolved a meeting; skip it.
+        if (!channel->getKeyframe(handle, &time, &value)) continue;
+        // The same V distance on screen for every curve, each through its own scale.
+        const double newValue = value + ((y - anchorV) * item->scaleY()) / item->conversionFactor();
+        const CMTime from = BN_CMTimeSaferAdd(time, offset);
+        CMTime to = BN_CMTimeSaferAdd(BN_CMTimeSaferAdd(time, dt), offset);
+
+        TQCompoundChannel* compound = linkedParent(channel);
+        if (!compound) {
+            channel->noteWillChange(true);
+            channel->setKeyframeValue(handle, newValue);
+            if (moveInTime) {
+                if (!_negativeRangeAllowed && CMTimeCompare(to, kCMTimeZero) < 0) to = kCMTimeZero;
+                // Only a keypoint moved alone lands on the grid; a group keeps its spacing.
+                if (singleEntry && !isConstraining) to = convertToCurveEditorAxis(to);
+                channel->moveKeyframe(&from, &to, true);
+            }
+            markDirty(item);
+            continue;
+        }
+
+        // Linked: no clamp at 0, no rounding, and the move runs even when dt is zero.
+        compound->noteWillChange(true);
+        channel->setKeyframeValue(handle, newValue);
+        if (moved.contains(handle)) continue;
+        compound->moveKeyframe(channel, from, to, nullptr, nullptr, _linked);
+        if (const auto* children = compound->getChildren()) {
+            for (TQChannelBase* child : *children) {
+                auto* component = dynamic_cast<TQChannel*>(child);
+                if (!component) continue;
+                TQCurveEditorChannelItem* componentItem = itemForChannel(component);
+                if (!componentItem) continue;
+                markDirty(componentItem);
+                // `to` is axis time; the lookup takes each component's own channel time, so
+                // that a component with an offset is found as well.
+                const CMTime componentTime = component->toChannelTime(&to);
+                if (TQKeyframeHandle h = component->getKeyframe(componentTime)) moved.insert(h);
+            }
+        }
+    }
+}
+
+void TQCurveEditorCtrlBase::offsetSelected(TQCurveSelectionList* list, CMTime x, double y) {
+    if (!list) return;
+    validateSelection(list);
+    if (list->empty()) return;
+
+    const TQCurveSelectionPtr first = list->selectionAtIndex(0);
+    if (first->isCurve()) {
+        TQCurveEditorChannelItem* item = itemForEntry(*first);
+        TQChannel* channel = item ? item->channel() : nullptr;
+        if (!channel) return;
+        // A vertical nudge of a segment steps by the channel's value step.
+        const double value = convertToChannelCoords(item, y * channel->getInfo()->valueStep);
+        channel->noteWillChange(true);
+        const double newValue = value + channel->getInitialValue();
+        channel->setCurveSegmentValue(channel->toSegmentTime(&x), newValue, false);
+        markDirty(item);
+        return;
+    }
+
+    if (shouldConstrainToFrames()) x = convertToCurveEditorAxis(x);
+
+    std::vector<TQCurveSelection*> entries;
+    entries.reserve(list->size());
+    for (const auto& e : list->getSelectionArray()) entries.push_back(e.get());
+    std::vector<OrderedEntry> ordered =
+        buildOrderedList(entries, [this](const TQCurveSelection& e) { return channelForEntry(e); });
+    if (isLaterThanZero(x)) std::reverse(ordered.begin(), ordered.end());
+
+    const bool moveInTime = !isZero(x);
+    const bool singleEntry = ordered.size() == 1;
+    for (const OrderedEntry& o : ordered) {
+        TQCurveSelection& entry = *o.entry;
+        if (!entry.isKeypoint()) continue;
+        TQCurveEditorChannelItem* item = itemForEntry(entry);
+        TQChannel* channel = item ? item->channel() : nullptr;
+        if (!channel) continue;
+        const TQKeyframeHandle handle = entry.getHandle();
+        const CMTime offset = channel->timeOffset();
+        channel->noteWillChange(true);
+        CMTime time = kCMTimeInvalid;
+        double value = 0.0;
+        if (!channel->getKeyframe(handle, &time, &value)) continue;
+        channel->setKeyframeValue(handle, value + (item->scaleY() * y) / item->conversionFactor());
+        const CMTime from = BN_CMTimeSaferAdd(time, offset);
+        if (moveInTime) {
+            // No moved set here: a nudge of two components of one linked compound moves the
+            // compound twice, as it always has.
+            if (TQCompoundChannel* compound = linkedParent(channel)) {
+                compound->noteWillChange(true);
+                compound->moveKeyframe(channel, from, BN_CMTimeSaferAdd(from, x), nullptr, nullptr,
+                                       _linked);
+                markComponentsDirty(*compound);
+            } else {
+                CMTime to = BN_CMTimeSaferAdd(from, x);
+                if (singleEntry) to = convertToCurveEditorAxis(to);
+                channel->moveKeyframe(&from, &to, true);
+            }
+        }
+        markDirty(item);
+    }
+}
+
+void TQCurveEditorCtrlBase::offsetCurve(TQCurveSelectionList* list, CMTime x, double y) {
+    if (!list) return;
+    validateSelection(list);
+    if (list->empty()) return;
+    // Only the curve of entry 0 moves; x is where the user took it.
+    TQCurveEditorChannelItem* item = itemForEntry(*list->selectionAtIndex(0));
+    TQChannel* channel = item ? item->channel() : nullptr;
+    if (!channel) return;
+    const double value = convertToChannelCoords(item, y);
+    channel->noteWillChange(true);
+    channel->offsetCurve(&x, value);
+    markDirty(item);
+}
+
+void TQCurveEditorCtrlBase::sortKeypoints(std::vector<TQKeyframePtr>& keys, bool bBackward) {
+    // The comparators put a before b only for a strict order; equal times are "descending"
+    // both ways, which is an equivalence here, so the sort is well defined. Stable, so equal
+    // times keep their order.
+    const auto timeOf = [](const TQKeyframePtr& k) { return k ? k->u() : kCMTimeZero; };
+    std::stable_sort(keys.begin(), keys.end(), [&](const TQKeyframePtr& a, const TQKeyframePtr& b) {
+        const int32_t c = CMTimeCompare(timeOf(a), timeOf(b));
+        return bBackward ? c > 0 : c < 0;
+    });
+}
