@@ -323,6 +323,13 @@ protected:
     TQChannel* channelForEntry(const TQCurveSelection& entry) const;
     // The compound through which an edit of `channel` goes, or null when it is not linked.
     TQCompoundChannel* linkedParent(const TQChannel* channel) const;
+    // The `linked` argument for an edit through `compound`. The compound applies an edit to
+    // every component only when told so, and does not consult its own fold flag; a linked
+    // compound's edits must reach every component whatever the caller asked, so its flag is
+    // added to the request here.
+    static bool compoundLinkArgument(const TQCompoundChannel& compound, bool requested) {
+        return requested || compound.isLinked();
+    }
     // Marks the cached curve of every component of the compound that has an item.
     void markComponentsDirty(const TQCompoundChannel& compound) const;
     static void markDirty(TQCurveEditorChannelItem* item) {

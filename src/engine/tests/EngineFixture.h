@@ -34,8 +34,8 @@ inline CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTimesca
 class FrameGridController : public TQCurveEditorCtrlBase {
 public:
     CMTime convertToCurveEditorAxis(CMTime time) const override {
-        const CMTime frame = CMTimeMake(1, 30);
-        return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, frame * 0.5), frame);
+        return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, CMTimeMake(1, 60)),
+                                              CMTimeMake(1, 30));
     }
 };
 

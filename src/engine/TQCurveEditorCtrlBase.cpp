@@ -1,0 +1,632 @@
+// The controller's core: lifecycle, channels into sets, queries, sampling, unit conversion,
+// the four modify brackets, view support and the context menus.
+
+#include "src/engine/TQCurveEditorCtrlBase.h"
+
+#include <algorithm>
+#include <cfloat>
+#include <cstdio>
+
+#include "platform/channels/TQChannelTypes.h"
+#include "src/resources/TQStrings.h"
+#include "src/view/TQCurveEditorViewBase.h"
+
+TQCurveEditorCtrlBase::TQCurveEditorCtrlBase() = default;
+TQCurveEditorCtrlBase::~TQCurveEditorCtrlBase() = default;
+
+// ---- Lifecycle and simple state ---------------------------------------------------------
+
+void TQCurveEditorCtrlBase::init() {
+    _selectedCurveSet.reset();
+    _lastFrameTextUpdateTime = false;
+    _snapshotChannels = false;
+    _ignoreHiddenChannels = false;
+    _iLastDragDirection = 0;
+    _keys.clear();
+    buildKeyframeMenu();
+    buildCurveMenu();
+    buildTangentMenu();
+    buildDefaultMenu();
+}
+
+void TQCurveEditorCtrlBase::setCurrentTool(uint32_t tool) {
+    _currentTool = tool;
+    if (_view) _view->currentToolChanged();
+}
+
+void TQCurveEditorCtrlBase::redrawCurveEditor() {
+    if (_view) _view->setNeedsDisplay(1);
+}
+
+void TQCurveEditorCtrlBase::updateUI() {
+    if (_view) {
+        _view->setAllOriginalCurveDirty(1);
+        _view->computeVerticalTickMarks();
+    }
+    redrawCurveEditor();
+}
+
+void TQCurveEditorCtrlBase::dumpKeypoints() const {
+    std::printf("Keypoints in selection\n");
+    std::printf("----------------------\n");
+    int index = 0;
+    for (const TQKeyframePtr& key : _keys) {
+        const double time = key ? CMTimeGetSeconds(key->u()) : 0.0;
+        const double value = key ? key->v() : 0.0;
+        std::printf("index: %d    time: %f    value: %f\n", index++, time, value);
+    }
+    std::printf("\n");
+}
+
+// ---- Lookup helpers ---------------------------------------------------------------------
+
+TQCurveEditorChannelItem* TQCurveEditorCtrlBase::itemForEntry(const TQCurveSelection& entry) const {
+    if (!_selectedCurveSet) return nullptr;
+    TQCurveEditorItemPtr item = _selectedCurveSet->itemWithIdentifier(entry.getCurveId());
+    // The set owns its items; the pointer lives as long as the item stays in the set, which
+    // is for the rest of the calling operation.
+    return dynamic_cast<TQCurveEditorChannelItem*>(item.get());
+}
+
+TQCurveEditorChannelItem* TQCurveEditorCtrlBase::itemForChannel(const TQChannelBase* channel) const {
+    if (!_selectedCurveSet || !channel) return nullptr;
+    TQCurveEditorItemPtr item = _selectedCurveSet->itemWithChannel(channel);
+    return dynamic_cast<TQCurveEditorChannelItem*>(item.get());
+}
+
+TQChannel* TQCurveEditorCtrlBase::channelForEntry(const TQCurveSelection& entry) const {
+    TQCurveEditorChannelItem* item = itemForEntry(entry);
+    return item ? item->channel() : nullptr;
+}
+
+TQCompoundChannel* TQCurveEditorCtrlBase::linkedParent(const TQChannel* channel) const {
+    if (!channel) return nullptr;
+    TQChannelFolder* parent = channel->getParent();
+    if (!parent || !parent->isCompoundChannel()) return nullptr;
+    if (!_linked && !parent->testFoldFlag(kTQFoldFlagLinked)) return nullptr;
+    return static_cast<TQCompoundChannel*>(parent);
+}
+
+void TQCurveEditorCtrlBase::markComponentsDirty(const TQCompoundChannel& compound) const {
+    const std::vector<TQChannelBase*>* children = compound.getChildren();
+    if (!children) return;
+    for (TQChannelBase* child : *children) markDirty(itemForChannel(child));
+}
+
+uint32_t TQCurveEditorCtrlBase::newItemSampleCount() const {
+    const double width = _view ? _view->width() : 0.0;
+    return static_cast<uint32_t>(std::max(0.0, width + 1.0));
+}
+
+TQCurveSelectionList* TQCurveEditorCtrlBase::viewSelection() const {
+    return _view ? _view->getSelection() : nullptr;
+}
+
+void TQCurveEditorCtrlBase::postNotification(TQNotificationWord word) const {
+    if (_pAppDelegate) _pAppDelegate->postNotification(word);
+}
+
+// ---- Channels into sets -----------------------------------------------------------------
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHChannelToSelectedCurveSet(
+    const CHChannelObject* channel) {
+    return appendChannelToCurveSet(channel ? dynamic_cast<TQChannel*>(channel->tqChannel()) : nullptr);
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHFolderToSelectedCurveSet(
+    const CHChannelObject* folder) {
+    return appendFolderToCurveSet(folder ? dynamic_cast<TQChannelFolder*>(folder->tqChannel()) : nullptr);
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHChannel(const CHChannelObject* channel,
+                                                            const TQCurveSetPtr& toCurveSet) {
+    return appendChannel(channel ? dynamic_cast<TQChannel*>(channel->tqChannel()) : nullptr, toCurveSet);
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHFolder(const CHChannelObject* folder,
+                                                           const TQCurveSetPtr& toCurveSet) {
+    return appendFolder(folder ? dynamic_cast<TQChannelFolder*>(folder->tqChannel()) : nullptr,
+                        toCurveSet);
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendChannelToCurveSet(TQChannel* channel) {
+    return appendChannel(channel, _selectedCurveSet);
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendFolderToCurveSet(TQChannelFolder* folder) {
+    return appendFolder(folder, _selectedCurveSet);
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendChannel(TQChannel* channel,
+                                                          const TQCurveSetPtr& toCurveSet) {
+    auto* mutableSet = dynamic_cast<TQCurveSetMutable*>(toCurveSet.get());
+    if (!channel || !mutableSet) return nullptr;
+    auto item = std::make_shared<TQCurveEditorChannelItem>();
+    item->initWithChannel(channel, newItemSampleCount(), _pAppDelegate,
+                          static_cast<char>(_ignoreHiddenChannels));
+    // No isValid test at this level: the set's appendItem decides.
+    mutableSet->appendItem(item);
+    postNotification(kTQNotifyCurveSetContentChanged);
+    return item;
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendFolder(TQChannelFolder* folder,
+                                                         const TQCurveSetPtr& toCurveSet) {
+    if (!folder || !toCurveSet) return nullptr;
+    TQCurveEditorItemPtr last;
+    if (const std::vector<TQChannelBase*>* children = folder->getChildren()) {
+        // Copy: appending may not change the tree, but a host's notify may.
+        const std::vector<TQChannelBase*> snapshot = *children;
+        for (TQChannelBase* child : snapshot) {
+            if (!child) continue;
+            if (auto* c = dynamic_cast<TQChannel*>(child)) {
+                if (TQCurveEditorItemPtr made = appendChannel(c, toCurveSet)) last = made;
+            } else if (auto* f = dynamic_cast<TQChannelFolder*>(child)) {
+                if (TQCurveEditorItemPtr made = appendFolder(f, toCurveSet)) last = made;
+            }
+        }
+    }
+    // Once for each level of the recursion, as the set's watchers have always seen it.
+    postNotification(kTQNotifyCurveSetContentChanged);
+    updateUI();
+    return last;
+}
+
+bool TQCurveEditorCtrlBase::removeChannelWithIdentifier(uint32_t identifier,
+                                                        const TQCurveSetPtr& fromCurveSet) {
+    if (!fromCurveSet) return false;
+    // Keep the set alive through the notification, which may replace the selected set.
+    const TQCurveSetPtr keep = fromCurveSet;
+    const bool removed = keep->removeItemWithIdentifier(identifier);
+    postNotification(kTQNotifyCurveSetContentChanged);
+    updateUI();
+    return removed;
+}
+
+bool TQCurveEditorCtrlBase::removeSelectedChannelFromSelectedCurveSet() {
+    const TQCurveSetPtr keep = _selectedCurveSet;
+    auto* mutableSet = dynamic_cast<TQCurveSetMutable*>(keep.get());
+    if (!mutableSet) return false;
+    if (_pAppDelegate)
+        _pAppDelegate->addToUndo(this, 2, 0, TQLocalizedString("Curve Editor Undo Remove Channel"));
+    const bool removed = mutableSet->removeSelectedItem();
+    postNotification(kTQNotifyCurveSetContentChanged);
+    updateUI();
+    return removed;
+}
+
+void TQCurveEditorCtrlBase::refreshSelectedCurveSet() {
+    if (_selectedCurveSet) {
+        const double width = _view ? _view->width() : 0.0;
+        _selectedCurveSet->refresh(static_cast<uint32_t>(std::max(0.0, width)), _snapshotChannels);
+    }
+    if (_view) {
+        _view->getSelection()->reset();
+        _view->resetBoxDeformation();
+    }
+    updateUI();
+}
+
+void TQCurveEditorCtrlBase::resetSelection() {
+    if (_view) _view->getSelection()->reset();
+}
+
+// ---- Queries ----------------------------------------------------------------------------
+
+void TQCurveEditorCtrlBase::setSelectedCurveSet(const TQCurveSetPtr& set) {
+    _selectedCurveSet = set;
+    postNotification(kTQNotifyCurveSetContentChanged);
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::channelItemWithIdentifier(uint32_t identifier) const {
+    return _selectedCurveSet ? _selectedCurveSet->itemWithIdentifier(identifier) : nullptr;
+}
+
+uint32_t TQCurveEditorCtrlBase::numberOfEnabledChannels() const {
+    return _selectedCurveSet ? _selectedCurveSet->numberOfEnabledItems() : 0;
+}
+
+uint32_t TQCurveEditorCtrlBase::numberOfSelectedChannels() const {
+    return _selectedCurveSet ? _selectedCurveSet->numberOfSelectedItems() : 0;
+}
+
+uint32_t TQCurveEditorCtrlBase::numberOfChannelItems() const {
+    return _selectedCurveSet ? _selectedCurveSet->numberOfChannelItems() : 0;
+}
+
+uint32_t TQCurveEditorCtrlBase::numberOfRootItems() const {
+    return _selectedCurveSet ? _selectedCurveSet->numberOfItems() : 0;
+}
+
+uint32_t TQCurveEditorCtrlBase::numberOfSelectedRootItems() const {
+    return _selectedCurveSet ? _selectedCurveSet->numberOfSelectedRootItems() : 0;
+}
+
+std::vector<TQCurveEditorItemPtr> TQCurveEditorCtrlBase::selectedChannels() const {
+    return _selectedCurveSet ? _selectedCurveSet->selectedItems() : std::vector<TQCurveEditorItemPtr>{};
+}
+
+std::vector<TQCurveEditorFolderItemPtr> TQCurveEditorCtrlBase::selectedRoots() const {
+    return _selectedCurveSet ? _selectedCurveSet->selectedRootItems()
+                             : std::vector<TQCurveEditorFolderItemPtr>{};
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::selectedChannel() const {
+    return _selectedCurveSet ? _selectedCurveSet->selectedItem() : nullptr;
+}
+
+void TQCurveEditorCtrlBase::deselectAllChannels() {
+    if (_selectedCurveSet) _selectedCurveSet->deselectAll();
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::getFirstChannel() const {
+    if (!_selectedCurveSet) return nullptr;
+    const uint32_t n = _selectedCurveSet->numberOfChannelItems();
+    for (uint32_t i = 0; i < n; ++i) {
+        TQCurveEditorItemPtr item = _selectedCurveSet->channeItemAtIndex(i);
+        if (item && item->isSelected() && item->isEnabledItem() != 0) return item;
+    }
+    return nullptr;
+}
+
+bool TQCurveEditorCtrlBase::canModifySelectedAnyCurve() const {
+    for (const TQCurveEditorItemPtr& item : selectedChannels()) {
+        if (!item) continue;
+        const TQChannelBase* channel = item->channelBase();
+        if (channel && !channel->isLocked(true)) return true;
+    }
+    return false;
+}
+
+TQCompoundChannel* TQCurveEditorCtrlBase::getChannelsLinkedParent(const TQChannel* channel) const {
+    if (!channel) return nullptr;
+    TQChannelFolder* parent = channel->getParent();
+    if (!parent || !parent->isCompoundChannel() || !parent->testFoldFlag(kTQFoldFlagLinked))
+        return nullptr;
+    return static_cast<TQCompoundChannel*>(parent);
+}
+
+// ---- Sampling and reading ---------------------------------------------------------------
+
+void TQCurveEditorCtrlBase::getSamples(TQCurveEditorItem* item, char flag, CMTime minU,
+                                       CMTime resolution, const CMTime** samplesU,
+                                       const double** samplesV, unsigned* number) {
+    if (samplesU) *samplesU = nullptr;
+    if (samplesV) *samplesV = nullptr;
+    // The caller's item may be a stale copy: the one in the selected set is authoritative.
+    TQCurveEditorChannelItem* own = nullptr;
+    if (item && _selectedCurveSet) {
+        TQCurveEditorItemPtr found = _selectedCurveSet->itemWithIdentifier(item->channelId());
+        own = dynamic_cast<TQCurveEditorChannelItem*>(found.get());
+    }
+    if (!own) {
+        if (number) *number = 0;
+        return;
+    }
+    if ((flag & 1) == 0) {
+        if (own->originalCurveDirty()) {
+            // A caller passes the count it wants filled in; without one, keep the item's.
+            if (number) own->setNumberOfSamples(*number);
+            own->refreshOriginalCurve(minU, resolution);
+        }
+        if (samplesU) *samplesU = own->samplesU();
+        if (samplesV) *samplesV = own->samplesV();
+        if (number) *number = own->numberOfSamples();
+    } else {
+        if (own->processedCurveDirty()) {
+            if (number) own->setNumberOfProcessedSamples(*number);
+            own->refreshProcessedCurve(minU, resolution);
+        }
+        if (samplesU) *samplesU = own->processedSamplesU();
+        if (samplesV) *samplesV = own->processedSamplesV();
+        if (number) *number = own->numberOfProcessedSamples();
+    }
+}
+
+std::vector<TQKeyframeHandle> TQCurveEditorCtrlBase::getKeypoints(uint32_t identifier) {
+    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(channelItemWithIdentifier(identifier).get());
+    if (!item) return {};
+    return *item->keypoints();
+}
+
+CGPoint TQCurveEditorCtrlBase::getKeypointPosition(const TQCurveSelection* entry) const {
+    if (!entry) return CGPointZero;
+    TQCurveEditorChannelItem* item = itemForEntry(*entry);
+    TQChannel* channel = item ? item->channel() : nullptr;
+    if (!channel) return CGPointZero;
+    CMTime time = kCMTimeInvalid;
+    double value = 0.0;
+    channel->getKeyframe(entry->getHandle(), &time, &value);
+    const double u = CMTimeGetSeconds(BN_CMTimeSaferAdd(time, channel->timeOffset()));
+    return CGPointMake(u, convertFromChannelCoords(item, value));
+}
+
+void TQCurveEditorCtrlBase::getSelectedVertex(const TQCurveSelection* entry, double* u,
+                                              double* y) const {
+    if (!entry || !entry->isKeypoint()) return;
+    const CGPoint p = getKeypointPosition(entry);
+    if (u) *u = p.x;
+    if (y) *y = p.y;
+}
+
+bool TQCurveEditorCtrlBase::getSelected(TQCurveSelectionList* list, double* minX, double* maxX,
+                                        double* minY, double* maxY) const {
+    // The largest float, as the bounds have always started: callers compare against it.
+    double lowX = FLT_MAX, highX = -FLT_MAX, lowY = FLT_MAX, highY = -FLT_MAX;
+    bool counted = false;
+    if (list && list->size() >= 2) {
+        // From index 1 on: the primary entry is the one being dragged.
+        for (uint32_t i = 1; i < list->size(); ++i) {
+            const TQCurveSelectionPtr entry = list->selectionAtIndex(i);
+            if (!entry || !entry->isKeypoint()) continue;
+            TQCurveEditorChannelItem* item = itemForEntry(*entry);
+            TQChannel* channel = item ? item->channel() : nullptr;
+            CMTime time = kCMTimeInvalid;
+            double value = 0.0;
+            if (!channel || !channel->getKeyframe(entry->getHandle(), &time, &value)) continue;
+            const double x = CMTimeGetSeconds(time);
+            const double v = convertFromChannelCoords(item, value);
+            lowX = std::min(lowX, x);
+            highX = std::max(highX, x);
+            lowY = std::min(lowY, v);
+            highY = std::max(highY, v);
+            counted = true;
+        }
+    }
+    if (minX) *minX = lowX;
+    if (maxX) *maxX = highX;
+    if (minY) *minY = lowY;
+    if (maxY) *maxY = highY;
+    return counted;
+}
+
+void TQCurveEditorCtrlBase::setCurveInterpolation(const TQCurveSelection* entry,
+                                                  uint32_t interpolation) {
+    if (!entry) return;
+    TQCurveEditorChannelItem* item = itemForEntry(*entry);
+    TQChannel* channel = item ? item->channel() : nullptr;
+    if (!channel) return;
+    channel->setInterpolation(interpolation);
+    markDirty(item);
+}
+
+// ---- Unit conversion --------------------------------------------------------------------
+
+double TQCurveEditorCtrlBase::convertToChannelCoords(const TQCurveEditorItem* item, double value) const {
+    const auto* c = dynamic_cast<const TQCurveEditorChannelItem*>(item);
+    if (!c) return value;
+    return (value * c->scaleY() + c->offsetY()) / c->conversionFactor();
+}
+
+double TQCurveEditorCtrlBase::convertFromChannelCoords(const TQCurveEditorItem* item,
+                                                       double value) const {
+    const auto* c = dynamic_cast<const TQCurveEditorChannelItem*>(item);
+    if (!c) return value;
+    return (value * c->conversionFactor() - c->offsetY()) / c->scaleY();
+}
+
+// ---- Modify brackets --------------------------------------------------------------------
+
+namespace {
+
+// The distinct channels of the list's entries, in order of first appearance. Entries whose
+// item or channel is gone are passed over. Small lists: a linear membership test is cheaper
+// than hashing, and a drag announces at most a few dozen channels.
+template <class Lookup>
+std::vector<const TQChannelBase*> gatherChannels(const TQCurveSelectionList& list, Lookup&& lookup) {
+    std::vector<const TQChannelBase*> channels;
+    for (const TQCurveSelectionPtr& entry : list.getSelectionArray()) {
+        if (!entry) continue;
+        const TQChannelBase* channel = lookup(*entry);
+        if (!channel) continue;
+        if (std::find(channels.begin(), channels.end(), channel) == channels.end())
+            channels.push_back(channel);
+    }
+    return channels;
+}
+
+}  // namespace
+
+void TQCurveEditorCtrlBase::willModify(TQCurveSelectionList* list) {
+    if (!list || !_pAppDelegate) return;
+    const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
+    for (const TQChannelBase* c : gatherChannels(*list, lookup)) _pAppDelegate->willChangeChannel(c);
+}
+
+void TQCurveEditorCtrlBase::didModify(TQCurveSelectionList* list) {
+    if (!list || !_pAppDelegate) return;
+    const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
+    const auto channels = gatherChannels(*list, lookup);
+    for (auto it = channels.rbegin(); it != channels.rend(); ++it) _pAppDelegate->didChangeChannel(*it);
+}
+
+void TQCurveEditorCtrlBase::willModifyValue(TQCurveSelectionList* list) {
+    if (!list || !_pAppDelegate) return;
+    const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
+    for (const TQChannelBase* c : gatherChannels(*list, lookup)) _pAppDelegate->willSetChannelValue(c);
+}
+
+void TQCurveEditorCtrlBase::didModifyValue(TQCurveSelectionList* list) {
+    if (!list || !_pAppDelegate) return;
+    const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
+    const auto channels = gatherChannels(*list, lookup);
+    for (auto it = channels.rbegin(); it != channels.rend(); ++it)
+        _pAppDelegate->didSetChannelValue(*it);
+}
+
+void TQCurveEditorCtrlBase::performWithBracket(
+    const char* undoKey, const std::function<void(TQCurveSelectionList*)>& operation) {
+    TQCurveSelectionList* list = viewSelection();
+    if (!list) return;
+    validateSelection(list);
+    if (_pAppDelegate) _pAppDelegate->startCaptureModifiedChannels(TQLocalizedString(undoKey));
+    willModify(list);
+    willModifyValue(list);
+    operation(list);
+    didModifyValue(list);
+    didModify(list);
+    if (_pAppDelegate) _pAppDelegate->endCaptureModifiedChannels();
+    postNotification(kTQNotifyChannelsChanged);
+}
+
+// ---- View support -----------------------------------------------------------------------
+
+CGRect TQCurveEditorCtrlBase::getMaxViewVolume() const {
+    double maximum = 0.0;
+    double minimum = 0.0;
+    if (_selectedCurveSet) {
+        const std::vector<TQCurveEditorItemPtr> items = _selectedCurveSet->allItems();
+        if (!items.empty()) {
+            // The maximum starts at the smallest positive double, not the most negative one:
+            // a set whose curves all lie below zero keeps its upper bound at about zero.
+            maximum = DBL_MIN;
+            minimum = DBL_MAX;
+            for (const TQCurveEditorItemPtr& item : items) {
+                auto* c = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
+                if (!c) continue;
+                maximum = std::max(maximum, convertFromChannelCoords(c, c->maxY()));
+                minimum = std::min(minimum, convertFromChannelCoords(c, c->minY()));
+            }
+        }
+    }
+    const CGRect current = _view ? _view->getCurrentViewVolume() : CGRectZero;
+    const double padding = _view ? _view->getZoomPadding() : 0.0;
+    const double h = current.size.height;
+    const double top = std::max(current.origin.y + h, maximum + padding * h);
+    const double bottom = std::min(current.origin.y, minimum - padding * h);
+    return CGRectMake(current.origin.x, bottom, current.size.width, top - bottom);
+}
+
+void TQCurveEditorCtrlBase::magnifyGestureWithEvent(const RWEvent& event, double andFactor) {
+    (void)event;
+    if (_view) _view->zoomWithFactor(_view->zoomX() + andFactor * -0.5, 1.0);
+}
+
+bool TQCurveEditorCtrlBase::runValuePanel(TQCurveEditorValueWindow& window) {
+    const RWModalResponse response = RWApplicationServices().modal->runModalForWindow(window);
+    // The panel ends with 1 on OK and 0 on cancel; an aborted or stopped run (nothing could
+    // be shown, or something else ended the run) is not an answer either.
+    return response > 0;
+}
+
+void TQCurveEditorCtrlBase::showValueAtPoint(const CGPoint& point, RWWindow* inWindow,
+                                             const CGRect& withRect) {
+    TQCurveSelectionList* list = viewSelection();
+    if (!list || list->empty()) return;
+    const TQCurveSelectionPtr entry = list->selectionAtIndex(0);
+    TQChannel* channel = entry ? channelForEntry(*entry) : nullptr;
+    if (!channel || dynamic_cast<TQChannelBool*>(channel)) return;
+    const TQKeyframeHandle handle = entry->getHandle();
+    double value = 0.0;
+    if (!channel->getKeyframe(handle, nullptr, &value)) return;
+    const double displayScale = channel->getInfo()->displayScale;
+
+    TQCurveEditorValueWindow window;
+    window.setTitle("TQCurveEditorValueView");
+    window.value = value * displayScale;
+    window.location = point;
+    window.parentRect = withRect;
+    window.parentWindow = inWindow;
+    if (!runValuePanel(window)) return;
+    // The panel ran a modal loop: the channel may have gone meanwhile.
+    channel = channelForEntry(*entry);
+    if (!channel) return;
+    // Deliberately outside any bracket and without a dirty mark, as this has always been.
+    channel->noteWillChange(true);
+    channel->setKeyframeValue(handle, displayScale != 0.0 ? window.value / displayScale : window.value);
+}
+
+// ---- Menus ------------------------------------------------------------------------------
+
+namespace {
+
+struct InterpolationEntry {
+    int64_t tag;
+    const char* key;
+};
+
+constexpr InterpolationEntry kInterpolationItems[] = {
+    {kTQInterpolationConstant, "Anim Menu Interpolation Constant"},
+    {kTQInterpolationLinear, "Anim Menu Interpolation Linear"},
+    {kTQInterpolationBezier, "Anim Menu Interpolation Bezier"},
+    {kTQInterpolationCatmullRom, "Anim Menu Interpolation Catmull Rom"},
+    {kTQInterpolationExp, "Anim Menu Interpolation Exp"},
+    {kTQInterpolationLog, "Anim Menu Interpolation Log"},
+};
+
+RWMenuItemPtr addItem(RWMenu& menu, const char* key, const char* action, RWActionTarget* target) {
+    RWMenuItemPtr item = menu.addItemWithTitle(TQLocalizedString(key), action, "");
+    item->setTarget(target);
+    item->setTag(0);
+    return item;
+}
+
+// "Anim Menu Interpolation" with its six items, each sending `action` with its code as tag.
+void addInterpolationSubmenu(RWMenu& menu, const char* action, RWActionTarget* target) {
+    auto submenu = std::make_shared<RWMenu>(TQLocalizedString("Anim Menu Interpolation"));
+    for (const InterpolationEntry& e : kInterpolationItems) {
+        RWMenuItemPtr item = submenu->addItemWithTitle(TQLocalizedString(e.key), action, "");
+        item->setTarget(target);
+        item->setTag(e.tag);
+    }
+    RWMenuItemPtr holder = menu.addItemWithTitle(TQLocalizedString("Anim Menu Interpolation"), "", "");
+    holder->setTag(0);
+    menu.setSubmenuForItem(submenu, *holder);
+}
+
+}  // namespace
+
+void TQCurveEditorCtrlBase::buildKeyframeMenu() {
+    auto menu = std::make_shared<RWMenu>("");
+    addItem(*menu, "Curve Editor Menu Delete", "menuDelete:", this);
+    menu->addItem(RWMenuItem::separatorItem());
+    addItem(*menu, "Curve Editor Menu Reverse", "menuReverse:", this);
+    menu->addItem(RWMenuItem::separatorItem());
+    addItem(*menu, "Anim Menu Ease In", "menuEaseIn:", this);
+    addItem(*menu, "Anim Menu Ease Out", "menuEaseOut:", this);
+    addItem(*menu, "Anim Menu Ease Both", "menuEaseBoth:", this);
+    menu->addItem(RWMenuItem::separatorItem());
+    addInterpolationSubmenu(*menu, "menuSetKeypointInterpolation:", this);
+    menu->addItem(RWMenuItem::separatorItem());
+    addItem(*menu, "Curve Editor Menu Lock", "menuLockSelected:", this);
+    addItem(*menu, "Curve Editor Menu Disable", "menuDisableSelected:", this);
+    _keyframeMenu = menu;
+}
+
+void TQCurveEditorCtrlBase::buildCurveMenu() {
+    auto menu = std::make_shared<RWMenu>("");
+    addItem(*menu, "Curve Editor Menu Add", "menuAddKeyframe:", this);
+    menu->addItem(RWMenuItem::separatorItem());
+    addItem(*menu, "Curve Editor Menu Delete All", "menuDeleteAllKeyframes:", this);
+    menu->addItem(RWMenuItem::separatorItem());
+    addInterpolationSubmenu(*menu, "menuSetSegmentInterpolation:", this);
+    _curveMenu = menu;
+}
+
+void TQCurveEditorCtrlBase::buildTangentMenu() {
+    auto menu = std::make_shared<RWMenu>("");
+    addItem(*menu, "Curve Editor Menu Break", "menuBreakTangent:", this);
+    addItem(*menu, "Curve Editor Menu Align", "menuAlignTangent:", this);
+    _tangentMenu = menu;
+}
+
+void TQCurveEditorCtrlBase::buildDefaultMenu() { _defaultMenu = std::make_shared<RWMenu>(""); }
+
+bool TQCurveEditorCtrlBase::performAction(const std::string& action, RWMenuItem& sender) {
+    void* from = &sender;
+    if (action == "menuDelete:") menuDelete(from);
+    else if (action == "menuDuplicate:") menuDuplicate(from);
+    else if (action == "menuReverse:") menuReverse(from);
+    else if (action == "menuEaseIn:") menuEaseIn(from);
+    else if (action == "menuEaseOut:") menuEaseOut(from);
+    else if (action == "menuEaseBoth:") menuEaseBoth(from);
+    else if (action == "menuLockSelected:") menuLockSelected(from);
+    else if (action == "menuDisableSelected:") menuDisableSelected(from);
+    else if (action == "menuAddKeyframe:") menuAddKeyframe(from);
+    else if (action == "menuBreakTangent:")
+        performWithBracket("Undo Break Tangents", [this](TQCurveSelectionList* l) { breakTangentsSelected(l); });
+    else if (action == "menuAlignTangent:")
+        performWithBracket("Undo Align Tangents", [this](TQCurveSelectionList* l) { alignTangentsSelected(l); });
+    else return false;
+    return true;
+}

@@ -1,0 +1,257 @@
+// The controller's core: brackets as the host sees them, queries, conversions, the maximum
+// view volume, sampling, the value panel and the menus.
+
+#include <cfloat>
+#include <string>
+#include <vector>
+
+#include "platform/channels/TQChannelTypes.h"
+#include "src/engine/tests/EngineFixture.h"
+
+using namespace engine_test;
+using Seq = std::vector<std::string>;
+
+class CtrlCore : public EngineFixture {};
+
+TEST_F(CtrlCore, brackets__drag_of_ten_steps_announces_each_channel_once_per_phase) {
+    TQChannel* a = addChannel("A", {{1, 0}, {2, 1}});
+    TQChannel* b = addChannel("B", {{1, 0}});
+    auto ia = addItem(a);
+    auto ib = addItem(b);
+    TQCurveSelectionList* list = selectInView({keypointEntry(ia, 1), keypointEntry(ia, 2), keypointEntry(ib, 1)});
+
+    // The drag variant: one capture, ten value steps, one close.
+    ctrl().validateSelection(list);
+    recorder.startCaptureModifiedChannels("Move");
+    ctrl().willModify(list);
+    for (int step = 0; step < 10; ++step) {
+        ctrl().willModifyValue(list);
+        a->noteWillChange(true);
+        a->setKeyframeValue(list->selectionAtIndex(0)->getHandle(), step);
+        ctrl().didModifyValue(list);
+        recorder.postNotification(kTQNotifyChannelsChanging);
+    }
+    ctrl().didModify(list);
+    recorder.endCaptureModifiedChannels();
+    recorder.postNotification(kTQNotifyChannelsChanged);
+
+    Seq expected = {"startCaptureModifiedChannels(Move)", "willChangeChannel(A)", "willChangeChannel(B)"};
+    for (int step = 0; step < 10; ++step) {
+        Seq one = {"willSetChannelValue(A)", "willSetChannelValue(B)", "didSetChannelValue(B)",
+                   "didSetChannelValue(A)", "postNotification(0x4)"};
+        expected.insert(expected.end(), one.begin(), one.end());
+    }
+    Seq tail = {"didChangeChannel(B)", "didChangeChannel(A)", "endCaptureModifiedChannels()",
+                "postNotification(0x8)"};
+    expected.insert(expected.end(), tail.begin(), tail.end());
+    EXPECT_EQ(recorder.bracketSequence(), expected);
+    EXPECT_EQ(recorder.captureBalance(), 0);
+    EXPECT_TRUE(host.canUndo()) << "the host should have recorded the step";
+}
+
+TEST_F(CtrlCore, brackets__entry_of_a_removed_channel_is_not_announced) {
+    TQChannel* a = addChannel("A", {{1, 0}});
+    TQChannel* gone = addChannel("Gone", {{1, 0}});
+    TQChannel* b = addChannel("B", {{1, 0}});
+    auto ia = addItem(a);
+    auto ig = addItem(gone);
+    auto ib = addItem(b);
+    const uint32_t goneId = ig->channelId();
+    selectInView({keypointEntry(ia, 1), keypointEntry(ig, 1), keypointEntry(ib, 1)});
+    object->removeChild(gone);
+
+    ctrl().menuReverse();
+
+    const Seq expected = {"postNotification(0x20000)",  // the vanished curve leaves the set
+                          "startCaptureModifiedChannels(Reverse Keypoints)",
+                          "willChangeChannel(A)", "willChangeChannel(B)",
+                          "willSetChannelValue(A)", "willSetChannelValue(B)",
+                          "didSetChannelValue(B)", "didSetChannelValue(A)",
+                          "didChangeChannel(B)", "didChangeChannel(A)",
+                          "endCaptureModifiedChannels()", "postNotification(0x8)"};
+    EXPECT_EQ(recorder.bracketSequence(), expected);
+    EXPECT_EQ(ctrl().channelItemWithIdentifier(goneId), nullptr);
+    EXPECT_EQ(view.getSelection()->size(), 2u);
+}
+
+TEST_F(CtrlCore, queries__selected_bounds_skip_the_primary_entry) {
+    TQChannel* a = addChannel("A", {{1, 5}, {3, -2}});
+    auto ia = addItem(a);
+    ia->setScaleY(1.0);
+    TQCurveSelectionList list;
+    double minX = 0, maxX = 0, minY = 0, maxY = 0;
+    {
+        list.addSelection(keypointEntry(ia, 1));
+        EXPECT_FALSE(ctrl().getSelected(&list, &minX, &maxX, &minY, &maxY));
+        EXPECT_EQ(minX, static_cast<double>(FLT_MAX));
+        EXPECT_EQ(maxY, -static_cast<double>(FLT_MAX));
+    }
+    {
+        list.addSelection(keypointEntry(ia, 3));
+        EXPECT_TRUE(ctrl().getSelected(&list, &minX, &maxX, nullptr, &maxY));
+        EXPECT_NEAR(minX, 3.0, kValueTolerance) << "only the second keypoint is measured";
+        EXPECT_NEAR(maxX, 3.0, kValueTolerance);
+        EXPECT_NEAR(maxY, -2.0, kValueTolerance);
+    }
+}
+
+TEST_F(CtrlCore, conversion__round_trip_through_channel_units) {
+    auto item = addItem(addChannel("A", {{1, 0}}));
+    item->setScaleY(2.5);
+    item->setOffsetY(-0.75);
+    for (double v : {-3.0, 0.0, 0.4, 1e6}) {
+        const double channelValue = ctrl().convertToChannelCoords(item.get(), v);
+        EXPECT_NEAR(ctrl().convertFromChannelCoords(item.get(), channelValue), v, kValueTolerance * (1 + std::abs(v)));
+    }
+    EXPECT_EQ(ctrl().convertToChannelCoords(nullptr, 4.0), 4.0) << "no item: value unchanged";
+}
+
+TEST_F(CtrlCore, maxViewVolume__empty_set_and_negative_curves) {
+    const double p = view.getZoomPadding();
+    {
+        const CGRect r = ctrl().getMaxViewVolume();
+        EXPECT_NEAR(r.origin.y, std::min(-1.0, 0.0 - p * 2.0), kValueTolerance);
+        EXPECT_NEAR(r.origin.y + r.size.height, 1.0, kValueTolerance);
+        EXPECT_EQ(r.origin.x, 0.0);
+        EXPECT_EQ(r.size.width, 10.0);
+    }
+    {
+        auto item = addItem(addChannel("Low", {{0, -50}, {1, -40}}));
+        item->setScaleY(1.0);
+        view.setCurrentViewVolume(CGRectMake(0, -60, 10, 0.5));
+        const CGRect r = ctrl().getMaxViewVolume();
+        // The running maximum starts at the smallest positive double, not at -infinity.
+        EXPECT_NEAR(r.origin.y + r.size.height, DBL_MIN + p * 0.5, kValueTolerance);
+        EXPECT_NEAR(r.origin.y, std::min(-60.0, -50.0 - p * 0.5), kValueTolerance);
+    }
+}
+
+TEST_F(CtrlCore, sets__append_remove_and_first_channel) {
+    TQCompoundChannel* folder = addCompound("Pos", 2, false, {{1, 0}});
+    TQCurveEditorItemPtr last = ctrl().appendFolder(folder, set);
+    ASSERT_NE(last, nullptr);
+    EXPECT_EQ(last->channelBase(), folder->getChild(1));
+    EXPECT_EQ(ctrl().numberOfChannelItems(), 2u);
+    EXPECT_EQ(recorder.count("postNotification"), 3u) << "one per item and one per level";
+
+    {
+        // Selected but disabled items are passed over.
+        auto first = set->channeItemAtIndex(0);
+        auto second = set->channeItemAtIndex(1);
+        first->select(1);
+        first->enableItem(0);
+        second->select(1);
+        EXPECT_EQ(ctrl().getFirstChannel(), second);
+    }
+    {
+        recorder.clearCalls();
+        auto plain = std::make_shared<TQCurveSet>();
+        plain->initWithName("Plain", &recorder);
+        ctrl().setSelectedCurveSet(plain);
+        recorder.clearCalls();
+        EXPECT_FALSE(ctrl().removeSelectedChannelFromSelectedCurveSet());
+        EXPECT_EQ(recorder.count("postNotification"), 0u) << "a set without removal posts nothing";
+        EXPECT_EQ(ctrl().appendChannel(static_cast<TQChannel*>(folder->getChild(0)), plain), nullptr);
+    }
+}
+
+TEST_F(CtrlCore, linkedParent__ignores_the_controller_flag) {
+    TQCompoundChannel* unlinked = addCompound("Free", 2, false, {});
+    TQCompoundChannel* linked = addCompound("Tied", 2, true, {});
+    ctrl()._linked = true;
+    EXPECT_EQ(ctrl().getChannelsLinkedParent(static_cast<TQChannel*>(unlinked->getChild(0))), nullptr);
+    EXPECT_EQ(ctrl().getChannelsLinkedParent(static_cast<TQChannel*>(linked->getChild(0))), linked);
+    EXPECT_EQ(ctrl().getChannelsLinkedParent(nullptr), nullptr);
+}
+
+TEST_F(CtrlCore, samples__refresh_when_dirty_and_nothing_for_a_foreign_item) {
+    auto item = addItem(addChannel("A", {{0, 0}, {1, 1}}));
+    const CMTime* u = nullptr;
+    const double* v = nullptr;
+    unsigned n = 11;
+    ctrl().getSamples(item.get(), 0, kCMTimeZero, CMTimeMake(1, 10), &u, &v, &n);
+    ASSERT_NE(v, nullptr);
+    EXPECT_EQ(n, 11u);
+    EXPECT_NEAR(v[10], 1.0, kValueTolerance);
+
+    auto stranger = std::make_shared<TQCurveEditorChannelItem>();
+    stranger->initWithChannel(addChannel("B", {}), 5, &recorder, 0);
+    n = 7;
+    ctrl().getSamples(stranger.get(), 0, kCMTimeZero, CMTimeMake(1, 10), &u, &v, &n);
+    EXPECT_EQ(u, nullptr);
+    EXPECT_EQ(v, nullptr);
+    EXPECT_EQ(n, 0u);
+}
+
+class CtrlValuePanel : public CtrlCore {
+protected:
+    void SetUp() override {
+        CtrlCore::SetUp();
+        RWServiceSet services;
+        services.modal = &modal;
+        RWInstallServices(services);
+    }
+    void TearDown() override {
+        RWResetServices();
+        CtrlCore::TearDown();
+    }
+    RWScriptedModal modal;
+};
+
+TEST_F(CtrlValuePanel, showValue__writes_the_accepted_value_in_channel_units) {
+    TQChannel* a = addChannel("A", {{1, 0.5}});
+    a->getInfo()->displayScale = 100.0;
+    auto item = addItem(a);
+    selectInView({keypointEntry(item, 1)});
+    double shown = 0.0;
+    modal.pushScript([&](RWWindow& window, RWModalService& m) {
+        auto* panel = dynamic_cast<TQCurveEditorValueWindow*>(&window);
+        ASSERT_NE(panel, nullptr);
+        shown = panel->value;
+        panel->value = 25.0;
+        m.stopModalWithCode(RWModalResponseOK);
+    });
+    ctrl().showValueAtPoint(CGPointMake(10, 10), nullptr, CGRectMake(0, 0, 5, 5));
+    EXPECT_NEAR(shown, 50.0, kValueTolerance) << "the panel shows the value times displayScale";
+    EXPECT_NEAR(keyValueAt(a, 1), 0.25, kValueTolerance);
+    EXPECT_TRUE(recorder.bracketSequence().empty()) << "the value panel opens no bracket";
+
+    modal.pushScript([](RWWindow& window, RWModalService& m) {
+        static_cast<TQCurveEditorValueWindow&>(window).value = 99.0;
+        m.stopModalWithCode(RWModalResponseCancel);
+    });
+    ctrl().showValueAtPoint(CGPointMake(10, 10), nullptr, CGRectMake(0, 0, 5, 5));
+    EXPECT_NEAR(keyValueAt(a, 1), 0.25, kValueTolerance) << "a cancelled panel changes nothing";
+}
+
+TEST_F(CtrlValuePanel, showValue__boolean_channel_opens_no_panel) {
+    auto item = addItem(static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannelBool>("On", 77))));
+    item->channel()->setKeyframe(seconds(1), 1.0);
+    selectInView({keypointEntry(item, 1)});
+    ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);
+    EXPECT_TRUE(modal.runs().empty());
+}
+
+TEST_F(CtrlCore, menus__built_from_the_tables_and_routed_to_actions) {
+    const RWMenuPtr& keys = ctrl().getKeyframeMenu();
+    ASSERT_NE(keys, nullptr);
+    ASSERT_EQ(keys->numberOfItems(), 12);
+    EXPECT_EQ(keys->itemAtIndex(0)->action(), "menuDelete:");
+    const RWMenuItemPtr interpolation = keys->itemAtIndex(8);
+    ASSERT_TRUE(interpolation->hasSubmenu());
+    std::vector<int64_t> tags;
+    for (const auto& item : interpolation->submenu()->itemArray()) tags.push_back(item->tag());
+    EXPECT_EQ(tags, (std::vector<int64_t>{0, 1, 4, 6, 13, 14}));
+    EXPECT_EQ(ctrl().getDefaultMenu()->numberOfItems(), 0);
+    EXPECT_EQ(ctrl().getTangentMenu()->itemAtIndex(1)->action(), "menuAlignTangent:");
+
+    RWMenuItem unknown("x", "menuNoSuchThing:");
+    EXPECT_FALSE(ctrl().performAction("menuNoSuchThing:", unknown));
+}
+
+TEST_F(CtrlCore, tool__change_tells_the_view) {
+    ctrl().setCurrentTool(2);
+    EXPECT_EQ(ctrl().getCurrentTool(), 2u);
+    EXPECT_EQ(recorder.count("postNotification"), 1u);
+    EXPECT_EQ(recorder.calls().back().word, kTQNotifyToolChangedWord);
+}
