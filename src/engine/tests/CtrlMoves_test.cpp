@@ -1,0 +1,312 @@
+// Moving keypoints: the order of the channel calls, the clamp at time 0, the frame grid, the
+// linked compounds, the nudge and curve forms, and a whole drag through the host's brackets.
+
+#include <string>
+#include <vector>
+
+#include "src/engine/tests/EngineFixture.h"
+#include "src/resources/TQStrings.h"
+
+namespace engine_test {
+namespace {
+
+constexpr double kTimeTolerance = 1.0 / kTimescale;  // one tick of the channels' timescale
+
+// A channel that logs every moveKeyframe (name and source axis time) into a shared log, so a
+// test sees the order in which keypoints of one or several channels were moved.
+class MoveLoggingChannel : public TQChannel {
+public:
+    MoveLoggingChannel(const char* name, TQChannelId id, std::vector<std::string>* log)
+        : TQChannel(name, id), _log(log) {}
+    void moveKeyframe(const CMTime* from, const CMTime* to, bool keepBoth) override {
+        char text[64];
+        std::snprintf(text, sizeof text, "%s@%g", getName().c_str(),
+                      from ? CMTimeGetSeconds(*from) : -1.0);
+        _log->push_back(text);
+        TQChannel::moveKeyframe(from, to, keepBoth);
+    }
+
+private:
+    std::vector<std::string>* _log;
+};
+
+class CtrlMovesTest : public EngineFixture {
+protected:
+    TQChannel* addLoggingChannel(const char* name, std::initializer_list<std::pair<double, double>> keys) {
+        auto* c = static_cast<TQChannel*>(object->addChild(
+            std::make_unique<MoveLoggingChannel>(name, nextChannelId++, &moveLog)));
+        for (const auto& [t, v] : keys) c->setKeyframe(seconds(t), v);
+        return c;
+    }
+
+    std::vector<std::string> moveLog;
+};
+
+TEST_F(CtrlMovesTest, moveSelected__leadingKeypointMovesFirst) {
+    TQChannel* c = addLoggingChannel("A", {{1.0, 0.0}, {2.0, 0.0}, {3.0, 0.0}});
+    auto item = addItem(c);
+    {
+        SCOPED_TRACE("moved right by 1");
+        // The anchor is listed first, the others out of time order on purpose.
+        TQCurveSelectionList* list =
+            selectInView({keypointEntry(item, 2.0), keypointEntry(item, 3.0), keypointEntry(item, 1.0)});
+        ctrl().moveSelected(list, seconds(3.0), 0.0, 1, 0);
+        EXPECT_EQ(moveLog, (std::vector<std::string>{"A@3", "A@2", "A@1"}))
+            << "moving forward must start with the latest keypoint";
+        EXPECT_EQ(keyTimes(c), (std::vector<double>{2.0, 3.0, 4.0}));
+        EXPECT_NEAR(keyValueAt(c, 4.0), 0.0, kValueTolerance) << "a move in time alone keeps values";
+    }
+    moveLog.clear();
+    {
+        SCOPED_TRACE("moved left by 1");
+        TQCurveSelectionList* list =
+            selectInView({keypointEntry(item, 3.0), keypointEntry(item, 4.0), keypointEntry(item, 2.0)});
+        ctrl().moveSelected(list, seconds(2.0), 0.0, 1, 0);
+        EXPECT_EQ(moveLog, (std::vector<std::string>{"A@2", "A@3", "A@4"}))
+            << "moving backward must start with the earliest keypoint";
+        EXPECT_EQ(keyTimes(c), (std::vector<double>{1.0, 2.0, 3.0}));
+    }
+}
+
+TEST_F(CtrlMovesTest, moveSelected__orderAcrossChannelsUsesChannelTimeWithoutOffset) {
+    ctrl().allowNegativeRange(true);
+    TQChannel* a = addLoggingChannel("A", {{1.0, 0.0}});
+    TQChannel* b = addLoggingChannel("B", {{2.0, 0.0}});
+    TQChannel* c = addLoggingChannel("C", {{3.0, 0.0}});
+    // On the axis C comes first; the order still goes by channel time.
+    c->setTimeOffset(seconds(-5.0));
+    auto ia = addItem(a);
+    auto ib = addItem(b);
+    auto ic = addItem(c);
+    TQCurveSelectionList* list =
+        selectInView({keypointEntry(ia, 1.0), keypointEntry(ic, 3.0), keypointEntry(ib, 2.0)});
+    ctrl().moveSelected(list, seconds(1.5), 0.0, 1, 0);
+    EXPECT_EQ(moveLog, (std::vector<std::string>{"C@-2", "B@2", "A@1"}));
+    EXPECT_NEAR(keyTimes(c)[0], 3.5, kTimeTolerance) << "each keypoint moves by the same dt";
+}
+
+TEST_F(CtrlMovesTest, moveSelected__withoutSelectionOrderTheAnchorStays) {
+    TQChannel* c = addLoggingChannel("A", {{1.0, 0.0}, {2.0, 0.0}});
+    auto item = addItem(c);
+    TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.0), keypointEntry(item, 2.0)});
+    ctrl().moveSelected(list, seconds(1.5), 0.0, 0, 0);
+    EXPECT_EQ(moveLog, (std::vector<std::string>{"A@2"}));
+    EXPECT_EQ(keyTimes(c), (std::vector<double>{1.0, 2.5}));
+}
+
+TEST_F(CtrlMovesTest, moveSelected__groupClampsAtZeroUnlessNegativeAllowed) {
+    {
+        SCOPED_TRACE("clamped");
+        TQChannel* c = addChannel("A", {{0.5, 0.0}, {1.5, 0.0}, {4.0, 0.0}});
+        auto item = addItem(c);
+        TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.5), keypointEntry(item, 0.5)});
+        ctrl().moveSelected(list, seconds(0.5), 0.0, 1, 0);
+        EXPECT_EQ(keyTimes(c), (std::vector<double>{0.0, 0.5, 4.0}))
+            << "the earliest keypoint must stop at 0 while the other keeps moving";
+    }
+    {
+        SCOPED_TRACE("negative range allowed");
+        ctrl().allowNegativeRange(true);
+        TQChannel* c = addChannel("B", {{0.5, 0.0}, {1.5, 0.0}});
+        auto item = addItem(c);
+        TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.5), keypointEntry(item, 0.5)});
+        ctrl().moveSelected(list, seconds(0.5), 0.0, 1, 0);
+        EXPECT_EQ(keyTimes(c), (std::vector<double>{-0.5, 0.5}));
+    }
+}
+
+TEST_F(CtrlMovesTest, moveSelected__valueMovesBySameScreenDistanceOnEveryCurve) {
+    TQChannel* a = addChannel("A", {{1.0, 10.0}});
+    TQChannel* b = addChannel("B", {{2.0, 100.0}});
+    auto ia = addItem(a);
+    auto ib = addItem(b);
+    ia->setScaleY(2.0);
+    ia->setOffsetY(0.0);
+    ib->setScaleY(50.0);
+    ib->setOffsetY(0.0);
+    // The anchor's V is 10 / 2 = 5; ask for V 6, one unit up.
+    TQCurveSelectionList* list = selectInView({keypointEntry(ia, 1.0), keypointEntry(ib, 2.0)});
+    ctrl().moveSelected(list, seconds(1.0), 6.0, 1, 1);
+    EXPECT_NEAR(keyValueAt(a, 1.0), 12.0, kValueTolerance);
+    EXPECT_NEAR(keyValueAt(b, 2.0), 150.0, kValueTolerance) << "each curve through its own scale";
+    EXPECT_EQ(keyTimes(b), (std::vector<double>{2.0})) << "a constrained move at the present time keeps it";
+}
+
+TEST_F(CtrlMovesTest, moveSelected__curveEntryMovesOnlyItsSegment) {
+    TQChannel* a = addChannel("A", {{1.0, 0.0}, {3.0, 0.0}});
+    TQChannel* b = addChannel("B", {{1.0, 5.0}});
+    auto ia = addItem(a);
+    auto ib = addItem(b);
+    ia->setScaleY(1.0);
+    TQCurveSelectionList* list = selectInView({curveEntry(ia), keypointEntry(ib, 1.0)});
+    ctrl().moveSelected(list, seconds(2.0), 0.5, 1, 0);
+    EXPECT_NEAR(a->getCurveValue(seconds(2.0)), 0.5, kValueTolerance) << "the segment goes through y";
+    EXPECT_NEAR(keyValueAt(b, 1.0), 5.0, kValueTolerance) << "other entries are ignored";
+    EXPECT_EQ(keyTimes(b), (std::vector<double>{1.0}));
+}
+
+TEST_F(CtrlMovesTest, moveSelected__twoComponentsOfLinkedCompoundMoveOnce) {
+    ctrl()._linked = true;
+    TQCompoundChannel* compound = addCompound("Position", 3, true, {{1.0, 0.0}, {3.0, 0.0}});
+    const auto components = compound->getComponents();
+    auto ix = addItem(components[0]);
+    auto iy = addItem(components[1]);
+    TQCurveSelectionList* list = selectInView({keypointEntry(ix, 1.0), keypointEntry(iy, 1.0)});
+    ctrl().moveSelected(list, seconds(1.5), 0.0, 1, 0);
+    for (TQChannel* component : components) {
+        SCOPED_TRACE(component->getName());
+        const std::vector<double> times = keyTimes(component);
+        ASSERT_EQ(times.size(), 2u);
+        EXPECT_NEAR(times[0], 1.5, kTimeTolerance) << "each component must move once, by dt";
+        EXPECT_NEAR(times[1], 3.0, kTimeTolerance);
+    }
+    EXPECT_EQ(ix->originalCurveDirty(), 1);
+    EXPECT_EQ(iy->originalCurveDirty(), 1);
+}
+
+TEST_F(CtrlMovesTest, offsetSelected__nudgesWithoutMovingInTimeWhenXIsZero) {
+    TQChannel* c = addLoggingChannel("A", {{1.0, 1.0}, {2.0, 2.0}});
+    auto item = addItem(c);
+    item->setScaleY(4.0);
+    TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.0), keypointEntry(item, 2.0)});
+    ctrl().offsetSelected(list, kCMTimeZero, 0.5);
+    EXPECT_TRUE(moveLog.empty()) << "a purely vertical nudge must not call moveKeyframe";
+    EXPECT_NEAR(keyValueAt(c, 1.0), 3.0, kValueTolerance);
+    EXPECT_NEAR(keyValueAt(c, 2.0), 4.0, kValueTolerance);
+
+    ctrl().offsetSelected(list, seconds(0.5), 0.0);
+    EXPECT_EQ(moveLog, (std::vector<std::string>{"A@2", "A@1"}));
+    EXPECT_EQ(keyTimes(c), (std::vector<double>{1.5, 2.5}));
+}
+
+TEST_F(CtrlMovesTest, offsetCurve__movesWholeCurveOfFirstEntry) {
+    TQChannel* a = addChannel("A", {{1.0, 1.0}, {2.0, 2.0}});
+    TQChannel* b = addChannel("B", {{1.0, 1.0}});
+    auto ia = addItem(a);
+    auto ib = addItem(b);
+    ia->setScaleY(2.0);
+    TQCurveSelectionList* list = selectInView({curveEntry(ia), curveEntry(ib)});
+    ctrl().offsetCurve(list, seconds(1.0), 0.5);
+    EXPECT_NEAR(keyValueAt(a, 1.0), 2.0, kValueTolerance);
+    EXPECT_NEAR(keyValueAt(a, 2.0), 3.0, kValueTolerance);
+    EXPECT_NEAR(keyValueAt(b, 1.0), 1.0, kValueTolerance) << "only entry 0's curve moves";
+}
+
+TEST_F(CtrlMovesTest, moves__emptyOrVanishedSelectionDoesNothing) {
+    ctrl().moveSelected(nullptr, seconds(1.0), 0.0, 1, 0);
+    ctrl().offsetSelected(nullptr, seconds(1.0), 0.0);
+    ctrl().offsetCurve(nullptr, seconds(1.0), 0.0);
+    TQChannel* c = addChannel("A", {{1.0, 0.0}});
+    auto item = addItem(c);
+    auto entry = keypointEntry(item, 1.0);
+    ASSERT_TRUE(set->removeItemWithIdentifier(item->channelId()));
+    TQCurveSelectionList* list = selectInView({entry});
+    ctrl().moveSelected(list, seconds(2.0), 1.0, 1, 0);
+    EXPECT_EQ(keyTimes(c), (std::vector<double>{1.0})) << "an entry of a removed item must not move";
+    EXPECT_TRUE(list->empty()) << "validateSelection takes the entry out";
+}
+
+TEST_F(CtrlMovesTest, sortKeypoints__byTimeBothWaysWithTiesAndNulls) {
+    const auto key = [](double t) {
+        auto k = std::make_shared<TQKeyframe>();
+        k->setU(seconds(t));
+        return k;
+    };
+    std::vector<TQKeyframePtr> keys{key(2.0), key(1.0), nullptr, key(1.0), key(-1.0)};
+    const TQKeyframe* firstOne = keys[1].get();
+    ctrl().sortKeypoints(keys, false);
+    ASSERT_EQ(keys.size(), 5u);
+    EXPECT_NEAR(CMTimeGetSeconds(keys[0]->u()), -1.0, kTimeTolerance);
+    EXPECT_EQ(keys[1], nullptr) << "a null element counts as time 0";
+    EXPECT_EQ(keys[2].get(), firstOne) << "equal times keep a valid, stable order";
+    EXPECT_NEAR(CMTimeGetSeconds(keys[4]->u()), 2.0, kTimeTolerance);
+    ctrl().sortKeypoints(keys, true);
+    EXPECT_NEAR(CMTimeGetSeconds(keys[0]->u()), 2.0, kTimeTolerance);
+    EXPECT_EQ(keys[3], nullptr);
+    EXPECT_NEAR(CMTimeGetSeconds(keys[4]->u()), -1.0, kTimeTolerance);
+}
+
+// The full editor puts times on a 1/30 s grid.
+class CtrlMovesGridTest : public EngineFixture {
+protected:
+    std::unique_ptr<TQCurveEditorCtrlBase> makeController() override {
+        return std::make_unique<FrameGridController>();
+    }
+};
+
+TEST_F(CtrlMovesGridTest, moveSelected__singleKeypointLandsOnFrameGroupKeepsSpacing) {
+    const double frame = 1.0 / 30.0;
+    {
+        SCOPED_TRACE("single keypoint, 1.4 frames right");
+        TQChannel* c = addChannel("A", {{1.0, 0.0}});
+        auto item = addItem(c);
+        TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.0)});
+        ctrl().moveSelected(list, seconds(1.0 + 1.4 * frame), 0.0, 1, 0);
+        EXPECT_NEAR(keyTimes(c)[0], 1.0 + frame, kTimeTolerance);
+    }
+    {
+        SCOPED_TRACE("constrained at its own time: value only");
+        TQChannel* c = addChannel("B", {{1.0 + 0.3 * frame, 0.0}});
+        auto item = addItem(c);
+        item->setScaleY(1.0);
+        TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.0 + 0.3 * frame)});
+        ctrl().moveSelected(list, seconds(1.0 + 0.3 * frame), 0.25, 1, 1);
+        EXPECT_NEAR(keyTimes(c)[0], 1.0 + 0.3 * frame, kTimeTolerance) << "no rounding when constraining";
+        EXPECT_NEAR(keyValueAt(c, 1.0 + 0.3 * frame), 0.25, kValueTolerance);
+    }
+    {
+        SCOPED_TRACE("a group off the grid keeps its spacing");
+        TQChannel* c = addChannel("C", {{1.0, 0.0}, {1.0 + 0.5 * frame, 0.0}});
+        auto item = addItem(c);
+        TQCurveSelectionList* list =
+            selectInView({keypointEntry(item, 1.0), keypointEntry(item, 1.0 + 0.5 * frame)});
+        ctrl().moveSelected(list, seconds(1.0 + 2.2 * frame), 0.0, 1, 0);
+        const std::vector<double> times = keyTimes(c);
+        ASSERT_EQ(times.size(), 2u);
+        EXPECT_NEAR(times[0], 1.0 + 2.0 * frame, kTimeTolerance) << "the anchor lands on the grid";
+        EXPECT_NEAR(times[1] - times[0], 0.5 * frame, kTimeTolerance) << "spacing must be kept";
+    }
+}
+
+// One drag of ten steps as the view runs it: the bracket opens once, each step announces the
+// values, and the host keeps the whole drag as one undo step.
+TEST_F(CtrlMovesTest, moveSelected__dragOfTenStepsIsOneBracketAndOneUndoStep) {
+    TQChannel* a = addChannel("A", {{1.0, 0.0}, {2.0, 0.0}});
+    TQChannel* b = addChannel("B", {{1.0, 0.0}});
+    auto ia = addItem(a);
+    auto ib = addItem(b);
+    TQCurveSelectionList* list = selectInView({keypointEntry(ia, 1.0), keypointEntry(ib, 1.0)});
+
+    ctrl().validateSelection(list);
+    recorder.startCaptureModifiedChannels(TQLocalizedString("Undo Move Keypoint"));
+    ctrl().willModify(list);
+    for (int step = 1; step <= 10; ++step) {
+        ctrl().willModifyValue(list);
+        ctrl().moveSelected(list, seconds(1.0 + 0.05 * step), 0.0, 1, 0);
+        ctrl().didModifyValue(list);
+        recorder.postNotification(kTQNotifyChannelsChanging);
+    }
+    ctrl().didModify(list);
+    recorder.endCaptureModifiedChannels();
+    recorder.postNotification(kTQNotifyChannelsChanged);
+
+    std::vector<std::string> expected{"startCaptureModifiedChannels(" +
+                                          TQLocalizedString("Undo Move Keypoint") + ")",
+                                      "willChangeChannel(A)", "willChangeChannel(B)"};
+    for (int step = 0; step < 10; ++step) {
+        expected.insert(expected.end(), {"willSetChannelValue(A)", "willSetChannelValue(B)",
+                                         "didSetChannelValue(B)", "didSetChannelValue(A)",
+                                         "postNotification(0x4)"});
+    }
+    expected.insert(expected.end(), {"didChangeChannel(B)", "didChangeChannel(A)",
+                                     "endCaptureModifiedChannels()", "postNotification(0x8)"});
+    EXPECT_EQ(recorder.bracketSequence(), expected);
+    EXPECT_NEAR(keyTimes(a)[0], 1.5, kTimeTolerance) << "the steps add up";
+
+    ASSERT_TRUE(host.undo());
+    EXPECT_EQ(keyTimes(a), (std::vector<double>{1.0, 2.0})) << "one undo takes back the whole drag";
+    EXPECT_EQ(keyTimes(b), (std::vector<double>{1.0}));
+}
+
+}  // namespace
+}  // namespace engine_test

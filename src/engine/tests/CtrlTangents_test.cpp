@@ -1,0 +1,269 @@
+// Tangent operations. The fixture's view maps 10 s by 2 units onto 800 x 400 pixels, so one
+// world unit is 80 pixels across and 200 up: angles in the world and on the screen differ,
+// which is what the screen-space follow of the opposite handle is about.
+
+#include <cmath>
+#include <numbers>
+
+#include "src/engine/tests/EngineFixture.h"
+
+namespace engine_test {
+namespace {
+
+constexpr double kPixelTolerance = 1e-2;    // the projection is single precision
+constexpr double kAngleTolerance = 1e-4;    // radians
+constexpr double kOffsetTolerance = 1e-5;   // handle offsets after a screen round trip
+
+double angleOf(const CGPoint& p) { return std::atan2(p.y, p.x); }
+double lengthOf(const CGPoint& p) { return std::hypot(p.x, p.y); }
+// Difference of two angles folded into (-pi, pi].
+double angleDiff(double a, double b) { return std::remainder(a - b, 2.0 * std::numbers::pi); }
+CGPoint rotated(const CGPoint& p, double angle, double scale) {
+    return CGPointMake(scale * (p.x * std::cos(angle) - p.y * std::sin(angle)),
+                       scale * (p.x * std::sin(angle) + p.y * std::cos(angle)));
+}
+
+class CtrlTangentsTest : public EngineFixture {
+protected:
+    struct Key {
+        TQChannel* channel = nullptr;
+        TQCurveEditorChannelItemPtr item;
+        TQKeyframeHandle handle = nullptr;
+        double time = 0.0;
+    };
+
+    // One keypoint at `t` with both handles set (offsets in seconds and channel units).
+    Key makeKey(const char* name, double t, double value, CGPoint in, CGPoint out,
+                bool broken = false, bool scaled = false, double scaleY = 1.0) {
+        Key k;
+        k.channel = addChannel(name, {{t, value}});
+        k.item = addItem(k.channel);
+        k.item->setScaleY(scaleY);
+        k.item->setOffsetY(0.0);
+        k.time = t;
+        k.handle = k.channel->getKeyframe(seconds(t));
+        k.channel->setKeyframeInterpolation(k.handle, kTQInterpolationBezier);
+        k.channel->setKeyframeInputTangents(k.handle, in.x, in.y, true);
+        k.channel->setKeyframeOutputTangents(k.handle, out.x, out.y, true);
+        k.channel->setKeyframeTangentsBroken(k.handle, broken);
+        k.channel->setKeyframeTangentsScaled(k.handle, scaled);
+        return k;
+    }
+
+    CGPoint handleOffset(const Key& k, bool output) const {
+        double u = 0.0;
+        double v = 0.0;
+        if (output) k.channel->getKeyframeOutputTangents(k.handle, &u, &v, true);
+        else k.channel->getKeyframeInputTangents(k.handle, &u, &v, true);
+        return CGPointMake(u, v);
+    }
+
+    CGPoint keyWorld(const Key& k) {
+        double value = 0.0;
+        k.channel->getKeyframe(k.handle, nullptr, &value);
+        return CGPointMake(k.time, ctrl().convertFromChannelCoords(k.item.get(), value));
+    }
+
+    CGPoint handleWorld(const Key& k, bool output) {
+        double value = 0.0;
+        k.channel->getKeyframe(k.handle, nullptr, &value);
+        const CGPoint o = handleOffset(k, output);
+        return CGPointMake(k.time + o.x, ctrl().convertFromChannelCoords(k.item.get(), value + o.y));
+    }
+
+    // The handle as the user sees it: pixels from its keypoint.
+    CGPoint screenVector(const Key& k, bool output) {
+        return view.getPointScreen(handleWorld(k, output)) - view.getPointScreen(keyWorld(k));
+    }
+
+    // Drags the handle so that it shows `screen` pixels from its keypoint.
+    void dragTo(const Key& k, bool output, const CGPoint& screen) {
+        auto entry = tangentEntry(k.item, k.time, output);
+        const CGPoint w = view.getPointWorld(view.getPointScreen(keyWorld(k)) + screen);
+        ctrl().setTangents(entry.get(), w.x, w.y);
+    }
+};
+
+TEST_F(CtrlTangentsTest, setTangents__brokenPairMovesAlone) {
+    Key k = makeKey("A", 5.0, 0.0, {-0.5, -0.1}, {0.5, 0.1}, /*broken*/ true);
+    const CGPoint inBefore = handleOffset(k, false);
+    dragTo(k, true, CGPointMake(30.0, 90.0));
+    const CGPoint inAfter = handleOffset(k, false);
+    EXPECT_EQ(inAfter.x, inBefore.x) << "the opposite handle of a broken pair must not change";
+    EXPECT_EQ(inAfter.y, inBefore.y);
+    EXPECT_NEAR(screenVector(k, true).y, 90.0, kPixelTolerance) << "the dragged handle follows the pointer";
+    EXPECT_EQ(k.item->originalCurveDirty(), 1);
+}
+
+TEST_F(CtrlTangentsTest, setTangents__unscaledPairKeepsRatioAndTurnsAlike) {
+    Key k = makeKey("A", 5.0, 0.0, {-0.5, -0.1}, {0.5, 0.1});
+    const CGPoint d = screenVector(k, true);
+    const CGPoint o = screenVector(k, false);
+    const double turn = 0.4;
+    dragTo(k, true, rotated(d, turn, 2.0));
+    const CGPoint after = screenVector(k, false);
+    EXPECT_NEAR(lengthOf(after), 2.0 * lengthOf(o), kPixelTolerance)
+        << "doubling the dragged handle must double the opposite one on screen";
+    EXPECT_NEAR(angleDiff(angleOf(after), angleOf(o)), turn, kAngleTolerance)
+        << "the opposite handle must turn by what the dragged one turned";
+}
+
+TEST_F(CtrlTangentsTest, setTangents__scaledPairKeepsOppositeLength) {
+    Key k = makeKey("A", 5.0, 0.0, {-0.5, -0.1}, {0.5, 0.1}, false, /*scaled*/ true);
+    const CGPoint d = screenVector(k, false);
+    const CGPoint o = screenVector(k, true);
+    dragTo(k, false, rotated(d, -0.3, 2.0));
+    const CGPoint after = screenVector(k, true);
+    EXPECT_NEAR(lengthOf(after), lengthOf(o), kPixelTolerance);
+    EXPECT_NEAR(angleDiff(angleOf(after), angleOf(o)), -0.3, kAngleTolerance);
+}
+
+TEST_F(CtrlTangentsTest, setTangents__pairAngleOtherThanStraightIsKept) {
+    Key k = makeKey("A", 5.0, 0.0, {-0.3, 0.2}, {0.5, 0.1});
+    const double pairAngle = angleDiff(angleOf(screenVector(k, false)), angleOf(screenVector(k, true)));
+    ASSERT_GT(std::abs(std::abs(pairAngle) - std::numbers::pi), 0.1) << "set-up must not be straight";
+    dragTo(k, true, rotated(screenVector(k, true), 1.1, 0.7));
+    const double after = angleDiff(angleOf(screenVector(k, false)), angleOf(screenVector(k, true)));
+    EXPECT_NEAR(angleDiff(after, pairAngle), 0.0, kAngleTolerance);
+}
+
+TEST_F(CtrlTangentsTest, setTangents__zeroLengthHandlePulledOutMirrorsInChannelUnits) {
+    Key k = makeKey("A", 5.0, 0.0, {-0.5, -0.1}, {0.0, 0.0});
+    auto entry = tangentEntry(k.item, 5.0, true);
+    ctrl().setTangents(entry.get(), 5.4, 0.3);
+    const CGPoint out = handleOffset(k, true);
+    const CGPoint in = handleOffset(k, false);
+    EXPECT_NEAR(out.x, 0.4, kOffsetTolerance);
+    EXPECT_NEAR(out.y, 0.3, kOffsetTolerance);
+    EXPECT_NEAR(in.x, -0.4, kOffsetTolerance) << "the opposite must be the negation, not a screen copy";
+    EXPECT_NEAR(in.y, -0.3, kOffsetTolerance);
+}
+
+TEST_F(CtrlTangentsTest, setTangents45__snapsToScreenMultiplesOf45) {
+    Key k = makeKey("A", 5.0, 0.0, {-0.5, -0.1}, {0.37, 0.05}, /*broken*/ true);
+    auto entry = tangentEntry(k.item, 5.0, true);
+    const CGPoint key = view.getPointScreen(keyWorld(k));
+    struct Case {
+        double pointerDegrees;
+        double snappedDegrees;
+    };
+    for (const Case c : {Case{40.0, 45.0}, Case{80.0, 90.0}, Case{-10.0, 0.0}, Case{150.0, 135.0}}) {
+        SCOPED_TRACE(c.pointerDegrees);
+        const double a = c.pointerDegrees * std::numbers::pi / 180.0;
+        const CGPoint pointer = view.getPointWorld(key + CGPointMake(100.0 * std::cos(a), 100.0 * std::sin(a)));
+        ctrl().setTangents45(entry.get(), pointer.x, pointer.y, 0);
+        EXPECT_NEAR(angleOf(screenVector(k, true)) * 180.0 / std::numbers::pi, c.snappedDegrees, 1e-3)
+            << "with flag clear the steps are absolute screen directions";
+    }
+}
+
+TEST_F(CtrlTangentsTest, setTangents45__flagSetStepsFromSavedHandle) {
+    // Saved at 10 degrees on screen: the family is 10, 55, 100...
+    Key k = makeKey("A", 5.0, 0.0, {-0.5, -0.1}, {0.5, 0.0}, /*broken*/ true);
+    const CGPoint key = view.getPointScreen(keyWorld(k));
+    const double saved = 10.0 * std::numbers::pi / 180.0;
+    dragTo(k, true, CGPointMake(80.0 * std::cos(saved), 80.0 * std::sin(saved)));
+    auto entry = tangentEntry(k.item, 5.0, true);
+    ctrl().saveTangents(entry.get());
+    const double a = 60.0 * std::numbers::pi / 180.0;
+    const CGPoint pointer = view.getPointWorld(key + CGPointMake(100.0 * std::cos(a), 100.0 * std::sin(a)));
+    ctrl().setTangents45(entry.get(), pointer.x, pointer.y, 1);
+    EXPECT_NEAR(angleOf(screenVector(k, true)) * 180.0 / std::numbers::pi, 55.0, 1e-2);
+}
+
+TEST_F(CtrlTangentsTest, setTangents45Selected__sameScreenHandleOnCurvesOfDifferentScale) {
+    Key a = makeKey("A", 2.0, 0.2, {-0.5, -0.1}, {0.5, 0.1}, false, false, 1.0);
+    Key b = makeKey("B", 4.0, 0.5, {-0.2, -0.3}, {0.2, 0.3}, false, false, 2.0);
+    Key c = makeKey("C", 6.0, -0.1, {-0.4, 0.0}, {0.4, 0.0}, false, false, 0.5);
+    TQCurveSelectionList* list =
+        selectInView({tangentEntry(a.item, 2.0, true), keypointEntry(b.item, 4.0), keypointEntry(c.item, 6.0)});
+    const CGPoint key = view.getPointScreen(keyWorld(a));
+    const CGPoint pointer = view.getPointWorld(key + CGPointMake(60.0, 57.0));
+    ctrl().setTangents45Selected(list, pointer.x, pointer.y, 0);
+    const CGPoint expected = screenVector(a, true);
+    EXPECT_NEAR(angleOf(expected), std::numbers::pi / 4.0, kAngleTolerance);
+    for (const Key* k : {&b, &c}) {
+        SCOPED_TRACE(k->channel->getName());
+        const CGPoint got = screenVector(*k, true);
+        EXPECT_NEAR(got.x, expected.x, kPixelTolerance) << "every keypoint gets the same on-screen handle";
+        EXPECT_NEAR(got.y, expected.y, kPixelTolerance);
+    }
+    EXPECT_EQ(list->selectionAtIndex(1)->getFlags(), TQSelectionKeypoint) << "the entry's word is restored";
+}
+
+TEST_F(CtrlTangentsTest, setTangentsSelected__sameWorldDeltaAndHandleEntriesSkipped) {
+    Key a = makeKey("A", 2.0, 0.2, {-0.5, -0.1}, {0.5, 0.1}, true, false, 1.0);
+    Key b = makeKey("B", 4.0, 0.5, {-0.2, -0.3}, {0.2, 0.3}, true, false, 2.0);
+    Key c = makeKey("C", 6.0, -0.1, {-0.4, 0.0}, {0.4, 0.0}, true, false, 0.5);
+    TQCurveSelectionList* list = selectInView(
+        {tangentEntry(a.item, 2.0, true), keypointEntry(b.item, 4.0), tangentEntry(c.item, 6.0, false)});
+    const CGPoint aBefore = handleWorld(a, true);
+    const CGPoint bBefore = handleWorld(b, true);
+    const CGPoint cBefore = handleOffset(c, false);
+    const CGPoint delta = CGPointMake(0.25, -0.15);
+    ctrl().setTangentsSelected(list, aBefore.x + delta.x, aBefore.y + delta.y);
+    const CGPoint bAfter = handleWorld(b, true);
+    EXPECT_NEAR(bAfter.x - bBefore.x, delta.x, kOffsetTolerance) << "the same world delta on a keypoint entry";
+    EXPECT_NEAR(bAfter.y - bBefore.y, delta.y, kOffsetTolerance);
+    EXPECT_EQ(handleOffset(c, false), cBefore) << "a handle entry after the first is left alone";
+}
+
+TEST_F(CtrlTangentsTest, breakTangentsSelected__allTakeOppositeOfFirst) {
+    Key a = makeKey("A", 2.0, 0.0, {-0.5, 0.0}, {0.5, 0.0}, /*broken*/ true);
+    Key b = makeKey("B", 4.0, 0.0, {-0.5, 0.0}, {0.5, 0.0}, /*broken*/ false);
+    TQCurveSelectionList* list = selectInView({keypointEntry(a.item, 2.0), tangentEntry(b.item, 4.0, true)});
+    ctrl().breakTangentsSelected(list);
+    EXPECT_FALSE(a.channel->getKeyframeTangentsBroken(a.handle));
+    EXPECT_FALSE(b.channel->getKeyframeTangentsBroken(b.handle)) << "not toggled one by one";
+    ctrl().breakTangents(list->selectionAtIndex(0).get());
+    EXPECT_TRUE(a.channel->getKeyframeTangentsBroken(a.handle)) << "the single form toggles";
+}
+
+TEST_F(CtrlTangentsTest, alignTangentsSelected__mirrorsThePickedSide) {
+    {
+        Key k = makeKey("A", 2.0, 0.0, {-0.3, 0.4}, {0.5, 0.1}, true);
+        TQCurveSelectionList* list = selectInView({tangentEntry(k.item, 2.0, false)});
+        ctrl().alignTangentsSelected(list);
+        EXPECT_EQ(handleOffset(k, true), CGPointMake(0.3, -0.4)) << "input overwrites output";
+    }
+    {
+        Key k = makeKey("B", 2.0, 0.0, {-0.3, 0.4}, {0.5, 0.1}, true);
+        TQCurveSelectionList* list = selectInView({tangentEntry(k.item, 2.0, true)});
+        ctrl().alignTangentsSelected(list);
+        EXPECT_EQ(handleOffset(k, false), CGPointMake(-0.5, -0.1)) << "output overwrites input";
+    }
+}
+
+TEST_F(CtrlTangentsTest, weightAndFlatten__setBitsAndLinearSegments) {
+    TQChannel* c = addChannel("A", {{1.0, 0.0}, {2.0, 1.0}, {3.0, 0.0}});
+    auto item = addItem(c);
+    c->setInterpolation(kTQInterpolationBezier);
+    const TQKeyframeHandle h2 = c->getKeyframe(seconds(2.0));
+    c->setKeyframeTangentsBroken(h2, true);
+    TQCurveSelectionList* list = selectInView({keypointEntry(item, 2.0)});
+    ctrl().weightTangentsSelected(list, 1);
+    EXPECT_TRUE(c->getKeyframeTangentsScaled(h2));
+    ctrl().flattenSelected(list);
+    EXPECT_EQ(c->getKeyframeInterpolation(h2), kTQInterpolationLinear);
+    EXPECT_EQ(c->getKeyframeInterpolation(c->getKeyframe(seconds(1.0))), kTQInterpolationLinear)
+        << "the incoming segment is flattened too";
+    EXPECT_EQ(c->getKeyframeInterpolation(c->getKeyframe(seconds(3.0))), kTQInterpolationBezier);
+    EXPECT_FALSE(c->getKeyframeTangentsBroken(h2));
+}
+
+TEST_F(CtrlTangentsTest, tangents__missingChannelOrNullEntryIsNoOp) {
+    Key k = makeKey("A", 2.0, 0.0, {-0.5, 0.0}, {0.5, 0.0});
+    auto entry = tangentEntry(k.item, 2.0, true);
+    ASSERT_TRUE(set->removeItemWithIdentifier(k.item->channelId()));
+    ctrl().setTangents(entry.get(), 3.0, 1.0);
+    ctrl().setTangents45(entry.get(), 3.0, 1.0, 0);
+    ctrl().breakTangents(entry.get());
+    ctrl().setBezierPoint(entry.get());
+    ctrl().setTangents(nullptr, 3.0, 1.0);
+    ctrl().saveTangents(nullptr);
+    EXPECT_EQ(handleOffset(k, true), CGPointMake(0.5, 0.0));
+    EXPECT_FALSE(k.channel->getKeyframeTangentsBroken(k.handle));
+}
+
+}  // namespace
+}  // namespace engine_test
