@@ -18,16 +18,17 @@ TEST_F(CtrlCore, brackets__drag_of_ten_steps_announces_each_channel_once_per_pha
     TQChannel* b = addChannel("B", {{1, 0}});
     auto ia = addItem(a);
     auto ib = addItem(b);
+    ia->setScaleY(1.0);
+    ib->setScaleY(1.0);
     TQCurveSelectionList* list = selectInView({keypointEntry(ia, 1), keypointEntry(ia, 2), keypointEntry(ib, 1)});
 
-    // The drag variant: one capture, ten value steps, one close.
+    // The drag variant, as the view runs it: one capture, ten value steps, one close.
     ctrl().validateSelection(list);
     recorder.startCaptureModifiedChannels("Move");
     ctrl().willModify(list);
-    for (int step = 0; step < 10; ++step) {
+    for (int step = 1; step <= 10; ++step) {
         ctrl().willModifyValue(list);
-        a->noteWillChange(true);
-        a->setKeyframeValue(list->selectionAtIndex(0)->getHandle(), step);
+        ctrl().moveSelected(list, seconds(1), 0.1 * step, 1, 1);
         ctrl().didModifyValue(list);
         recorder.postNotification(kTQNotifyChannelsChanging);
     }
@@ -46,7 +47,11 @@ TEST_F(CtrlCore, brackets__drag_of_ten_steps_announces_each_channel_once_per_pha
     expected.insert(expected.end(), tail.begin(), tail.end());
     EXPECT_EQ(recorder.bracketSequence(), expected);
     EXPECT_EQ(recorder.captureBalance(), 0);
+    EXPECT_NEAR(keyValueAt(a, 1), 1.0, kValueTolerance) << "the drag lands where the last step put it";
+    EXPECT_NEAR(keyValueAt(b, 1), 1.0, kValueTolerance);
     EXPECT_TRUE(host.canUndo()) << "the host should have recorded the step";
+    host.undo();
+    EXPECT_NEAR(keyValueAt(a, 1), 0.0, kValueTolerance) << "one undo takes back the whole drag";
 }
 
 TEST_F(CtrlCore, brackets__entry_of_a_removed_channel_is_not_announced) {
