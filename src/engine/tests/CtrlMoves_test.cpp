@@ -164,6 +164,38 @@ TEST_F(CtrlMovesTest, moveSelected__twoComponentsOfLinkedCompoundMoveOnce) {
     EXPECT_EQ(iy->originalCurveDirty(), 1);
 }
 
+TEST_F(CtrlMovesTest, moveSelected__linkedCompoundUnderOffsetAndWithoutTimeChange) {
+    ctrl()._linked = true;
+    // The whole object starts 2 s late on the editor's axis.
+    object->setTimeOffset(seconds(2.0));
+    TQCompoundChannel* compound = addCompound("Position", 2, true, {{1.0, 0.0}, {3.0, 0.0}});
+    const auto components = compound->getComponents();
+    auto ix = addItem(components[0]);
+    auto iy = addItem(components[1]);
+    ix->setScaleY(1.0);
+    iy->setScaleY(1.0);
+    {
+        SCOPED_TRACE("moved in time");
+        TQCurveSelectionList* list = selectInView({keypointEntry(ix, 1.0), keypointEntry(iy, 1.0)});
+        ctrl().moveSelected(list, seconds(3.5), 0.0, 1, 0);
+        for (TQChannel* component : components) {
+            const std::vector<double> times = keyTimes(component);
+            ASSERT_EQ(times.size(), 2u);
+            EXPECT_NEAR(times[0], 1.5, kTimeTolerance)
+                << component->getName() << " must move once, also with a time offset";
+        }
+    }
+    {
+        SCOPED_TRACE("value only");
+        TQCurveSelectionList* list = selectInView({keypointEntry(ix, 1.5), keypointEntry(iy, 1.5)});
+        ctrl().moveSelected(list, seconds(3.5), 0.5, 1, 1);
+        for (TQChannel* component : components) {
+            EXPECT_EQ(keyTimes(component).size(), 2u) << "a move to the same time must not add keyframes";
+            EXPECT_NEAR(keyValueAt(component, 1.5), 0.5, kValueTolerance);
+        }
+    }
+}
+
 TEST_F(CtrlMovesTest, offsetSelected__nudgesWithoutMovingInTimeWhenXIsZero) {
     TQChannel* c = addLoggingChannel("A", {{1.0, 1.0}, {2.0, 2.0}});
     auto item = addItem(c);
