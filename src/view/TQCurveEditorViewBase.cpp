@@ -27,7 +27,10 @@ TQCurveEditorViewBase::TQCurveEditorViewBase()
       _currentSelection(std::make_shared<TQCurveSelectionList>()),
       _previousSelection(std::make_shared<TQCurveSelectionList>()) {}
 
-TQCurveEditorViewBase::~TQCurveEditorViewBase() = default;
+TQCurveEditorViewBase::~TQCurveEditorViewBase() {
+    // A controller that still points here would call a dead view at its next update.
+    if (_controller && _controller->getView() == this) _controller->setView(nullptr);
+}
 
 // ---- Wiring, size and backing --------------------------------------------------------------
 

@@ -266,5 +266,14 @@ TEST_F(ViewFramingTest, currentToolChanged__forgetsTheBoxAndPostsTheToolWord) {
     EXPECT_EQ(viewHost.redrawRequests(), 1);
 }
 
+TEST_F(ViewFramingTest, destruction__detachesTheViewFromItsController) {
+    auto doomed = std::make_unique<TQCurveEditorViewBase>();
+    doomed->setController(&ctrl());
+    ctrl().setView(doomed.get());
+    doomed.reset();
+    EXPECT_EQ(ctrl().getView(), nullptr) << "the controller must not keep a dangling view";
+    ctrl().setView(&view);
+}
+
 }  // namespace
 }  // namespace view_test
