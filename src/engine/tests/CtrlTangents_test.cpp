@@ -251,6 +251,34 @@ TEST_F(CtrlTangentsTest, weightAndFlatten__setBitsAndLinearSegments) {
     EXPECT_FALSE(c->getKeyframeTangentsBroken(h2));
 }
 
+TEST_F(CtrlTangentsTest, setTangents__withoutUsableScreen) {
+    {
+        SCOPED_TRACE("no view: the world serves as the screen");
+        Key k = makeKey("A", 5.0, 0.0, {-0.5, -0.1}, {0.5, 0.1});
+        ctrl().setView(nullptr);
+        auto entry = tangentEntry(k.item, 5.0, true);
+        ctrl().setTangents(entry.get(), 6.0, 0.2);
+        const CGPoint in = handleOffset(k, false);
+        EXPECT_NEAR(in.x, -1.0, kOffsetTolerance) << "the pair follows in world units";
+        EXPECT_NEAR(in.y, -0.2, kOffsetTolerance);
+        ctrl().setView(&view);
+    }
+    {
+        SCOPED_TRACE("a view that has not drawn yet");
+        Key k = makeKey("B", 5.0, 0.0, {-0.5, -0.1}, {0.5, 0.1});
+        TQCurveEditorViewBase undrawn;
+        ctrl().setView(&undrawn);
+        auto entry = tangentEntry(k.item, 5.0, true);
+        ctrl().setTangents(entry.get(), 5.2, 0.3);
+        ctrl().setTangents45(entry.get(), 5.2, 0.3, 0);
+        ctrl().setView(&view);
+        const CGPoint out = handleOffset(k, true);
+        const CGPoint in = handleOffset(k, false);
+        EXPECT_NEAR(out.x, 0.2, kOffsetTolerance) << "the dragged handle is still written";
+        EXPECT_EQ(in, CGPointMake(-0.5, -0.1)) << "no NaN may reach the opposite handle";
+    }
+}
+
 TEST_F(CtrlTangentsTest, tangents__missingChannelOrNullEntryIsNoOp) {
     Key k = makeKey("A", 2.0, 0.0, {-0.5, 0.0}, {0.5, 0.0});
     auto entry = tangentEntry(k.item, 2.0, true);
