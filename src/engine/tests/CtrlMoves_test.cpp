@@ -68,32 +68,6 @@ TEST_F(CtrlMovesTest, moveSelected__leadingKeypointMovesFirst) {
     }
 }
 
-TEST_F(CtrlMovesTest, moveSelected__orderAcrossChannelsUsesChannelTimeWithoutOffset) {
-    ctrl().allowNegativeRange(true);
-    TQChannel* a = addLoggingChannel("A", {{1.0, 0.0}});
-    TQChannel* b = addLoggingChannel("B", {{2.0, 0.0}});
-    TQChannel* c = addLoggingChannel("C", {{3.0, 0.0}});
-    // On the axis C comes first; the order still goes by channel time.
-    c->setTimeOffset(seconds(-5.0));
-    auto ia = addItem(a);
-    auto ib = addItem(b);
-    auto ic = addItem(c);
-    TQCurveSelectionList* list =
-        selectInView({keypointEntry(ia, 1.0), keypointEntry(ic, 3.0), keypointEntry(ib, 2.0)});
-    ctrl().moveSelected(list, seconds(1.5), 0.0, 1, 0);
-    EXPECT_EQ(moveLog, (std::vector<std::string>{"C@-2", "B@2", "A@1"}));
-    EXPECT_NEAR(keyTimes(c)[0], 3.5, kTimeTolerance) << "each keypoint moves by the same dt";
-}
-
-TEST_F(CtrlMovesTest, moveSelected__withoutSelectionOrderTheAnchorStays) {
-    TQChannel* c = addLoggingChannel("A", {{1.0, 0.0}, {2.0, 0.0}});
-    auto item = addItem(c);
-    TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.0), keypointEntry(item, 2.0)});
-    ctrl().moveSelected(list, seconds(1.5), 0.0, 0, 0);
-    EXPECT_EQ(moveLog, (std::vector<std::string>{"A@2"}));
-    EXPECT_EQ(keyTimes(c), (std::vector<double>{1.0, 2.5}));
-}
-
 TEST_F(CtrlMovesTest, moveSelected__groupClampsAtZeroUnlessNegativeAllowed) {
     {
         SCOPED_TRACE("clamped");
@@ -132,43 +106,13 @@ TEST_F(CtrlMovesTest, moveSelected__valueMovesBySameScreenDistanceOnEveryCurve) 
     EXPECT_EQ(keyTimes(b), (std::vector<double>{2.0})) << "a constrained move at the present time keeps it";
 }
 
-TEST_F(CtrlMovesTest, moveSelected__curveEntryMovesOnlyItsSegment) {
-    TQChannel* a = addChannel("A", {{1.0, 0.0}, {3.0, 0.0}});
-    TQChannel* b = addChannel("B", {{1.0, 5.0}});
-    auto ia = addItem(a);
-    auto ib = addItem(b);
-    ia->setScaleY(1.0);
-    TQCurveSelectionList* list = selectInView({curveEntry(ia), keypointEntry(ib, 1.0)});
-    ctrl().moveSelected(list, seconds(2.0), 0.5, 1, 0);
-    EXPECT_NEAR(a->getCurveValue(seconds(2.0)), 0.5, kValueTolerance) << "the segment goes through y";
-    EXPECT_NEAR(keyValueAt(b, 1.0), 5.0, kValueTolerance) << "other entries are ignored";
-    EXPECT_EQ(keyTimes(b), (std::vector<double>{1.0}));
-}
-
-TEST_F(CtrlMovesTest, moveSelected__twoComponentsOfLinkedCompoundMoveOnce) {
-    ctrl()._linked = true;
-    TQCompoundChannel* compound = addCompound("Position", 3, true, {{1.0, 0.0}, {3.0, 0.0}});
-    const auto components = compound->getComponents();
-    auto ix = addItem(components[0]);
-    auto iy = addItem(components[1]);
-    TQCurveSelectionList* list = selectInView({keypointEntry(ix, 1.0), keypointEntry(iy, 1.0)});
-    ctrl().moveSelected(list, seconds(1.5), 0.0, 1, 0);
-    for (TQChannel* component : components) {
-        SCOPED_TRACE(component->getName());
-        const std::vector<double> times = keyTimes(component);
-        ASSERT_EQ(times.size(), 2u);
-        EXPECT_NEAR(times[0], 1.5, kTimeTolerance) << "each component must move once, by dt";
-        EXPECT_NEAR(times[1], 3.0, kTimeTolerance);
-    }
-    EXPECT_EQ(ix->originalCurveDirty(), 1);
-    EXPECT_EQ(iy->originalCurveDirty(), 1);
-}
-
-TEST_F(CtrlMovesTest, moveSelected__linkedCompoundUnderOffsetAndWithoutTimeChange) {
+// Two selected components of a linked compound of three: the first entry moves the compound,
+// the second is found in the moved set. Under an offset, the lookup must still find it.
+TEST_F(CtrlMovesTest, moveSelected__linkedComponentsMoveOnceAlsoUnderOffset) {
     ctrl()._linked = true;
     // The whole object starts 2 s late on the editor's axis.
     object->setTimeOffset(seconds(2.0));
-    TQCompoundChannel* compound = addCompound("Position", 2, true, {{1.0, 0.0}, {3.0, 0.0}});
+    TQCompoundChannel* compound = addCompound("Position", 3, true, {{1.0, 0.0}, {3.0, 0.0}});
     const auto components = compound->getComponents();
     auto ix = addItem(components[0]);
     auto iy = addItem(components[1]);
@@ -189,10 +133,10 @@ TEST_F(CtrlMovesTest, moveSelected__linkedCompoundUnderOffsetAndWithoutTimeChang
         SCOPED_TRACE("value only");
         TQCurveSelectionList* list = selectInView({keypointEntry(ix, 1.5), keypointEntry(iy, 1.5)});
         ctrl().moveSelected(list, seconds(3.5), 0.5, 1, 1);
-        for (TQChannel* component : components) {
+        for (TQChannel* component : components)
             EXPECT_EQ(keyTimes(component).size(), 2u) << "a move to the same time must not add keyframes";
-            EXPECT_NEAR(keyValueAt(component, 1.5), 0.5, kValueTolerance);
-        }
+        EXPECT_NEAR(keyValueAt(components[1], 1.5), 0.5, kValueTolerance);
+        EXPECT_NEAR(keyValueAt(components[2], 1.5), 0.0, kValueTolerance) << "values are per entry";
     }
 }
 
@@ -209,19 +153,6 @@ TEST_F(CtrlMovesTest, offsetSelected__nudgesWithoutMovingInTimeWhenXIsZero) {
     ctrl().offsetSelected(list, seconds(0.5), 0.0);
     EXPECT_EQ(moveLog, (std::vector<std::string>{"A@2", "A@1"}));
     EXPECT_EQ(keyTimes(c), (std::vector<double>{1.5, 2.5}));
-}
-
-TEST_F(CtrlMovesTest, offsetCurve__movesWholeCurveOfFirstEntry) {
-    TQChannel* a = addChannel("A", {{1.0, 1.0}, {2.0, 2.0}});
-    TQChannel* b = addChannel("B", {{1.0, 1.0}});
-    auto ia = addItem(a);
-    auto ib = addItem(b);
-    ia->setScaleY(2.0);
-    TQCurveSelectionList* list = selectInView({curveEntry(ia), curveEntry(ib)});
-    ctrl().offsetCurve(list, seconds(1.0), 0.5);
-    EXPECT_NEAR(keyValueAt(a, 1.0), 2.0, kValueTolerance);
-    EXPECT_NEAR(keyValueAt(a, 2.0), 3.0, kValueTolerance);
-    EXPECT_NEAR(keyValueAt(b, 1.0), 1.0, kValueTolerance) << "only entry 0's curve moves";
 }
 
 TEST_F(CtrlMovesTest, moves__emptyOrVanishedSelectionDoesNothing) {
@@ -275,16 +206,6 @@ TEST_F(CtrlMovesGridTest, moveSelected__singleKeypointLandsOnFrameGroupKeepsSpac
         TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.0)});
         ctrl().moveSelected(list, seconds(1.0 + 1.4 * frame), 0.0, 1, 0);
         EXPECT_NEAR(keyTimes(c)[0], 1.0 + frame, kTimeTolerance);
-    }
-    {
-        SCOPED_TRACE("constrained at its own time: value only");
-        TQChannel* c = addChannel("B", {{1.0 + 0.3 * frame, 0.0}});
-        auto item = addItem(c);
-        item->setScaleY(1.0);
-        TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.0 + 0.3 * frame)});
-        ctrl().moveSelected(list, seconds(1.0 + 0.3 * frame), 0.25, 1, 1);
-        EXPECT_NEAR(keyTimes(c)[0], 1.0 + 0.3 * frame, kTimeTolerance) << "no rounding when constraining";
-        EXPECT_NEAR(keyValueAt(c, 1.0 + 0.3 * frame), 0.25, kValueTolerance);
     }
     {
         SCOPED_TRACE("a group off the grid keeps its spacing");
