@@ -38,7 +38,8 @@ TQChannel* TQCompoundChannel::componentWithId(TQChannelId channelId) const {
 template <class Fn>
 void TQCompoundChannel::forEachTarget(TQChannel* component, bool linked, Fn&& fn) const {
     if (!component || component->getParent() != this) return;
-    if (!linked) {
+    // The compound's own link flag links as surely as the caller's request.
+    if (!linked && !isLinked()) {
         fn(*component);
         return;
     }

@@ -42,6 +42,14 @@ protected:
     RecordingObserver observer;
 };
 
+TEST_F(TreeCompoundTest, foldFlag__linksWhateverTheCallerAsks) {
+    compound.setLinked(true);
+    compound.addKeyframe(components[1], seconds(6.5), false);
+    for (TQChannel* c : components) EXPECT_TRUE(keyedAt(c, 5.5)) << "id " << c->getChannelId();
+    compound.deleteKeyframe(components[0], seconds(5.5), false);
+    for (TQChannel* c : components) EXPECT_FALSE(keyedAt(c, 5.5)) << "id " << c->getChannelId();
+}
+
 TEST_F(TreeCompoundTest, addKeyframe__linkedAddsToAllUnlinkedToOne) {
     compound.addKeyframe(components[1], seconds(4), true);  // axis 4 s = channel 3 s
     for (TQChannel* c : components) EXPECT_TRUE(keyedAt(c, 3)) << "id " << c->getChannelId();
