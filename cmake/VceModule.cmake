@@ -48,7 +48,8 @@ function(vce_module target)
       target_include_directories(${target}_tests PRIVATE ${PROJECT_SOURCE_DIR})
       vce_warnings(${target}_tests)
       gtest_discover_tests(${target}_tests DISCOVERY_MODE PRE_TEST
-        PROPERTIES ENVIRONMENT "VCE_SOURCE_DIR=${PROJECT_SOURCE_DIR}")
+        PROPERTIES ENVIRONMENT "VCE_SOURCE_DIR=${PROJECT_SOURCE_DIR}"
+                   ENVIRONMENT_MODIFICATION "QT_QPA_PLATFORM=set:offscreen")
     endif()
   endif()
 endfunction()
