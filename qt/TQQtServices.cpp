@@ -1,0 +1,125 @@
+#include "qt/TQQtServices.h"
+
+#include <QCursor>
+#include <QTimer>
+#include <QWindow>
+
+#include <chrono>
+
+// ---- Clock --------------------------------------------------------------------------------
+
+TQQtClock::TQQtClock() { _elapsed.start(); }
+
+double TQQtClock::now() const { return static_cast<double>(_elapsed.nsecsElapsed()) * 1e-9; }
+
+// ---- Timer --------------------------------------------------------------------------------
+
+TQQtTimerService::TQQtTimerService() : _context(new QObject) {}
+
+TQQtTimerService::~TQQtTimerService() { delete _context; }
+
+void TQQtTimerService::dispatchAfter(uint64_t nanoseconds, std::function<void()> block) {
+    if (!block) return;
+    // Rounded up: "at least the given time from now".
+    const auto delay = std::chrono::ceil<std::chrono::milliseconds>(std::chrono::nanoseconds(nanoseconds));
+    QTimer::singleShot(delay, Qt::PreciseTimer, _context, [b = std::move(block)]() { b(); });
+}
+
+// ---- View host ------------------------------------------------------------------------------
+
+TQQtViewHost::TQQtViewHost(QWidget* widget) : _widget(widget) {}
+
+CGRect TQQtViewHost::bounds() const {
+    if (!_widget) return CGRectZero;
+    return CGRectMake(0.0, 0.0, _widget->width(), _widget->height());
+}
+
+double TQQtViewHost::backingScaleFactor() const {
+    return _widget ? _widget->devicePixelRatioF() : 1.0;
+}
+
+bool TQQtViewHost::hasWindow() const {
+    // A widget always has a top-level ancestor; it is in a window once that has a native
+    // window, which happens when it is first shown.
+    return _widget && _widget->window()->windowHandle() != nullptr;
+}
+
+void TQQtViewHost::setNeedsDisplay() {
+    if (_widget) _widget->update();
+}
+
+Qt::CursorShape TQQtViewHost::cursorShape(RWCursor cursor) {
+    switch (cursor) {
+        case RWCursor::Arrow: return Qt::ArrowCursor;
+        case RWCursor::IBeam: return Qt::IBeamCursor;
+        case RWCursor::PointingHand: return Qt::PointingHandCursor;
+        case RWCursor::OpenHand: return Qt::OpenHandCursor;
+        case RWCursor::ClosedHand: return Qt::ClosedHandCursor;
+        case RWCursor::CrossHair: return Qt::CrossCursor;
+        case RWCursor::ResizeLeftRight: return Qt::SizeHorCursor;
+        case RWCursor::ResizeUpDown: return Qt::SizeVerCursor;
+        case RWCursor::OperationNotAllowed: return Qt::ForbiddenCursor;
+        case RWCursor::Move: return Qt::SizeAllCursor;
+        case RWCursor::EditPoints: return Qt::PointingHandCursor;
+        case RWCursor::CrossHairs: return Qt::CrossCursor;
+        case RWCursor::Sketch: return Qt::CrossCursor;
+        case RWCursor::PenAddControlPoint: return Qt::CrossCursor;
+    }
+    return Qt::ArrowCursor;
+}
+
+void TQQtViewHost::setCursor(RWCursor cursor) {
+    _cursor = cursor;
+    applyCursor();
+}
+
+void TQQtViewHost::setCursorHidden(bool hidden) {
+    _cursorHidden = hidden;
+    applyCursor();
+}
+
+void TQQtViewHost::applyCursor() {
+    if (!_widget) return;
+    _widget->setCursor(QCursor(_cursorHidden ? Qt::BlankCursor : cursorShape(_cursor)));
+}
+
+CGPoint TQQtViewHost::convertPointFromWindow(const CGPoint& pointInWindow) const {
+    if (!_widget) return pointInWindow;
+    const QWidget* window = _widget->window();
+    const QPointF inWindow(pointInWindow.x, window->height() - pointInWindow.y);
+    const QPointF local = _widget->mapFrom(window, inWindow);
+    return CGPointMake(local.x(), _widget->height() - local.y());
+}
+
+CGPoint TQQtViewHost::windowPointFromWidgetPoint(const QPointF& widgetPoint) const {
+    if (!_widget) return CGPointMake(widgetPoint.x(), widgetPoint.y());
+    const QWidget* window = _widget->window();
+    const QPointF inWindow = _widget->mapTo(window, widgetPoint);
+    return CGPointMake(inWindow.x(), window->height() - inWindow.y());
+}
+
+std::optional<RWEvent> TQQtViewHost::nextEventMatchingMask(RWEventMask mask) {
+    for (auto it = _pending.begin(); it != _pending.end(); ++it) {
+        if (!it->matchesMask(mask)) continue;
+        RWEvent event = *it;
+        _pending.erase(it);
+        return event;
+    }
+    return std::nullopt;
+}
+
+// ---- Installer ------------------------------------------------------------------------------
+
+TQQtServiceInstaller::TQQtServiceInstaller() : _previous(RWApplicationServices()) {
+    RWServiceSet mine;
+    mine.clock = &_clock;
+    mine.timer = &_timer;
+    RWInstallServices(mine);
+}
+
+TQQtServiceInstaller::~TQQtServiceInstaller() {
+    RWServiceSet back;
+    back.clock = _previous.clock;
+    back.timer = _previous.timer;
+    RWInstallServices(back);
+}
