@@ -1,0 +1,46 @@
+# Turns the PNG files of a folder into a C++ source that holds their bytes, so that the library
+# carries its images and nothing has to be found on disk at run time. Decoding happens in C++
+# (BNImage.cpp) at the first request of each file.
+#
+# cmake -DINPUT_DIR=<folder of *.png> -DOUTPUT=<file.cpp> -P EmbedImages.cmake
+
+foreach(var INPUT_DIR OUTPUT)
+  if(NOT DEFINED ${var})
+    message(FATAL_ERROR "EmbedImages: ${var} is not set")
+  endif()
+endforeach()
+
+string(REPEAT "[0-9a-f]" 64 lineOfHex)
+
+file(GLOB files RELATIVE "${INPUT_DIR}" "${INPUT_DIR}/*.png")
+list(SORT files)
+
+set(source "// Generated from the images folder at build time; edit the PNG files, not this file.\n")
+string(APPEND source "#include \"src/resources/internal/TQEmbeddedImages.h\"\n\n")
+string(APPEND source "namespace {\n")
+set(table "")
+set(index 0)
+foreach(name ${files})
+  file(READ "${INPUT_DIR}/${name}" hex HEX)
+  string(LENGTH "${hex}" hexLength)
+  math(EXPR byteCount "${hexLength} / 2")
+  if(byteCount EQUAL 0)
+    message(FATAL_ERROR "EmbedImages: ${name} is empty")
+  endif()
+  # 64 hex digits (32 bytes) per line keeps the generated file readable in a debugger.
+  string(REGEX REPLACE "(${lineOfHex})" "\\1\n" hex "${hex}")
+  string(REGEX REPLACE "([0-9a-f][0-9a-f])" "0x\\1," bytes "${hex}")
+  string(APPEND source "// ${name}\nconstexpr unsigned char kImage${index}[] = {\n${bytes}};\n")
+  string(APPEND table "    {\"${name}\", kImage${index}, ${byteCount}},\n")
+  math(EXPR index "${index} + 1")
+endforeach()
+string(APPEND source "\nconstexpr TQEmbeddedImageFile kFiles[] = {\n${table}    {nullptr, nullptr, 0},\n};\n")
+string(APPEND source "}  // namespace\n\n")
+string(APPEND source "std::span<const TQEmbeddedImageFile> TQEmbeddedImageFiles() {\n")
+string(APPEND source "    // The last entry only keeps the array non-empty when the folder is.\n")
+string(APPEND source "    return {kFiles, std::size(kFiles) - 1};\n}\n")
+
+file(WRITE "${OUTPUT}.tmp" "${source}")
+# Only touch the output when it changed, so that an unchanged folder recompiles nothing.
+file(COPY_FILE "${OUTPUT}.tmp" "${OUTPUT}" ONLY_IF_DIFFERENT)
+file(REMOVE "${OUTPUT}.tmp")
