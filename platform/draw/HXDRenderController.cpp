@@ -4,15 +4,16 @@ HXDRenderController::HXDRenderController(HXDTexture* texture, float backingScale
     : _backingScale(backingScale), _initialTexture(texture) {}
 
 void HXDRenderController::updateTexture(HXDTexture* texture, float backingScale,
-                                        const BNMatrix44f& projection, HXDFloat2 pixelScale) {
+                                        const BNMatrix44f& projection, HXDFloat2 pixelScale,
+                                        CGSize drawableSize) {
     _backingScale = backingScale;
     _context = std::make_unique<HXDRenderingContext>(texture ? texture : _initialTexture, backingScale,
-                                                     projection, pixelScale);
+                                                     projection, pixelScale, drawableSize);
 }
 
 void HXDRenderController::releaseTexture() {
     _initialTexture = nullptr;
     if (_context)
-        _context = std::make_unique<HXDRenderingContext>(nullptr, _context->backingScale(),
-                                                         _context->projection(), _context->pixelScale());
+        _context = std::make_unique<HXDRenderingContext>(nullptr, _context->backingScale(), _context->projection(),
+                                                         _context->pixelScale(), _context->drawableSize());
 }
