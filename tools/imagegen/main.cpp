@@ -164,6 +164,47 @@ void drawRemove(ImageCanvas& canvas) {
     canvas.draw(capsule({c - 4.5, c}, {c + 4.5, c}, 0.8), solid(kGlyph));
 }
 
+// Inspector images: the parameter menu button of a channel row, the reset button of a mini
+// editor strip, and the border drawn over the strip (stretched to its bounds, so only its
+// edges carry anything).
+constexpr double kMenuButtonSize = 16.0;
+constexpr double kBorderSize = 24.0;
+
+void drawParameterMenu(ImageCanvas& canvas) {
+    const Point c{kMenuButtonSize * 0.5, kMenuButtonSize * 0.5};
+    canvas.draw(disc(c, 6.5), verticalGradient(grey(0.42), grey(0.3), c.y - 6.5, c.y + 6.5));
+    canvas.draw(ring(c, 6.0, 6.5), solid(grey(0.18)));
+    canvas.draw(capsule({c.x - 3.0, c.y - 1.2}, {c.x, c.y + 1.8}, 0.75), solid(kGlyph));
+    canvas.draw(capsule({c.x, c.y + 1.8}, {c.x + 3.0, c.y - 1.2}, 0.75), solid(kGlyph));
+}
+
+void drawReset(ImageCanvas& canvas) {
+    // Three quarters of a circle, open at the top right, and its arrow head.
+    const Point c{kSmallIconSize * 0.5, kSmallIconSize * 0.5};
+    const double radius = 4.5;
+    const Coverage band = ring(c, radius - 0.8, radius + 0.8);
+    canvas.draw(
+        [band, c](Point p) {
+            const double angle = std::atan2(p.y - c.y, p.x - c.x);  // y down: -pi/2 is the top
+            return angle > -1.75 && angle < -0.2 ? 0.0 : band(p);
+        },
+        solid(kGlyph));
+    const Point end{c.x + radius * std::cos(-1.75), c.y + radius * std::sin(-1.75)};
+    canvas.draw(polygon({{end.x + 3.0, end.y}, {end.x - 0.5, end.y - 3.0}, {end.x - 0.5, end.y + 3.0}}),
+                solid(kGlyph));
+}
+
+void drawGradientBorder(ImageCanvas& canvas) {
+    const double s = kBorderSize;
+    canvas.draw(rectangle(0.0, 0.0, s, 4.0), verticalGradient(grey(0.0, 0.45), grey(0.0, 0.0), 0.0, 4.0));
+    canvas.draw(rectangle(0.0, s - 3.0, s, 3.0), verticalGradient(grey(1.0, 0.0), grey(1.0, 0.08), s - 3.0, s));
+    const Rgba line = grey(0.36);
+    canvas.draw(rectangle(0.0, 0.0, s, 1.0), solid(line));
+    canvas.draw(rectangle(0.0, s - 1.0, s, 1.0), solid(line));
+    canvas.draw(rectangle(0.0, 0.0, 1.0, s), solid(line));
+    canvas.draw(rectangle(s - 1.0, 0.0, 1.0, s), solid(line));
+}
+
 bool writeBothScales(const std::string& folder, const std::string& name, double sizePoints,
                      const std::function<void(ImageCanvas&)>& drawImage) {
     for (const double scale : {1.0, 2.0}) {
@@ -212,5 +253,8 @@ int main(int argc, char** argv) {
     ok &= writeBothScales(folder, "K_KeyframeEditor_TransformKeyframes", kToolIconSize, drawTransformTool);
     ok &= writeBothScales(folder, "K_General_Add", kSmallIconSize, drawAdd);
     ok &= writeBothScales(folder, "K_General_Remove", kSmallIconSize, drawRemove);
+    ok &= writeBothScales(folder, "S_Inspector_ParameterMenu_Normal", kMenuButtonSize, drawParameterMenu);
+    ok &= writeBothScales(folder, "Shared_Inspector_Reset", kSmallIconSize, drawReset);
+    ok &= writeBothScales(folder, "K_Inspector_Gradient-Border", kBorderSize, drawGradientBorder);
     return ok ? 0 : 1;
 }

@@ -58,6 +58,18 @@ TEST_F(BNImageResources, BNImageForResource__everyKeypointImageAtBothScales) {
     }
 }
 
+TEST_F(BNImageResources, BNImageForResource__everyOtherImageInUse) {
+    // Tool segments of both editors, the curve set add/remove control, the channel row menu
+    // button, and the mini editor strip's reset button and border.
+    for (const char* name : {"K_KeyframeEditor_EditKeyframes", "K_KeyframeEditor_SketchKeyframes",
+                             "K_KeyframeEditor_TransformKeyframes", "K_General_Add", "K_General_Remove",
+                             "S_Inspector_ParameterMenu_Normal", "Shared_Inspector_Reset",
+                             "K_Inspector_Gradient-Border"}) {
+        EXPECT_NE(BNImageForResource(name, 1.0), nullptr) << name << " is missing";
+        EXPECT_NE(BNImageForResource(name, 2.0), nullptr) << name << "@2x is missing";
+    }
+}
+
 TEST_F(BNImageResources, keypointImages__transparentCornersAndOpaqueCentre) {
     // The hit test of keypoints reads the image's alpha: a click at a corner of the square
     // must fall through to what lies under it.
