@@ -145,6 +145,13 @@ TEST(BNImage, BNImageFromPNGData__rejectsWhatIsNotAPNG) {
     error.clear();
     EXPECT_EQ(BNImageFromPNGData(whole.first(std::min<std::size_t>(60, whole.size())), 1.0, &error), nullptr);
     EXPECT_FALSE(error.empty());
+
+    // The same file with its compressed pixels damaged: an error, not a crash or a half image.
+    std::vector<std::uint8_t> damaged(whole.begin(), whole.end());
+    for (std::size_t i = damaged.size() / 2; i < damaged.size() - 16; i += 7) damaged[i] ^= 0x5a;
+    error.clear();
+    EXPECT_EQ(BNImageFromPNGData(damaged, 1.0, &error), nullptr);
+    EXPECT_FALSE(error.empty());
 }
 
 TEST(BNImage, pixelAt__outsideIsTransparentAndBadBuffersAreSized) {
