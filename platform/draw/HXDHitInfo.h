@@ -24,7 +24,8 @@ public:
     uint64_t unsignedLongLongValue() const;
     double doubleValue() const;
 
-    friend bool operator==(const HXDNumber&, const HXDNumber&) = default;
+    // By value, as numbers compare: 1 (signed), 1u and 1.0 are equal; -1 and 2^64-1 are not.
+    friend bool operator==(const HXDNumber& a, const HXDNumber& b);
 
 private:
     enum class Kind : uint8_t { Signed, Unsigned, Floating };
@@ -34,7 +35,6 @@ private:
         uint64_t u;
         double d;
     } _v{0};
-    friend struct HXDNumberAccess;
 };
 
 // A small mutable dictionary from string keys to numbers. It holds a handful of entries, so

@@ -84,7 +84,7 @@ public:
     // The numeric form callers pass (0 mitre, 1 round, 2 bevel); other values give a mitre.
     void setLineJoin(int join);
     bool loop() const { return _loop; }
-    void setLoop(bool loop) { _loop = loop; }
+    void setLoop(bool loop);
 
     // Builds the hit-test index now rather than at the first test.
     void prepareForHitTesting() const;

@@ -1,0 +1,147 @@
+#include "platform/draw/HXDHitTest.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "platform/draw/HXDDrawPrimitive.h"
+#include "platform/draw/HXDRenderController.h"
+
+// ---- HXDScreenMapping ----------------------------------------------------------------------
+
+HXDScreenMapping::HXDScreenMapping(const BNMatrix44f& projection, const CGSize& drawableSize)
+    : _drawableSize(drawableSize) {
+    const double hw = 0.5 * drawableSize.width;
+    const double hh = 0.5 * drawableSize.height;
+    // ((row . (x, y, 0, 1)) * 0.5 + 0.5) * size, expanded into the affine terms.
+    _a = projection.at(0, 0) * hw;
+    _b = projection.at(0, 1) * hw;
+    _c = (projection.at(0, 3) + 1.0) * hw;
+    _d = projection.at(1, 0) * hh;
+    _e = projection.at(1, 1) * hh;
+    _f = (projection.at(1, 3) + 1.0) * hh;
+    const double det = _a * _e - _b * _d;
+    if (!(drawableSize.width > 0.0 && drawableSize.height > 0.0) || !std::isfinite(det) || det == 0.0) return;
+    _ia = _e / det;
+    _ib = -_b / det;
+    _id = -_d / det;
+    _ie = _a / det;
+    _valid = true;
+}
+
+namespace {
+CGRect boundsOfMappedCorners(const CGRect& r, auto&& map) {
+    const CGRect s = CGRectStandardize(r);
+    const double x0 = s.origin.x, y0 = s.origin.y;
+    const double x1 = x0 + s.size.width, y1 = y0 + s.size.height;
+    const CGPoint p[4] = {map(x0, y0), map(x1, y0), map(x0, y1), map(x1, y1)};
+    double minX = p[0].x, maxX = p[0].x, minY = p[0].y, maxY = p[0].y;
+    for (const CGPoint& q : p) {
+        minX = std::min(minX, q.x);
+        maxX = std::max(maxX, q.x);
+        minY = std::min(minY, q.y);
+        maxY = std::max(maxY, q.y);
+    }
+    return CGRectMake(minX, minY, maxX - minX, maxY - minY);
+}
+}  // namespace
+
+CGRect HXDScreenMapping::worldRectToPixels(const CGRect& world) const {
+    return boundsOfMappedCorners(world, [this](double x, double y) { return worldToPixel(x, y); });
+}
+
+CGRect HXDScreenMapping::pixelRectToWorld(const CGRect& pixels) const {
+    return boundsOfMappedCorners(pixels, [this](double x, double y) { return pixelToWorld(x, y); });
+}
+
+// ---- HXDHitTestContext -----------------------------------------------------------------------
+
+HXDHitTestContext HXDHitTestContext::atPoint(const HXDScreenMapping& mapping, float backingScale, HXDFloat2 point) {
+    HXDHitTestContext c;
+    if (!mapping.isValid() || !std::isfinite(point.x) || !std::isfinite(point.y)) return c;
+    c._kind = Kind::Point;
+    c._mapping = mapping;
+    c._backingScale = backingScale > 0.0f ? backingScale : 1.0f;
+    c._point = CGPointMake(point.x, point.y);
+    c._rect = CGRectMake(point.x, point.y, 0.0, 0.0);
+    return c;
+}
+
+HXDHitTestContext HXDHitTestContext::inRect(const HXDScreenMapping& mapping, float backingScale, const CGRect& rect) {
+    HXDHitTestContext c;
+    const CGRect s = CGRectStandardize(rect);
+    if (!mapping.isValid() || !std::isfinite(s.origin.x) || !std::isfinite(s.origin.y) ||
+        !std::isfinite(s.size.width) || !std::isfinite(s.size.height))
+        return c;
+    c._kind = Kind::Rect;
+    c._mapping = mapping;
+    c._backingScale = backingScale > 0.0f ? backingScale : 1.0f;
+    c._rect = s;
+    c._point = s.origin;
+    return c;
+}
+
+CGRect HXDHitTestContext::worldQueryRect(double reach) const {
+    const CGRect grown = CGRectMake(_rect.origin.x - reach, _rect.origin.y - reach, _rect.size.width + 2.0 * reach,
+                                    _rect.size.height + 2.0 * reach);
+    return _mapping.pixelRectToWorld(grown);
+}
+
+// ---- HXDHitRecord ----------------------------------------------------------------------------
+
+uint32_t HXDHitRecord::hitID() const { return _primitive->hitInfo().hitID(); }
+
+const HXDExtraInfo& HXDHitRecord::extraInfo() const { return _primitive->hitInfo().extraInfo(); }
+
+// ---- The test itself -------------------------------------------------------------------------
+
+namespace {
+HXDScreenMapping mappingOf(const HXDRenderingContext* context) {
+    if (!context) return HXDScreenMapping();
+    return HXDScreenMapping(context->projection(), context->drawableSize());
+}
+}  // namespace
+
+HXDHitTestContext HXDRenderController::renderingContextForHitTestAtCoords(HXDFloat2 coords) const {
+    const HXDRenderingContext* context = _context.get();
+    return HXDHitTestContext::atPoint(mappingOf(context), context ? context->backingScale() : _backingScale, coords);
+}
+
+HXDHitTestContext HXDRenderController::renderingContextForHitTestInRect(const CGRect& rect) const {
+    const HXDRenderingContext* context = _context.get();
+    return HXDHitTestContext::inRect(mappingOf(context), context ? context->backingScale() : _backingScale, rect);
+}
+
+std::vector<HXDHitRecord> HXDRenderController::newHitTestResultForPrimitives(const HXDPrimitiveArray& primitives,
+                                                                             const HXDHitTestContext& context,
+                                                                             bool returnClosestHit) const {
+    std::vector<HXDHitRecord> result;
+    if (!context.isValid()) return result;
+    const bool isPoint = context.kind() == HXDHitTestContext::Kind::Point;
+
+    // The best so far: least distance, then the higher priority, then the later one (on top).
+    const std::shared_ptr<HXDDrawPrimitive>* best = nullptr;
+    float bestDistance = 0.0f;
+    int bestPriority = 0;
+    for (const auto& primitive : primitives) {
+        if (!primitive) continue;
+        float distance = 0.0f;
+        if (isPoint) {
+            distance = primitive->hitDistanceAtPoint(context);
+            if (!(distance >= 0.0f)) continue;
+        } else if (!primitive->intersectsRect(context)) {
+            continue;
+        }
+        if (!returnClosestHit) {
+            result.emplace_back(primitive, distance);
+            continue;
+        }
+        const int priority = primitive->hitPriority();
+        if (!best || distance < bestDistance || (distance == bestDistance && priority >= bestPriority)) {
+            best = &primitive;
+            bestDistance = distance;
+            bestPriority = priority;
+        }
+    }
+    if (returnClosestHit && best) result.emplace_back(*best, bestDistance);
+    return result;
+}

@@ -1,0 +1,257 @@
+#include "platform/draw/HXDMultiline.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "platform/draw/HXDEncoder.h"
+#include "platform/draw/internal/HXDGeometry2D.h"
+#include "platform/draw/internal/HXDPolylineIndex.h"
+
+namespace hxd_internal {
+
+namespace {
+bool finite(const HXDLineVertex& v) { return std::isfinite(v.start.x) && std::isfinite(v.start.y); }
+
+void grow(float& minX, float& minY, float& maxX, float& maxY, const HXDLineVertex& v) {
+    minX = std::min(minX, v.start.x);
+    maxX = std::max(maxX, v.start.x);
+    minY = std::min(minY, v.start.y);
+    maxY = std::max(maxY, v.start.y);
+}
+}  // namespace
+
+PolylineIndex::PolylineIndex(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
+                             bool loop) {
+    const size_t n = vertices.size();
+    bool allFinite = true;
+    for (const HXDLineVertex& v : vertices) {
+        if (!finite(v)) {
+            allFinite = false;
+            continue;
+        }
+        if (!hasBounds) {
+            minX = maxX = v.start.x;
+            minY = maxY = v.start.y;
+            hasBounds = true;
+        } else {
+            grow(minX, minY, maxX, maxY, v);
+        }
+    }
+    if (!hasBounds || n < 2) return;
+
+    monotone = allFinite && runStarts.empty() && !loop;
+    for (size_t i = 1; monotone && i < n; ++i) monotone = vertices[i].start.x >= vertices[i - 1].start.x;
+
+    if (monotone) {
+        const uint32_t segments = static_cast<uint32_t>(n - 1);
+        uint32_t count = std::clamp<uint32_t>(segments / kSegmentsPerBin, 1u, kMaxBins);
+        const double span = static_cast<double>(maxX) - static_cast<double>(minX);
+        if (!(span > 0.0)) count = 1;
+        binOrigin = minX;
+        binInvWidth = count > 1 ? count / span : 0.0;
+        bins.assign(count, Bin{});
+        for (uint32_t i = 0; i < segments; ++i) {
+            const HXDLineVertex& a = vertices[i];
+            const HXDLineVertex& b = vertices[i + 1];
+            const float lo = std::min(a.start.y, b.start.y);
+            const float hi = std::max(a.start.y, b.start.y);
+            for (uint32_t k = binOf(a.start.x), last = binOf(b.start.x); k <= last; ++k) {
+                Bin& bin = bins[k];
+                if (bin.first == kNone) {
+                    bin.first = i;
+                    bin.minY = lo;
+                    bin.maxY = hi;
+                } else {
+                    bin.minY = std::min(bin.minY, lo);
+                    bin.maxY = std::max(bin.maxY, hi);
+                }
+                bin.end = i + 1;
+            }
+        }
+        return;
+    }
+
+    const size_t runs = runStarts.size() + 1;
+    for (size_t r = 0; r < runs; ++r) {
+        const uint32_t first = r == 0 ? 0u : runStarts[r - 1];
+        const uint32_t end = r < runStarts.size() ? runStarts[r] : static_cast<uint32_t>(n);
+        if (end <= first + 1) continue;  // a run of one vertex has no segment
+        for (uint32_t k = first; k + 1 < end; k += kChunkSegments) {
+            Chunk chunk;
+            chunk.first = k;
+            chunk.last = std::min(k + kChunkSegments, end - 1);
+            for (uint32_t v = chunk.first; v <= chunk.last; ++v) {
+                if (!finite(vertices[v])) continue;
+                if (!chunk.bounded) {
+                    chunk.minX = chunk.maxX = vertices[v].start.x;
+                    chunk.minY = chunk.maxY = vertices[v].start.y;
+                    chunk.bounded = true;
+                } else {
+                    grow(chunk.minX, chunk.minY, chunk.maxX, chunk.maxY, vertices[v]);
+                }
+            }
+            if (chunk.bounded) chunks.push_back(chunk);
+        }
+        if (loop) closers.emplace_back(end - 1, first);
+    }
+}
+
+uint32_t PolylineIndex::binOf(double x) const {
+    const double k = std::floor((x - binOrigin) * binInvWidth);
+    const double last = static_cast<double>(bins.size()) - 1.0;
+    // Clamped in double before the conversion, which would be undefined out of range.
+    if (!(k > 0.0)) return 0;
+    return static_cast<uint32_t>(std::min(k, last));
+}
+
+template <class Visit>
+void PolylineIndex::forEachCandidate(const std::vector<HXDLineVertex>& vertices, const CGRect& q,
+                                     Visit&& visit) const {
+    const double qx0 = q.origin.x, qy0 = q.origin.y;
+    const double qx1 = qx0 + q.size.width, qy1 = qy0 + q.size.height;
+    if (!hasBounds || qx1 < minX || qx0 > maxX || qy1 < minY || qy0 > maxY) return;
+    auto segmentMayMeet = [&](const HXDLineVertex& a, const HXDLineVertex& b) {
+        return !(std::max(a.start.x, b.start.x) < qx0 || std::min(a.start.x, b.start.x) > qx1 ||
+                 std::max(a.start.y, b.start.y) < qy0 || std::min(a.start.y, b.start.y) > qy1);
+    };
+
+    if (monotone) {
+        uint32_t next = 0;  // adjacent bins share segments: each is visited once
+        for (uint32_t k = binOf(qx0), last = binOf(qx1); k <= last; ++k) {
+            const Bin& bin = bins[k];
+            if (bin.first == kNone || bin.maxY < qy0 || bin.minY > qy1) continue;
+            for (uint32_t i = std::max(bin.first, next); i < bin.end; ++i) {
+                const HXDLineVertex& a = vertices[i];
+                if (a.start.x > qx1) break;  // x never decreases: nothing further can meet q
+                if (segmentMayMeet(a, vertices[i + 1]) && visit(i, i + 1)) return;
+            }
+            next = std::max(next, bin.end);
+        }
+        return;
+    }
+
+    for (const Chunk& chunk : chunks) {
+        if (chunk.maxX < qx0 || chunk.minX > qx1 || chunk.maxY < qy0 || chunk.minY > qy1) continue;
+        for (uint32_t i = chunk.first; i < chunk.last; ++i)
+            if (segmentMayMeet(vertices[i], vertices[i + 1]) && visit(i, i + 1)) return;
+    }
+    for (const auto& [i, j] : closers)
+        if (segmentMayMeet(vertices[i], vertices[j]) && visit(i, j)) return;
+}
+
+}  // namespace hxd_internal
+
+// ---- HXDMultiline ----------------------------------------------------------------------------
+
+HXDMultiline::HXDMultiline(std::span<const HXDLineVertex> lines)
+    : HXDDrawPrimitive(0), _vertices(lines.begin(), lines.end()) {}
+
+HXDMultiline::HXDMultiline(std::vector<HXDLineVertex>&& lines) : HXDDrawPrimitive(0), _vertices(std::move(lines)) {}
+
+HXDMultiline::HXDMultiline(std::span<const HXDLineSegment> segments) : HXDDrawPrimitive(0) {
+    _vertices.reserve(segments.size() + 1);
+    for (size_t s = 0; s < segments.size(); ++s) {
+        const HXDLineSegment& seg = segments[s];
+        const bool chained = s > 0 && segments[s - 1].end == seg.start;
+        if (!chained) {
+            if (s > 0) _runStarts.push_back(static_cast<uint32_t>(_vertices.size()));
+            _vertices.emplace_back(seg.start, seg.color);
+        } else {
+            // The shared vertex takes the colour of the segment that leaves it.
+            _vertices.back().color = seg.color;
+        }
+        _vertices.emplace_back(seg.end, seg.color);
+    }
+}
+
+HXDMultiline::~HXDMultiline() = default;
+
+std::pair<uint32_t, uint32_t> HXDMultiline::runRange(size_t run) const {
+    const size_t runs = numberOfRuns();
+    if (run >= runs) return {0, 0};
+    const uint32_t first = run == 0 ? 0u : _runStarts[run - 1];
+    const uint32_t end = run + 1 < runs ? _runStarts[run] : static_cast<uint32_t>(_vertices.size());
+    return {first, end};
+}
+
+void HXDMultiline::setLoop(bool loop) {
+    if (loop == _loop) return;
+    _loop = loop;
+    _index.reset();  // the closing segments are part of the index
+}
+
+void HXDMultiline::setLineJoin(int join) {
+    _lineJoin = join == 1 ? HXDLineJoin::Round : join == 2 ? HXDLineJoin::Bevel : HXDLineJoin::Miter;
+}
+
+const hxd_internal::PolylineIndex& HXDMultiline::index() const {
+    if (!_index) _index = std::make_unique<hxd_internal::PolylineIndex>(_vertices, _runStarts, _loop);
+    return *_index;
+}
+
+void HXDMultiline::prepareForHitTesting() const { (void)index(); }
+
+double HXDMultiline::halfWidthInPixels(float backingScale) const {
+    const double w = static_cast<double>(_width) * backingScale * 0.5;
+    return w > 0.5 ? w : 0.5;  // NaN and hairlines alike cover half a pixel on each side
+}
+
+void HXDMultiline::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const {
+    encoder.encodeMultiline(*this, context);
+}
+
+float HXDMultiline::hitDistanceAtPoint(const HXDHitTestContext& context) const {
+    const double half = halfWidthInPixels(context.backingScale());
+    const double reach = half + context.lineTolerance();
+    const CGPoint p = context.point();
+    const HXDScreenMapping& m = context.mapping();
+    double best = std::numeric_limits<double>::infinity();
+    index().forEachCandidate(_vertices, context.worldQueryRect(reach), [&](uint32_t i, uint32_t j) {
+        const CGPoint a = m.worldToPixel(_vertices[i].start.x, _vertices[i].start.y);
+        const CGPoint b = m.worldToPixel(_vertices[j].start.x, _vertices[j].start.y);
+        const double d = hxd_internal::distanceToSegment(p.x, p.y, a.x, a.y, b.x, b.y);
+        if (d < best) best = d;
+        return best <= half;  // on the line: nothing can be closer
+    });
+    if (!(best <= reach)) return -1.0f;
+    return static_cast<float>(std::max(0.0, best - half));
+}
+
+bool HXDMultiline::intersectsRect(const HXDHitTestContext& context) const {
+    const double half = halfWidthInPixels(context.backingScale());
+    const CGRect& r = context.rect();
+    const double x0 = r.origin.x - half, y0 = r.origin.y - half;
+    const double x1 = r.origin.x + r.size.width + half, y1 = r.origin.y + r.size.height + half;
+    const HXDScreenMapping& m = context.mapping();
+    bool hit = false;
+    index().forEachCandidate(_vertices, context.worldQueryRect(half), [&](uint32_t i, uint32_t j) {
+        const CGPoint a = m.worldToPixel(_vertices[i].start.x, _vertices[i].start.y);
+        const CGPoint b = m.worldToPixel(_vertices[j].start.x, _vertices[j].start.y);
+        hit = hxd_internal::segmentMeetsRect(a.x, a.y, b.x, b.y, x0, y0, x1, y1);
+        return hit;
+    });
+    return hit;
+}
+
+// ---- HXDLine ---------------------------------------------------------------------------------
+
+namespace {
+std::vector<HXDLineVertex> twoVertices(HXDFloat3 start, HXDFloat3 end, HXDColor color) {
+    return {HXDLineVertex(start, color), HXDLineVertex(end, color)};
+}
+}  // namespace
+
+HXDLine::HXDLine(HXDFloat3 start, HXDFloat3 end, float width, HXDColor color, bool antialiased)
+    : HXDMultiline(twoVertices(start, end, color)) {
+    setWidth(width);
+    setAntialiased(antialiased);
+}
+
+std::shared_ptr<HXDLine> HXDLine::lineFromStart(HXDFloat3 start, HXDFloat3 end, float width, HXDColor color,
+                                                bool antialiased) {
+    return std::make_shared<HXDLine>(start, end, width, color, antialiased);
+}
+
+void HXDLine::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const {
+    encoder.encodeLine(*this, context);
+}

@@ -1,0 +1,296 @@
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <memory>
+#include <random>
+
+#include "platform/draw/HXDPrimitives.h"
+#include "platform/geometry/BNViewProjection.h"
+
+namespace {
+
+constexpr uint32_t kCurveID = 0x10000000u;
+constexpr uint32_t kKeypointID = 0x20000000u;
+constexpr uint32_t kOutTangentID = 0x40000000u;
+constexpr double kPixelTolerance = 1e-3;
+
+// A view of 10 seconds by 10 units (x 0..10, y -5..5) on a 200 x 100 drawable: 20 pixels per
+// second across, 10 pixels per unit up.
+class HitTestFixture : public ::testing::Test {
+protected:
+    void SetUp() override { installFrame(1.0f); }
+
+    void installFrame(float backingScale) {
+        controller.updateTexture(nullptr, backingScale, BNViewVolumeProjection(CGRectMake(0, -5, 10, 10)),
+                                 HXDFloat2{0.05f, 0.1f}, CGSizeMake(200, 100));
+    }
+    CGPoint pixel(double x, double y) const {
+        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100)).worldToPixel(x, y);
+    }
+    HXDHitTestContext at(CGPoint p) const {
+        return controller.renderingContextForHitTestAtCoords(HXDFloat2{float(p.x), float(p.y)});
+    }
+    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p, bool closest = true) const {
+        return controller.newHitTestResultForPrimitives(list, at(p), closest);
+    }
+
+    // A keypoint image of 8 x 8 texels (2x, so 4 x 4 points): opaque except a transparent
+    // 2 x 2 corner at each corner.
+    static std::shared_ptr<const HXDPixelTexture> keypointImage() {
+        std::vector<uint8_t> rgba(8 * 8 * 4, 255);
+        for (int row = 0; row < 8; ++row)
+            for (int col = 0; col < 8; ++col) {
+                const bool corner = (row < 2 || row >= 6) && (col < 2 || col >= 6);
+                rgba[(row * 8 + col) * 4 + 3] = corner ? 0 : 255;
+            }
+        return HXDPixelTexture::textureWithRGBA(8, 8, 2.0f, std::move(rgba));
+    }
+    // A keypoint quad of 16 x 16 pixels centred on a world point, as a view makes it.
+    std::shared_ptr<HXDQuadTexture> keypoint(double x, double y, uint64_t handle) const {
+        const CGRect dest = CGRectMake(x - 0.4, y - 0.8, 0.8, 1.6);  // 16 px by 16 px
+        auto quad = std::make_shared<HXDQuadTexture>(0, keypointImage(), dest, 1.0f);
+        quad->setUseTextureAlphaForHitTest(true);
+        quad->hitInfo().setHitID(kKeypointID);
+        quad->hitInfo().extraInfo().setObject("ID", HXDNumber::numberWithInteger(7));
+        quad->hitInfo().extraInfo().setObject("Handle", HXDNumber::numberWithUnsignedLongLong(handle));
+        return quad;
+    }
+    static std::shared_ptr<HXDMultiline> curve(std::vector<HXDLineVertex> vertices) {
+        auto line = std::make_shared<HXDMultiline>(std::move(vertices));
+        line->hitInfo().setHitID(kCurveID);
+        return line;
+    }
+
+    HXDRenderController controller{nullptr, 1.0f};
+};
+
+TEST_F(HitTestFixture, mapping__agreesWithTheViewConversion) {
+    const BNMatrix44f& projection = controller.renderingContext()->projection();
+    const HXDScreenMapping mapping(projection, CGSizeMake(200, 100));
+    for (const CGPoint world : {CGPointMake(0, 0), CGPointMake(2.5, -4), CGPointMake(10, 5)}) {
+        const CGPoint expected = BNProjectionWorldToScreen(projection, CGSizeMake(200, 100), world);
+        const CGPoint got = mapping.worldToPixel(world.x, world.y);
+        EXPECT_NEAR(got.x, expected.x, kPixelTolerance) << "world x " << world.x;
+        EXPECT_NEAR(got.y, expected.y, kPixelTolerance) << "world y " << world.y;
+        const CGPoint back = mapping.pixelToWorld(got.x, got.y);
+        EXPECT_NEAR(back.x, world.x, 1e-6);
+        EXPECT_NEAR(back.y, world.y, 1e-6);
+    }
+}
+
+TEST_F(HitTestFixture, context__beforeAnyFrameFindsNothing) {
+    HXDRenderController fresh(nullptr, 1.0f);
+    const HXDPrimitiveArray list{curve({{{0, 0, 0}, {}}, {{10, 0, 0}, {}}})};
+    const HXDHitTestContext c = fresh.renderingContextForHitTestAtCoords(HXDFloat2{100, 50});
+    EXPECT_FALSE(c.isValid());
+    EXPECT_TRUE(fresh.newHitTestResultForPrimitives(list, c, true).empty()) << "no frame: no projection to test with";
+
+    HXDPrimitiveArray withNull{nullptr, list[0]};
+    EXPECT_EQ(pick(withNull, pixel(5, 0)).size(), 1u) << "a null entry is skipped, not dereferenced";
+}
+
+TEST_F(HitTestFixture, multiline__hitOnTheLineAndWithinTheToleranceOnly) {
+    const HXDPrimitiveArray list{curve({{{0, 0, 0}, {}}, {{5, 2, 0}, {}}, {{10, 2, 0}, {}}})};
+    {
+        const auto hits = pick(list, pixel(7.5, 2));
+        ASSERT_EQ(hits.size(), 1u);
+        EXPECT_EQ(hits[0].hitID(), kCurveID);
+        EXPECT_FLOAT_EQ(hits[0].distance(), 0.0f) << "a point on the drawn line lies at distance 0";
+    }
+    {
+        // 2 px above a 1 px line: 1.5 px beyond its edge, inside the 3 px tolerance.
+        const CGPoint p = pixel(7.5, 2);
+        const auto hits = pick(list, CGPointMake(p.x, p.y + 2));
+        ASSERT_EQ(hits.size(), 1u);
+        EXPECT_NEAR(hits[0].distance(), 1.5, kPixelTolerance);
+    }
+    {
+        const CGPoint p = pixel(7.5, 2);
+        EXPECT_TRUE(pick(list, CGPointMake(p.x, p.y + 4)).empty()) << "4 px off a 1 px line is beyond the tolerance";
+    }
+    {
+        // On a backing scale of 2, width 1 covers 2 px and the tolerance 6 px.
+        installFrame(2.0f);
+        const CGPoint p = pixel(7.5, 2);
+        EXPECT_EQ(pick(list, CGPointMake(p.x, p.y + 6.5)).size(), 1u) << "tolerance follows the backing scale";
+    }
+}
+
+// The index must find what a walk over every segment finds, for curves (x in order) and for
+// anything else (a loop, x going back, several runs).
+TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
+    std::mt19937 rng(1234);
+    std::uniform_real_distribution<double> ux(-0.5, 10.5), uy(-5.5, 5.5);
+    std::vector<HXDLineVertex> monotone, wandering;
+    for (int i = 0; i < 2000; ++i) {
+        const float x = static_cast<float>(i * 10.0 / 1999.0);
+        monotone.push_back({{x, static_cast<float>(4.0 * std::sin(x * 3.0)), 0}, {}});
+        wandering.push_back({{static_cast<float>(5 + 4 * std::cos(i * 0.01)), static_cast<float>(4 * std::sin(i * 0.013)), 0}, {}});
+    }
+    auto looped = curve(wandering);
+    looped->setLoop(true);
+    const HXDScreenMapping mapping(controller.renderingContext()->projection(), CGSizeMake(200, 100));
+    for (const auto& line : {curve(monotone), looped}) {
+        const auto& v = line->vertices();
+        const size_t segments = v.size() - 1 + (line->loop() ? 1 : 0);
+        for (int trial = 0; trial < 300; ++trial) {
+            const CGPoint p = pixel(ux(rng), uy(rng));
+            double best = std::numeric_limits<double>::infinity();
+            for (size_t s = 0; s < segments; ++s) {
+                const HXDLineVertex& a = v[s];
+                const HXDLineVertex& b = v[(s + 1) % v.size()];
+                const CGPoint pa = mapping.worldToPixel(a.start.x, a.start.y);
+                const CGPoint pb = mapping.worldToPixel(b.start.x, b.start.y);
+                const double dx = pb.x - pa.x, dy = pb.y - pa.y;
+                double t = ((p.x - pa.x) * dx + (p.y - pa.y) * dy) / (dx * dx + dy * dy);
+                t = std::clamp(std::isfinite(t) ? t : 0.0, 0.0, 1.0);
+                best = std::min(best, std::hypot(pa.x + t * dx - p.x, pa.y + t * dy - p.y));
+            }
+            const auto hits = pick({line}, p);
+            const bool expected = best <= 0.5 + 3.0;
+            ASSERT_EQ(!hits.empty(), expected) << "trial " << trial << " loop " << line->loop() << " brute " << best;
+            if (expected) {
+                EXPECT_NEAR(hits[0].distance(), std::max(0.0, best - 0.5), kPixelTolerance);
+            }
+        }
+    }
+}
+
+TEST_F(HitTestFixture, multiline__segmentsWithGapsMakeRunsAndLoopsClose) {
+    const HXDColor c{1, 0, 0, 1};
+    const HXDLineSegment segs[] = {{{0, 0, 0}, {0, 2, 0}, c}, {{0, 2, 0}, {2, 2, 0}, c}, {{6, 0, 0}, {8, 0, 0}, c}};
+    auto line = std::make_shared<HXDMultiline>(std::span<const HXDLineSegment>(segs));
+    EXPECT_EQ(line->numberOfRuns(), 2u);
+    EXPECT_EQ(line->vertices().size(), 5u) << "chained segments share their vertex";
+    EXPECT_TRUE(pick({line}, pixel(4, 1)).empty()) << "the gap between runs is not a segment";
+    EXPECT_TRUE(pick({line}, pixel(1, 1)).empty()) << "open: the first run does not close";
+    line->setLoop(true);
+    EXPECT_EQ(pick({line}, pixel(1, 1)).size(), 1u) << "loop closes (2,2) back to (0,0) through (1,1)";
+}
+
+TEST_F(HitTestFixture, keypointQuad__transparentCornerDoesNotHitButTheImageDoes) {
+    auto key = keypoint(5, 0, 0xFFFFFFFF12345678ull);
+    const CGPoint centre = pixel(5, 0);
+    {
+        const auto hits = pick({key}, centre);
+        ASSERT_EQ(hits.size(), 1u);
+        EXPECT_EQ(hits[0].hitID(), kKeypointID);
+        const HXDNumber* handle = hits[0].extraInfo().objectForKey("Handle");
+        ASSERT_NE(handle, nullptr);
+        EXPECT_EQ(handle->unsignedLongLongValue(), 0xFFFFFFFF12345678ull) << "a 64-bit handle survives the record";
+        EXPECT_EQ(hits[0].extraInfo().objectForKey("ID")->unsignedLongValue(), 7u);
+    }
+    // The quad spans centre +- 8 px; its 2 x 2 texel corners are the outer 4 px.
+    const CGPoint corner = CGPointMake(centre.x + 7, centre.y + 7);
+    EXPECT_TRUE(pick({key}, corner).empty()) << "a transparent texel is not the keypoint";
+    EXPECT_EQ(pick({key}, CGPointMake(centre.x + 7, centre.y)).size(), 1u) << "an opaque edge texel is";
+    key->setUseTextureAlphaForHitTest(false);
+    EXPECT_EQ(pick({key}, corner).size(), 1u) << "without the flag the whole rectangle hits, as tangent handles do";
+}
+
+TEST_F(HitTestFixture, closest__keypointOverCurveOverlapsToTheTopOneAndLinesByDistance) {
+    auto line = curve({{{0, 0, 0}, {}}, {{10, 0, 0}, {}}});
+    auto first = keypoint(5, 0, 1);
+    auto second = keypoint(5.2, 0, 2);  // overlaps the first by 12 px
+    {
+        const auto hits = pick({first, line}, pixel(5, 0));
+        ASSERT_EQ(hits.size(), 1u) << "closest answers at most one record";
+        EXPECT_EQ(hits[0].hitID(), kKeypointID) << "the keypoint wins over the curve through it, drawn later or not";
+    }
+    {
+        const auto hits = pick({line, first, second}, pixel(5.1, 0));
+        ASSERT_EQ(hits.size(), 1u);
+        EXPECT_EQ(hits[0].extraInfo().objectForKey("Handle")->unsignedLongLongValue(), 2u)
+            << "of two overlapping keypoints the one drawn on top is hit";
+        EXPECT_EQ(pick({line, first, second}, pixel(5.1, 0), false).size(), 3u)
+            << "without the flag every primitive under the point answers, in order";
+    }
+    {
+        // A tangent handle near a curve: on the handle it wins; 2 px off the curve and
+        // outside the handle, the curve does.
+        auto handle = std::make_shared<HXDQuadTexture>(kOutTangentID, nullptr, CGRectMake(1, 0.5, 0.5, 1.0), 1.0f);
+        const auto on = pick({line, handle}, pixel(1.25, 1.0));
+        ASSERT_EQ(on.size(), 1u);
+        EXPECT_EQ(on[0].hitID(), kOutTangentID);
+        const auto off = pick({line, handle}, pixel(3, 0.2));
+        ASSERT_EQ(off.size(), 1u);
+        EXPECT_EQ(off[0].hitID(), kCurveID);
+    }
+}
+
+TEST_F(HitTestFixture, rectangle__findsKeypointsByTheirOpaqueTexelsAndCurvesThatCross) {
+    auto a = keypoint(2, 0, 1);
+    auto b = keypoint(5, 2, 2);
+    auto c = keypoint(8, -2, 3);
+    const CGPoint pa = pixel(2, 0), pb = pixel(5, 2);
+    {
+        const CGRect band = CGRectMake(pb.x + 1, pb.y + 1, pa.x - pb.x - 2, pa.y - pb.y - 2);  // negative size
+        const auto hits = controller.newHitTestResultForPrimitives(
+            {a, b, c}, controller.renderingContextForHitTestInRect(band), false);
+        ASSERT_EQ(hits.size(), 2u) << "the band from b's centre to a's covers both, not c";
+        EXPECT_EQ(hits[0].extraInfo().objectForKey("Handle")->unsignedLongLongValue(), 1u) << "records keep array order";
+    }
+    {
+        // A small band over a's transparent top-right corner only.
+        const CGRect corner = CGRectMake(pa.x + 6.5, pa.y + 6.5, 1, 1);
+        EXPECT_TRUE(controller
+                        .newHitTestResultForPrimitives({a}, controller.renderingContextForHitTestInRect(corner), false)
+                        .empty())
+            << "a band over a transparent corner does not select the keypoint";
+    }
+    {
+        auto line = curve({{{0, -4, 0}, {}}, {{10, 4, 0}, {}}});
+        const CGPoint mid = pixel(5, 0);
+        const auto crossing = controller.renderingContextForHitTestInRect(CGRectMake(mid.x - 3, mid.y - 3, 6, 6));
+        EXPECT_EQ(controller.newHitTestResultForPrimitives({line}, crossing, false).size(), 1u);
+        const auto beside = controller.renderingContextForHitTestInRect(CGRectMake(mid.x + 20, mid.y - 3, 6, 6));
+        EXPECT_TRUE(controller.newHitTestResultForPrimitives({line}, beside, false).empty());
+    }
+}
+
+TEST_F(HitTestFixture, meshAndFlatQuad__insideHitsOutsideDoesNot) {
+    auto mesh = std::make_shared<HXDMesh>(9, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{2, -2}, {2, 2}, {8, 2}, {8, -2}})});
+    auto handle = std::make_shared<HXDScreenspaceQuad>(CGRectMake(7.9, 1.8, 0.2, 0.4), 3);
+    {
+        const auto hits = pick({mesh, handle}, pixel(5, 0));
+        ASSERT_EQ(hits.size(), 1u);
+        EXPECT_EQ(hits[0].hitID(), 9u);
+    }
+    {
+        const auto hits = pick({mesh, handle}, pixel(8, 2));
+        ASSERT_EQ(hits.size(), 1u);
+        EXPECT_EQ(hits[0].hitID(), 3u) << "a box handle drawn over the box's inside wins";
+    }
+    EXPECT_TRUE(pick({mesh, handle}, pixel(9, 0)).empty());
+    mesh->setWireframe(true);
+    EXPECT_TRUE(pick({mesh}, pixel(5, 0)).empty()) << "a wireframe mesh is hit on its outline only";
+    EXPECT_EQ(pick({mesh}, pixel(2, 0)).size(), 1u);
+}
+
+TEST(HXDPrimitivesTest, textureAndNumbers__badInputIsSafe) {
+    EXPECT_EQ(HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::vector<uint8_t>(10))->width(), 0u)
+        << "a buffer of the wrong size gives an empty texture, not a read past its end";
+    const auto t = HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {64, 32, 16, 128}, true);
+    EXPECT_EQ(t->rgba()[0], 128) << "premultiplied input is stored straight";
+    EXPECT_EQ(t->alphaAt(-1, 0), 0.0f);
+    EXPECT_NE(t->textureID(), HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {0, 0, 0, 0})->textureID());
+
+    EXPECT_EQ(HXDNumber::numberWithDouble(1e300).integerValue(), std::numeric_limits<int64_t>::max());
+    EXPECT_EQ(HXDNumber::numberWithDouble(std::nan("")).unsignedLongLongValue(), 0u);
+    EXPECT_EQ(HXDNumber::numberWithInteger(3), HXDNumber::numberWithUnsignedLongLong(3));
+    EXPECT_FALSE(HXDNumber::numberWithInteger(-1) == HXDNumber::numberWithUnsignedLongLong(~0ull));
+}
+
+TEST_F(HitTestFixture, text__boxFollowsTheAnchorAndTheBackingScale) {
+    HXDText text(HXDAttributedString{"0.50", HXDTextAttributes{}}, HXDTextLayoutAnchor::BottomLeft, CGPointMake(5, 0));
+    const HXDScreenMapping mapping(controller.renderingContext()->projection(), CGSizeMake(200, 100));
+    const CGRect one = text.pixelRect(mapping, 1.0f);
+    const CGRect two = text.pixelRect(mapping, 2.0f);
+    EXPECT_NEAR(one.origin.x, 100, kPixelTolerance);
+    EXPECT_NEAR(one.origin.y, 50, kPixelTolerance) << "anchor 0 puts the box's bottom left at the position";
+    EXPECT_GT(one.size.width, 0.0);
+    EXPECT_NEAR(two.size.height, 2 * one.size.height, kPixelTolerance) << "a point is two pixels on a 2x backing";
+}
+
+}  // namespace
