@@ -7,6 +7,7 @@
 
 #include "platform/channels/internal/TQChannelData.h"
 
+using tq_internal::compareTimes;
 using tq_internal::CurveCursor;
 using tq_internal::handleOf;
 using tq_internal::TQChannelData;
@@ -119,7 +120,7 @@ TQKeyframeHandle TQChannel::getPreviousEnabledKeyframe(TQKeyframeHandle handle) 
     // arriving here.
     for (long j = i - 1; j >= 0; --j) {
         const TQKeyframeRecord& k = _d->keys[size_t(j)];
-        if (k.enabled && CMTimeCompare(k.time, time) < 0) return handleOf(k.serial);
+        if (k.enabled && compareTimes(k.time, time) < 0) return handleOf(k.serial);
     }
     return nullptr;
 }
@@ -495,7 +496,7 @@ void TQChannel::purgeKeyframes() {
     size_t kept = 0;
     for (size_t i = 0; i < keys.size(); ++i) {
         const bool lastOfRun =
-            i + 1 == keys.size() || CMTimeCompare(keys[i].time, keys[i + 1].time) != 0;
+            i + 1 == keys.size() || compareTimes(keys[i].time, keys[i + 1].time) != 0;
         if (lastOfRun) {
             if (kept != i) keys[kept] = keys[i];
             ++kept;
@@ -523,13 +524,13 @@ void TQChannel::moveKeyframe(const CMTime* from, const CMTime* to, bool keepBoth
     const CMTime target = toChannelTime(to);
     if (!CMTIME_IS_NUMERIC(source) || !CMTIME_IS_NUMERIC(target)) return;
     const long i = _d->lastAt(source);
-    if (i < 0 || CMTimeCompare(source, target) == 0) return;
-    const uint64_t moved = _d->keys[size_t(i)].serial;
-    _d->retime(size_t(i), target);
+    if (i < 0 || compareTimes(source, target) == 0) return;
+    const size_t pos = _d->retime(size_t(i), target);
     if (keepBoth) return;
-    std::erase_if(_d->keys, [&](const TQKeyframeRecord& k) {
-        return k.serial != moved && CMTimeCompare(k.time, target) == 0;
-    });
+    // The moved keyframe arrived last at the target: the others there come just before it.
+    const size_t firstThere = _d->lowerBound(target);
+    if (firstThere == pos) return;
+    _d->keys.erase(_d->keys.begin() + long(firstThere), _d->keys.begin() + long(pos));
     _d->orderChanged();
 }
 
@@ -539,7 +540,7 @@ void TQChannel::setKeyframeTime(TQKeyframeHandle handle, const CMTime* time,
     const long i = _d->indexOf(handle);
     if (i < 0 || !time || !CMTIME_IS_NUMERIC(*time)) return;
     size_t pos = size_t(i);
-    if (CMTimeCompare(_d->keys[pos].time, *time) != 0) {
+    if (compareTimes(_d->keys[pos].time, *time) != 0) {
         if (collided) *collided = _d->lastAt(*time) >= 0;
         pos = _d->retime(pos, *time);
     }
@@ -570,7 +571,7 @@ void TQChannel::setCurveSegmentValue(const CMTime& time, double value, bool noti
     const size_t after = _d->upperBound(time);
     auto offsetRunAt = [&](size_t pos) {
         const CMTime at = keys[pos].time;
-        for (size_t j = _d->lowerBound(at); j < keys.size() && CMTimeCompare(keys[j].time, at) == 0;
+        for (size_t j = _d->lowerBound(at); j < keys.size() && compareTimes(keys[j].time, at) == 0;
              ++j) {
             keys[j].value += delta;
         }

@@ -1,5 +1,6 @@
 #include "platform/channels/internal/TQChannelData.h"
 
+#include <algorithm>
 #include <atomic>
 
 namespace tq_internal {
@@ -45,7 +46,7 @@ size_t TQChannelData::lowerBound(const CMTime& time) const {
     size_t lo = 0, hi = keys.size();
     while (lo < hi) {
         const size_t mid = lo + (hi - lo) / 2;
-        if (CMTimeCompare(keys[mid].time, time) < 0) {
+        if (compareTimes(keys[mid].time, time) < 0) {
             lo = mid + 1;
         } else {
             hi = mid;
@@ -58,7 +59,7 @@ size_t TQChannelData::upperBound(const CMTime& time) const {
     size_t lo = 0, hi = keys.size();
     while (lo < hi) {
         const size_t mid = lo + (hi - lo) / 2;
-        if (CMTimeCompare(keys[mid].time, time) <= 0) {
+        if (compareTimes(keys[mid].time, time) <= 0) {
             lo = mid + 1;
         } else {
             hi = mid;
@@ -69,7 +70,7 @@ size_t TQChannelData::upperBound(const CMTime& time) const {
 
 long TQChannelData::lastAt(const CMTime& time) const {
     const size_t ub = upperBound(time);
-    if (ub == 0 || CMTimeCompare(keys[ub - 1].time, time) != 0) return -1;
+    if (ub == 0 || compareTimes(keys[ub - 1].time, time) != 0) return -1;
     return long(ub - 1);
 }
 
@@ -96,11 +97,31 @@ void TQChannelData::eraseAt(size_t position) {
 }
 
 size_t TQChannelData::retime(size_t position, const CMTime& time) {
-    TQKeyframeRecord record = keys[position];
-    eraseAt(position);
-    record.time = time;
-    record.seconds = CMTimeGetSeconds(time);
-    return insert(record);
+    if (position >= keys.size()) return position;
+    cacheValid = false;
+    // The new place: after every other keyframe at an equal or earlier time. Moving later,
+    // the keyframe itself is among those counted by upperBound; moving earlier, it is not.
+    const bool later = compareTimes(time, keys[position].time) >= 0;
+    size_t target = upperBound(time);
+    if (later) --target;
+    keys[position].time = time;
+    keys[position].seconds = CMTimeGetSeconds(time);
+    if (target == position) return position;  // a drag step usually stays between its neighbours
+
+    // Only the keyframes between the old and the new place shift by one.
+    const auto first = keys.begin() + long(std::min(position, target));
+    const auto last = keys.begin() + long(std::max(position, target)) + 1;
+    if (target > position) {
+        std::rotate(first, first + 1, last);
+    } else {
+        std::rotate(first, last - 1, last);
+    }
+    if (indexValid) {
+        for (size_t i = std::min(position, target), end = std::max(position, target); i <= end; ++i) {
+            index[keys[i].serial] = i;
+        }
+    }
+    return target;
 }
 
 const CurveCache& TQChannelData::curve() const {

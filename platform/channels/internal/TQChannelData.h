@@ -35,6 +35,17 @@ bool sameState(const TQKeyframeRecord& a, const TQKeyframeRecord& b);
 
 uint64_t nextKeyframeSerial();
 
+// CMTimeCompare with a shortcut for the common case of two numeric times on one timescale,
+// which is every comparison between keyframes set on the editor's grid.
+inline int32_t compareTimes(const CMTime& a, const CMTime& b) {
+    constexpr CMTimeFlags kKind = kCMTimeFlags_Valid | kCMTimeFlags_ImpliedValueFlagsMask;
+    if (a.timescale == b.timescale && a.timescale > 0 && (a.flags & kKind) == kCMTimeFlags_Valid &&
+        (b.flags & kKind) == kCMTimeFlags_Valid) {
+        return a.value < b.value ? -1 : (a.value > b.value ? 1 : 0);
+    }
+    return CMTimeCompare(a, b);
+}
+
 inline void* handleOf(uint64_t serial) {
     return reinterpret_cast<void*>(static_cast<uintptr_t>(serial));
 }
@@ -64,7 +75,8 @@ struct TQChannelData {
     // Inserts after every keyframe at an equal or earlier time; answers the position.
     size_t insert(const TQKeyframeRecord& record);
     void eraseAt(size_t position);
-    // Takes the keyframe at `position` out and puts it back at `time`, arriving last there.
+    // Takes the keyframe at `position` out and puts it back at `time`, arriving last there;
+    // answers its new position. Costs a binary search plus the keyframes it passes over.
     size_t retime(size_t position, const CMTime& time);
     // First position whose time is not earlier than `time` / later than `time`.
     size_t lowerBound(const CMTime& time) const;

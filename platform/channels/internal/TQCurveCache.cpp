@@ -232,7 +232,7 @@ void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
     pts.reserve(keys.size());
     for (const TQKeyframeRecord& k : keys) {
         if (!k.enabled) continue;
-        if (!pts.empty() && CMTimeCompare(pts.back()->time, k.time) == 0) {
+        if (!pts.empty() && compareTimes(pts.back()->time, k.time) == 0) {
             pts.back() = &k;  // keyframes that met: the last arrived stands for the time
         } else {
             pts.push_back(&k);
