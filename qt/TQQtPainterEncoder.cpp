@@ -1,0 +1,399 @@
+#include "qt/TQQtPainterEncoder.h"
+
+#include <QFontDatabase>
+#include <QFontMetricsF>
+#include <QLinearGradient>
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+
+namespace {
+
+// Textures are few (keypoint images, handles, icons); a cache past this many holds images
+// of textures that are gone, and starts over.
+constexpr size_t kMaxCachedTextures = 256;
+
+Qt::PenJoinStyle penJoin(HXDLineJoin join) {
+    switch (join) {
+        case HXDLineJoin::Round: return Qt::RoundJoin;
+        case HXDLineJoin::Bevel: return Qt::BevelJoin;
+        case HXDLineJoin::Miter: return Qt::MiterJoin;
+    }
+    return Qt::MiterJoin;
+}
+
+// Flat ends keep stipple steps exactly as long as the pattern says; round joins get round
+// ends so that separately stroked pieces meet without notches.
+Qt::PenCapStyle penCap(Qt::PenJoinStyle join) { return join == Qt::RoundJoin ? Qt::RoundCap : Qt::FlatCap; }
+
+bool nearlySame(const QPointF& a, const QPointF& b) {
+    return std::abs(a.x() - b.x()) + std::abs(a.y() - b.y()) < 1e-6;
+}
+
+QPointF lerp(const QPointF& a, const QPointF& b, double t) { return a + (b - a) * t; }
+
+HXDColor lerp(const HXDColor& a, const HXDColor& b, double t) {
+    const auto mix = [t](float x, float y) { return static_cast<float>(x + (y - x) * t); };
+    return HXDColor{mix(a.red, b.red), mix(a.green, b.green), mix(a.blue, b.blue), mix(a.alpha, b.alpha)};
+}
+
+}  // namespace
+
+// ---- Text metrics ---------------------------------------------------------------------------
+
+QFont TQQtTextMetrics::fontFor(const HXDTextAttributes& attributes) {
+    QFont font = attributes.fontFamily.empty() ? QFontDatabase::systemFont(QFontDatabase::GeneralFont)
+                                               : QFont(QString::fromStdString(attributes.fontFamily));
+    // A point of the views is one logical pixel, whatever the screen's dpi says.
+    const float size = std::isfinite(attributes.fontSize) ? attributes.fontSize : 8.0f;
+    font.setPixelSize(std::max(1, static_cast<int>(std::lround(size))));
+    return font;
+}
+
+CGSize TQQtTextMetrics::sizeOfText(const std::string& text, const HXDTextAttributes& attributes) const {
+    const QFontMetricsF metrics(fontFor(attributes));
+    return CGSizeMake(metrics.horizontalAdvance(QString::fromStdString(text)), metrics.height());
+}
+
+// ---- Frame ----------------------------------------------------------------------------------
+
+TQQtPainterEncoder::~TQQtPainterEncoder() {
+    if (_painter.isActive()) _painter.end();
+}
+
+HXDTexture* TQQtPainterEncoder::nextDrawable() {
+    if (_drawableSize.isEmpty()) return nullptr;
+    QImage& image = _target.image();
+    if (image.size() != _drawableSize) image = QImage(_drawableSize, QImage::Format_ARGB32_Premultiplied);
+    if (image.isNull()) return nullptr;  // out of memory for a huge drawable
+    return &_target;
+}
+
+void TQQtPainterEncoder::beginEncoding(HXDTexture& target, const HXDColor& clearColor) {
+    // Only our own drawable can be painted: anything else is not a QImage we know.
+    if (&target != &_target || _target.image().isNull()) return;
+    if (_painter.isActive()) _painter.end();
+    _painter.begin(&_target.image());
+    _painter.setCompositionMode(QPainter::CompositionMode_Source);
+    _painter.fillRect(QRect(QPoint(0, 0), _target.image().size()), qColor(clearColor));
+    _encoding = true;
+    _mapping = HXDScreenMapping();
+    _mappedSize = CGSizeZero;
+}
+
+void TQQtPainterEncoder::endEncoding() {
+    if (!_encoding) return;
+    _painter.end();
+    _encoding = false;
+    ++_framesPresented;
+    if (_present) _present(_target.image());
+}
+
+QColor TQQtPainterEncoder::qColor(const HXDColor& c) {
+    const auto clamp01 = [](float v) { return std::isfinite(v) ? std::clamp(v, 0.0f, 1.0f) : 0.0f; };
+    return QColor::fromRgbF(clamp01(c.red), clamp01(c.green), clamp01(c.blue), clamp01(c.alpha));
+}
+
+QPainter::CompositionMode TQQtPainterEncoder::compositionModeFor(const HXDBlendingInfo& b) {
+    using F = HXDBlendFactor;
+    if (!b.enabled) return QPainter::CompositionMode_Source;
+    switch (b.rgbOperation) {
+        case HXDBlendOperation::Min: return QPainter::CompositionMode_Darken;
+        case HXDBlendOperation::Max: return QPainter::CompositionMode_Lighten;
+        case HXDBlendOperation::Subtract:
+        case HXDBlendOperation::ReverseSubtract: return QPainter::CompositionMode_Difference;
+        case HXDBlendOperation::Add: break;
+    }
+    // QPainter works on premultiplied colours, so a source factor of SourceAlpha (straight
+    // colour) and One (premultiplied colour) are the same mode here.
+    const bool srcOver = b.sourceRGB == F::SourceAlpha || b.sourceRGB == F::One;
+    if (srcOver && b.destinationRGB == F::OneMinusSourceAlpha) return QPainter::CompositionMode_SourceOver;
+    if (srcOver && b.destinationRGB == F::One) return QPainter::CompositionMode_Plus;
+    if (srcOver && b.destinationRGB == F::Zero) return QPainter::CompositionMode_Source;
+    if ((b.sourceRGB == F::DestinationColor && b.destinationRGB == F::Zero) ||
+        (b.sourceRGB == F::Zero && b.destinationRGB == F::SourceColor))
+        return QPainter::CompositionMode_Multiply;
+    if (b.sourceRGB == F::One && b.destinationRGB == F::OneMinusSourceColor) return QPainter::CompositionMode_Screen;
+    if (b.sourceRGB == F::Zero && b.destinationRGB == F::OneMinusSourceAlpha)
+        return QPainter::CompositionMode_DestinationOut;
+    if (b.sourceRGB == F::Zero && b.destinationRGB == F::One) return QPainter::CompositionMode_Destination;
+    if (b.sourceRGB == F::OneMinusDestinationAlpha && b.destinationRGB == F::One)
+        return QPainter::CompositionMode_DestinationOver;
+    if (b.sourceRGB == F::DestinationAlpha && b.destinationRGB == F::OneMinusSourceAlpha)
+        return QPainter::CompositionMode_SourceAtop;
+    return QPainter::CompositionMode_SourceOver;
+}
+
+const HXDScreenMapping& TQQtPainterEncoder::mappingFor(const HXDRenderingContext& context) {
+    const CGSize size = context.drawableSize();
+    if (!(_mappedSize == size) || !(_mappedProjection == context.projection())) {
+        _mapping = HXDScreenMapping(context.projection(), size);
+        _mappedProjection = context.projection();
+        _mappedSize = size;
+    }
+    _deviceHeight = size.height > 0.0 ? size.height : _target.image().height();
+    return _mapping;
+}
+
+QRectF TQQtPainterEncoder::toDevice(const CGRect& r) const {
+    const CGRect s = CGRectStandardize(r);
+    return QRectF(s.origin.x, _deviceHeight - (s.origin.y + s.size.height), s.size.width, s.size.height);
+}
+
+bool TQQtPainterEncoder::prepare(const HXDDrawPrimitive& primitive) {
+    if (!_encoding) return false;
+    _painter.setCompositionMode(compositionModeFor(primitive.blendingInfo()));
+    _painter.setOpacity(1.0);
+    return true;
+}
+
+// ---- Multilines -----------------------------------------------------------------------------
+
+void TQQtPainterEncoder::encodeMultiline(const HXDMultiline& multiline, const HXDRenderingContext& context) {
+    if (!prepare(multiline) || !mappingFor(context).isValid()) return;
+    const double widthPixels = static_cast<double>(multiline.width()) * context.backingScale();
+    if (!(widthPixels >= 0.0) || multiline.vertices().size() < 2) return;
+    double step = 0.0;
+    if (multiline.stippled()) {
+        step = static_cast<double>(multiline.stippleScale()) * context.backingScale();
+        if (multiline.stipplePattern() == 0) return;  // every step off
+        if (!(step > 0.0) || multiline.stipplePattern() == 0xFFFFFFFFu) step = 0.0;
+    }
+    const float gamma = multiline.gamma();
+    if (multiline.antialiased() && std::isfinite(gamma) && gamma > 0.0f && gamma != 1.0f) {
+        strokeWithGamma(multiline, widthPixels, step, gamma);
+        return;
+    }
+    _painter.setRenderHint(QPainter::Antialiasing, multiline.antialiased());
+    strokeMultiline(_painter, multiline, widthPixels, step);
+}
+
+void TQQtPainterEncoder::strokeMultiline(QPainter& painter, const HXDMultiline& multiline, double widthPixels,
+                                         double step) {
+    const Qt::PenJoinStyle join = penJoin(multiline.lineJoin());
+    const auto& vertices = multiline.vertices();
+    StipplePhase phase{0, step};
+    for (size_t r = 0; r < multiline.numberOfRuns(); ++r) {
+        const auto [first, end] = multiline.runRange(r);
+        if (end <= first || end > vertices.size()) continue;
+        _points.clear();
+        _colors.clear();
+        for (uint32_t i = first; i < end; ++i) {
+            _points.push_back(toDevice(vertices[i].start.x, vertices[i].start.y));
+            _colors.push_back(vertices[i].color);
+        }
+        if (multiline.loop() && end - first > 2) {
+            _points.push_back(_points.front());
+            _colors.push_back(_colors.front());
+        }
+        strokeRun(painter, widthPixels, step, multiline.stipplePattern(), join, phase);
+    }
+}
+
+void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double step, uint32_t pattern,
+                                   Qt::PenJoinStyle join, StipplePhase& phase) {
+    _polyline.clear();
+    for (size_t i = 0; i + 1 < _points.size(); ++i) {
+        const QPointF& a = _points[i];
+        const QPointF& b = _points[i + 1];
+        const HXDColor& ca = _colors[i];
+        const HXDColor& cb = _colors[i + 1];
+        if (!std::isfinite(a.x()) || !std::isfinite(a.y()) || !std::isfinite(b.x()) || !std::isfinite(b.y())) {
+            flushPolyline(painter, widthPixels, join);
+            continue;
+        }
+        if (step <= 0.0) {
+            if (ca == cb) {
+                appendToPolyline(painter, a, b, ca, widthPixels, join);
+            } else {
+                flushPolyline(painter, widthPixels, join);
+                drawSegment(painter, a, b, ca, cb, widthPixels, join);
+            }
+            continue;
+        }
+        // Stipple: walk the segment step by step; the phase runs on into the next segment.
+        const double length = std::hypot(b.x() - a.x(), b.y() - a.y());
+        double t = 0.0;
+        while (t < length) {
+            const double piece = std::min(phase.remaining, length - t);
+            const bool on = ((pattern >> phase.bit) & 1u) != 0;
+            if (on) {
+                const double t0 = t / length;
+                const double t1 = (t + piece) / length;
+                const QPointF pa = lerp(a, b, t0);
+                const QPointF pb = lerp(a, b, t1);
+                if (ca == cb) {
+                    appendToPolyline(painter, pa, pb, ca, widthPixels, join);
+                } else {
+                    flushPolyline(painter, widthPixels, join);
+                    drawSegment(painter, pa, pb, lerp(ca, cb, t0), lerp(ca, cb, t1), widthPixels, join);
+                }
+            } else {
+                flushPolyline(painter, widthPixels, join);
+            }
+            t += piece;
+            phase.remaining -= piece;
+            if (phase.remaining <= step * 1e-9) {
+                phase.bit = (phase.bit + 1) % 32;
+                phase.remaining = step;
+            }
+        }
+    }
+    flushPolyline(painter, widthPixels, join);
+}
+
+void TQQtPainterEncoder::appendToPolyline(QPainter& painter, const QPointF& a, const QPointF& b,
+                                          const HXDColor& color, double widthPixels, Qt::PenJoinStyle join) {
+    if (!_polyline.isEmpty() && color == _polylineColor && nearlySame(_polyline.back(), a)) {
+        _polyline.append(b);
+        return;
+    }
+    flushPolyline(painter, widthPixels, join);
+    _polyline.append(a);
+    _polyline.append(b);
+    _polylineColor = color;
+}
+
+void TQQtPainterEncoder::flushPolyline(QPainter& painter, double widthPixels, Qt::PenJoinStyle join) {
+    if (_polyline.size() >= 2) {
+        // Width 0 is Qt's one-pixel cosmetic pen, as thin as a line can be drawn.
+        painter.setPen(QPen(QBrush(qColor(_polylineColor)), widthPixels, Qt::SolidLine, penCap(join), join));
+        painter.drawPolyline(_polyline);
+    }
+    _polyline.clear();
+}
+
+void TQQtPainterEncoder::drawSegment(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& ca,
+                                     const HXDColor& cb, double widthPixels, Qt::PenJoinStyle join) {
+    if (nearlySame(a, b)) return;
+    QLinearGradient gradient(a, b);
+    gradient.setColorAt(0.0, qColor(ca));
+    gradient.setColorAt(1.0, qColor(cb));
+    painter.setPen(QPen(QBrush(gradient), widthPixels, Qt::SolidLine, penCap(join), join));
+    painter.drawLine(a, b);
+}
+
+void TQQtPainterEncoder::strokeWithGamma(const HXDMultiline& multiline, double widthPixels, double step,
+                                         float gamma) {
+    // Bounds of the line in device pixels, grown by its width and the antialiased fringe.
+    double x0 = INFINITY, y0 = INFINITY, x1 = -INFINITY, y1 = -INFINITY;
+    for (const HXDLineVertex& v : multiline.vertices()) {
+        const QPointF p = toDevice(v.start.x, v.start.y);
+        if (!std::isfinite(p.x()) || !std::isfinite(p.y())) continue;
+        x0 = std::min(x0, p.x());
+        y0 = std::min(y0, p.y());
+        x1 = std::max(x1, p.x());
+        y1 = std::max(y1, p.y());
+    }
+    if (x0 > x1) return;
+    const double grow = widthPixels + 2.0;
+    const QRect area = QRectF(QPointF(x0 - grow, y0 - grow), QPointF(x1 + grow, y1 + grow))
+                           .toAlignedRect()
+                           .intersected(QRect(QPoint(0, 0), _target.image().size()));
+    if (area.isEmpty()) return;
+
+    QImage layer(area.size(), QImage::Format_ARGB32_Premultiplied);
+    layer.fill(Qt::transparent);
+    {
+        QPainter lp(&layer);
+        lp.setRenderHint(QPainter::Antialiasing, true);
+        lp.translate(-area.topLeft());
+        strokeMultiline(lp, multiline, widthPixels, step);
+    }
+    // Coverage raised to 1/gamma; colour components follow, to stay premultiplied.
+    std::array<uint8_t, 256> lut{};
+    for (int a = 0; a < 256; ++a)
+        lut[a] = static_cast<uint8_t>(std::lround(255.0 * std::pow(a / 255.0, 1.0 / gamma)));
+    for (int y = 0; y < layer.height(); ++y) {
+        auto* row = reinterpret_cast<QRgb*>(layer.scanLine(y));
+        for (int x = 0; x < layer.width(); ++x) {
+            const int a = qAlpha(row[x]);
+            if (a == 0) continue;
+            const int na = lut[a];
+            const auto scale = [a, na](int c) { return std::min(na, c * na / a); };
+            row[x] = qRgba(scale(qRed(row[x])), scale(qGreen(row[x])), scale(qBlue(row[x])), na);
+        }
+    }
+    _painter.drawImage(area.topLeft(), layer);
+}
+
+// ---- Quads, meshes, text ----------------------------------------------------------------------
+
+const QImage* TQQtPainterEncoder::textureImage(const HXDPixelTexture& texture) {
+    if (texture.width() == 0 || texture.height() == 0) return nullptr;
+    const auto found = _textures.find(texture.textureID());
+    if (found != _textures.end()) return &found->second;
+    if (_textures.size() >= kMaxCachedTextures) _textures.clear();
+    const QImage straight(texture.rgba().data(), static_cast<int>(texture.width()),
+                          static_cast<int>(texture.height()), static_cast<qsizetype>(texture.width()) * 4,
+                          QImage::Format_RGBA8888);
+    // The conversion copies: the cached image owns its texels.
+    QImage converted = straight.convertToFormat(QImage::Format_ARGB32_Premultiplied);
+    if (converted.isNull()) return nullptr;
+    return &_textures.emplace(texture.textureID(), std::move(converted)).first->second;
+}
+
+void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad, const HXDRenderingContext& context) {
+    if (!prepare(quad) || !mappingFor(context).isValid() || !quad.texture()) return;
+    const QImage* image = textureImage(*quad.texture());
+    if (!image) return;
+    const float attenuation = quad.attenuation();
+    if (!(attenuation > 0.0f)) return;
+    const QRectF target = toDevice(_mapping.worldRectToPixels(quad.destinationRect()));
+    if (!target.isValid()) return;
+    _painter.setOpacity(std::min(1.0f, attenuation));
+    _painter.setRenderHint(QPainter::SmoothPixmapTransform, true);
+    _painter.drawImage(target, *image, QRectF(image->rect()));
+    _painter.setOpacity(1.0);
+}
+
+void TQQtPainterEncoder::encodeScreenspaceQuad(const HXDScreenspaceQuad& quad, const HXDRenderingContext& context) {
+    if (!prepare(quad) || !mappingFor(context).isValid()) return;
+    const QRectF target = toDevice(_mapping.worldRectToPixels(quad.frame()));
+    if (!target.isValid()) return;
+    // Flat fills keep crisp edges: a band or handle is an exact pixel rectangle.
+    _painter.setRenderHint(QPainter::Antialiasing, false);
+    _painter.fillRect(target, qColor(quad.color()));
+}
+
+void TQQtPainterEncoder::encodeMesh(const HXDMesh& mesh, const HXDRenderingContext& context) {
+    if (!prepare(mesh) || !mappingFor(context).isValid()) return;
+    const QColor color = qColor(mesh.brush().color);
+    _painter.setRenderHint(QPainter::Antialiasing, true);
+    if (mesh.wireframe()) {
+        _painter.setPen(QPen(QBrush(color), context.backingScale(), Qt::SolidLine, Qt::FlatCap, Qt::MiterJoin));
+        _painter.setBrush(Qt::NoBrush);
+    } else {
+        _painter.setPen(Qt::NoPen);
+        _painter.setBrush(color);
+    }
+    for (const HXDSubmesh& submesh : mesh.submeshes()) {
+        const size_t needed = mesh.wireframe() ? 2 : 3;
+        if (submesh.vertices.size() < needed) continue;
+        _polyline.clear();
+        for (const HXDFloat2& v : submesh.vertices) _polyline.append(toDevice(v.x, v.y));
+        _painter.drawPolygon(_polyline, Qt::OddEvenFill);
+    }
+    _polyline.clear();
+    _painter.setBrush(Qt::NoBrush);
+}
+
+void TQQtPainterEncoder::encodeText(const HXDText& text, const HXDRenderingContext& context) {
+    if (!prepare(text) || !mappingFor(context).isValid() || text.string().empty()) return;
+    const float scale = context.backingScale() > 0.0f ? context.backingScale() : 1.0f;
+    const QRectF box = toDevice(text.pixelRect(_mapping, scale));
+    if (!box.isValid()) return;
+    _painter.save();
+    _painter.setRenderHint(QPainter::TextAntialiasing, true);
+    _painter.translate(box.topLeft());
+    _painter.scale(scale, scale);
+    _painter.setFont(TQQtTextMetrics::fontFor(text.attributes()));
+    _painter.setPen(qColor(text.attributes().color));
+    // The box was measured with the shared metrics at creation; the baseline sits at its
+    // bottom less the descent, as the measuring font lays it out.
+    _painter.drawText(QRectF(0.0, 0.0, box.width() / scale, box.height() / scale),
+                      Qt::AlignLeft | Qt::AlignBottom | Qt::TextDontClip | Qt::TextSingleLine,
+                      QString::fromStdString(text.string()));
+    _painter.restore();
+}

@@ -1,0 +1,236 @@
+#include <gtest/gtest.h>
+
+#include <QColor>
+#include <QImage>
+
+#include <memory>
+#include <vector>
+
+#include "platform/draw/HXDPrimitives.h"
+#include "platform/draw/testing/HXDRecordingEncoder.h"
+#include "platform/geometry/BNViewProjection.h"
+#include "qt/TQQtPainterEncoder.h"
+
+namespace {
+
+// Colour components read back from an 8-bit image are off by rounding and by blending.
+constexpr int kChannelTolerance = 3;
+
+const HXDColor kBackground{0.0f, 0.0f, 0.0f, 1.0f};
+const HXDColor kRed{1.0f, 0.0f, 0.0f, 1.0f};
+const HXDColor kBlue{0.0f, 0.0f, 1.0f, 1.0f};
+
+// A 200 x 100 drawable whose world coordinates are its pixels (y up), so that every
+// primitive can be placed on exact pixel centres.
+class PainterEncoderTest : public ::testing::Test {
+protected:
+    static constexpr int kWidth = 200;
+    static constexpr int kHeight = 100;
+
+    // One frame with the given primitives, at backing scale `scale` (the drawable grows).
+    void render(const std::vector<std::shared_ptr<HXDDrawPrimitive>>& primitives, float scale = 1.0f) {
+        encoder.setDrawableSize(QSize(static_cast<int>(kWidth * scale), static_cast<int>(kHeight * scale)));
+        HXDTexture* target = encoder.nextDrawable();
+        ASSERT_NE(target, nullptr);
+        const HXDRenderingContext context(target, scale, BNViewVolumeProjection(CGRectMake(0, 0, kWidth, kHeight)),
+                                          HXDFloat2{1.0f / scale, 1.0f / scale});
+        encoder.beginEncoding(*target, kBackground);
+        for (const auto& p : primitives) p->encodeWithEncoder(encoder, context);
+        encoder.endEncoding();
+    }
+
+    // The pixel whose centre is (x + 0.5, y + 0.5) in drawable pixels, y up.
+    QColor pixel(int x, int yUp) const { return encoder.image().pixelColor(x, encoder.image().height() - 1 - yUp); }
+
+    static ::testing::AssertionResult near(const QColor& got, const HXDColor& want, int tolerance = kChannelTolerance) {
+        const QColor w = TQQtPainterEncoder::qColor(want);
+        if (std::abs(got.red() - w.red()) <= tolerance && std::abs(got.green() - w.green()) <= tolerance &&
+            std::abs(got.blue() - w.blue()) <= tolerance)
+            return ::testing::AssertionSuccess();
+        return ::testing::AssertionFailure() << "got rgb(" << got.red() << "," << got.green() << "," << got.blue()
+                                             << "), want rgb(" << w.red() << "," << w.green() << "," << w.blue()
+                                             << ")";
+    }
+
+    static std::shared_ptr<HXDMultiline> horizontalLine(float y, HXDColor from, HXDColor to) {
+        const std::vector<HXDLineVertex> v{{{10.0f, y, 0.0f}, from}, {{190.0f, y, 0.0f}, to}};
+        return std::make_shared<HXDMultiline>(std::span<const HXDLineVertex>(v));
+    }
+
+    TQQtPainterEncoder encoder;
+};
+
+TEST_F(PainterEncoderTest, frame__clears_to_the_background_and_presents) {
+    int presented = 0;
+    encoder.setPresentHandler([&](const QImage& image) {
+        ++presented;
+        EXPECT_EQ(image.size(), QSize(kWidth, kHeight));
+    });
+    render({});
+    EXPECT_EQ(presented, 1);
+    EXPECT_EQ(encoder.framesPresented(), 1);
+    EXPECT_TRUE(near(pixel(0, 0), kBackground));
+    EXPECT_TRUE(near(pixel(kWidth - 1, kHeight - 1), kBackground));
+}
+
+TEST_F(PainterEncoderTest, nextDrawable__null_without_a_size_and_foreign_targets_are_refused) {
+    EXPECT_EQ(encoder.nextDrawable(), nullptr) << "an encoder without a size has no drawable";
+    HXDRecordingEncoder other;  // its target is not a QImage of ours
+    encoder.beginEncoding(*other.nextDrawable(), kRed);
+    encoder.endEncoding();
+    EXPECT_EQ(encoder.framesPresented(), 0) << "a frame on a foreign target must not be presented";
+}
+
+TEST_F(PainterEncoderTest, multiline__solid_colour_on_its_row_only) {
+    auto line = horizontalLine(50.5f, kRed, kRed);
+    line->setAntialiased(true);
+    render({line});
+    EXPECT_TRUE(near(pixel(100, 50), kRed)) << "the line's own row";
+    EXPECT_TRUE(near(pixel(100, 52), kBackground)) << "two rows above the line";
+    EXPECT_TRUE(near(pixel(5, 50), kBackground)) << "left of the line's start";
+}
+
+TEST_F(PainterEncoderTest, multiline__per_vertex_colours_blend_along_the_segment) {
+    render({horizontalLine(50.5f, kRed, kBlue)});
+    const QColor start = pixel(12, 50);
+    const QColor end = pixel(188, 50);
+    const QColor middle = pixel(100, 50);
+    EXPECT_GT(start.red(), 230);
+    EXPECT_LT(start.blue(), 25);
+    EXPECT_GT(end.blue(), 230);
+    EXPECT_LT(end.red(), 25);
+    EXPECT_NEAR(middle.red(), 128, 12) << "halfway the colour is half of each";
+    EXPECT_NEAR(middle.blue(), 128, 12);
+}
+
+TEST_F(PainterEncoderTest, multiline__stipple_steps_follow_the_pattern_and_scale) {
+    // 0x33333333: two steps on, two off; scale 2 points: 4 pixels on, 4 off, from x = 10.
+    auto line = horizontalLine(50.5f, kRed, kRed);
+    line->setStippled(true);
+    line->setStipplePattern(0x33333333u);
+    line->setStippleScale(2.0f);
+    render({line});
+    for (int block = 0; block < 6; ++block) {
+        const int x = 10 + block * 4 + 2;  // the middle of each 4-pixel block
+        if (block % 2 == 0)
+            EXPECT_TRUE(near(pixel(x, 50), kRed)) << "block " << block << " must be drawn";
+        else
+            EXPECT_TRUE(near(pixel(x, 50), kBackground)) << "block " << block << " must be a gap";
+    }
+    {
+        // The phase runs on across a vertex: a corner at x = 16 is in the middle of a step.
+        const std::vector<HXDLineVertex> v{{{10.0f, 20.5f, 0.0f}, kRed},
+                                           {{16.0f, 20.5f, 0.0f}, kRed},
+                                           {{60.0f, 20.5f, 0.0f}, kRed}};
+        auto bent = std::make_shared<HXDMultiline>(std::span<const HXDLineVertex>(v));
+        bent->setStippled(true);
+        bent->setStipplePattern(0x33333333u);
+        bent->setStippleScale(2.0f);
+        render({bent});
+        // Dashes 10..13, 18..21, gaps 14..17, 22..25; restarting at x = 16 would ink 16..19.
+        EXPECT_TRUE(near(pixel(17, 20), kBackground)) << "the gap must run on past the vertex";
+        EXPECT_TRUE(near(pixel(20, 20), kRed)) << "pixels 18..21 are the second dash";
+        EXPECT_TRUE(near(pixel(23, 20), kBackground)) << "pixels 22..25 are the second gap";
+    }
+}
+
+TEST_F(PainterEncoderTest, multiline__width_in_points_times_backing_scale) {
+    auto line = horizontalLine(50.0f, kRed, kRed);
+    line->setWidth(4.0f);
+    render({line}, 2.0f);
+    // 4 points at scale 2: 8 pixels, rows 96..103 around pixel row 100.
+    EXPECT_TRUE(near(pixel(200, 97), kRed));
+    EXPECT_TRUE(near(pixel(200, 102), kRed));
+    EXPECT_TRUE(near(pixel(200, 106), kBackground));
+}
+
+TEST_F(PainterEncoderTest, multiline__loop_closes_each_run) {
+    const std::vector<HXDLineSegment> segments{{{20.5f, 20.5f, 0.0f}, {20.5f, 80.5f, 0.0f}, kRed},
+                                               {{20.5f, 80.5f, 0.0f}, {80.5f, 80.5f, 0.0f}, kRed},
+                                               {{80.5f, 80.5f, 0.0f}, {80.5f, 20.5f, 0.0f}, kRed}};
+    auto box = std::make_shared<HXDMultiline>(std::span<const HXDLineSegment>(segments));
+    render({box});
+    EXPECT_TRUE(near(pixel(50, 20), kBackground)) << "an open run has no bottom edge";
+    box->setLoop(true);
+    render({box});
+    EXPECT_TRUE(near(pixel(50, 20), kRed)) << "the loop closes the bottom edge";
+}
+
+TEST_F(PainterEncoderTest, quadTexture__draws_the_image_with_its_transparent_corners) {
+    // 4 x 4 texels: opaque blue with a transparent top-left texel.
+    std::vector<uint8_t> rgba(4 * 4 * 4);
+    for (size_t i = 0; i < 16; ++i) {
+        rgba[i * 4 + 2] = 255;
+        rgba[i * 4 + 3] = i == 0 ? 0 : 255;
+    }
+    auto texture = HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::move(rgba));
+    auto quad = std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100, 40, 40, 40), 1.0f);
+    render({quad});
+    EXPECT_TRUE(near(pixel(120, 60), kBlue)) << "inside the image";
+    EXPECT_TRUE(near(pixel(103, 77), kBackground)) << "the transparent top-left texel";
+    EXPECT_TRUE(near(pixel(137, 43), kBlue)) << "the opaque bottom-right texel";
+    EXPECT_TRUE(near(pixel(95, 60), kBackground)) << "outside the rectangle";
+    EXPECT_EQ(encoder.cachedTextureCount(), 1u);
+    render({quad});
+    EXPECT_EQ(encoder.cachedTextureCount(), 1u) << "a texture is converted once, not per frame";
+}
+
+TEST_F(PainterEncoderTest, screenspaceQuad__blends_over_what_lies_below) {
+    auto under = std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, 0, 100, 100), 0);
+    under->setColor(kRed);
+    auto band = std::make_shared<HXDScreenspaceQuad>(CGRectMake(50, 0, 100, 100), 0);
+    band->setColor(HXDColor{0.0f, 0.0f, 1.0f, 0.25f});
+    render({under, band});
+    EXPECT_TRUE(near(pixel(25, 50), kRed));
+    EXPECT_TRUE(near(pixel(75, 50), HXDColor{0.75f, 0.0f, 0.25f, 1.0f})) << "a quarter of blue over red";
+    EXPECT_TRUE(near(pixel(125, 50), HXDColor{0.0f, 0.0f, 0.25f, 1.0f})) << "a quarter of blue over black";
+    band->setBlendingInfo(HXDDataType::additiveBlendingInfo());
+    render({under, band});
+    EXPECT_TRUE(near(pixel(75, 50), HXDColor{1.0f, 0.0f, 0.25f, 1.0f})) << "additive keeps the red";
+}
+
+TEST_F(PainterEncoderTest, mesh__fills_its_polygons_or_their_outlines) {
+    std::vector<HXDSubmesh> submeshes{HXDSubmesh({{20, 20}, {80, 20}, {80, 80}, {20, 80}})};
+    auto mesh = std::make_shared<HXDMesh>(9, HXDBrush{0, kBlue}, submeshes);
+    render({mesh});
+    EXPECT_TRUE(near(pixel(50, 50), kBlue));
+    mesh->setWireframe(true);
+    render({mesh});
+    EXPECT_TRUE(near(pixel(50, 50), kBackground)) << "a wireframe leaves the inside alone";
+    EXPECT_GT(pixel(50, 20).blue(), 100) << "the bottom edge is drawn";
+}
+
+TEST_F(PainterEncoderTest, text__paints_inside_its_box_in_its_colour) {
+    TQQtTextMetrics metrics;
+    HXDTextMetrics::setShared(&metrics);
+    HXDAttributedString s{"Wide 8.88", HXDTextAttributes{}};
+    s.attributes.color = kRed;
+    auto text = std::make_shared<HXDText>(s, HXDTextLayoutAnchor::BottomLeft, CGPointMake(40, 40));
+    HXDTextMetrics::setShared(nullptr);
+    render({text});
+    const CGSize size = text->size();
+    EXPECT_GT(size.width, 10.0);
+    EXPECT_NEAR(size.height, metrics.sizeOfText("Wide 8.88", s.attributes).height, 1e-9);
+    int inked = 0;
+    int outside = 0;
+    for (int y = 0; y < kHeight; ++y) {
+        for (int x = 0; x < kWidth; ++x) {
+            if (pixel(x, y).red() < 60) continue;
+            const bool inBox = x >= 39 && x <= 41 + size.width && y >= 39 && y <= 41 + size.height;
+            ++(inBox ? inked : outside);
+        }
+    }
+    EXPECT_GT(inked, 10) << "the text left no red pixels";
+    EXPECT_EQ(outside, 0) << "text pixels outside the measured box";
+}
+
+TEST(PainterEncoderBlending, compositionModeFor__named_blendings) {
+    EXPECT_EQ(TQQtPainterEncoder::compositionModeFor(HXDDataType::sourceOneMinusSourceBlendingInfo()),
+              QPainter::CompositionMode_SourceOver);
+    EXPECT_EQ(TQQtPainterEncoder::compositionModeFor(HXDDataType::opaqueBlendingInfo()),
+              QPainter::CompositionMode_Source);
+    EXPECT_EQ(TQQtPainterEncoder::compositionModeFor(HXDDataType::additiveBlendingInfo()),
+              QPainter::CompositionMode_Plus);
+}
+
+}  // namespace
