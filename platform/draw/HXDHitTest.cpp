@@ -63,6 +63,7 @@ HXDHitTestContext HXDHitTestContext::atPoint(const HXDScreenMapping& mapping, fl
     c._backingScale = backingScale > 0.0f ? backingScale : 1.0f;
     c._point = CGPointMake(point.x, point.y);
     c._rect = CGRectMake(point.x, point.y, 0.0, 0.0);
+    c.prepareWorldQuery();
     return c;
 }
 
@@ -77,13 +78,26 @@ HXDHitTestContext HXDHitTestContext::inRect(const HXDScreenMapping& mapping, flo
     c._backingScale = backingScale > 0.0f ? backingScale : 1.0f;
     c._rect = s;
     c._point = s.origin;
+    c.prepareWorldQuery();
     return c;
 }
 
+void HXDHitTestContext::prepareWorldQuery() {
+    _worldRect = _mapping.pixelRectToWorld(_rect);
+    // A pixel square maps to a parallelogram whose bounds are these extents (exact for the
+    // axis-aligned projections of curve views, a safe bound otherwise).
+    const CGPoint o = _mapping.pixelToWorld(0.0, 0.0);
+    const CGPoint ux = _mapping.pixelToWorld(1.0, 0.0);
+    const CGPoint uy = _mapping.pixelToWorld(0.0, 1.0);
+    _worldPerPixelX = std::fabs(ux.x - o.x) + std::fabs(uy.x - o.x);
+    _worldPerPixelY = std::fabs(ux.y - o.y) + std::fabs(uy.y - o.y);
+}
+
 CGRect HXDHitTestContext::worldQueryRect(double reach) const {
-    const CGRect grown = CGRectMake(_rect.origin.x - reach, _rect.origin.y - reach, _rect.size.width + 2.0 * reach,
-                                    _rect.size.height + 2.0 * reach);
-    return _mapping.pixelRectToWorld(grown);
+    const double gx = reach * _worldPerPixelX;
+    const double gy = reach * _worldPerPixelY;
+    return CGRectMake(_worldRect.origin.x - gx, _worldRect.origin.y - gy, _worldRect.size.width + 2.0 * gx,
+                      _worldRect.size.height + 2.0 * gy);
 }
 
 // ---- HXDHitRecord ----------------------------------------------------------------------------

@@ -95,9 +95,16 @@ public:
     CGRect worldQueryRect(double reach) const;
 
 private:
+    void prepareWorldQuery();
+
     Kind _kind = Kind::Invalid;
     CGPoint _point = CGPointZero;
     CGRect _rect = CGRectZero;
+    // The query's world bounds and the world extent of one pixel on each axis, made once per
+    // test: every primitive asks for its grown query rectangle.
+    CGRect _worldRect = CGRectZero;
+    double _worldPerPixelX = 0.0;
+    double _worldPerPixelY = 0.0;
     HXDScreenMapping _mapping;
     float _backingScale = 1.0f;
 };

@@ -5,7 +5,6 @@
 
 #include "platform/draw/HXDEncoder.h"
 #include "platform/draw/internal/HXDGeometry2D.h"
-#include "platform/draw/internal/HXDPolylineIndex.h"
 
 namespace hxd_internal {
 
@@ -20,57 +19,73 @@ void grow(float& minX, float& minY, float& maxX, float& maxY, const HXDLineVerte
 }
 }  // namespace
 
-PolylineIndex::PolylineIndex(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
-                             bool loop) {
+void PolylineIndex::build(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
+                          bool loop) {
+    *this = PolylineIndex();
+    built = true;
+    if (vertices.size() < 2) return;  // no segment: nothing can be hit
+    if (runStarts.empty() && !loop && buildBins(vertices)) return;
+    buildChunks(vertices, runStarts, loop);
+}
+
+// One pass over a curve whose x never decreases, bounds and bins together: the x extent is
+// known from the ends. Answers false (and keeps nothing) at the first vertex that goes back
+// in x or is not finite.
+bool PolylineIndex::buildBins(const std::vector<HXDLineVertex>& vertices) {
     const size_t n = vertices.size();
-    bool allFinite = true;
-    for (const HXDLineVertex& v : vertices) {
-        if (!finite(v)) {
-            allFinite = false;
-            continue;
-        }
-        if (!hasBounds) {
-            minX = maxX = v.start.x;
-            minY = maxY = v.start.y;
-            hasBounds = true;
-        } else {
-            grow(minX, minY, maxX, maxY, v);
-        }
-    }
-    if (!hasBounds || n < 2) return;
+    const HXDLineVertex& head = vertices.front();
+    const HXDLineVertex& tail = vertices.back();
+    if (!finite(head) || !finite(tail) || tail.start.x < head.start.x) return false;
 
-    monotone = allFinite && runStarts.empty() && !loop;
-    for (size_t i = 1; monotone && i < n; ++i) monotone = vertices[i].start.x >= vertices[i - 1].start.x;
+    const uint32_t segments = static_cast<uint32_t>(n - 1);
+    uint32_t count = std::clamp<uint32_t>(segments / kSegmentsPerBin, 1u, kMaxBins);
+    const double span = static_cast<double>(tail.start.x) - static_cast<double>(head.start.x);
+    if (!(span > 0.0)) count = 1;
+    binOrigin = head.start.x;
+    binInvWidth = count > 1 ? count / span : 0.0;
+    bins.assign(count, Bin{});
 
-    if (monotone) {
-        const uint32_t segments = static_cast<uint32_t>(n - 1);
-        uint32_t count = std::clamp<uint32_t>(segments / kSegmentsPerBin, 1u, kMaxBins);
-        const double span = static_cast<double>(maxX) - static_cast<double>(minX);
-        if (!(span > 0.0)) count = 1;
-        binOrigin = minX;
-        binInvWidth = count > 1 ? count / span : 0.0;
-        bins.assign(count, Bin{});
-        for (uint32_t i = 0; i < segments; ++i) {
-            const HXDLineVertex& a = vertices[i];
-            const HXDLineVertex& b = vertices[i + 1];
-            const float lo = std::min(a.start.y, b.start.y);
-            const float hi = std::max(a.start.y, b.start.y);
-            for (uint32_t k = binOf(a.start.x), last = binOf(b.start.x); k <= last; ++k) {
-                Bin& bin = bins[k];
-                if (bin.first == kNone) {
-                    bin.first = i;
-                    bin.minY = lo;
-                    bin.maxY = hi;
-                } else {
-                    bin.minY = std::min(bin.minY, lo);
-                    bin.maxY = std::max(bin.maxY, hi);
-                }
-                bin.end = i + 1;
+    float lowY = head.start.y;
+    float highY = head.start.y;
+    uint32_t binA = binOf(head.start.x);
+    for (uint32_t i = 0; i < segments; ++i) {
+        const HXDLineVertex& a = vertices[i];
+        const HXDLineVertex& b = vertices[i + 1];
+        if (!finite(b) || b.start.x < a.start.x) {
+            bins.clear();
+            return false;
+        }
+        const float lo = std::min(a.start.y, b.start.y);
+        const float hi = std::max(a.start.y, b.start.y);
+        lowY = std::min(lowY, lo);
+        highY = std::max(highY, hi);
+        const uint32_t binB = binOf(b.start.x);
+        for (uint32_t k = binA; k <= binB; ++k) {
+            Bin& bin = bins[k];
+            if (bin.first == kNone) {
+                bin.first = i;
+                bin.minY = lo;
+                bin.maxY = hi;
+            } else {
+                bin.minY = std::min(bin.minY, lo);
+                bin.maxY = std::max(bin.maxY, hi);
             }
+            bin.end = i + 1;
         }
-        return;
+        binA = binB;
     }
+    hasBounds = true;
+    monotone = true;
+    minX = head.start.x;
+    maxX = tail.start.x;
+    minY = lowY;
+    maxY = highY;
+    return true;
+}
 
+void PolylineIndex::buildChunks(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
+                                bool loop) {
+    const size_t n = vertices.size();
     const size_t runs = runStarts.size() + 1;
     for (size_t r = 0; r < runs; ++r) {
         const uint32_t first = r == 0 ? 0u : runStarts[r - 1];
@@ -81,7 +96,7 @@ PolylineIndex::PolylineIndex(const std::vector<HXDLineVertex>& vertices, const s
             chunk.first = k;
             chunk.last = std::min(k + kChunkSegments, end - 1);
             for (uint32_t v = chunk.first; v <= chunk.last; ++v) {
-                if (!finite(vertices[v])) continue;
+                if (!finite(vertices[v])) continue;  // a segment through it never hits
                 if (!chunk.bounded) {
                     chunk.minX = chunk.maxX = vertices[v].start.x;
                     chunk.minY = chunk.maxY = vertices[v].start.y;
@@ -90,7 +105,15 @@ PolylineIndex::PolylineIndex(const std::vector<HXDLineVertex>& vertices, const s
                     grow(chunk.minX, chunk.minY, chunk.maxX, chunk.maxY, vertices[v]);
                 }
             }
-            if (chunk.bounded) chunks.push_back(chunk);
+            if (!chunk.bounded) continue;
+            if (!hasBounds) {
+                minX = chunk.minX, minY = chunk.minY, maxX = chunk.maxX, maxY = chunk.maxY;
+                hasBounds = true;
+            } else {
+                minX = std::min(minX, chunk.minX), minY = std::min(minY, chunk.minY);
+                maxX = std::max(maxX, chunk.maxX), maxY = std::max(maxY, chunk.maxY);
+            }
+            chunks.push_back(chunk);
         }
         if (loop) closers.emplace_back(end - 1, first);
     }
@@ -177,7 +200,7 @@ std::pair<uint32_t, uint32_t> HXDMultiline::runRange(size_t run) const {
 void HXDMultiline::setLoop(bool loop) {
     if (loop == _loop) return;
     _loop = loop;
-    _index.reset();  // the closing segments are part of the index
+    _index.built = false;  // the closing segments are part of the index
 }
 
 void HXDMultiline::setLineJoin(int join) {
@@ -185,8 +208,8 @@ void HXDMultiline::setLineJoin(int join) {
 }
 
 const hxd_internal::PolylineIndex& HXDMultiline::index() const {
-    if (!_index) _index = std::make_unique<hxd_internal::PolylineIndex>(_vertices, _runStarts, _loop);
-    return *_index;
+    if (!_index.built) _index.build(_vertices, _runStarts, _loop);
+    return _index;
 }
 
 void HXDMultiline::prepareForHitTesting() const { (void)index(); }

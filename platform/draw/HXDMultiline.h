@@ -24,6 +24,7 @@
 #include <vector>
 
 #include "platform/draw/HXDDrawPrimitive.h"
+#include "platform/draw/internal/HXDPolylineIndex.h"
 
 struct HXDLineVertex {
     HXDFloat3 start;
@@ -45,10 +46,6 @@ struct HXDLineSegment {
         return {from, to, segmentColor};
     }
 };
-
-namespace hxd_internal {
-struct PolylineIndex;
-}
 
 class HXDMultiline : public HXDDrawPrimitive {
 public:
@@ -100,9 +97,14 @@ public:
 private:
     const hxd_internal::PolylineIndex& index() const;
 
+    // Declared first: a hit test reads the width and the index's head together, and with
+    // hundreds of curves per test the cache lines touched per curve are what it costs.
+    float _width = 1.0f;
+    // Built at the first hit test; the vertices never change after construction. Views use
+    // primitives on one thread, so the lazy build needs no lock.
+    mutable hxd_internal::PolylineIndex _index;
     std::vector<HXDLineVertex> _vertices;
     std::vector<uint32_t> _runStarts;
-    float _width = 1.0f;
     float _gamma = 1.0f;
     float _stippleScale = 1.0f;
     uint32_t _stipplePattern = 0x0F0F0F0Fu;
@@ -110,9 +112,6 @@ private:
     bool _antialiased = false;
     bool _stippled = false;
     bool _loop = false;
-    // Built at the first hit test; the vertices never change after construction. Views use
-    // primitives on one thread, so the lazy build needs no lock.
-    mutable std::unique_ptr<hxd_internal::PolylineIndex> _index;
 };
 
 // One segment of one colour.

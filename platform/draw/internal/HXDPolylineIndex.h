@@ -37,10 +37,11 @@ struct PolylineIndex {
         bool bounded = false;  // false when no vertex of the chunk is finite
     };
 
+    // What every test reads comes first, in one cache line with the owner's width.
+    bool built = false;
     bool hasBounds = false;
-    float minX = 0.0f, minY = 0.0f, maxX = 0.0f, maxY = 0.0f;
-
     bool monotone = false;
+    float minX = 0.0f, minY = 0.0f, maxX = 0.0f, maxY = 0.0f;
     double binOrigin = 0.0;
     double binInvWidth = 0.0;
     std::vector<Bin> bins;
@@ -49,9 +50,16 @@ struct PolylineIndex {
     // The closing segments of looped runs: (last vertex, first vertex).
     std::vector<std::pair<uint32_t, uint32_t>> closers;
 
-    PolylineIndex(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts, bool loop);
+    // Indexes the vertices (replacing what was there).
+    void build(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts, bool loop);
 
     uint32_t binOf(double x) const;
+
+private:
+    bool buildBins(const std::vector<HXDLineVertex>& vertices);
+    void buildChunks(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts, bool loop);
+
+public:
 
     // Calls visit(i, j) for each segment (vertex i to vertex j) that may meet the world
     // rectangle q (standardized), until visit answers true.
