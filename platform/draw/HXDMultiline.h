@@ -53,7 +53,7 @@ public:
     explicit HXDMultiline(std::span<const HXDLineVertex> lines);
     explicit HXDMultiline(std::vector<HXDLineVertex>&& lines);
     // Segments: chained ones share their vertices, a gap starts a new run. A segment's
-    // colour is given to both of its ends.
+    // colour is given to its ends; a shared vertex takes the colour of the segment leaving it.
     explicit HXDMultiline(std::span<const HXDLineSegment> segments);
     ~HXDMultiline() override;
 

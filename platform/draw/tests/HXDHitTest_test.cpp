@@ -268,20 +268,6 @@ TEST_F(HitTestFixture, meshAndFlatQuad__insideHitsOutsideDoesNot) {
     EXPECT_EQ(pick({mesh}, pixel(2, 0)).size(), 1u);
 }
 
-TEST(HXDPrimitivesTest, textureAndNumbers__badInputIsSafe) {
-    EXPECT_EQ(HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::vector<uint8_t>(10))->width(), 0u)
-        << "a buffer of the wrong size gives an empty texture, not a read past its end";
-    const auto t = HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {64, 32, 16, 128}, true);
-    EXPECT_EQ(t->rgba()[0], 128) << "premultiplied input is stored straight";
-    EXPECT_EQ(t->alphaAt(-1, 0), 0.0f);
-    EXPECT_NE(t->textureID(), HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {0, 0, 0, 0})->textureID());
-
-    EXPECT_EQ(HXDNumber::numberWithDouble(1e300).integerValue(), std::numeric_limits<int64_t>::max());
-    EXPECT_EQ(HXDNumber::numberWithDouble(std::nan("")).unsignedLongLongValue(), 0u);
-    EXPECT_EQ(HXDNumber::numberWithInteger(3), HXDNumber::numberWithUnsignedLongLong(3));
-    EXPECT_FALSE(HXDNumber::numberWithInteger(-1) == HXDNumber::numberWithUnsignedLongLong(~0ull));
-}
-
 TEST_F(HitTestFixture, text__boxFollowsTheAnchorAndTheBackingScale) {
     HXDText text(HXDAttributedString{"0.50", HXDTextAttributes{}}, HXDTextLayoutAnchor::BottomLeft, CGPointMake(5, 0));
     const HXDScreenMapping mapping(controller.renderingContext()->projection(), CGSizeMake(200, 100));
