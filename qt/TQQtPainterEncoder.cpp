@@ -38,6 +38,28 @@ HXDColor lerp(const HXDColor& a, const HXDColor& b, double t) {
     return HXDColor{mix(a.red, b.red), mix(a.green, b.green), mix(a.blue, b.blue), mix(a.alpha, b.alpha)};
 }
 
+// Liang-Barsky: the part [u0, u1] of the segment a-b (as fractions of it) inside the
+// rectangle; false when none of it is.
+bool clipToRect(const QPointF& a, const QPointF& b, const QRectF& r, double& u0, double& u1) {
+    const double dx = b.x() - a.x();
+    const double dy = b.y() - a.y();
+    const double p[4] = {-dx, dx, -dy, dy};
+    const double q[4] = {a.x() - r.left(), r.right() - a.x(), a.y() - r.top(), r.bottom() - a.y()};
+    u0 = 0.0;
+    u1 = 1.0;
+    for (int k = 0; k < 4; ++k) {
+        if (p[k] == 0.0) {
+            if (q[k] < 0.0) return false;
+            continue;
+        }
+        const double u = q[k] / p[k];
+        if (p[k] < 0.0) u0 = std::max(u0, u);
+        else u1 = std::min(u1, u);
+        if (u0 > u1) return false;
+    }
+    return true;
+}
+
 }  // namespace
 
 // ---- Text metrics ---------------------------------------------------------------------------
@@ -193,6 +215,10 @@ void TQQtPainterEncoder::strokeMultiline(QPainter& painter, const HXDMultiline& 
 
 void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double step, uint32_t pattern,
                                    Qt::PenJoinStyle join, StipplePhase& phase) {
+    // Segments are clipped to the drawable grown by a margin: a curve zoomed far out of
+    // view keeps its direction where it enters, and the rasteriser never sees huge numbers.
+    const double margin = 16.0 + widthPixels;
+    const QRectF guard = QRectF(QPointF(0, 0), QSizeF(_target.image().size())).adjusted(-margin, -margin, margin, margin);
     _polyline.clear();
     for (size_t i = 0; i + 1 < _points.size(); ++i) {
         const QPointF& a = _points[i];
@@ -203,20 +229,32 @@ void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double
             flushPolyline(painter, widthPixels, join);
             continue;
         }
+        const double length = std::hypot(b.x() - a.x(), b.y() - a.y());
+        double u0 = 0.0;
+        double u1 = 1.0;
+        if (!clipToRect(a, b, guard, u0, u1)) {
+            flushPolyline(painter, widthPixels, join);
+            if (step > 0.0) advancePhase(phase, length, step);
+            continue;
+        }
         if (step <= 0.0) {
+            const QPointF pa = u0 > 0.0 ? lerp(a, b, u0) : a;
+            const QPointF pb = u1 < 1.0 ? lerp(a, b, u1) : b;
             if (ca == cb) {
-                appendToPolyline(painter, a, b, ca, widthPixels, join);
+                appendToPolyline(painter, pa, pb, ca, widthPixels, join);
             } else {
                 flushPolyline(painter, widthPixels, join);
-                drawSegment(painter, a, b, ca, cb, widthPixels, join);
+                drawSegment(painter, pa, pb, lerp(ca, cb, u0), lerp(ca, cb, u1), widthPixels, join);
             }
             continue;
         }
-        // Stipple: walk the segment step by step; the phase runs on into the next segment.
-        const double length = std::hypot(b.x() - a.x(), b.y() - a.y());
-        double t = 0.0;
-        while (t < length) {
-            const double piece = std::min(phase.remaining, length - t);
+        // Stipple: walk the visible part step by step; the phase runs on into the next
+        // segment, and over the clipped parts without walking them.
+        advancePhase(phase, u0 * length, step);
+        double t = u0 * length;
+        const double visibleEnd = u1 * length;
+        while (t < visibleEnd) {
+            const double piece = std::min(phase.remaining, visibleEnd - t);
             const bool on = ((pattern >> phase.bit) & 1u) != 0;
             if (on) {
                 const double t0 = t / length;
@@ -239,8 +277,26 @@ void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double
                 phase.remaining = step;
             }
         }
+        if (u1 < 1.0) {
+            flushPolyline(painter, widthPixels, join);
+            advancePhase(phase, (1.0 - u1) * length, step);
+        }
     }
     flushPolyline(painter, widthPixels, join);
+}
+
+void TQQtPainterEncoder::advancePhase(StipplePhase& phase, double distance, double step) {
+    if (!(distance > 0.0)) return;
+    // The position within one period of the pattern (32 steps), moved on by the distance.
+    const double period = 32.0 * step;
+    double position = std::fmod(phase.bit * step + (step - phase.remaining) + distance, period);
+    if (position < 0.0) position += period;
+    phase.bit = std::min<uint32_t>(31, static_cast<uint32_t>(position / step));
+    phase.remaining = step - (position - phase.bit * step);
+    if (phase.remaining <= step * 1e-9) {
+        phase.bit = (phase.bit + 1) % 32;
+        phase.remaining = step;
+    }
 }
 
 void TQQtPainterEncoder::appendToPolyline(QPainter& painter, const QPointF& a, const QPointF& b,

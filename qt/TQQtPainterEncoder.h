@@ -106,6 +106,8 @@ private:
     };
     void strokeRun(QPainter& painter, double widthPixels, double step, uint32_t pattern, Qt::PenJoinStyle join,
                    StipplePhase& phase);
+    // Moves the phase on by a distance in pixels without drawing.
+    static void advancePhase(StipplePhase& phase, double distance, double step);
     void drawSegment(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& ca, const HXDColor& cb,
                      double widthPixels, Qt::PenJoinStyle join);
     void appendToPolyline(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& color,

@@ -134,6 +134,24 @@ TEST_F(PainterEncoderTest, multiline__stipple_steps_follow_the_pattern_and_scale
     }
 }
 
+TEST_F(PainterEncoderTest, multiline__far_offscreen_start_keeps_the_stipple_phase) {
+    // Starts 2^20 pattern periods (64 pixels each) left of x = 16: the visible part starts
+    // in phase, as if every step had been walked.
+    const float start = 16.0f - 64.0f * 1048576.0f;
+    const std::vector<HXDLineVertex> v{{{start, 50.5f, 0.0f}, kRed}, {{190.0f, 50.5f, 0.0f}, kRed}};
+    auto line = std::make_shared<HXDMultiline>(std::span<const HXDLineVertex>(v));
+    line->setStippled(true);
+    line->setStipplePattern(0x33333333u);
+    line->setStippleScale(2.0f);
+    render({line});
+    // Checked in the middle of each 4-pixel step pair: aliased lines may round by one pixel.
+    EXPECT_TRUE(near(pixel(18, 50), kRed)) << "a dash starts at x = 16";
+    EXPECT_TRUE(near(pixel(22, 50), kBackground)) << "then a gap";
+    EXPECT_TRUE(near(pixel(26, 50), kRed));
+    EXPECT_TRUE(near(pixel(2, 50), kRed)) << "the part left of x = 16 is drawn in phase too";
+    EXPECT_TRUE(near(pixel(6, 50), kBackground));
+}
+
 TEST_F(PainterEncoderTest, multiline__width_in_points_times_backing_scale) {
     auto line = horizontalLine(50.0f, kRed, kRed);
     line->setWidth(4.0f);
