@@ -20,67 +20,66 @@ void grow(float& minX, float& minY, float& maxX, float& maxY, const HXDLineVerte
 }  // namespace
 
 void PolylineIndex::build(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
-                          bool loop) {
+                          bool loop, bool monotoneX) {
     *this = PolylineIndex();
     built = true;
     if (vertices.size() < 2) return;  // no segment: nothing can be hit
-    if (runStarts.empty() && !loop && buildBins(vertices)) return;
+    if (monotoneX && runStarts.empty() && !loop) {
+        buildBins(vertices);
+        return;
+    }
     buildChunks(vertices, runStarts, loop);
 }
 
-// One pass over a curve whose x never decreases, bounds and bins together: the x extent is
-// known from the ends. Answers false (and keeps nothing) at the first vertex that goes back
-// in x or is not finite.
-bool PolylineIndex::buildBins(const std::vector<HXDLineVertex>& vertices) {
-    const size_t n = vertices.size();
+// The x extent is known from the ends; the y extent is left open (a pass over every vertex
+// is what this avoids), so the bins' own extents do the rejecting.
+void PolylineIndex::buildBins(const std::vector<HXDLineVertex>& vertices) {
     const HXDLineVertex& head = vertices.front();
     const HXDLineVertex& tail = vertices.back();
-    if (!finite(head) || !finite(tail) || tail.start.x < head.start.x) return false;
-
-    const uint32_t segments = static_cast<uint32_t>(n - 1);
+    const uint32_t segments = static_cast<uint32_t>(vertices.size() - 1);
     uint32_t count = std::clamp<uint32_t>(segments / kSegmentsPerBin, 1u, kMaxBins);
     const double span = static_cast<double>(tail.start.x) - static_cast<double>(head.start.x);
     if (!(span > 0.0)) count = 1;
     binOrigin = head.start.x;
     binInvWidth = count > 1 ? count / span : 0.0;
     bins.assign(count, Bin{});
-
-    float lowY = head.start.y;
-    float highY = head.start.y;
-    uint32_t binA = binOf(head.start.x);
-    for (uint32_t i = 0; i < segments; ++i) {
-        const HXDLineVertex& a = vertices[i];
-        const HXDLineVertex& b = vertices[i + 1];
-        if (!finite(b) || b.start.x < a.start.x) {
-            bins.clear();
-            return false;
-        }
-        const float lo = std::min(a.start.y, b.start.y);
-        const float hi = std::max(a.start.y, b.start.y);
-        lowY = std::min(lowY, lo);
-        highY = std::max(highY, hi);
-        const uint32_t binB = binOf(b.start.x);
-        for (uint32_t k = binA; k <= binB; ++k) {
-            Bin& bin = bins[k];
-            if (bin.first == kNone) {
-                bin.first = i;
-                bin.minY = lo;
-                bin.maxY = hi;
-            } else {
-                bin.minY = std::min(bin.minY, lo);
-                bin.maxY = std::max(bin.maxY, hi);
-            }
-            bin.end = i + 1;
-        }
-        binA = binB;
-    }
     hasBounds = true;
     monotone = true;
     minX = head.start.x;
     maxX = tail.start.x;
-    minY = lowY;
-    maxY = highY;
-    return true;
+    minY = -std::numeric_limits<float>::infinity();
+    maxY = std::numeric_limits<float>::infinity();
+}
+
+void PolylineIndex::fillBin(const std::vector<HXDLineVertex>& vertices, uint32_t k) {
+    const uint32_t segments = static_cast<uint32_t>(vertices.size() - 1);
+    // first: the least segment whose end reaches bin k.
+    uint32_t lo = 0, hi = segments;
+    while (lo < hi) {
+        const uint32_t mid = lo + (hi - lo) / 2;
+        if (binOf(vertices[mid + 1].start.x) >= k) hi = mid;
+        else lo = mid + 1;
+    }
+    const uint32_t first = lo;
+    // end: one past the last segment whose start lies at or before bin k.
+    hi = segments;
+    while (lo < hi) {
+        const uint32_t mid = lo + (hi - lo) / 2;
+        if (binOf(vertices[mid].start.x) <= k) lo = mid + 1;
+        else hi = mid;
+    }
+    Bin& bin = bins[k];
+    if (first >= lo) {
+        bin.first = kNone;
+        return;
+    }
+    bin.first = first;
+    bin.end = lo;
+    bin.minY = bin.maxY = vertices[first].start.y;
+    for (uint32_t v = first + 1; v <= lo; ++v) {
+        bin.minY = std::min(bin.minY, vertices[v].start.y);
+        bin.maxY = std::max(bin.maxY, vertices[v].start.y);
+    }
 }
 
 void PolylineIndex::buildChunks(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
@@ -120,16 +119,16 @@ void PolylineIndex::buildChunks(const std::vector<HXDLineVertex>& vertices, cons
 }
 
 uint32_t PolylineIndex::binOf(double x) const {
-    const double k = std::floor((x - binOrigin) * binInvWidth);
+    const double k = (x - binOrigin) * binInvWidth;
     const double last = static_cast<double>(bins.size()) - 1.0;
-    // Clamped in double before the conversion, which would be undefined out of range.
+    // Clamped in double before the conversion, which would be undefined out of range; above
+    // 0 the conversion's truncation is the floor.
     if (!(k > 0.0)) return 0;
     return static_cast<uint32_t>(std::min(k, last));
 }
 
 template <class Visit>
-void PolylineIndex::forEachCandidate(const std::vector<HXDLineVertex>& vertices, const CGRect& q,
-                                     Visit&& visit) const {
+void PolylineIndex::forEachCandidate(const std::vector<HXDLineVertex>& vertices, const CGRect& q, Visit&& visit) {
     const double qx0 = q.origin.x, qy0 = q.origin.y;
     const double qx1 = qx0 + q.size.width, qy1 = qy0 + q.size.height;
     if (!hasBounds || qx1 < minX || qx0 > maxX || qy1 < minY || qy0 > maxY) return;
@@ -141,6 +140,7 @@ void PolylineIndex::forEachCandidate(const std::vector<HXDLineVertex>& vertices,
     if (monotone) {
         uint32_t next = 0;  // adjacent bins share segments: each is visited once
         for (uint32_t k = binOf(qx0), last = binOf(qx1); k <= last; ++k) {
+            if (bins[k].first == kUnfilled) fillBin(vertices, k);
             const Bin& bin = bins[k];
             if (bin.first == kNone || bin.maxY < qy0 || bin.minY > qy1) continue;
             for (uint32_t i = std::max(bin.first, next); i < bin.end; ++i) {
@@ -166,10 +166,24 @@ void PolylineIndex::forEachCandidate(const std::vector<HXDLineVertex>& vertices,
 
 // ---- HXDMultiline ----------------------------------------------------------------------------
 
-HXDMultiline::HXDMultiline(std::span<const HXDLineVertex> lines)
-    : HXDDrawPrimitive(0), _vertices(lines.begin(), lines.end()) {}
+namespace {
+// One run of finite vertices whose x never decreases: the shape of a sampled curve, which the
+// index serves with bins. Checked as the vertices arrive, while they are in cache.
+bool isMonotoneInX(const std::vector<HXDLineVertex>& vertices) {
+    float previous = -std::numeric_limits<float>::infinity();
+    for (const HXDLineVertex& v : vertices) {
+        if (!(std::isfinite(v.start.y) && v.start.x >= previous && std::isfinite(v.start.x))) return false;
+        previous = v.start.x;
+    }
+    return true;
+}
+}  // namespace
 
-HXDMultiline::HXDMultiline(std::vector<HXDLineVertex>&& lines) : HXDDrawPrimitive(0), _vertices(std::move(lines)) {}
+HXDMultiline::HXDMultiline(std::span<const HXDLineVertex> lines)
+    : HXDDrawPrimitive(0), _vertices(lines.begin(), lines.end()), _monotoneX(isMonotoneInX(_vertices)) {}
+
+HXDMultiline::HXDMultiline(std::vector<HXDLineVertex>&& lines)
+    : HXDDrawPrimitive(0), _vertices(std::move(lines)), _monotoneX(isMonotoneInX(_vertices)) {}
 
 HXDMultiline::HXDMultiline(std::span<const HXDLineSegment> segments) : HXDDrawPrimitive(0) {
     _vertices.reserve(segments.size() + 1);
@@ -185,6 +199,7 @@ HXDMultiline::HXDMultiline(std::span<const HXDLineSegment> segments) : HXDDrawPr
         }
         _vertices.emplace_back(seg.end, seg.color);
     }
+    _monotoneX = _runStarts.empty() && isMonotoneInX(_vertices);
 }
 
 HXDMultiline::~HXDMultiline() = default;
@@ -207,8 +222,8 @@ void HXDMultiline::setLineJoin(int join) {
     _lineJoin = join == 1 ? HXDLineJoin::Round : join == 2 ? HXDLineJoin::Bevel : HXDLineJoin::Miter;
 }
 
-const hxd_internal::PolylineIndex& HXDMultiline::index() const {
-    if (!_index.built) _index.build(_vertices, _runStarts, _loop);
+hxd_internal::PolylineIndex& HXDMultiline::index() const {
+    if (!_index.built) _index.build(_vertices, _runStarts, _loop, _monotoneX);
     return _index;
 }
 

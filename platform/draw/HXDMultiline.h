@@ -15,8 +15,9 @@
 //
 // Hit test: a multiline is hit within half its width of a segment (at least half a pixel),
 // plus the line tolerance. Its world-space index (bounds, and bins along x for the usual
-// curve whose x never decreases) is built once, at the first hit test or by
-// prepareForHitTesting, so a pick over hundreds of long curves touches a few segments each.
+// curve whose x never decreases, filled bin by bin as tests reach them) is built at the first
+// hit test, so a pick over hundreds of long curves touches a few segments of each, and a
+// frame that is never picked pays nothing for it.
 
 #include <cstdint>
 #include <memory>
@@ -83,7 +84,8 @@ public:
     bool loop() const { return _loop; }
     void setLoop(bool loop);
 
-    // Builds the hit-test index now rather than at the first test.
+    // Sets the hit-test index up now rather than at the first test (a curve's bins still
+    // fill as tests reach them).
     void prepareForHitTesting() const;
 
     void encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const override;
@@ -95,7 +97,7 @@ public:
     double halfWidthInPixels(float backingScale) const;
 
 private:
-    const hxd_internal::PolylineIndex& index() const;
+    hxd_internal::PolylineIndex& index() const;
 
     // Declared first: a hit test reads the width and the index's head together, and with
     // hundreds of curves per test the cache lines touched per curve are what it costs.
@@ -112,6 +114,7 @@ private:
     bool _antialiased = false;
     bool _stippled = false;
     bool _loop = false;
+    bool _monotoneX = false;
 };
 
 // One segment of one colour.
