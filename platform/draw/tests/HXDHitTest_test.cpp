@@ -6,6 +6,7 @@
 #include <random>
 
 #include "platform/draw/HXDPrimitives.h"
+#include "platform/draw/internal/HXDGeometry2D.h"
 #include "platform/geometry/BNViewProjection.h"
 
 namespace {
@@ -117,8 +118,8 @@ TEST_F(HitTestFixture, multiline__hitOnTheLineAndWithinTheToleranceOnly) {
     }
 }
 
-// The index must find what a walk over every segment finds, for curves (x in order) and for
-// anything else (a loop, x going back, several runs).
+// The index must find what a walk over every segment finds, for points and bands, for curves
+// (x in order, bins filled as queries reach them) and for anything else (a loop, x going back).
 TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
     std::mt19937 rng(1234);
     std::uniform_real_distribution<double> ux(-0.5, 10.5), uy(-5.5, 5.5);
@@ -128,10 +129,14 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
         monotone.push_back({{x, static_cast<float>(4.0 * std::sin(x * 3.0)), 0}, {}});
         wandering.push_back({{static_cast<float>(5 + 4 * std::cos(i * 0.01)), static_cast<float>(4 * std::sin(i * 0.013)), 0}, {}});
     }
+    // Jagged: few, long segments, so that each one decides some answers.
+    std::vector<HXDLineVertex> jagged;
+    std::uniform_real_distribution<double> jy(-4.5, 4.5);
+    for (int i = 0; i < 120; ++i) jagged.push_back({{static_cast<float>(i * 10.0 / 119.0), static_cast<float>(jy(rng)), 0}, {}});
     auto looped = curve(wandering);
     looped->setLoop(true);
     const HXDScreenMapping mapping(controller.renderingContext()->projection(), CGSizeMake(200, 100));
-    for (const auto& line : {curve(monotone), looped}) {
+    for (const auto& line : {curve(monotone), curve(jagged), looped}) {
         const auto& v = line->vertices();
         const size_t segments = v.size() - 1 + (line->loop() ? 1 : 0);
         for (int trial = 0; trial < 300; ++trial) {
@@ -147,6 +152,23 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
                 t = std::clamp(std::isfinite(t) ? t : 0.0, 0.0, 1.0);
                 best = std::min(best, std::hypot(pa.x + t * dx - p.x, pa.y + t * dy - p.y));
             }
+            // A band of up to 30 px around the point: crossed by some segment, or not.
+            const CGRect band = CGRectMake(p.x, p.y, (trial % 7) * 5.0, (trial % 5) * 6.0);
+            bool crossed = false;
+            for (size_t s = 0; s < segments && !crossed; ++s) {
+                const HXDLineVertex& a = v[s];
+                const HXDLineVertex& b = v[(s + 1) % v.size()];
+                const CGPoint pa = mapping.worldToPixel(a.start.x, a.start.y);
+                const CGPoint pb = mapping.worldToPixel(b.start.x, b.start.y);
+                crossed = hxd_internal::segmentMeetsRect(pa.x, pa.y, pb.x, pb.y, band.origin.x - 0.5, band.origin.y - 0.5,
+                                                         band.origin.x + band.size.width + 0.5,
+                                                         band.origin.y + band.size.height + 0.5);
+            }
+            EXPECT_EQ(controller.newHitTestResultForPrimitives({line}, controller.renderingContextForHitTestInRect(band), false)
+                          .size(),
+                      crossed ? 1u : 0u)
+                << "band of trial " << trial << " loop " << line->loop();
+
             const auto hits = pick({line}, p);
             const bool expected = best <= 0.5 + 3.0;
             ASSERT_EQ(!hits.empty(), expected) << "trial " << trial << " loop " << line->loop() << " brute " << best;
