@@ -106,6 +106,9 @@ private:
     };
     void strokeRun(QPainter& painter, double widthPixels, double step, uint32_t pattern, Qt::PenJoinStyle join,
                    StipplePhase& phase);
+    // One colour, every point near the drawable: the run is drawn as one polyline. False
+    // (nothing drawn) otherwise.
+    bool drawWholeRun(QPainter& painter, const QRectF& guard, double widthPixels, Qt::PenJoinStyle join);
     // Moves the phase on by a distance in pixels without drawing.
     static void advancePhase(StipplePhase& phase, double distance, double step);
     void drawSegment(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& ca, const HXDColor& cb,
