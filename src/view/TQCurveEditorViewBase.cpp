@@ -64,16 +64,7 @@ void TQCurveEditorViewBase::viewDidChangeBackingProperties() {
 
 // ---- Projection and mapping ----------------------------------------------------------------
 
-void TQCurveEditorViewBase::drawProjection() {
-    if (!_renderController)
-        _renderController = std::make_unique<HXDRenderController>(nullptr, static_cast<float>(_contentsScale));
-    const CGRect& v = _currentViewVolume;
-    const CGSize b = bounds().size;
-    const HXDFloat2 pixelScale{static_cast<float>(v.size.width / b.width),
-                               static_cast<float>(v.size.height / b.height)};
-    _renderController->updateTexture(nullptr, static_cast<float>(_contentsScale),
-                                     BNViewVolumeProjection(v), pixelScale);
-}
+// drawProjection is part of the frame: TQCurveEditorViewDraw.cpp.
 
 namespace {
 // The projection of the last frame; the zero matrix before the first (conversions then

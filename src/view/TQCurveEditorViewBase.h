@@ -15,25 +15,53 @@
 //
 // Lifetime: the controller, the view host, the clock and the timer are not owned; each must
 // outlive the view or be detached (set to null) first. The view owns its three selection
-// lists and its render controller.
+// lists, its render controller, its image assets and the primitives of one frame.
+//
+// Drawing. A host that wants a frame calls displayLayer with an encoder of its own (a painter
+// on a widget, a recorder in tests). The view builds the frame's primitives and has each
+// encode itself; the same primitives answer the hit tests until the next frame. Frames are
+// at most 30 a second: a request inside that gap returns without drawing and schedules one
+// delayed redraw, so the host should keep showing its last frame when displayLayer answers
+// false.
 
 #include <cstdint>
+#include <map>
 #include <memory>
+#include <optional>
+#include <utility>
+#include <vector>
 
-#include "platform/draw/HXDRenderController.h"
+#include "platform/draw/HXDPrimitives.h"
 #include "platform/geometry/CGGeometry.h"
 #include "platform/media/CMTime.h"
 #include "platform/ui/RWEvent.h"
+#include "platform/support/BNString.h"
 #include "platform/ui/RWServices.h"
 #include "src/contract/TQNotificationWords.h"
 #include "src/data/TQCurveSelection.h"
+#include "src/resources/GDColor.h"
 
 class TQCurveEditorCtrlBase;
 class TQCurveEditorItem;
 class TQCurveEditorChannelItem;
 
+// One image of the keypoint or tangent tables: the texture (shared, immutable) and the
+// image's size in points. An image the resources lack leaves a null texture and a zero size.
+struct KeyframeAsset {
+    std::shared_ptr<const HXDPixelTexture> texture;
+    CGSize size = CGSizeZero;
+};
+
+// The frame's keypoint quads by the item's channelId (what a rubber band tests).
+using TQKeypointPrimitives = std::map<uint32_t, HXDPrimitiveArray>;
+
 class TQCurveEditorViewBase {
 public:
+    // Minimum time between two frames, in seconds, and the delay of the one redraw that a
+    // request inside that gap schedules, in nanoseconds.
+    static constexpr double kFrameInterval = 0.03333333333333333;
+    static constexpr uint64_t kDelayedDisplayNanoseconds = 33333333;
+
     // Zero volumes; a subclass's constructor sets them.
     TQCurveEditorViewBase();
     virtual ~TQCurveEditorViewBase();
@@ -197,6 +225,116 @@ public:
     virtual void computeVerticalTickMarks();
     virtual uint32_t numberOfTickMarks() const { return 10; }
 
+    // ---- Frame (drawing pipeline) ----
+
+    // Draws one frame through the encoder: the 1/30 s gate, then the background primitives,
+    // the projection, drawCurveEditor, and every primitive encoded in order. Answers true
+    // when a frame was encoded; false when the gate held it back (one delayed redraw is then
+    // pending) or when the encoder had no drawable (a null encoder is a host without one).
+    virtual bool displayLayer(HXDEncoder* encoder);
+    // One-time set-up at the first frame: render controller, assets, primitive lists.
+    virtual void setupMetalRender();
+    char metalRenderReady() const { return _metalRenderReady; }
+    void setMetalRenderReady(char ready) { _metalRenderReady = ready; }
+    // Loads the keypoint and tangent images at the present backing scale.
+    virtual void loadAssets();
+    // One image of the resources at the present backing scale.
+    KeyframeAsset keyframeAssetWithImageName(const BNString& name) const;
+    // [colorIndex 0..7][state 0 normal, 1 pressed, 2 inactive, 3 disabled][selected 0/1];
+    // out-of-range indices answer an empty asset.
+    const KeyframeAsset& keyframeAsset(uint32_t colorIndex, uint32_t state, uint32_t selected) const;
+    const KeyframeAsset& tangentAsset() const { return _tangentAsset; }
+
+    // Steps of a frame, in the order displayLayer runs them. drawBackground, drawGrid and
+    // drawCurveUnits are empty here: subclasses fill them.
+    virtual void drawBackground() {}
+    // Builds the frame's primitives: auto-zoom, tick marks, grid, the curves (the primary
+    // channel last, on top), overlays, units.
+    virtual void drawCurveEditor();
+    virtual void drawGrid() {}
+    virtual void drawCurveUnits() {}
+    // The rubber band while selecting; the box of the box tool.
+    virtual void drawOverlays(const CGRect& bounds);
+    virtual void drawSelectionRect();
+    // The box tool's handles and inside; empty here.
+    virtual void drawFourCornerBox() {}
+
+    // The frame's lists. Primitives live until the next frame starts; the hit test runs on
+    // _selectionPrimitives and _keypointsPrimitives.
+    const HXDPrimitiveArray& primitives() const { return _primitives; }
+    const HXDPrimitiveArray& backgroundPrimitives() const { return _backgroundPrimitives; }
+    const HXDPrimitiveArray& selectionPrimitives() const { return _selectionPrimitives; }
+    const TQKeypointPrimitives& keypointsPrimitives() const { return _keypointsPrimitives; }
+    // Non-null only while a frame is encoded.
+    HXDEncoder* encoder() const { return _encoder; }
+    HXDTexture* currentTexture() const { return _currentTexture; }
+
+    // ---- Colours and text ----
+
+    GDColor gridColor() const;
+    GDColor endpointsColor() const;
+    GDColor textColor() const;
+    GDColor selectionColor() const;
+    GDColor backgroundColor() const;
+    GDColor lockedColor() const;
+    // curveColor0..curveColor7; none above 7.
+    std::optional<GDColor> curveColor(uint32_t index) const;
+    // From a table built once per process. An index above 7 wraps (index & 7), as the colour
+    // counter of new items does, instead of reading past the table.
+    static GDColor getColorForIndex(uint32_t index);
+    const HXDTextAttributes& textAttribs() const { return _textAttribs; }
+    // The system font at 8 points in curveEditorTextColor0.
+    static HXDTextAttributes defaultTextAttributes();
+
+    // Text of a value label: decibels ("%.f") for an amplitude channel, "%4.2f" otherwise;
+    // none when the item has no channel.
+    std::optional<BNString> getScale(const TQCurveEditorItem* item, double value) const;
+    // Text of a keypoint label from the localised time and coordinates formats; time is on
+    // the editor's axis.
+    virtual BNString getCoordinates(const TQCurveEditorItem* item, const CMTime& time, double value) const;
+    // Places a text at a world point, nudged by _minDeltaU pixels' worth of zoom and snapped
+    // to a whole drawable pixel (metalPrint:atPos:).
+    void metalPrint(const BNString& text, const CGPoint& worldPosition);
+
+    // ---- Curves, keypoints and tangents of one item ----
+
+    // Drawable pixels per point of the window: the host's, or the last known without one.
+    double windowBackingScale() const;
+    // Width of thin lines in points: 1 on a backing scale of 1, 0.5 above (one pixel).
+    float thinLineWidth() const;
+    // The curve as three multilines (dimmed before the first and after the last keypoint),
+    // and the ghost of a selected item during a gesture.
+    virtual void drawOriginalCurve(TQCurveEditorItem* item);
+    // The curve after behaviours, translucent, not pickable.
+    virtual void drawProcessedCurve(TQCurveEditorItem* item);
+    // Every keypoint's image, and the handles of selected, enabled, unlocked keypoints.
+    virtual void drawPoints(TQCurveEditorItem* item, char drawTangents);
+    // One keypoint image (slot chosen from the six assets by its state), its value label for
+    // the primary selected keypoint; rasterSize receives the image's size in world units.
+    virtual void drawKeypoint(TQKeyframeHandle handle, const CMTime* u, double v, bool selected, bool enabled,
+                              bool locked, TQCurveEditorItem* item, const KeyframeAsset assets[6],
+                              CGPoint* rasterSize);
+    // Turns a relative tangent (seconds, channel units) into absolute world coordinates, and
+    // gives the offset from the keypoint to where the handle line meets the ellipse inscribed
+    // in half the keypoint image.
+    void calculateDrawTangentU(double* tangentU, double* tangentV, double* deltaU, double* deltaV, const CMTime* u,
+                               double v, const CGPoint& rasterSize, const TQCurveEditorItem* item) const;
+    // One tangent handle (line and image), unless it lies on its keypoint.
+    virtual void drawTangent(TQKeyframeHandle handle, double tangentU, double tangentV, const CMTime* u, double v,
+                             uint32_t whichTangent, TQCurveEditorItem* item, const CGPoint& rasterSize);
+    // Three pixels in world units, as the last drawPoints set it.
+    CGPoint pointSize() const { return _pointSize; }
+
+    // ---- Gesture flags that drawing reads (the mouse code sets them) ----
+
+    char printText() const { return _printText; }
+    void setPrintText(char print) { _printText = print; }
+    char mouseIsDown() const { return _mouseIsDown; }
+    void setMouseIsDown(char down) { _mouseIsDown = down; }
+    char selecting() const { return _selecting; }
+    void setSelecting(char selecting) { _selecting = selecting; }
+    void setSelectionViewVolume(const CGRect& volume) { _selectionViewVolume = volume; }
+
     // ---- Tools ----
 
     // Forgets the box, redraws, posts kTQNotifyToolChangedWord.
@@ -245,6 +383,8 @@ protected:
     CGPoint _mouseOrigin;   // where the gesture began, drawable pixels
     CGPoint _lastMousePos;  // running pointer position of the gesture, drawable pixels
     char _selecting = 0;
+    char _printText = 0;    // show the value label of the primary keypoint
+    char _mouseIsDown = 0;  // a gesture is under way
 
     // ---- Selection lists, owned, never null ----
     std::shared_ptr<TQCurveSelectionList> _selection;
@@ -265,4 +405,30 @@ protected:
     CGSize _drawableSize = CGSizeZero;
     double _contentsScale = 1.0;
     std::unique_ptr<HXDRenderController> _renderController;
+
+    // ---- Drawing pipeline, in declaration order ----
+    HXDTextAttributes _textAttribs = defaultTextAttributes();
+    KeyframeAsset _keyframeAssets[8][4][2];
+    KeyframeAsset _tangentAsset;
+    double _lastDrawTime = 0.0;           // clock time of the last frame
+    char _firedFutureDisplayEvent = 0;    // a delayed redraw is scheduled
+    char _metalRenderReady = 0;           // setupMetalRender has run
+    HXDTexture* _currentTexture = nullptr;  // the drawable during a frame, not owned
+    HXDEncoder* _encoder = nullptr;         // set only during a frame, not owned
+    HXDPrimitiveArray _primitives;            // this frame's primitives, in drawing order
+    HXDPrimitiveArray _backgroundPrimitives;  // drawn before the projection is set
+    TQKeypointPrimitives _keypointsPrimitives;
+    HXDPrimitiveArray _selectionPrimitives;   // everything pickable, in drawing order
+    CGPoint _pointSize = CGPointZero;
+
+private:
+    // Scratch of drawOriginalCurve, kept between frames so that the merge of selected
+    // keypoints allocates only when it grows.
+    std::vector<std::pair<CMTime, double>> _selectedKeyScratch;
+    // Scratch of drawPoints: the handles of a large selection, sorted, so that each keypoint
+    // is looked up in it by bisection instead of by a walk of the whole selection.
+    std::vector<TQKeyframeHandle> _selectedHandleScratch;
+    // Expires with the view, so that a delayed redraw scheduled by a frame never calls a
+    // dead view.
+    std::shared_ptr<char> _lifeToken = std::make_shared<char>(0);
 };

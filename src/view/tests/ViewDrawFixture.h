@@ -1,0 +1,56 @@
+#pragma once
+// The view fixture with a recording encoder of the view's drawable size, and helpers that run
+// whole frames past the 1/30 s gate and read back what they drew.
+
+#include <memory>
+#include <vector>
+
+#include "platform/draw/testing/HXDRecordingEncoder.h"
+#include "src/view/tests/ViewFixture.h"
+
+namespace view_test {
+
+class ViewDrawFixture : public ViewFixture {
+protected:
+    // Past the gate, one frame; answers whether it was drawn.
+    bool frame() {
+        clock.advance(1.0);
+        return view.displayLayer(&encoder);
+    }
+
+    // The channel id an item's primitive carries, or -1 without one.
+    static int64_t idOf(const HXDDrawPrimitive& p) {
+        const HXDNumber* id = p.hitInfo().extraInfo().objectForKey("ID");
+        return id ? id->integerValue() : -1;
+    }
+
+    // The multilines of the frame's pickable list that belong to the item, in order.
+    std::vector<const HXDMultiline*> curvePieces(const TQCurveEditorChannelItemPtr& item) const {
+        std::vector<const HXDMultiline*> out;
+        for (const auto& p : view.selectionPrimitives())
+            if (p->hitInfo().hitID() == TQSelectionCurve && idOf(*p) == item->channelId())
+                out.push_back(dynamic_cast<const HXDMultiline*>(p.get()));
+        return out;
+    }
+
+    // The pickable primitives of one hit id, in drawing order.
+    template <class T>
+    std::vector<const T*> pickable(uint32_t hitID) const {
+        std::vector<const T*> out;
+        for (const auto& p : view.selectionPrimitives())
+            if (p->hitInfo().hitID() == hitID)
+                if (const auto* t = dynamic_cast<const T*>(p.get())) out.push_back(t);
+        return out;
+    }
+
+    // A linear channel with its item, selected for nothing.
+    TQCurveEditorChannelItemPtr linearItem(const char* name, std::initializer_list<std::pair<double, double>> keys) {
+        TQChannel* c = addChannel(name, keys);
+        c->setInterpolation(kTQInterpolationLinear);
+        return addItem(c);
+    }
+
+    HXDRecordingEncoder encoder{800, 400};
+};
+
+}  // namespace view_test
