@@ -162,6 +162,16 @@ TEST_F(PainterEncoderTest, multiline__width_in_points_times_backing_scale) {
     EXPECT_TRUE(near(pixel(200, 106), kBackground));
 }
 
+TEST_F(PainterEncoderTest, multiline__thinner_than_a_pixel_is_weakened_by_its_width) {
+    auto line = horizontalLine(50.5f, kRed, kRed);
+    line->setWidth(0.5f);
+    render({line});
+    EXPECT_NEAR(pixel(100, 50).red(), 128, 8) << "half a pixel wide covers half the pixel";
+    render({line}, 2.0f);
+    EXPECT_GT(std::max(pixel(200, 100).red(), pixel(200, 101).red()), 200)
+        << "half a point on a backing scale of 2 is one full pixel";
+}
+
 TEST_F(PainterEncoderTest, multiline__loop_closes_each_run) {
     const std::vector<HXDLineSegment> segments{{{20.5f, 20.5f, 0.0f}, {20.5f, 80.5f, 0.0f}, kRed},
                                                {{20.5f, 80.5f, 0.0f}, {80.5f, 80.5f, 0.0f}, kRed},
