@@ -300,6 +300,9 @@ public:
 
     // Drawable pixels per point of the window: the host's, or the last known without one.
     double windowBackingScale() const;
+    // getSizeWorld of a size in drawable pixels, through the projection of the last frame
+    // (which is affine, so the world size of one pixel, taken once per frame, scales).
+    CGPoint worldSizeOfPixels(double width, double height) const;
     // Width of thin lines in points: 1 on a backing scale of 1, 0.5 above (one pixel).
     float thinLineWidth() const;
     // The curve as three multilines (dimmed before the first and after the last keypoint),
@@ -420,6 +423,7 @@ protected:
     TQKeypointPrimitives _keypointsPrimitives;
     HXDPrimitiveArray _selectionPrimitives;   // everything pickable, in drawing order
     CGPoint _pointSize = CGPointZero;
+    CGPoint _worldPerPixel = CGPointZero;  // getSizeWorld of one pixel, set with the projection
 
 private:
     // Scratch of drawOriginalCurve, kept between frames so that the merge of selected

@@ -150,6 +150,8 @@ void TQCurveEditorViewBase::drawProjection() {
     // tests work on the pixel grid the view reports.
     _renderController->updateTexture(_currentTexture, static_cast<float>(_contentsScale),
                                      BNViewVolumeProjection(v), pixelScale, _drawableSize);
+    // The projection is affine: one pixel's world size serves every image of the frame.
+    _worldPerPixel = getSizeWorld(CGPointMake(1.0, 1.0));
 }
 
 // ---- Assets --------------------------------------------------------------------------------
