@@ -170,6 +170,58 @@ protected:
         return out;
     }
 
+    // Two frames: the first fits each curve to the grid, then the view frames them all.
+    void renderFramed() {
+        ASSERT_TRUE(renderFrame()) << "the first frame must draw";
+        view.frameAll(1);
+        ASSERT_TRUE(renderFrame()) << "the framed frame must draw";
+        ASSERT_EQ(encoder.image().size(), QSize(800, 400));
+    }
+
+    QColor backgroundColour() const {
+        const GDColor c = view.backgroundColor();
+        return TQQtPainterEncoder::qColor(HXDColor{c.red, c.green, c.blue, 1.0f});
+    }
+
+    bool nearKeypoint(const std::vector<ScreenCurve>& curves, const CGPoint& p) const {
+        for (const ScreenCurve& c : curves)
+            for (const CGPoint& k : c.keypoints)
+                if (std::hypot(p.x - k.x, p.y - k.y) < kKeypointClearance) return true;
+        return false;
+    }
+
+    // Looks for `want` near each probe of curves[index] that no other curve, no keypoint and
+    // no excluded rectangle (pixels, y up) comes near; answers how many probes were judged,
+    // and reports each probe where the colour is missing.
+    int checkCurveColour(const std::vector<ScreenCurve>& curves, size_t index, const QColor& want,
+                         const CGRect& excluded = CGRectZero) {
+        const QImage& image = encoder.image();
+        const QColor background = backgroundColour();
+        const ScreenCurve& curve = curves[index];
+        const CGRect keepOut = CGRectInset(excluded, -kCurveClearance, -kCurveClearance);
+        int checked = 0;
+        for (const CGPoint& p : curve.probes) {
+            if (p.x < 2 || p.y < 2 || p.x > image.width() - 3 || p.y > image.height() - 3) continue;
+            if (nearKeypoint(curves, p) || (!CGRectIsEmpty(excluded) && CGRectContainsPoint(keepOut, p))) continue;
+            bool crowded = false;
+            for (size_t other = 0; other < curves.size() && !crowded; ++other)
+                crowded = other != index && distanceToPolyline(p, curves[other].points) < kCurveClearance;
+            if (crowded) continue;
+            ++checked;
+            double best = -1.0;
+            for (int dy = -2; dy <= 2; ++dy)
+                for (int dx = -2; dx <= 2; ++dx)
+                    best = std::max(best, coverage(pixel(static_cast<int>(p.x) + dx, static_cast<int>(p.y) + dy),
+                                                   background, want));
+            if (best < kMinCoverage)
+                ADD_FAILURE() << "curve " << index << " (" << curve.item->simpleName() << ") missing at pixel ("
+                              << p.x << ", " << p.y << ")";
+        }
+        return checked;
+    }
+
+    static QColor qColour(const GDColor& c) { return TQQtPainterEncoder::qColor(HXDColor{c.red, c.green, c.blue, 1.0f}); }
+
     QColor pixel(int x, int yUp) const {
         const QImage& image = encoder.image();
         return image.pixelColor(x, image.height() - 1 - yUp);
@@ -203,58 +255,24 @@ protected:
 };
 
 TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_elsewhere) {
-    ASSERT_TRUE(renderFrame()) << "the first frame must draw";
-    view.frameAll(1);
-    ASSERT_TRUE(renderFrame()) << "the framed frame must draw";
+    renderFramed();
     const QImage& image = encoder.image();
-    ASSERT_EQ(image.width(), 800);
-    ASSERT_EQ(image.height(), 400);
     const QString path = QDir(QCoreApplication::applicationDirPath()).filePath("offscreen_sample_scene.png");
     EXPECT_TRUE(image.save(path, "PNG")) << "could not write " << path.toStdString();
 
-    const QColor background = TQQtPainterEncoder::qColor(HXDColor{
-        view.backgroundColor().red, view.backgroundColor().green, view.backgroundColor().blue, 1.0f});
+    const QColor background = backgroundColour();
     const std::vector<ScreenCurve> curves = screenCurves();
     ASSERT_EQ(curves.size(), channels.size());
 
-    const auto nearKeypoint = [&](const CGPoint& p) {
-        for (const ScreenCurve& c : curves)
-            for (const CGPoint& k : c.keypoints)
-                if (std::hypot(p.x - k.x, p.y - k.y) < kKeypointClearance) return true;
-        return false;
-    };
-
-    // Each curve's colour at its probes, where no other curve and no keypoint come near.
+    // Each curve's colour at its probes. Curves of one compound can coincide (one hides the
+    // other); most must be judged.
     int totalChecked = 0;
     size_t judged = 0;
     for (size_t ci = 0; ci < curves.size(); ++ci) {
-        const ScreenCurve& curve = curves[ci];
-        const QColor want = TQQtPainterEncoder::qColor(
-            HXDColor{curve.color.red, curve.color.green, curve.color.blue, curve.color.alpha});
-        int checked = 0, found = 0;
-        for (const CGPoint& p : curve.probes) {
-            if (p.x < 2 || p.y < 2 || p.x > image.width() - 3 || p.y > image.height() - 3) continue;
-            if (nearKeypoint(p)) continue;
-            bool crowded = false;
-            for (size_t other = 0; other < curves.size() && !crowded; ++other)
-                crowded = other != ci && distanceToPolyline(p, curves[other].points) < kCurveClearance;
-            if (crowded) continue;
-            ++checked;
-            double best = -1.0;
-            for (int dy = -2; dy <= 2; ++dy)
-                for (int dx = -2; dx <= 2; ++dx)
-                    best = std::max(best, coverage(pixel(static_cast<int>(p.x) + dx, static_cast<int>(p.y) + dy),
-                                                   background, want));
-            if (best >= kMinCoverage) ++found;
-            else
-                ADD_FAILURE() << "curve " << ci << " (" << curve.item->simpleName() << ") missing at pixel (" << p.x << ", "
-                              << p.y << ")";
-        }
-        EXPECT_EQ(found, checked) << "curve " << ci << " is missing at some of its probes";
+        const int checked = checkCurveColour(curves, ci, qColour(curves[ci].color));
         totalChecked += checked;
         judged += checked >= 5 ? 1 : 0;
     }
-    // Curves of one compound can coincide (one hides the other); most must be judged.
     EXPECT_GE(judged * 2, curves.size()) << "too few curves had clear probes: the framing is wrong";
     EXPECT_GE(totalChecked, 100);
 
@@ -283,7 +301,7 @@ TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_e
     for (int y = 4; y < image.height(); y += 16) {
         for (int x = 4; x < image.width(); x += 16) {
             const CGPoint p = CGPointMake(x + 0.5, y + 0.5);
-            if (nearKeypoint(p)) continue;
+            if (nearKeypoint(curves, p)) continue;
             bool nearCurve = false;
             for (const ScreenCurve& c : curves)
                 if ((nearCurve = distanceToPolyline(p, c.points) < kCurveClearance)) break;
@@ -296,6 +314,98 @@ TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_e
         }
     }
     EXPECT_GT(clear, 200) << "the curves cover nearly the whole view: the framing is wrong";
+}
+
+TEST_F(OffscreenSceneRenderTest, selection__curve_handles_label_and_band_are_painted) {
+    renderFramed();
+    // Select the first curve and its first keypoint past the middle whose segment uses
+    // tangents, with its value label; and a rubber band over the right quarter.
+    TQCurveEditorChannelItem* item = dynamic_cast<TQCurveEditorChannelItem*>(set->channeItemAtIndex(0).get());
+    ASSERT_NE(item, nullptr);
+    TQChannel* channel = item->channel();
+    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+    TQKeyframeHandle chosen = nullptr;
+    for (size_t k = keys.size() / 2; k + 1 < keys.size() && !chosen; ++k)
+        if (channel->getKeyframeInterpolationUsesTangents(keys[k])) chosen = keys[k];
+    ASSERT_NE(chosen, nullptr) << "no keypoint of the first curve uses tangents";
+    item->select(1);
+    auto entry = std::make_shared<TQCurveSelection>();
+    entry->setHandle(chosen);
+    entry->setFlags(TQSelectionKeypoint);
+    entry->setCurveId(item->channelId());
+    CMTime time{};
+    double value = 0.0;
+    channel->getKeyframe(chosen, &time, &value);
+    entry->setKeypointUV(time, value);
+    view.getSelection()->addSelection(entry);
+    view.setPrintText(1);
+    const CGRect volume = view.getCurrentViewVolume();
+    view.setSelecting(1);
+    view.setSelectionViewVolume(CGRectMake(volume.origin.x + volume.size.width * 0.75, volume.origin.y,
+                                           volume.size.width * 0.25, volume.size.height));
+    ASSERT_TRUE(renderFrame());
+    const QImage& image = encoder.image();
+    image.save(QDir(QCoreApplication::applicationDirPath()).filePath("offscreen_sample_scene_selection.png"), "PNG");
+
+    const std::vector<ScreenCurve> curves = screenCurves();
+    const CGRect band = CGRectMake(image.width() * 0.75, 0, image.width() * 0.25, image.height());
+
+    // The selected curve loses its colour to the selection colour, outside the band.
+    EXPECT_GE(checkCurveColour(curves, 0, qColour(view.selectionColor()), band), 5);
+
+    // The band: a quarter of the selection colour over the background, away from the curves.
+    {
+        const QColor bg = backgroundColour();
+        const QColor sel = qColour(view.selectionColor());
+        int checked = 0;
+        for (int y = 8; y < image.height() - 8; y += 12) {
+            const CGPoint p = CGPointMake(band.origin.x + band.size.width * 0.5 + 0.5, y + 0.5);
+            bool nearCurve = nearKeypoint(curves, p);
+            for (const ScreenCurve& c : curves) nearCurve = nearCurve || distanceToPolyline(p, c.points) < kCurveClearance;
+            if (nearCurve) continue;
+            ++checked;
+            EXPECT_NEAR(coverage(pixel(static_cast<int>(p.x), y), bg, sel), 0.25, 0.05)
+                << "the band at pixel (" << p.x << ", " << y << ") is not a quarter of the selection colour";
+        }
+        EXPECT_GT(checked, 5);
+    }
+
+    // Tangent handles: an image at each handle quad the frame made, and at least one of them.
+    int handles = 0;
+    const HXDScreenMapping mapping(view.renderController()->renderingContext()->projection(),
+                                   view.renderController()->renderingContext()->drawableSize());
+    for (const auto& primitive : view.selectionPrimitives()) {
+        const uint32_t id = primitive->hitInfo().hitID();
+        if (id != TQSelectionInTangent && id != TQSelectionOutTangent) continue;
+        const auto* quad = dynamic_cast<const HXDQuadTexture*>(primitive.get());
+        ASSERT_NE(quad, nullptr);
+        const CGRect r = mapping.worldRectToPixels(quad->destinationRect());
+        const int cx = static_cast<int>(r.origin.x + r.size.width * 0.5);
+        const int cy = static_cast<int>(r.origin.y + r.size.height * 0.5);
+        if (cx < 0 || cy < 0 || cx >= image.width() || cy >= image.height()) continue;
+        ++handles;
+        const QColor got = pixel(cx, cy);
+        const QColor bg = backgroundColour();
+        EXPECT_GT(std::abs(got.red() - bg.red()) + std::abs(got.green() - bg.green()) + std::abs(got.blue() - bg.blue()),
+                  90)
+            << "no handle image at pixel (" << cx << ", " << cy << ")";
+    }
+    EXPECT_GE(handles, 1) << "the selected keypoint shows no tangent handle";
+
+    // The value label: text-coloured pixels above and right of the keypoint.
+    {
+        const CGPoint k = view.getPointScreen(CGPointMake(CMTimeGetSeconds(time) + CMTimeGetSeconds(channel->timeOffset()),
+                                                          controller.convertFromChannelCoords(item, value)));
+        const QColor text = qColour(view.textColor());
+        const QColor bg = backgroundColour();
+        int inked = 0;
+        for (int y = static_cast<int>(k.y) - 40; y < static_cast<int>(k.y) + 40; ++y)
+            for (int x = static_cast<int>(k.x) - 120; x < static_cast<int>(k.x) + 120; ++x)
+                if (x >= 0 && y >= 0 && x < image.width() && y < image.height() &&
+                    coverage(pixel(x, y), bg, text) > 0.6)
+                    ++inked;
+        EXPECT_GT(inked, 10) << "no value label near the selected keypoint";
+    }
 }
 
 }  // namespace
