@@ -110,11 +110,13 @@ std::optional<RWEvent> TQQtViewHost::nextEventMatchingMask(RWEventMask mask) {
 
 // ---- Installer ------------------------------------------------------------------------------
 
-TQQtServiceInstaller::TQQtServiceInstaller() : _previous(RWApplicationServices()) {
+TQQtServiceInstaller::TQQtServiceInstaller()
+    : _previous(RWApplicationServices()), _previousMetrics(&HXDTextMetrics::shared()) {
     RWServiceSet mine;
     mine.clock = &_clock;
     mine.timer = &_timer;
     RWInstallServices(mine);
+    HXDTextMetrics::setShared(&_metrics);
 }
 
 TQQtServiceInstaller::~TQQtServiceInstaller() {
@@ -122,4 +124,6 @@ TQQtServiceInstaller::~TQQtServiceInstaller() {
     back.clock = _previous.clock;
     back.timer = _previous.timer;
     RWInstallServices(back);
+    // The estimate, if that is what was there, behaves the same installed as not.
+    HXDTextMetrics::setShared(_previousMetrics);
 }

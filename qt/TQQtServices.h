@@ -14,6 +14,7 @@
 #include <deque>
 
 #include "platform/ui/RWServices.h"
+#include "qt/TQQtPainterEncoder.h"
 
 // Seconds since the clock was made, on the monotonic clock Qt's timers use.
 class TQQtClock final : public RWClock {
@@ -84,8 +85,9 @@ private:
     std::deque<RWEvent> _pending;
 };
 
-// Installs a Qt clock and a Qt timer as the process-wide services for its lifetime and puts
-// back what was installed before. Make one after the QApplication, on the main thread.
+// Installs a Qt clock, a Qt timer and the Qt text metrics (so that text boxes are measured
+// with the font the painter draws with) as the process-wide services for its lifetime, and
+// puts back what was installed before. Make one after the QApplication, on the main thread.
 class TQQtServiceInstaller {
 public:
     TQQtServiceInstaller();
@@ -99,5 +101,7 @@ public:
 private:
     TQQtClock _clock;
     TQQtTimerService _timer;
+    TQQtTextMetrics _metrics;
     RWServiceSet _previous;
+    const HXDTextMetrics* _previousMetrics;
 };

@@ -132,12 +132,16 @@ TEST(QtClockTest, now__is_monotonic) {
 
 TEST(QtServiceInstallerTest, installs_and_restores) {
     RWClock* before = RWApplicationServices().clock;
+    const HXDTextMetrics* metricsBefore = &HXDTextMetrics::shared();
     {
         TQQtServiceInstaller installer;
         EXPECT_EQ(RWApplicationServices().clock, &installer.clock());
         EXPECT_EQ(RWApplicationServices().timer, &installer.timer());
+        EXPECT_NE(dynamic_cast<const TQQtTextMetrics*>(&HXDTextMetrics::shared()), nullptr)
+            << "text must be measured with the painter's font";
     }
     EXPECT_EQ(RWApplicationServices().clock, before);
+    EXPECT_EQ(&HXDTextMetrics::shared(), metricsBefore);
 }
 
 }  // namespace
