@@ -345,11 +345,13 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
         // Handles only on selected, enabled, unlocked keypoints: the input one when the
         // segment arriving here is shaped by tangents, the output one when the leaving one is.
         const bool editable = drawTangents && selected && enabled && !locked;
-        double iu = 0.0;
-        double iv = 0.0;
-        channel->getKeyframeInputTangents(h, &iu, &iv, true);
-        if (editable && k != 0 && prevUsesTangents && (std::fabs(iu) >= kEpsilon || std::fabs(iv) >= kEpsilon))
-            drawTangent(h, iu, iv, &u, v, TQSelectionInTangent, channelItem, rasterSize);
+        if (editable && k != 0 && prevUsesTangents) {
+            double iu = 0.0;
+            double iv = 0.0;
+            channel->getKeyframeInputTangents(h, &iu, &iv, true);
+            if (std::fabs(iu) >= kEpsilon || std::fabs(iv) >= kEpsilon)
+                drawTangent(h, iu, iv, &u, v, TQSelectionInTangent, channelItem, rasterSize);
+        }
         prevUsesTangents = channel->getKeyframeInterpolationUsesTangents(h);
         // No zero-length test here: an output handle on its keypoint is dropped by drawTangent.
         if (editable && k + 1 != n && prevUsesTangents) {

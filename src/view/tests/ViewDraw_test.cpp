@@ -120,3 +120,22 @@ TEST_F(ViewFrameTest, getScaleAndCoordinates__formatValuesByChannelType) {
 
 }  // namespace
 }  // namespace view_test
+
+namespace view_test {
+namespace {
+
+TEST_F(ViewFrameTest, setVisibleOriginalCurveDirty__marksOnlyWhatTheHostReportsChanged) {
+    auto changed = linearItem("Changed", {{1.0, 0.0}, {5.0, 0.5}});
+    auto still = linearItem("Still", {{1.0, 0.0}, {5.0, 0.5}});
+    ASSERT_TRUE(frame());
+    ASSERT_FALSE(changed->originalCurveDirty() || still->originalCurveDirty()) << "a frame caches every curve";
+    changed->channel()->noteWillChange(true);
+    view.setVisibleOriginalCurveDirty(1);
+    EXPECT_TRUE(changed->originalCurveDirty());
+    EXPECT_FALSE(still->originalCurveDirty()) << "an unchanged curve keeps its samples";
+    view.setAllOriginalCurveDirty(1);
+    EXPECT_TRUE(still->originalCurveDirty());
+}
+
+}  // namespace
+}  // namespace view_test
