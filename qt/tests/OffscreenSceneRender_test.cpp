@@ -9,7 +9,9 @@
 #include <QDir>
 #include <QWidget>
 
+#include <algorithm>
 #include <cmath>
+#include <cstdlib>
 #include <memory>
 #include <vector>
 
@@ -36,6 +38,8 @@ constexpr double kColourResidual = 40.0;
 // antialiased fringe may change a pixel.
 constexpr double kCurveClearance = 5.0;
 constexpr double kKeypointClearance = 12.0;
+// A pixel of the golden comparison counts as changed beyond this difference on a channel.
+constexpr int kGoldenChannelTolerance = 8;
 // Probes per curve between its first and last keypoints.
 constexpr int kProbes = 200;
 
@@ -314,6 +318,47 @@ TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_e
         }
     }
     EXPECT_GT(clear, 200) << "the curves cover nearly the whole view: the framing is wrong";
+}
+
+// The same frame against a reviewed image, for what the pixel checks above do not look at
+// (the dimmed, stippled ends; the keypoint images' look). Antialiasing may differ a little
+// between builds of Qt, so a pixel counts as changed only beyond a tolerance, and a few may.
+// VCE_UPDATE_GOLDEN=1 rewrites the golden image after a deliberate change of the drawing.
+TEST_F(OffscreenSceneRenderTest, frame__matches_the_golden_image) {
+    const char* sourceDir = std::getenv("VCE_SOURCE_DIR");
+    if (!sourceDir) GTEST_SKIP() << "VCE_SOURCE_DIR is not set (ctest sets it): no golden image to compare with";
+    renderFramed();
+    // Four seconds past the last keyframes, so that the dimmed, stippled ends take room.
+    const CGRect framed = view.getCurrentViewVolume();
+    const CMTime start = CMTimeMake(0, kTimescale);
+    const CMTime duration = CMTimeMake(14 * kTimescale, kTimescale);
+    view.setDisplayRange(&start, &duration);
+    view.setCurrentViewVolume(CGRectMake(0.0, framed.origin.y, 14.0, framed.size.height));
+    view.setAllOriginalCurveDirty(1);
+    ASSERT_TRUE(renderFrame());
+    const QString golden = QDir(QString::fromUtf8(sourceDir)).filePath("qt/tests/golden/sample_scene_first_object.png");
+    const QImage frame = encoder.image().convertToFormat(QImage::Format_RGB32);
+    frame.save(QDir(QCoreApplication::applicationDirPath()).filePath("offscreen_sample_scene_golden.png"), "PNG");
+    if (std::getenv("VCE_UPDATE_GOLDEN")) {
+        ASSERT_TRUE(frame.save(golden, "PNG")) << "could not write " << golden.toStdString();
+        GTEST_SKIP() << "golden image rewritten";
+    }
+    const QImage expected = QImage(golden).convertToFormat(QImage::Format_RGB32);
+    ASSERT_FALSE(expected.isNull()) << "no golden image at " << golden.toStdString();
+    ASSERT_EQ(expected.size(), frame.size());
+    int changed = 0;
+    for (int y = 0; y < frame.height(); ++y) {
+        const auto* a = reinterpret_cast<const QRgb*>(frame.constScanLine(y));
+        const auto* b = reinterpret_cast<const QRgb*>(expected.constScanLine(y));
+        for (int x = 0; x < frame.width(); ++x) {
+            const int d = std::max({std::abs(qRed(a[x]) - qRed(b[x])), std::abs(qGreen(a[x]) - qGreen(b[x])),
+                                    std::abs(qBlue(a[x]) - qBlue(b[x]))});
+            changed += d > kGoldenChannelTolerance ? 1 : 0;
+        }
+    }
+    const int allowed = frame.width() * frame.height() / 1000;  // 0.1 %
+    EXPECT_LE(changed, allowed) << changed << " pixels differ from " << golden.toStdString()
+                                << "; the frame is in offscreen_sample_scene_golden.png beside the tests";
 }
 
 TEST_F(OffscreenSceneRenderTest, selection__curve_handles_label_and_band_are_painted) {
