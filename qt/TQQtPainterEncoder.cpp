@@ -431,8 +431,12 @@ void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad, const HXD
     if (!image) return;
     const float attenuation = quad.attenuation();
     if (!(attenuation > 0.0f)) return;
-    const QRectF target = toDevice(_mapping.worldRectToPixels(quad.destinationRect()));
+    QRectF target = toDevice(_mapping.worldRectToPixels(quad.destinationRect()));
     if (!target.isValid()) return;
+    // An image shown texel for pixel (keypoints, handles) lands on whole pixels: it stays
+    // crisp, and the painter blits it instead of resampling. The shift is under half a pixel.
+    if (std::abs(target.width() - image->width()) < 0.01 && std::abs(target.height() - image->height()) < 0.01)
+        target = QRectF(QPointF(std::round(target.left()), std::round(target.top())), QSizeF(image->size()));
     _painter.setOpacity(std::min(1.0f, attenuation));
     _painter.setRenderHint(QPainter::SmoothPixmapTransform, true);
     _painter.drawImage(target, *image, QRectF(image->rect()));

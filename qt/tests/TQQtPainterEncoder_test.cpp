@@ -203,6 +203,21 @@ TEST_F(PainterEncoderTest, quadTexture__draws_the_image_with_its_transparent_cor
     EXPECT_EQ(encoder.cachedTextureCount(), 1u) << "a texture is converted once, not per frame";
 }
 
+TEST_F(PainterEncoderTest, quadTexture__shown_texel_for_pixel_lands_on_whole_pixels) {
+    // 4 x 4 texels, the left half red and the right half blue, placed 0.3 pixels off the grid.
+    std::vector<uint8_t> rgba(4 * 4 * 4);
+    for (size_t i = 0; i < 16; ++i) {
+        const bool left = i % 4 < 2;
+        rgba[i * 4 + 0] = left ? 255 : 0;
+        rgba[i * 4 + 2] = left ? 0 : 255;
+        rgba[i * 4 + 3] = 255;
+    }
+    auto texture = HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::move(rgba));
+    render({std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100.3, 40.2, 4, 4), 1.0f)});
+    EXPECT_TRUE(near(pixel(101, 41), kRed, 0)) << "a texel drawn one to one must not be resampled";
+    EXPECT_TRUE(near(pixel(102, 41), kBlue, 0));
+}
+
 TEST_F(PainterEncoderTest, screenspaceQuad__blends_over_what_lies_below) {
     auto under = std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, 0, 100, 100), 0);
     under->setColor(kRed);
