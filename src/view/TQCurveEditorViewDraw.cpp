@@ -101,6 +101,8 @@ bool TQCurveEditorViewBase::displayLayer(HXDEncoder* encoder) {
     // Background primitives are drawn before this frame's projection is installed: they get
     // the last frame's projection (identity before the first) on this frame's target.
     const float scale = static_cast<float>(_contentsScale);
+    // A subclass's set-up may leave the controller to us.
+    if (!_renderController) _renderController = std::make_unique<HXDRenderController>(nullptr, scale);
     {
         const HXDRenderingContext* last = _renderController->renderingContext();
         const BNMatrix44f projection = last ? last->projection() : BNMatrix44f::identity();
