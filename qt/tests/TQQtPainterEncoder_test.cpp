@@ -172,6 +172,23 @@ TEST_F(PainterEncoderTest, multiline__thinner_than_a_pixel_is_weakened_by_its_wi
         << "half a point on a backing scale of 2 is one full pixel";
 }
 
+TEST_F(PainterEncoderTest, multiline__join_decides_the_corner) {
+    // A V of width 8 with its corner at (100, 80): a mitre reaches about 6 pixels past the
+    // corner, a bevel under 3.
+    const std::vector<HXDLineVertex> v{{{50.0f, 20.0f, 0.0f}, kRed},
+                                       {{100.0f, 80.0f, 0.0f}, kRed},
+                                       {{150.0f, 20.0f, 0.0f}, kRed}};
+    auto corner = std::make_shared<HXDMultiline>(std::span<const HXDLineVertex>(v));
+    corner->setWidth(8.0f);
+    corner->setLineJoin(0);
+    render({corner});
+    EXPECT_TRUE(near(pixel(99, 84), kRed)) << "join 0 is a mitre";
+    corner->setLineJoin(2);
+    render({corner});
+    EXPECT_TRUE(near(pixel(99, 84), kBackground)) << "join 2 is a bevel";
+    EXPECT_TRUE(near(pixel(99, 80), kRed)) << "the corner itself is drawn";
+}
+
 TEST_F(PainterEncoderTest, multiline__loop_closes_each_run) {
     const std::vector<HXDLineSegment> segments{{{20.5f, 20.5f, 0.0f}, {20.5f, 80.5f, 0.0f}, kRed},
                                                {{20.5f, 80.5f, 0.0f}, {80.5f, 80.5f, 0.0f}, kRed},
