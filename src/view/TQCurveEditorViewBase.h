@@ -25,12 +25,14 @@
 // false.
 
 #include <cstdint>
+#include <limits>
 #include <map>
 #include <memory>
 #include <optional>
 #include <utility>
 #include <vector>
 
+#include "platform/draw/HXDHitTest.h"
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/geometry/CGGeometry.h"
 #include "platform/media/CMTime.h"
@@ -197,6 +199,89 @@ public:
     CMTime getCurveEditorCurrentTime() const { return currentTime(); }
     void setCurrentTime(const CMTime& time);
 
+    // ---- Picking and rubber-band selection (TQCurveEditorViewPick.cpp) ----
+    //
+    // Hit tests run on the primitives of the last frame drawn, so they answer for what the
+    // user sees even when a channel changed since. Before the first frame nothing is hit.
+
+    // One-point test at a drawable pixel: the closest thing under it becomes the only entry
+    // of _currentSelection (or, for the box tool, _currentActivePart). A miss leaves both
+    // as they were.
+    virtual void pick(const CGPoint& screen);
+    // Rectangle test of _selectionViewVolume against keypoint images only; fills
+    // _currentSelection, or leaves it as it was when nothing is inside.
+    virtual void select();
+    // Turns hit records into entries of _currentSelection (emptied first). With
+    // keyframesOnly, only keypoint records count. Records whose "ID" names no item of the
+    // selected curve set are skipped.
+    virtual void processHits(const std::vector<HXDHitRecord>& hits, char keyframesOnly);
+    // Rebuilds _selection from a saved list by keyframe time (handles do not survive a
+    // rebuild of a channel); entries whose time is gone are dropped, the others keep order.
+    void validateSelectedHandles(TQCurveSelectionList* list);
+    // The controller's selected channels, without repeats, in order.
+    std::vector<TQChannelBase*> channelsForSelection() const;
+    // Every keypoint of every enabled item (locked ones included), as keypoint entries.
+    virtual void selectAll(void* sender = nullptr);
+    virtual void selectNone(void* sender = nullptr);
+    uint32_t getActivePart() const { return _activePart; }
+    uint32_t getCurrentActivePart() const { return _currentActivePart; }
+
+    // ---- Mouse, keys and the edit tool (TQCurveEditorViewMouse.cpp) ----
+    //
+    // Events carry the desktop toolkit's semantics (RWEvent.h): locationInWindow in window
+    // points with y up, the modifier bits (Command 0x100000, Option 0x80000, Shift 0x20000,
+    // Control 0x40000) and click counts. One gesture is mouseDown, any number of
+    // mouseDragged, mouseUp; a drag that changes channels is one undo step of the host,
+    // named after what its first step did. Drag steps are limited to one per 1/30 s of the
+    // view's clock; a dropped event loses no movement, since the next step measures from
+    // the last one that ran.
+
+    virtual void mouseDown(const RWEvent& event);
+    virtual void mouseDragged(const RWEvent& event);
+    virtual void mouseUp(const RWEvent& event);
+    // The edit tool (tool 0).
+    virtual void mouseDownEdit(const RWEvent& event);
+    virtual void mouseDraggedEdit(const RWEvent& event);
+    // The sketch (1) and box (2) tools: nothing in this class; the views that offer those
+    // tools override them.
+    virtual void mouseDownSketch(const RWEvent&) {}
+    virtual void mouseDraggedSketch(const RWEvent&) {}
+    virtual void mouseDownBox(const RWEvent&) {}
+    virtual void mouseDraggedBox(const RWEvent&) {}
+    // The space bar: a repeated space key arms the space-bar navigation of a drag on empty
+    // space. Answers false when the key is not the view's (the caller passes it on).
+    virtual bool keyDown(const RWEvent& event);
+    // Ends the space-bar mode (answers true then); also forgets that a drag has not yet
+    // stepped, so that a key released before the first step suppresses that drag's capture.
+    virtual bool keyUp(const RWEvent& event);
+    // A key equivalent before the menus see it: a space key-down arms the space bar at once.
+    virtual bool customKeyEquivalent(const RWEvent& event);
+    char space() const { return _space; }
+
+    // Horizontal or vertical constraint of a Shift drag: the first call with no direction
+    // decides it from p - origin (a tie is vertical) and answers origin; later calls keep
+    // origin's y (horizontal) or x (vertical).
+    CGPoint constrainMove(const CGPoint& p, const CGPoint& origin);
+    uint32_t constrainMoveDirection() const { return _constrainMove; }
+    // Keeps a world x inside [total range start, later of total and display range end].
+    CGPoint constrainTime(const CGPoint& p) const;
+    // Round trip through the screen: the dragged point is deliberately not moved onto the
+    // nearby marker times it looks at.
+    CGPoint snapCursorTo(const CGPoint& p) const;
+
+    void setSnapCursor(char snap) { _snapCursor = snap; }
+    char snapCursor() const { return _snapCursor; }
+    void setLockKeyframesInU(char lock) { _lockInU = lock; }
+    char lockKeyframesInU() const { return _lockInU; }
+    char getCapturing() const { return _capturing; }
+    void setCapturing(char capturing) { _capturing = capturing; }
+    void setShouldDrawProcessedCurve(char draw) { _shouldDrawProcessedCurve = draw; }
+    char shouldDrawProcessedCurve() const { return _shouldDrawProcessedCurve; }
+    char startDrag() const { return _startDrag; }
+    char didAddPoint() const { return _didAddPoint; }
+    // Posts kTQNotifyChannelsChanged (a gesture is done).
+    void notifyChannelChangeDone() const;
+
     // ---- Selection (the controller reads and repairs these) ----
 
     // _selection, after its stored keypoint times and values were refreshed from the
@@ -353,6 +438,25 @@ protected:
     void volumeChanged(bool markCurvesDirty);
     // The display range's start and duration, in seconds, into x and width.
     void takeHorizontalFromDisplayRange();
+    // One drag step of the rubber band by a pointer movement in backing pixels (dy up).
+    void rubberBandStep(double dx, double dy, uint64_t modifierFlags);
+    // An event's location in drawable pixels of this view (y up), and in backing pixels of
+    // the window (the source of drag deltas).
+    CGPoint drawablePointOfEvent(const RWEvent& event) const;
+    CGPoint backingPointOfEvent(const RWEvent& event) const;
+    // The edit tool's drag of the primary entry, by kind; W is the pointer's world point.
+    void dragTangentStep(TQCurveSelection& primary, CGPoint world, uint64_t modifierFlags);
+    // Answers the point after the Shift axis constraint, the time limits and the snap.
+    CGPoint dragKeypointStep(TQCurveSelection& primary, CGPoint world, double dx, uint64_t modifierFlags);
+    void dragCurveStep(CGPoint world, uint64_t modifierFlags);
+    // Opens the drag's one undo step at its first step.
+    void openDragCapture(const char* undoKey);
+    // Turns the ghost on and lowers the sample count of every selected item for a drag, and
+    // restores them at its end.
+    void prepareItemsForDrag();
+    void restoreItemsAfterDrag();
+    void setCursorShape(RWCursor cursor) const;
+    void hideCursorForDrag();
 
     // ---- Fields of the view volume, in declaration order ----
     TQCurveEditorCtrlBase* _controller = nullptr;  // not owned
@@ -384,10 +488,27 @@ protected:
 
     // ---- Gesture state (the mouse code sets it) ----
     CGPoint _mouseOrigin;   // where the gesture began, drawable pixels
-    CGPoint _lastMousePos;  // running pointer position of the gesture, drawable pixels
-    char _selecting = 0;
+    CGPoint _lastMousePos;  // running pointer position of the gesture, drawable pixels;
+                            // after a constrained step, where the constrained point lies
+    CGPoint _lastPoint;     // last raw pointer position in backing pixels (window), for deltas
+    char _space = 0;        // the space bar is held
+    char _startDrag = 0;    // no drag step has run yet in this gesture
+    char _useOriginalAngle = 0;  // a Shift-constrained tangent drag keeps its stored angle
     char _printText = 0;    // show the value label of the primary keypoint
+    uint32_t _constrainMove = 0;  // 0 not decided, 1 horizontal, 2 vertical
+    char _shiftWasPressed = 0;    // Shift has been seen during this drag
+    char _cursorHidden = 0;       // the drag has hidden the pointer
+    char _capturing = 0;          // a capture of modified channels is open
     char _mouseIsDown = 0;  // a gesture is under way
+    char _snapCursor = 0;
+    char _lockInU = 0;      // keypoints keep their time in a drag unless Shift is down
+    char _didAddPoint = 0;  // the mouse down added a keypoint
+    char _shouldDrawProcessedCurve = 1;  // restore the processed curve at mouse up
+    // Clock time of the last drag step that ran; -infinity lets the first one through.
+    double _lastMouseDraggedEvent = -std::numeric_limits<double>::infinity();
+    char _selecting = 0;
+    uint32_t _activePart = 0;         // box part of the gesture, 0 for none
+    uint32_t _currentActivePart = 0;  // box part the last pick found
 
     // ---- Selection lists, owned, never null ----
     std::shared_ptr<TQCurveSelectionList> _selection;
