@@ -3,6 +3,7 @@
 #include <QColor>
 #include <QImage>
 
+#include <cmath>
 #include <memory>
 #include <vector>
 
@@ -111,6 +112,18 @@ TEST_F(PainterEncoderTest, multiline__width_in_points_times_backing_scale) {
     thin->setWidth(0.5f);
     render({thin});
     EXPECT_NEAR(pixel(100, 50).red(), 128, 8) << "half a pixel wide covers half the pixel";
+}
+
+TEST_F(PainterEncoderTest, multiline__gamma_raises_partial_coverage) {
+    // On a pixel boundary a one-pixel line covers two rows by half each.
+    auto edge = horizontal(50.0f, kRed, kRed);
+    edge->setAntialiased(true);
+    render({edge});
+    const int linear = pixel(100, 50).red();
+    edge->setGamma(2.0f);
+    render({edge});
+    EXPECT_NEAR(pixel(100, 50).red(), 255.0 * std::sqrt(linear / 255.0), 6.0) << "coverage^(1/2)";
+    EXPECT_TRUE(near(pixel(100, 53), kBackground)) << "no coverage stays none";
 }
 
 TEST_F(PainterEncoderTest, multiline__join_and_loop) {
