@@ -1,6 +1,8 @@
 #include "qt/TQQtCurveViewWidget.h"
 
+#include <QApplication>
 #include <QPainter>
+#include <QStyleHints>
 #include <QTimer>
 
 #include <cmath>
@@ -20,6 +22,9 @@ TQQtCurveViewWidget::~TQQtCurveViewWidget() { setView(nullptr); }
 void TQQtCurveViewWidget::setView(TQCurveEditorViewBase* view) {
     if (view == _view) return;
     if (_view && _view->viewHost() == &_host) _view->setViewHost(nullptr);
+    // A gesture does not carry over to another view: its release would reach a view that
+    // never saw the press.
+    _leftGesture = false;
     _view = view;
     if (_view) {
         _view->setViewHost(&_host);
@@ -80,4 +85,88 @@ void TQQtCurveViewWidget::deliverQueuedWheel() {
     if (!_view) return;
     if (std::optional<RWEvent> first = _host.nextEventMatchingMask(RWEventMaskScrollWheel))
         _view->scrollWheel(*first);
+}
+
+void TQQtCurveViewWidget::beginGesture(QMouseEvent* event, bool doubleClick) {
+    const qint64 nowMs = static_cast<qint64>(event->timestamp());
+    const QPointF at = event->position();
+    // Qt reports the second press of a double click by itself; later presses of a longer
+    // run are counted here by the same rules of time and distance.
+    const bool continues = _hasLastPress &&
+                           nowMs - _lastPressMs <= QGuiApplication::styleHints()->mouseDoubleClickInterval() &&
+                           (at - _lastPressAt).manhattanLength() <= QGuiApplication::styleHints()->startDragDistance();
+    if (doubleClick) _clickCount = std::max<int64_t>(2, continues ? _clickCount + 1 : 2);
+    else _clickCount = continues ? _clickCount + 1 : 1;
+    _hasLastPress = true;
+    _lastPressMs = nowMs;
+    _lastPressAt = at;
+
+    const std::optional<RWEvent> down = TQQtEvents::mouseEvent(*event, _host, _clickCount);
+    if (!down) return;
+    event->accept();
+    _leftGesture = true;
+    _view->mouseDown(*down);
+}
+
+void TQQtCurveViewWidget::mousePressEvent(QMouseEvent* event) {
+    if (!_view || event->button() != Qt::LeftButton || _leftGesture) {
+        QWidget::mousePressEvent(event);
+        return;
+    }
+    beginGesture(event, false);
+}
+
+void TQQtCurveViewWidget::mouseDoubleClickEvent(QMouseEvent* event) {
+    if (!_view || event->button() != Qt::LeftButton || _leftGesture) {
+        QWidget::mouseDoubleClickEvent(event);
+        return;
+    }
+    beginGesture(event, true);
+}
+
+void TQQtCurveViewWidget::mouseMoveEvent(QMouseEvent* event) {
+    if (!_view || !_leftGesture || !(event->buttons() & Qt::LeftButton)) {
+        QWidget::mouseMoveEvent(event);
+        return;
+    }
+    const std::optional<RWEvent> drag = TQQtEvents::mouseEvent(*event, _host, _clickCount);
+    if (!drag || drag->type() != RWEventType::LeftMouseDragged) return;
+    event->accept();
+    _view->mouseDragged(*drag);
+}
+
+void TQQtCurveViewWidget::mouseReleaseEvent(QMouseEvent* event) {
+    if (!_view || event->button() != Qt::LeftButton || !_leftGesture) {
+        QWidget::mouseReleaseEvent(event);
+        return;
+    }
+    _leftGesture = false;
+    const std::optional<RWEvent> up = TQQtEvents::mouseEvent(*event, _host, _clickCount);
+    if (!up) return;
+    event->accept();
+    _view->mouseUp(*up);
+}
+
+void TQQtCurveViewWidget::keyPressEvent(QKeyEvent* event) {
+    if (_view) {
+        const RWEvent key = TQQtEvents::keyEvent(*event);
+        // A modifier key alone changes no state of the view's; the next mouse event
+        // carries the new modifiers.
+        if (key.type() == RWEventType::KeyDown && _view->keyDown(key)) {
+            event->accept();
+            return;
+        }
+    }
+    QWidget::keyPressEvent(event);
+}
+
+void TQQtCurveViewWidget::keyReleaseEvent(QKeyEvent* event) {
+    if (_view) {
+        const RWEvent key = TQQtEvents::keyEvent(*event);
+        if (key.type() == RWEventType::KeyUp && _view->keyUp(key)) {
+            event->accept();
+            return;
+        }
+    }
+    QWidget::keyReleaseEvent(event);
 }

@@ -7,6 +7,14 @@
 // frame back, the widget shows the last frame again; the view has then scheduled one delayed
 // redraw, which reaches the widget as update(). So a burst of repaints costs one frame.
 //
+// Mouse and keys. The left button's press, moves and release go to the view's mouseDown,
+// mouseDragged and mouseUp as one gesture, in window points with y up and the modifier bits
+// of TQQtEvents (Ctrl is Command, Alt is Option). A press that follows the last one within the
+// platform's double-click interval, near where it was, counts one click more (2 for Qt's
+// double click, 3 for a third press...). Moves without a gesture under way, and the other
+// buttons, are not the edit tool's. Key presses go to the view first; keys it does not take
+// go on to the parent, so that window shortcuts still work.
+//
 // Wheel events are folded as the views expect: each one is queued on the host, and one
 // handler run from the event loop takes the first; the view's scrollWheel takes the ones
 // still waiting. Events the view has no handler for are translated by subclasses (see
@@ -42,14 +50,29 @@ protected:
     void resizeEvent(QResizeEvent* event) override;
     void showEvent(QShowEvent* event) override;
     void wheelEvent(QWheelEvent* event) override;
+    void mousePressEvent(QMouseEvent* event) override;
+    void mouseDoubleClickEvent(QMouseEvent* event) override;
+    void mouseMoveEvent(QMouseEvent* event) override;
+    void mouseReleaseEvent(QMouseEvent* event) override;
+    void keyPressEvent(QKeyEvent* event) override;
+    void keyReleaseEvent(QKeyEvent* event) override;
 
 private:
     void syncBacking();
     void deliverQueuedWheel();
+    // A left press, counted as the click of a multi-click it may continue.
+    void beginGesture(QMouseEvent* event, bool doubleClick);
 
     TQQtViewHost _host;
     TQQtPainterEncoder _encoder;
     TQCurveEditorViewBase* _view = nullptr;  // not owned
     qreal _lastPixelRatio = 0.0;
     bool _wheelDeliveryPending = false;
+    // The gesture of the left button: true from its press to its release.
+    bool _leftGesture = false;
+    // The last left press, for counting clicks.
+    int64_t _clickCount = 0;
+    qint64 _lastPressMs = 0;
+    QPointF _lastPressAt;
+    bool _hasLastPress = false;
 };

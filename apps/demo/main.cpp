@@ -1,0 +1,71 @@
+// The demo: the reference host's sample scene in a curve view.
+//
+//   vce_demo                    opens the window
+//   vce_demo --screenshot FILE  draws the window offscreen once the scene is loaded, writes it
+//                               to FILE (PNG) and exits; needs no display
+#include <QApplication>
+#include <QElapsedTimer>
+#include <QPixmap>
+#include <QStringList>
+
+#include <cstdio>
+#include <cstdlib>
+
+#include "apps/demo/TQDemoWindow.h"
+#include "qt/TQQtServices.h"
+
+namespace {
+
+// Long enough for the first frame and the one delayed redraw the 1/30 s gate may schedule.
+constexpr int kSettleMilliseconds = 250;
+
+void settle(int milliseconds) {
+    QElapsedTimer elapsed;
+    elapsed.start();
+    while (elapsed.elapsed() < milliseconds) QCoreApplication::processEvents(QEventLoop::AllEvents, 10);
+}
+
+int usage(const char* program) {
+    std::fprintf(stderr, "usage: %s [--screenshot FILE]\n", program);
+    return 2;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    QString screenshot;
+    for (int i = 1; i < argc; ++i) {
+        const QString arg = QString::fromLocal8Bit(argv[i]);
+        if (arg == QLatin1String("--screenshot")) {
+            if (i + 1 >= argc) return usage(argv[0]);
+            screenshot = QString::fromLocal8Bit(argv[++i]);
+        } else if (arg.startsWith(QLatin1String("--screenshot="))) {
+            screenshot = arg.mid(static_cast<int>(qstrlen("--screenshot=")));
+        } else if (arg == QLatin1String("--help") || arg == QLatin1String("-h")) {
+            usage(argv[0]);
+            return 0;
+        }
+    }
+    if (!screenshot.isEmpty() && screenshot.isEmpty()) return usage(argv[0]);
+    // A screenshot needs no display: draw offscreen unless a platform was asked for.
+    if (!screenshot.isEmpty() && !qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
+        qputenv("QT_QPA_PLATFORM", "offscreen");
+
+    QApplication app(argc, argv);
+    QApplication::setApplicationName(QStringLiteral("VantaCurveEditor Demo"));
+    TQQtServiceInstaller services;
+
+    TQDemoWindow window;
+    window.show();
+    if (screenshot.isEmpty()) return QApplication::exec();
+
+    settle(kSettleMilliseconds);
+    window.frameAll();
+    settle(kSettleMilliseconds);
+    const QPixmap image = window.grab();
+    if (image.isNull() || !image.save(screenshot, "PNG")) {
+        std::fprintf(stderr, "vce_demo: could not write %s\n", screenshot.toLocal8Bit().constData());
+        return 1;
+    }
+    return 0;
+}
