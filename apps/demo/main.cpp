@@ -37,16 +37,14 @@ int main(int argc, char** argv) {
     for (int i = 1; i < argc; ++i) {
         const QString arg = QString::fromLocal8Bit(argv[i]);
         if (arg == QLatin1String("--screenshot")) {
-            if (i + 1 >= argc) return usage(argv[0]);
+            if (i + 1 >= argc || argv[i + 1][0] == '\0') return usage(argv[0]);
             screenshot = QString::fromLocal8Bit(argv[++i]);
-        } else if (arg.startsWith(QLatin1String("--screenshot="))) {
-            screenshot = arg.mid(static_cast<int>(qstrlen("--screenshot=")));
         } else if (arg == QLatin1String("--help") || arg == QLatin1String("-h")) {
             usage(argv[0]);
             return 0;
         }
+        // Anything else is left to Qt (-platform, -style...).
     }
-    if (!screenshot.isEmpty() && screenshot.isEmpty()) return usage(argv[0]);
     // A screenshot needs no display: draw offscreen unless a platform was asked for.
     if (!screenshot.isEmpty() && !qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");

@@ -1,0 +1,177 @@
+// Mouse gestures through Qt itself: QTest presses, moves and releases on the widget (offscreen
+// platform) must reach the view as one drag of the edit tool, change the channel under the
+// pointer as one undo step of the host, and the host's undo must give the channel back exactly.
+#include <gtest/gtest.h>
+
+#include <QApplication>
+#include <QTest>
+
+#include <cmath>
+#include <memory>
+
+#include "host/TQHostAppDelegate.h"
+#include "host/TQHostSampleScene.h"
+#include "platform/ui/testing/RWTestDoubles.h"
+#include "qt/TQQtCurveViewWidget.h"
+#include "src/curvesets/TQCurveSet.h"
+#include "src/engine/TQCurveEditorCtrlBase.h"
+#include "src/view/TQCurveEditorViewBase.h"
+
+namespace {
+
+// Past the view's 1/30 s gate for frames and drag steps.
+constexpr double kStepSeconds = 0.05;
+// How far a dragged keypoint must have gone, in pixels, to count as moved.
+constexpr double kMovedPixels = 5.0;
+
+// One animated channel of the sample scene's first object, alone in the view, so that a
+// press on one of its keypoints cannot pick another curve's.
+class CurveViewWidgetMouseTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
+        controller.init();
+        controller.setAppDelegate(&host);
+        view.setClock(&clock);
+        view.setTimer(&timer);
+        view.setController(&controller);
+        controller.setView(&view);
+        const CMTimeRange range = host.displayRange();
+        view.setDisplayRange(&range.start, &range.duration);
+        view.setCurrentViewVolume(CGRectMake(0.0, -150.0, 10.0, 300.0));
+        view.setOriginalViewVolume(CGRectMake(0.0, -150.0, 10.0, 300.0));
+        widget.resize(640, 320);
+        widget.setView(&view);
+        widget.show();
+        // The offscreen platform exposes the window from the event loop: paint only after.
+        for (int i = 0; i < 20; ++i) QCoreApplication::processEvents();
+
+        set = std::make_shared<TQCurveSetMutable>();
+        set->initWithName("Mouse", &host);
+        controller.setSelectedCurveSet(set);
+        channel = firstAnimatedChannel(host.scene().objects().front());
+        ASSERT_NE(channel, nullptr) << "the first object has no channel of more than two keyframes";
+        item = controller.appendChannel(channel, set);
+        ASSERT_NE(item, nullptr);
+        view.frameAll(1);
+        drawFrame();
+        ASSERT_GE(widget.framesDrawn(), 1) << "the widget drew no frame: picks would find nothing";
+    }
+    void TearDown() override {
+        widget.setView(nullptr);
+        view.setController(nullptr);
+        controller.setView(nullptr);
+    }
+
+    static TQChannel* firstAnimatedChannel(TQChannelBase* node) {
+        if (!node) return nullptr;
+        if (auto* c = dynamic_cast<TQChannel*>(node); c && c->numberOfKeyframes() > 2) return c;
+        if (const std::vector<TQChannelBase*>* children = node->getChildren())
+            for (TQChannelBase* child : *children)
+                if (TQChannel* found = firstAnimatedChannel(child)) return found;
+        return nullptr;
+    }
+
+    // A frame now, so that picks test what the channel looks like now.
+    void drawFrame() {
+        clock.advance(kStepSeconds);
+        widget.repaint();
+    }
+
+    // Where a keyframe lies in the widget's own coordinates (y down, logical pixels).
+    QPoint widgetPointOf(TQKeyframeHandle handle) const {
+        CMTime t = kCMTimeInvalid;
+        double v = 0.0;
+        if (!channel->getKeyframe(handle, &t, &v)) return QPoint(-1, -1);
+        return widgetPointAt(t, v);
+    }
+    // Where a point of the channel (channel time and value) lies in the widget.
+    QPoint widgetPointAt(const CMTime& t, double v) const {
+        const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
+        const CGPoint screen = view.getPointScreen(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
+        const double ratio = widget.devicePixelRatioF();
+        return QPoint(static_cast<int>(std::lround(screen.x / ratio)),
+                      static_cast<int>(std::lround(widget.height() - screen.y / ratio)));
+    }
+
+    TQHostAppDelegate host;
+    RWManualClock clock;
+    RWManualTimer timer{clock};
+    TQCurveEditorCtrlBase controller;
+    TQCurveEditorViewBase view;
+    TQQtCurveViewWidget widget;
+    TQCurveSetMutablePtr set;
+    TQChannel* channel = nullptr;
+    TQCurveEditorItemPtr item;
+};
+
+TEST_F(CurveViewWidgetMouseTest, drag_on_a_keypoint__changes_the_channel_and_undo_restores_it_exactly) {
+    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+    const TQKeyframeHandle key = keys[keys.size() / 2];
+    const QPoint start = widgetPointOf(key);
+    ASSERT_TRUE(widget.rect().contains(start)) << "the keypoint must be on screen after framing";
+    const std::unique_ptr<TQChannelBase> before(channel->cloneChannel());
+
+    QTest::mousePress(&widget, Qt::LeftButton, Qt::NoModifier, start);
+    // Three steps, each past the drag gate, up and a little to the right.
+    for (int step = 1; step <= 3; ++step) {
+        clock.advance(kStepSeconds);
+        QTest::mouseMove(&widget, start + QPoint(2 * step, -10 * step));
+    }
+    const QPoint end = start + QPoint(6, -30);
+    QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, end);
+
+    EXPECT_FALSE(*channel == *before) << "the drag did not change the channel";
+    ASSERT_TRUE(channel->getKeyframe(key, nullptr, nullptr)) << "the dragged keyframe's handle went stale";
+    const QPoint moved = widgetPointOf(key);
+    EXPECT_LT(moved.y(), start.y() - kMovedPixels) << "the keypoint should have gone up on screen";
+    ASSERT_TRUE(host.canUndo()) << "the drag left no undo step";
+    EXPECT_EQ(host.undoDescription(), "Move Keypoint");
+    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "one drag must be one undo step";
+
+    ASSERT_TRUE(host.undo());
+    TQChannel* restored = item->channel();
+    ASSERT_NE(restored, nullptr) << "the channel is gone after undo";
+    EXPECT_TRUE(*restored == *before) << "undo must give back the channel exactly";
+}
+
+TEST_F(CurveViewWidgetMouseTest, press_and_release_without_moving__changes_nothing_and_records_no_step) {
+    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+    const QPoint at = widgetPointOf(keys[keys.size() / 2]);
+    const std::unique_ptr<TQChannelBase> before(channel->cloneChannel());
+    QTest::mouseClick(&widget, Qt::LeftButton, Qt::NoModifier, at);
+    EXPECT_TRUE(*channel == *before) << "a click must not change the channel";
+    EXPECT_FALSE(host.canUndo()) << "a click must not leave an undo step";
+    EXPECT_EQ(view.getSelection()->size(), 1u) << "the click should have selected the keypoint";
+}
+
+TEST_F(CurveViewWidgetMouseTest, double_click_on_the_curve__adds_one_keypoint_as_one_step) {
+    // Zoomed in, two neighbouring keyframes far enough apart on screen that their midpoint is
+    // curve alone.
+    CGRect volume = view.getCurrentViewVolume();
+    volume.origin.x += volume.size.width * 0.375;
+    volume.size.width *= 0.25;
+    view.setCurrentViewVolume(volume);
+    view.setAllOriginalCurveDirty(1);
+    drawFrame();
+    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+    CMTime mid = kCMTimeInvalid;
+    for (size_t i = 0; i + 1 < keys.size() && !CMTIME_IS_NUMERIC(mid); ++i) {
+        const QPoint a = widgetPointOf(keys[i]), b = widgetPointOf(keys[i + 1]);
+        if (!widget.rect().contains(a) || !widget.rect().contains(b) || b.x() - a.x() < 40) continue;
+        CMTime ta = kCMTimeInvalid, tb = kCMTimeInvalid;
+        channel->getKeyframe(keys[i], &ta, nullptr);
+        channel->getKeyframe(keys[i + 1], &tb, nullptr);
+        mid = CMTimeMake((ta.value + tb.value) / 2, ta.timescale);
+    }
+    ASSERT_TRUE(CMTIME_IS_NUMERIC(mid)) << "no two neighbouring keyframes lie 40 pixels apart on screen";
+    const QPoint at = widgetPointAt(mid, channel->getCurveValue(mid));
+    const unsigned before = channel->numberOfKeyframes();
+
+    QTest::mouseDClick(&widget, Qt::LeftButton, Qt::NoModifier, at);
+
+    EXPECT_EQ(channel->numberOfKeyframes(), before + 1) << "a double click on the curve adds one keypoint";
+    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "the added keypoint is one undo step";
+}
+
+}  // namespace
