@@ -1,0 +1,257 @@
+// Gestures of the edit tool through the view: which keypoint a drag moves, the Shift axis
+// constraint, one undo step per drag and none for a click, Command-drags that pull tangents,
+// the 1/30 s gate on drag steps, and the clicks that add, flatten and break.
+
+#include "src/view/tests/ViewMouseFixture.h"
+
+namespace view_test {
+namespace {
+
+class ViewMouseEdit : public ViewMouseFixture {};
+
+TEST_F(ViewMouseEdit, drag__fromAnUnselectedKeypointMovesItAlone) {
+    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
+    const TQKeyframeHandle k2 = keyAt(item, 2.0);
+    const TQKeyframeHandle k5 = keyAt(item, 5.0);
+    selectInView({keypointEntry(item, 2.0)});
+    ASSERT_TRUE(frame());
+
+    down(5.0, 0.0);
+    ASSERT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{k5}) << "the click replaces the selection";
+    dragTo(5.25, 0.2);
+    dragTo(5.5, 0.5);
+    up(5.5, 0.5);
+
+    const auto [t5, v5] = keyOf(item, k5);
+    EXPECT_NEAR(t5, 5.5, kDragTolerance) << "the picked keypoint follows the pointer in time";
+    EXPECT_NEAR(v5, 0.5, kDragTolerance) << "and in value";
+    const auto [t2, v2] = keyOf(item, k2);
+    EXPECT_EQ(t2, 2.0) << "the keypoint selected before the click stays";
+    EXPECT_EQ(v2, 0.0);
+    EXPECT_FALSE(view.getCapturing()) << "mouse up closes the capture";
+    EXPECT_FALSE(view.mouseIsDown());
+}
+
+TEST_F(ViewMouseEdit, drag__shiftInMidDragDecidesTheAxisFromTheWholeMovement) {
+    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
+    const TQKeyframeHandle k = keyAt(item, 5.0);
+    ASSERT_TRUE(frame());
+    {
+        // Mostly sideways since the origin (40 px right, 30 px up): horizontal, and the value
+        // is held where the keypoint is at that moment, not where the gesture began.
+        down(5.0, 0.0);
+        dragTo(5.1, 0.1);
+        dragTo(5.5, 0.15, kShift);
+        EXPECT_EQ(view.constrainMoveDirection(), 1u);
+        dragTo(5.75, 0.6, kShift);
+        const auto [t, v] = keyOf(item, k);
+        EXPECT_NEAR(t, 5.75, kDragTolerance) << "time follows the pointer";
+        EXPECT_NEAR(v, 0.1, kDragTolerance) << "value stays at its position when Shift came";
+        // Releasing Shift clears the axis; pressing it again decides afresh.
+        dragTo(5.8, 0.2);
+        EXPECT_EQ(view.constrainMoveDirection(), 0u);
+        up(5.8, 0.2);
+    }
+    {
+        // Mostly upward since the origin: vertical. The pick needs a frame that shows the
+        // keypoint where the first gesture left it.
+        ASSERT_TRUE(frame());
+        const auto [t0, v0] = keyOf(item, k);
+        down(t0, v0);
+        dragTo(t0 + 0.05, v0 + 0.5, kShift);
+        EXPECT_EQ(view.constrainMoveDirection(), 2u);
+        dragTo(t0 + 1.0, v0 + 0.6, kShift);
+        const auto [t, v] = keyOf(item, k);
+        EXPECT_NEAR(t, t0, kDragTolerance) << "a vertical constraint keeps the time";
+        EXPECT_NEAR(v, v0 + 0.6, kDragTolerance);
+        up(t0 + 1.0, v0 + 0.6);
+    }
+}
+
+TEST_F(ViewMouseEdit, constrainMove__aTieIsVertical) {
+    EXPECT_EQ(view.constrainMove(CGPointMake(13, 17), CGPointMake(10, 20)), CGPointMake(10, 20))
+        << "the deciding call answers the origin";
+    EXPECT_EQ(view.constrainMoveDirection(), 2u);
+    EXPECT_EQ(view.constrainMove(CGPointMake(50, 60), CGPointMake(1, 2)), CGPointMake(1, 60));
+}
+
+TEST_F(ViewMouseEdit, constrainTime__clampsToTotalStartAndTheLaterEnd) {
+    const CMTime totalStart = seconds(1.0);
+    const CMTime totalDuration = seconds(4.0);
+    view.setTotalRange(&totalStart, &totalDuration);
+    EXPECT_EQ(view.constrainTime(CGPointMake(0.5, 3.0)).x, 1.0);
+    EXPECT_EQ(view.constrainTime(CGPointMake(0.5, 3.0)).y, 3.0) << "y is not touched";
+    EXPECT_NEAR(view.constrainTime(CGPointMake(20.0, 0.0)).x, 10.0, kWorldTolerance)
+        << "the display range ends after the total range: its end is the limit";
+    const CMTime longer = seconds(30.0);
+    view.setTotalRange(nullptr, &longer);
+    EXPECT_NEAR(view.constrainTime(CGPointMake(40.0, 0.0)).x, 31.0, kWorldTolerance);
+    EXPECT_NEAR(view.constrainTime(CGPointMake(12.0, 0.0)).x, 12.0, kWorldTolerance);
+}
+
+TEST_F(ViewMouseEdit, click__withoutADragOpensNoCapture) {
+    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}});
+    ASSERT_TRUE(frame());
+    click(5.0, 0.0);
+    EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 0u);
+    EXPECT_EQ(countCalls("endCaptureModifiedChannels"), 0u);
+    EXPECT_EQ(countCalls("suppressEventCoalescing"), 1u);
+    EXPECT_EQ(countCalls("unsuppressEventCoalescing"), 1u);
+    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyChannelsChanged});
+    EXPECT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{keyAt(item, 5.0)});
+    EXPECT_FALSE(host.canUndo());
+}
+
+TEST_F(ViewMouseEdit, drag__tenStepsAreOneUndoStepThatRestoresExactly) {
+    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.25}, {8.0, 0.0}});
+    const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
+    ASSERT_TRUE(frame());
+
+    down(5.0, 0.25);
+    for (int i = 1; i <= 10; ++i) dragTo(5.0 + 0.1 * i, 0.25 + 0.05 * i);
+    up(6.0, 0.75);
+
+    EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 1u);
+    EXPECT_EQ(countCalls("endCaptureModifiedChannels"), 1u);
+    EXPECT_EQ(countCalls("willSetChannelValue"), 10u) << "each step announces its value change";
+    ASSERT_EQ(host.undoStack().undoCount(), 1u);
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Keypoint"));
+    EXPECT_NEAR(keyValueAt(item->channel(), 6.0), 0.75, kDragTolerance);
+
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(*item->channel() == *before) << "undo restores the channel exactly";
+    EXPECT_FALSE(host.canUndo());
+}
+
+TEST_F(ViewMouseEdit, mouseDragged__stepsAreGatedToThirtyASecondWithoutLosingMovement) {
+    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}});
+    const TQKeyframeHandle k = keyAt(item, 5.0);
+    ASSERT_TRUE(frame());
+    down(5.0, 0.0);
+    dragTo(5.25, 0.0);
+    dragTo(5.5, 0.0, 0, 0.01);  // inside the gap: dropped whole
+    EXPECT_NEAR(keyOf(item, k).first, 5.25, kDragTolerance);
+    dragTo(6.0, 0.0);
+    EXPECT_NEAR(keyOf(item, k).first, 6.0, kDragTolerance) << "the next step measures from the last that ran";
+    up(6.0, 0.0);
+}
+
+TEST_F(ViewMouseEdit, drag__commandPullsTangentsOnTheSideOfTheMovement) {
+    auto bezierItem = [&](const char* name) {
+        TQChannel* c = addChannel(name, {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
+        c->setInterpolation(kTQInterpolationBezier);
+        return addItem(c);
+    };
+    {
+        auto item = bezierItem("Right");
+        ASSERT_TRUE(frame());
+        down(5.0, 0.0, kCommand);
+        dragTo(6.0, 0.4, kCommand);
+        ASSERT_EQ(view.getSelection()->size(), 1u);
+        EXPECT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionOutTangent)
+            << "dragging right turns the entry into the output handle";
+        double u = 0.0;
+        double v = 0.0;
+        item->channel()->getKeyframeOutputTangents(keyAt(item, 5.0), &u, &v);
+        EXPECT_GT(u, 0.0) << "the output handle leads toward the pointer";
+        EXPECT_GT(v, 0.0);
+        EXPECT_TRUE(host.undoStack().isStepOpen()) << "the drag's step stays open until mouse up";
+        up(6.0, 0.4, kCommand);
+        EXPECT_FALSE(host.undoStack().isStepOpen());
+        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Tangents"));
+        EXPECT_EQ(host.undoStack().undoCount(), 2u) << "the Command click's flatten, then the pull";
+        ctrl().removeChannelWithIdentifier(item->channelId(), set);
+    }
+    {
+        auto item = bezierItem("Left");
+        ASSERT_TRUE(frame());
+        down(5.0, 0.0, kCommand);
+        dragTo(4.0, 0.4, kCommand);
+        EXPECT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionInTangent)
+            << "dragging left turns it into the input handle";
+        up(4.0, 0.4, kCommand);
+    }
+}
+
+TEST_F(ViewMouseEdit, click__commandFlattensOptionOnACurveAddsAKeypoint) {
+    TQChannel* c = addChannel("A", {{2.0, 0.0}, {5.0, 0.5}, {8.0, 0.0}});
+    c->setInterpolation(kTQInterpolationLinear);
+    auto item = addItem(c);
+    ASSERT_TRUE(frame());
+    {
+        // Option-click on the curve between two keypoints: a keypoint there, selected.
+        const double y = 0.5 * (6.5 - 5.0) / 3.0 * -1.0 + 0.5;  // on the segment 5..8
+        click(6.5, y, kOption);
+        EXPECT_EQ(keyTimes(c).size(), 4u) << "a keypoint was added on the curve";
+        ASSERT_EQ(view.getSelection()->size(), 1u);
+        EXPECT_TRUE(view.getSelection()->selectionAtIndex(0)->isKeypoint()) << "the new keypoint is selected";
+        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Add keypoint"));
+    }
+    {
+        // A plain click on the curve selects the curve.
+        ASSERT_TRUE(frame());
+        click(3.5, 0.25);
+        ASSERT_EQ(view.getSelection()->size(), 1u);
+        EXPECT_TRUE(view.getSelection()->selectionAtIndex(0)->isCurve());
+    }
+    {
+        c->setInterpolation(kTQInterpolationBezier);
+        ASSERT_TRUE(frame());
+        click(5.0, 0.5, kCommand);
+        EXPECT_EQ(c->getKeyframeInterpolation(keyAt(item, 5.0)), kTQInterpolationLinear)
+            << "Command-click flattens the keypoint into a linear one";
+        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Flatten Keypoint"));
+    }
+}
+
+TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
+    auto item = linearItem("A", {{2.0, 0.0}, {8.0, 0.0}});
+    ASSERT_TRUE(frame());
+    down(5.0, 0.0);
+    ASSERT_TRUE(view.getSelection()->selectionAtIndex(0)->isCurve());
+    dragTo(6.0, 0.3);
+    up(6.0, 0.3);
+    EXPECT_EQ(keyTimes(item->channel()), (std::vector<double>{2.0, 8.0})) << "times stay";
+    EXPECT_NEAR(keyValueAt(item->channel(), 2.0), 0.3, kDragTolerance);
+    EXPECT_NEAR(keyValueAt(item->channel(), 8.0), 0.3, kDragTolerance);
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Curve"));
+}
+
+TEST_F(ViewMouseEdit, drag__pastTheRightEdgePansByTheOverrun) {
+    auto item = linearItem("A", {{2.0, 0.0}, {9.5, 0.0}});
+    view.setAutoZoom(0);  // auto-pan on
+    ASSERT_TRUE(frame());
+    down(9.5, 0.0);
+    dragTo(10.5, 0.0);  // 80 px beyond the right edge
+    ASSERT_EQ(range().offsets.size(), 1u) << "one horizontal pan";
+    EXPECT_NEAR(range().offsets[0], 0.5, kDragTolerance) << "by the overrun of 40 px";
+    up(10.5, 0.0);
+}
+
+TEST_F(ViewMouseEdit, mouseUp__endsTheGhostAndRestoresTheSampleCount) {
+    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}});
+    ASSERT_TRUE(frame());
+    down(5.0, 0.0);
+    dragTo(5.5, 0.1);
+    EXPECT_TRUE(item->drawGhost()) << "a drag shows the ghost";
+    EXPECT_EQ(item->numberOfSamples(), 161u) << "and samples a fifth of the width";
+    up(5.5, 0.1);
+    EXPECT_FALSE(item->drawGhost());
+    EXPECT_EQ(item->numberOfSamples(), 801u);
+}
+
+TEST_F(ViewMouseEdit, keys__spaceRepeatArmsAndKeyUpEndsIt) {
+    EXPECT_FALSE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, " ")))
+        << "a first, non-repeated space is passed on";
+    EXPECT_TRUE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, " ", 0, 49, true)));
+    EXPECT_TRUE(view.space());
+    EXPECT_TRUE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
+    EXPECT_FALSE(view.space());
+    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyChannelsChanged});
+    EXPECT_TRUE(view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " ")));
+    EXPECT_TRUE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, "a"))) << "any key's release ends the mode";
+    EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, "a"))) << "without the mode a release is passed on";
+}
+
+}  // namespace
+}  // namespace view_test

@@ -1,0 +1,162 @@
+// Picking and the rubber band through the view: what a click and a band take into the
+// selection, what the other tools take, and the selection repairs and commands.
+
+#include "src/view/tests/ViewMouseFixture.h"
+
+namespace view_test {
+namespace {
+
+class ViewPick : public ViewMouseFixture {
+protected:
+    void SetUp() override {
+        ViewMouseFixture::SetUp();
+        item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
+        k2 = keyAt(item, 2.0);
+        k5 = keyAt(item, 5.0);
+        k8 = keyAt(item, 8.0);
+    }
+    TQCurveEditorChannelItemPtr item;
+    TQKeyframeHandle k2 = nullptr;
+    TQKeyframeHandle k5 = nullptr;
+    TQKeyframeHandle k8 = nullptr;
+};
+
+TEST_F(ViewPick, rubberBand__selectsTheKeypointsItCoversAndNothingElse) {
+    selectInView({keypointEntry(item, 8.0)});
+    ASSERT_TRUE(frame());
+    down(1.0, 0.5);  // on empty space, above the curve
+    dragTo(3.0, 0.0);
+    dragTo(6.0, -0.5);
+    EXPECT_TRUE(view.selecting());
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k5})) << "the band replaces the selection";
+    up(6.0, -0.5);
+    EXPECT_FALSE(view.selecting());
+    EXPECT_EQ(view.getSelectionViewVolume(), CGRectZero) << "the band is forgotten at mouse up";
+    EXPECT_EQ(countCalls("postNotification"), 0u) << "a plain band changes no channel and posts nothing";
+    EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 0u);
+
+    // A band that covers only the curve between keypoints takes nothing.
+    ASSERT_TRUE(frame());
+    down(3.0, 0.2);
+    dragTo(4.0, -0.2);
+    EXPECT_TRUE(view.getSelection()->empty()) << "bands test keypoint images only";
+    up(4.0, -0.2);
+}
+
+TEST_F(ViewPick, rubberBand__withShiftInvertsMembership) {
+    selectInView({keypointEntry(item, 2.0), keypointEntry(item, 5.0)});
+    ASSERT_TRUE(frame());
+    down(4.0, 0.5, kShift);
+    EXPECT_TRUE(view.selecting()) << "Shift on empty space starts a band at once";
+    dragTo(9.0, -0.5, kShift);
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k8}))
+        << "the covered selected keypoint leaves, the covered unselected one joins at the end";
+    dragTo(9.5, -0.5, kShift);
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k8})) << "each step starts from mouse down's selection";
+    up(9.5, -0.5, kShift);
+
+    // Dragged leftward, new keypoints join at the front, each in front of the one before.
+    ASSERT_TRUE(frame());
+    selectInView({keypointEntry(item, 8.0)});
+    down(6.0, 0.5, kShift);
+    dragTo(1.0, -0.5, kShift);
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k5, k2, k8}));
+    up(1.0, -0.5, kShift);
+}
+
+TEST_F(ViewPick, click__onEmptySpaceEmptiesTheSelectionAndShiftKeepsIt) {
+    selectInView({keypointEntry(item, 2.0)});
+    ASSERT_TRUE(frame());
+    click(3.0, 0.8, kShift);
+    EXPECT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{k2});
+    click(3.0, 0.8);
+    EXPECT_TRUE(view.getSelection()->empty());
+}
+
+TEST_F(ViewPick, click__shiftTogglesAKeypointAndMakesItPrimary) {
+    selectInView({keypointEntry(item, 2.0)});
+    ASSERT_TRUE(frame());
+    click(8.0, 0.0, kShift);
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k8, k2}));
+    click(2.0, 0.0, kShift);
+    EXPECT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{k8});
+    click(5.0, 0.0, kShift);
+    click(8.0, 0.0);
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k8, k5}))
+        << "a plain click on a selected keypoint keeps the selection and makes it primary";
+}
+
+TEST_F(ViewPick, pick__otherToolsMakeNoEntry) {
+    ASSERT_TRUE(frame());
+    const CGPoint onKey = view.getPointScreen(CGPointMake(5.0, 0.0));
+    {
+        ctrl().setCurrentTool(1);
+        view.pick(onKey);
+        EXPECT_TRUE(view.getCurrentSelection()->empty()) << "sketch";
+        EXPECT_EQ(view.getCurrentActivePart(), 0u);
+    }
+    {
+        ctrl().setCurrentTool(2);
+        view.pick(onKey);
+        EXPECT_TRUE(view.getCurrentSelection()->empty()) << "box, no band";
+        EXPECT_EQ(view.getCurrentActivePart(), TQSelectionKeypoint) << "the box tool records the hit id";
+        view.setSelecting(1);
+        view.pick(onKey);
+        EXPECT_EQ(view.getCurrentSelection()->size(), 1u) << "during a band the box tool takes keypoints";
+        view.setSelecting(0);
+    }
+}
+
+TEST_F(ViewPick, pick__aRecordOfAnItemThatIsGoneIsSkipped) {
+    ASSERT_TRUE(frame());
+    ctrl().removeChannelWithIdentifier(item->channelId(), set);
+    view.getCurrentSelection()->addSelection(keypointEntry(item, 8.0));
+    view.pick(view.getPointScreen(CGPointMake(5.0, 0.0)));
+    EXPECT_TRUE(view.getCurrentSelection()->empty()) << "the frame is older than the set";
+    view.getCurrentSelection()->addSelection(keypointEntry(item, 8.0));
+    view.pick(view.getPointScreen(CGPointMake(5.0, 0.9)));
+    EXPECT_EQ(view.getCurrentSelection()->size(), 1u) << "a miss calls nothing and leaves the list";
+}
+
+TEST_F(ViewPick, validateSelectedHandles__matchesByTimeAndDropsDeletedKeypoints) {
+    TQCurveSelectionList saved;
+    saved.addSelection(keypointEntry(item, 8.0));
+    saved.addSelection(keypointEntry(item, 5.0));
+    saved.addSelection(keypointEntry(item, 2.0));
+    // A rebuild of the channel: new handles at 2 and 8, the keypoint at 5 gone.
+    TQChannel* c = item->channel();
+    c->deleteKeyframe(k5);
+    const double v8 = keyValueAt(c, 8.0);
+    c->deleteKeyframe(keyAt(item, 8.0));
+    c->setKeyframe(seconds(8.0), v8 + 1.0);
+
+    view.validateSelectedHandles(&saved);
+    ASSERT_EQ(view.getSelection()->size(), 2u);
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{keyAt(item, 8.0), keyAt(item, 2.0)}))
+        << "order kept, value ignored";
+}
+
+TEST_F(ViewPick, selectAll__skipsDisabledItemsAndTakesLockedKeypoints) {
+    TQChannel* other = addChannel("B", {{1.0, 0.0}});
+    auto disabled = addItem(other);
+    other->resetFlag(kTQChannelFlagEnabledInCurveEditor);
+    item->channel()->setFlag(kTQChannelFlagEnabledInCurveEditor);
+    item->channel()->setKeyframeLocked(k5, true);
+
+    view.selectAll();
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k5, k8}));
+    for (const auto& e : view.getSelection()->getSelectionArray()) EXPECT_EQ(e->getFlags(), TQSelectionKeypoint);
+    view.selectNone();
+    EXPECT_TRUE(view.getSelection()->empty());
+}
+
+TEST_F(ViewPick, channelsForSelection__hasNoRepeats) {
+    item->select(1);
+    auto second = addItem(addChannel("B", {{1.0, 0.0}}));
+    second->select(1);
+    const std::vector<TQChannelBase*> channels = view.channelsForSelection();
+    EXPECT_EQ(channels, (std::vector<TQChannelBase*>{item->channelBase(), second->channelBase()}));
+}
+
+}  // namespace
+}  // namespace view_test
