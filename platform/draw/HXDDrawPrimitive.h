@@ -8,6 +8,7 @@
 // drawn. Primitives are made per frame and shared between the frame's lists
 // (std::shared_ptr): one object is both drawn and hit-tested.
 
+#include <atomic>
 #include <cstdint>
 #include <memory>
 
@@ -42,11 +43,34 @@ public:
     // Filled shapes (1) win over lines (0) at equal distance.
     virtual int hitPriority() const { return 1; }
 
+    // ---- World bounds, read by the index a render controller keeps over a long list ----
+    // Where tests at this backing scale can hit the primitive (see HXDHitBounds). The default,
+    // Anywhere, is always right: a subclass that does not say is tested by every test.
+    virtual HXDHitBounds hitBounds(float backingScale) const;
+    // For XSpan bounds: the y extent of the part of the shape over world x in [x0, x1]
+    // (segments that reach into the range count whole); false when no part lies there.
+    virtual bool hitYExtentOverX(double x0, double x1, double& minY, double& maxY) const;
+
+    // Counts changes to the hit geometry (width, loop, wireframe) of primitives that an index
+    // has read: an index built before the count moved is rebuilt at its next test.
+    static uint64_t hitGeometryRevision() { return sHitGeometryRevision.load(std::memory_order_relaxed); }
+    // Called by the index as it reads the primitive's bounds.
+    void markHitIndexed() const { _hitIndexed = true; }
+
 protected:
     HXDDrawPrimitive() = default;
     explicit HXDDrawPrimitive(uint32_t hitID) { _hitInfo.setHitID(hitID); }
 
+    // Subclasses call this when a setter changes what hitBounds answers. Primitives being
+    // built for a frame have not been indexed yet, and cost nothing here.
+    void hitGeometryChanged() {
+        if (_hitIndexed) sHitGeometryRevision.fetch_add(1, std::memory_order_relaxed);
+    }
+
 private:
+    static inline std::atomic<uint64_t> sHitGeometryRevision{0};
+
+    mutable bool _hitIndexed = false;
     HXDHitInfo _hitInfo;
     HXDBlendingInfo _blendingInfo = HXDDataType::sourceOneMinusSourceBlendingInfo();
 };

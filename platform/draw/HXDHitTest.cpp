@@ -5,6 +5,7 @@
 
 #include "platform/draw/HXDDrawPrimitive.h"
 #include "platform/draw/HXDRenderController.h"
+#include "platform/draw/internal/HXDPrimitiveIndex.h"
 
 // ---- HXDScreenMapping ----------------------------------------------------------------------
 
@@ -100,6 +101,21 @@ CGRect HXDHitTestContext::worldQueryRect(double reach) const {
                       _worldRect.size.height + 2.0 * gy);
 }
 
+// ---- HXDHitBounds ----------------------------------------------------------------------------
+
+HXDHitBounds HXDHitBounds::box(const CGRect& world, double reach) {
+    // The standardized rectangle, without a call per quad of a frame.
+    const double xa = world.origin.x, xb = xa + world.size.width;
+    const double ya = world.origin.y, yb = ya + world.size.height;
+    if (!(std::isfinite(xa) && std::isfinite(xb) && std::isfinite(ya) && std::isfinite(yb))) return anywhere();
+    HXDHitBounds b;
+    b.kind = Kind::Box;
+    b.minX = std::min(xa, xb), b.maxX = std::max(xa, xb);
+    b.minY = std::min(ya, yb), b.maxY = std::max(ya, yb);
+    b.reach = reach;
+    return b;
+}
+
 // ---- HXDHitRecord ----------------------------------------------------------------------------
 
 uint32_t HXDHitRecord::hitID() const { return _primitive->hitInfo().hitID(); }
@@ -136,18 +152,18 @@ std::vector<HXDHitRecord> HXDRenderController::newHitTestResultForPrimitives(con
     const std::shared_ptr<HXDDrawPrimitive>* best = nullptr;
     float bestDistance = 0.0f;
     int bestPriority = 0;
-    for (const auto& primitive : primitives) {
-        if (!primitive) continue;
+    auto test = [&](const std::shared_ptr<HXDDrawPrimitive>& primitive) {
+        if (!primitive) return;
         float distance = 0.0f;
         if (isPoint) {
             distance = primitive->hitDistanceAtPoint(context);
-            if (!(distance >= 0.0f)) continue;
+            if (!(distance >= 0.0f)) return;
         } else if (!primitive->intersectsRect(context)) {
-            continue;
+            return;
         }
         if (!returnClosestHit) {
             result.emplace_back(primitive, distance);
-            continue;
+            return;
         }
         const int priority = primitive->hitPriority();
         if (!best || distance < bestDistance || (distance == bestDistance && priority >= bestPriority)) {
@@ -155,6 +171,17 @@ std::vector<HXDHitRecord> HXDRenderController::newHitTestResultForPrimitives(con
             bestDistance = distance;
             bestPriority = priority;
         }
+    };
+
+    // The index serves axis-aligned mappings, where a world box bounds a pixel box; the
+    // candidates come in list order, so the ranking above sees what a walk would.
+    if (primitives.size() >= hxd_internal::PrimitiveIndex::kMinPrimitives && context.mapping().isAxisAligned()) {
+        if (!_hitIndex) _hitIndex = std::make_unique<hxd_internal::PrimitiveIndex>();
+        if (!_hitIndex->describes(primitives, context.backingScale()))
+            _hitIndex->build(primitives, context.backingScale());
+        for (const uint32_t i : _hitIndex->candidates(primitives, context)) test(primitives[i]);
+    } else {
+        for (const auto& primitive : primitives) test(primitive);
     }
     if (returnClosestHit && best) result.emplace_back(*best, bestDistance);
     return result;

@@ -61,6 +61,9 @@ public:
     CGRect worldRectToPixels(const CGRect& world) const;
     CGRect pixelRectToWorld(const CGRect& pixels) const;
     CGSize drawableSize() const { return _drawableSize; }
+    // True when x maps to pixel x and y to pixel y alone (no rotation or shear), as every
+    // orthographic view projection does: world and pixel rectangles then map onto each other.
+    bool isAxisAligned() const { return _valid && _b == 0.0 && _d == 0.0; }
 
 private:
     bool _valid = false;
@@ -93,6 +96,9 @@ public:
     // The region of world space that a primitive must reach to be hit, grown by `reach`
     // pixels on every side: primitives with cached world bounds reject on it first.
     CGRect worldQueryRect(double reach) const;
+    // The world extent of one drawable pixel on each axis (bounds for a skewed mapping).
+    double worldPerPixelX() const { return _worldPerPixelX; }
+    double worldPerPixelY() const { return _worldPerPixelY; }
 
 private:
     void prepareWorldQuery();
@@ -107,6 +113,30 @@ private:
     double _worldPerPixelY = 0.0;
     HXDScreenMapping _mapping;
     float _backingScale = 1.0f;
+};
+
+// Where a primitive can take hits, in world coordinates: every point or rectangle that hits
+// it lies within `reach` drawable pixels of this box. A render controller indexes long lists
+// by it (HXDRenderController.h), so that a test only runs the exact test of primitives near
+// its point. Answers are conservative: a box too large costs time, never a missed hit.
+struct HXDHitBounds {
+    enum class Kind : uint8_t {
+        Nowhere,   // nothing can hit it (no segment, no area)
+        Anywhere,  // not known: every test runs the exact test
+        Box,       // within [minX, maxX] x [minY, maxY]
+        // Within [minX, maxX] across; the y extent over part of that span is asked for when a
+        // test comes near (hitYExtentOverX), since finding it for the whole of a long curve
+        // would read every vertex.
+        XSpan,
+    };
+    Kind kind = Kind::Anywhere;
+    double minX = 0.0, minY = 0.0, maxX = 0.0, maxY = 0.0;
+    double reach = 0.0;
+
+    static HXDHitBounds nowhere() { return {Kind::Nowhere}; }
+    static HXDHitBounds anywhere() { return {Kind::Anywhere}; }
+    // A box of a world rectangle (any sign of width and height); Anywhere when it is not finite.
+    static HXDHitBounds box(const CGRect& world, double reach);
 };
 
 // One hit. It keeps its primitive alive and answers the primitive's hit id and dictionary.

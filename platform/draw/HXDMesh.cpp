@@ -1,5 +1,6 @@
 #include "platform/draw/HXDMesh.h"
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 
@@ -11,6 +12,32 @@ HXDMesh::HXDMesh(uint32_t hitID, HXDBrush brush, std::vector<HXDSubmesh> submesh
 
 void HXDMesh::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const {
     encoder.encodeMesh(*this, context);
+}
+
+void HXDMesh::setWireframe(bool wireframe) {
+    if (wireframe == _wireframe) return;
+    _wireframe = wireframe;
+    hitGeometryChanged();
+}
+
+// The wireframe half width here is the one hitDistanceAtPoint tests with.
+HXDHitBounds HXDMesh::hitBounds(float backingScale) const {
+    double minX = std::numeric_limits<double>::infinity(), minY = minX;
+    double maxX = -minX, maxY = -minX;
+    for (const HXDSubmesh& s : _submeshes) {
+        // Even one vertex counts: its degenerate edge is what outlines and bands test.
+        for (const HXDFloat2& v : s.vertices) {
+            // A vertex at infinity, or NaN, leaves the shape without bounds.
+            if (!(std::isfinite(v.x) && std::isfinite(v.y))) return HXDHitBounds::anywhere();
+            minX = std::min(minX, static_cast<double>(v.x));
+            maxX = std::max(maxX, static_cast<double>(v.x));
+            minY = std::min(minY, static_cast<double>(v.y));
+            maxY = std::max(maxY, static_cast<double>(v.y));
+        }
+    }
+    if (!(minX <= maxX)) return HXDHitBounds::nowhere();
+    const double reach = _wireframe ? 0.5 + static_cast<double>(kHXDLineHitTolerancePoints) * backingScale : 0.0;
+    return HXDHitBounds::box(CGRectMake(minX, minY, maxX - minX, maxY - minY), reach);
 }
 
 namespace {

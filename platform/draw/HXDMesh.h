@@ -29,12 +29,14 @@ public:
     const HXDBrush& brush() const { return _brush; }
     const std::vector<HXDSubmesh>& submeshes() const { return _submeshes; }
     bool wireframe() const { return _wireframe; }
-    void setWireframe(bool wireframe) { _wireframe = wireframe; }
+    void setWireframe(bool wireframe);
 
     void encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const override;
     float hitDistanceAtPoint(const HXDHitTestContext& context) const override;
     bool intersectsRect(const HXDHitTestContext& context) const override;
     int hitPriority() const override { return _wireframe ? 0 : 1; }
+    // The box of every vertex; outlines reach as far as one-point lines do.
+    HXDHitBounds hitBounds(float backingScale) const override;
 
 private:
     HXDBrush _brush;

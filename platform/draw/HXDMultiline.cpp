@@ -51,23 +51,57 @@ void PolylineIndex::buildBins(const std::vector<HXDLineVertex>& vertices) {
     maxY = std::numeric_limits<float>::infinity();
 }
 
-void PolylineIndex::fillBin(const std::vector<HXDLineVertex>& vertices, uint32_t k) {
-    const uint32_t segments = static_cast<uint32_t>(vertices.size() - 1);
-    // first: the least segment whose end reaches bin k.
-    uint32_t lo = 0, hi = segments;
+namespace {
+// The least i in [0, n) for which pred holds (n when none), pred being false and then true
+// along i. Searched outward from a guess, doubling the step, then by halves: near a good
+// guess it reads a few neighbouring vertices instead of a path through the whole array.
+template <class Pred>
+uint32_t firstTrueNear(uint32_t n, uint32_t guess, Pred&& pred) {
+    if (n == 0) return 0;
+    uint32_t lo = 0, hi = n;  // pred is false below lo and true at hi (or hi is n)
+    guess = std::min(guess, n - 1);
+    if (pred(guess)) {
+        hi = guess;
+        for (uint64_t step = 1; hi > 0; step *= 2) {
+            const uint32_t probe = hi > step ? static_cast<uint32_t>(hi - step) : 0u;
+            if (!pred(probe)) {
+                lo = probe + 1;
+                break;
+            }
+            hi = probe;
+        }
+    } else {
+        lo = guess + 1;
+        for (uint64_t step = 1; lo < n; step *= 2) {
+            const uint32_t probe = static_cast<uint32_t>(std::min<uint64_t>(lo + step - 1, n - 1));
+            if (pred(probe)) {
+                hi = probe;
+                break;
+            }
+            lo = probe + 1;
+        }
+    }
     while (lo < hi) {
         const uint32_t mid = lo + (hi - lo) / 2;
-        if (binOf(vertices[mid + 1].start.x) >= k) hi = mid;
+        if (pred(mid)) hi = mid;
         else lo = mid + 1;
     }
-    const uint32_t first = lo;
-    // end: one past the last segment whose start lies at or before bin k.
-    hi = segments;
-    while (lo < hi) {
-        const uint32_t mid = lo + (hi - lo) / 2;
-        if (binOf(vertices[mid].start.x) <= k) lo = mid + 1;
-        else hi = mid;
-    }
+    return lo;
+}
+}  // namespace
+
+void PolylineIndex::fillBin(const std::vector<HXDLineVertex>& vertices, uint32_t k) {
+    const uint32_t segments = static_cast<uint32_t>(vertices.size() - 1);
+    // Sampled curves are close to uniform in x, so bin k's segments start near the same
+    // fraction of the array as the bin of the bins.
+    const uint64_t count = bins.size();
+    const auto guess = [&](uint64_t bin) { return static_cast<uint32_t>(bin * segments / count); };
+    // first: the least segment whose end reaches bin k.
+    const uint32_t first =
+        firstTrueNear(segments, guess(k), [&](uint32_t i) { return binOf(vertices[i + 1].start.x) >= k; });
+    // lo: one past the last segment whose start lies at or before bin k.
+    const uint32_t lo =
+        firstTrueNear(segments, guess(k + 1), [&](uint32_t i) { return binOf(vertices[i].start.x) > k; });
     Bin& bin = bins[k];
     if (first >= lo) {
         bin.first = kNone;
@@ -125,6 +159,39 @@ uint32_t PolylineIndex::binOf(double x) const {
     // 0 the conversion's truncation is the floor.
     if (!(k > 0.0)) return 0;
     return static_cast<uint32_t>(std::min(k, last));
+}
+
+bool PolylineIndex::yExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo,
+                                 double& hi) {
+    if (!hasBounds || x1 < minX || x0 > maxX) return false;
+    bool found = false;
+    auto take = [&](float a, float b) {
+        lo = found ? std::min(lo, static_cast<double>(a)) : a;
+        hi = found ? std::max(hi, static_cast<double>(b)) : b;
+        found = true;
+    };
+    if (monotone) {
+        // A segment meeting [x0, x1] at some x lies in bin binOf(x), which is in this range.
+        for (uint32_t k = binOf(x0), last = binOf(x1); k <= last; ++k) {
+            if (bins[k].first == kUnfilled) fillBin(vertices, k);
+            if (bins[k].first != kNone) take(bins[k].minY, bins[k].maxY);
+        }
+        return found;
+    }
+    for (const Chunk& chunk : chunks)
+        if (!(chunk.maxX < x0 || chunk.minX > x1)) take(chunk.minY, chunk.maxY);
+    // A closing segment joins two vertices that lie in chunks of their run, but the segment
+    // between them may cross x0..x1 where neither chunk does.
+    for (const auto& [i, j] : closers) {
+        const HXDLineVertex& a = vertices[i];
+        const HXDLineVertex& b = vertices[j];
+        if (!(std::isfinite(a.start.x) && std::isfinite(a.start.y) && std::isfinite(b.start.x) &&
+              std::isfinite(b.start.y)))
+            continue;  // never hit, as in the exact test
+        if (std::max(a.start.x, b.start.x) < x0 || std::min(a.start.x, b.start.x) > x1) continue;
+        take(std::min(a.start.y, b.start.y), std::max(a.start.y, b.start.y));
+    }
+    return found;
 }
 
 template <class Visit>
@@ -216,6 +283,13 @@ void HXDMultiline::setLoop(bool loop) {
     if (loop == _loop) return;
     _loop = loop;
     _index.built = false;  // the closing segments are part of the index
+    hitGeometryChanged();
+}
+
+void HXDMultiline::setWidth(float width) {
+    if (width == _width) return;
+    _width = width;
+    hitGeometryChanged();  // the reach follows the width
 }
 
 void HXDMultiline::setLineJoin(int join) {
@@ -236,6 +310,27 @@ double HXDMultiline::halfWidthInPixels(float backingScale) const {
 
 void HXDMultiline::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const {
     encoder.encodeMultiline(*this, context);
+}
+
+HXDHitBounds HXDMultiline::hitBounds(float backingScale) const {
+    HXDHitBounds b;
+    b.kind = HXDHitBounds::Kind::XSpan;
+    b.reach = halfWidthInPixels(backingScale) + static_cast<double>(kHXDLineHitTolerancePoints) * backingScale;
+    if (_monotoneX && !_loop && _vertices.size() >= 2) {
+        // A curve's x extent is its ends': no need to build its index before a test comes near.
+        b.minX = _vertices.front().start.x;
+        b.maxX = _vertices.back().start.x;
+        return b;
+    }
+    const hxd_internal::PolylineIndex& i = index();
+    if (!i.hasBounds) return HXDHitBounds::nowhere();
+    b.minX = i.minX;
+    b.maxX = i.maxX;
+    return b;
+}
+
+bool HXDMultiline::hitYExtentOverX(double x0, double x1, double& minY, double& maxY) const {
+    return index().yExtentOverX(_vertices, x0, x1, minY, maxY);
 }
 
 float HXDMultiline::hitDistanceAtPoint(const HXDHitTestContext& context) const {

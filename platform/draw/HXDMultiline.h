@@ -66,7 +66,7 @@ public:
     std::pair<uint32_t, uint32_t> runRange(size_t run) const;
 
     float width() const { return _width; }
-    void setWidth(float width) { _width = width; }
+    void setWidth(float width);
     float gamma() const { return _gamma; }
     void setGamma(float gamma) { _gamma = gamma; }
     bool antialiased() const { return _antialiased; }
@@ -92,6 +92,9 @@ public:
     float hitDistanceAtPoint(const HXDHitTestContext& context) const override;
     bool intersectsRect(const HXDHitTestContext& context) const override;
     int hitPriority() const override { return 0; }
+    // XSpan over the vertices' x extent, reaching half the width plus the line tolerance.
+    HXDHitBounds hitBounds(float backingScale) const override;
+    bool hitYExtentOverX(double x0, double x1, double& minY, double& maxY) const override;
 
     // Half the drawn width in drawable pixels, never below half a pixel.
     double halfWidthInPixels(float backingScale) const;

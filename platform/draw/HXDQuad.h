@@ -30,6 +30,7 @@ public:
     void encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const override;
     float hitDistanceAtPoint(const HXDHitTestContext& context) const override;
     bool intersectsRect(const HXDHitTestContext& context) const override;
+    HXDHitBounds hitBounds(float) const override { return HXDHitBounds::box(_destinationRect, 0.0); }
 
 private:
     // Whether the texel drawn at the pixel point (inside `pixels`, the drawn rectangle) is
@@ -54,6 +55,7 @@ public:
     void encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const override;
     float hitDistanceAtPoint(const HXDHitTestContext& context) const override;
     bool intersectsRect(const HXDHitTestContext& context) const override;
+    HXDHitBounds hitBounds(float) const override { return HXDHitBounds::box(_frame, 0.0); }
 
 private:
     CGRect _frame;

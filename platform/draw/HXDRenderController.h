@@ -57,10 +57,17 @@ private:
     CGSize _drawableSize;
 };
 
+namespace hxd_internal {
+class PrimitiveIndex;
+}
+
 class HXDRenderController {
 public:
     // The texture may be null at creation: a frame supplies it.
     HXDRenderController(HXDTexture* texture, float backingScale);
+    ~HXDRenderController();
+    HXDRenderController(const HXDRenderController&) = delete;
+    HXDRenderController& operator=(const HXDRenderController&) = delete;
 
     // Installs the state of a new frame; the previous context is replaced. drawableSize is
     // used when no texture is given (neither now nor at creation): a view that installs its
@@ -86,6 +93,12 @@ public:
     // the one closest record (ranked as HXDHitTest.h tells; in a rectangle test all distances
     // are 0, so the flag keeps the filled shape drawn last). Null entries are skipped; an
     // invalid context answers no record. The records keep their primitives alive.
+    //
+    // A long list (a frame's pickable primitives) is indexed in world space at its first
+    // test, so that later tests of the same list run the exact test of the primitives near
+    // them only; a test of another list, or of the same list changed in any way, indexes
+    // again. The index holds weak references to the last long list's primitives until then,
+    // or until the next updateTexture. Not for concurrent use: tests fill the index.
     std::vector<HXDHitRecord> newHitTestResultForPrimitives(const HXDPrimitiveArray& primitives,
                                                             const HXDHitTestContext& context,
                                                             bool returnClosestHit) const;
@@ -94,4 +107,5 @@ private:
     float _backingScale;
     HXDTexture* _initialTexture;
     std::unique_ptr<HXDRenderingContext> _context;
+    mutable std::unique_ptr<hxd_internal::PrimitiveIndex> _hitIndex;
 };

@@ -62,6 +62,10 @@ struct PolylineIndex {
 
     uint32_t binOf(double x) const;
 
+    // The y extent of the segments that reach into world x in [x0, x1] (bins or chunks over
+    // the range, so a bound, not the exact extent); false when no segment does.
+    bool yExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo, double& hi);
+
 private:
     void buildBins(const std::vector<HXDLineVertex>& vertices);
     void buildChunks(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts, bool loop);

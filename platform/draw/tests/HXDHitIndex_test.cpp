@@ -1,0 +1,212 @@
+// The render controller's index over long lists: whatever it skips, the answers must be the
+// ones a walk over every primitive gives, and any change to the list must be seen.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <memory>
+#include <random>
+
+#include "platform/draw/HXDPrimitives.h"
+#include "platform/draw/internal/HXDPrimitiveIndex.h"
+#include "platform/geometry/BNViewProjection.h"
+
+namespace {
+
+constexpr double kPixelTolerance = 1e-4;
+
+struct Found {
+    const HXDDrawPrimitive* primitive;
+    float distance;
+};
+
+// The rules of HXDHitTest.h, applied to every primitive of the list in turn.
+std::vector<Found> walk(const HXDPrimitiveArray& list, const HXDHitTestContext& context, bool closest) {
+    std::vector<Found> all;
+    for (const auto& p : list) {
+        if (!p) continue;
+        if (context.kind() == HXDHitTestContext::Kind::Point) {
+            const float d = p->hitDistanceAtPoint(context);
+            if (d >= 0.0f) all.push_back({p.get(), d});
+        } else if (p->intersectsRect(context)) {
+            all.push_back({p.get(), 0.0f});
+        }
+    }
+    if (!closest || all.empty()) return all;
+    Found best = all[0];
+    for (const Found& f : all) {
+        if (f.distance < best.distance ||
+            (f.distance == best.distance && f.primitive->hitPriority() >= best.primitive->hitPriority()))
+            best = f;
+    }
+    return {best};
+}
+
+// x 0..10 by y -5..5 on 200 x 100 pixels, as in the hit-test tests.
+class HitIndexFixture : public ::testing::Test {
+protected:
+    void SetUp() override { installFrame(1.0f); }
+
+    void installFrame(float backingScale, double shear = 0.0) {
+        BNMatrix44f projection = BNViewVolumeProjection(CGRectMake(0, -5, 10, 10));
+        projection.set(0, 1, static_cast<float>(shear));
+        controller.updateTexture(nullptr, backingScale, projection, HXDFloat2{0.05f, 0.1f}, CGSizeMake(200, 100));
+    }
+    CGPoint pixel(double x, double y) const {
+        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100)).worldToPixel(x, y);
+    }
+    HXDHitTestContext at(CGPoint p) const {
+        return controller.renderingContextForHitTestAtCoords(HXDFloat2{float(p.x), float(p.y)});
+    }
+    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p, bool closest = true) const {
+        return controller.newHitTestResultForPrimitives(list, at(p), closest);
+    }
+
+    static std::shared_ptr<HXDMultiline> curve(double y, double amplitude, float width, int samples, double power = 1.0) {
+        std::vector<HXDLineVertex> v;
+        for (int i = 0; i < samples; ++i) {
+            // power > 1 crowds the samples at the start: the bins' guesses are then far off.
+            const double x = 10.0 * std::pow(i / double(samples - 1), power);
+            v.push_back({{float(x), float(y + amplitude * std::sin(x * 2.3 + y)), 0}, {}});
+        }
+        auto line = std::make_shared<HXDMultiline>(std::move(v));
+        line->setWidth(width);
+        return line;
+    }
+
+    // A frame's worth of everything a view draws: curves of several widths in bands, their
+    // keypoint images (alpha-tested), tangent handles, and the odd ones out.
+    HXDPrimitiveArray frame(uint32_t seed) const {
+        std::mt19937 rng(seed);
+        std::uniform_real_distribution<double> u(0.0, 1.0);
+        std::vector<uint8_t> rgba(8 * 8 * 4, 255);
+        for (int i = 0; i < 8; ++i) rgba[(i * 8 + i) * 4 + 3] = 0;  // a transparent diagonal
+        auto image = HXDPixelTexture::textureWithRGBA(8, 8, 2.0f, std::move(rgba));
+        HXDPrimitiveArray list;
+        for (int c = 0; c < 12; ++c) {
+            const double y = -4.5 + 0.8 * c;
+            list.push_back(curve(y, 0.3, c % 3 == 0 ? 3.0f : 1.0f, 400, c % 4 == 1 ? 3.0 : 1.0));
+            for (int k = 0; k < 10; ++k) {
+                const double x = 0.4 + k + 0.2 * u(rng);
+                auto key = std::make_shared<HXDQuadTexture>(k, image, CGRectMake(x - 0.2, y - 0.4, 0.4, 0.8), 1.0f);
+                key->setUseTextureAlphaForHitTest(true);
+                list.push_back(key);
+                if (k % 4 == 0)
+                    list.push_back(std::make_shared<HXDQuadTexture>(100 + k, nullptr,
+                                                                    CGRectMake(x + 0.3, y, -0.15, 0.3), 1.0f));
+            }
+        }
+        std::vector<HXDLineVertex> ring;
+        for (int i = 0; i < 60; ++i) ring.push_back({{float(5 + 3 * std::cos(i * 0.1)), float(3 * std::sin(i * 0.1)), 0}, {}});
+        auto loop = std::make_shared<HXDMultiline>(std::move(ring));
+        loop->setLoop(true);  // its closing chord crosses columns its vertices do not reach
+        list.push_back(loop);
+        list.push_back(nullptr);
+        list.push_back(std::make_shared<HXDMesh>(7, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{1, 1}, {2, 1}, {1.5, 2}})}));
+        auto outline = std::make_shared<HXDMesh>(8, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{6, -2}, {8, -2}, {8, 0}})});
+        outline->setWireframe(true);
+        list.push_back(outline);
+        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(-1, -1, 12, 0.1), 9));  // across everything
+        list.push_back(std::make_shared<HXDText>(HXDAttributedString{"1.25", HXDTextAttributes{}},
+                                                 HXDTextLayoutAnchor::Center, CGPointMake(3, 3)));
+        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(NAN, 0, 1, 1), 10));
+        list.push_back(std::make_shared<HXDMultiline>(std::vector<HXDLineVertex>{}));
+        return list;
+    }
+
+    void expectAgreesWithWalk(const HXDPrimitiveArray& list, uint32_t seed, int trials) const {
+        std::mt19937 rng(seed);
+        std::uniform_real_distribution<double> ux(-0.5, 10.5), uy(-5.5, 5.5), band(0.0, 1.0);
+        for (int trial = 0; trial < trials; ++trial) {
+            const CGPoint p = pixel(ux(rng), uy(rng));
+            // Small bands use the columns, wide ones the pass over every entry.
+            const double w = trial % 5 == 4 ? 180.0 * band(rng) : 12.0 * band(rng);
+            const HXDHitTestContext contexts[] = {at(p), controller.renderingContextForHitTestInRect(
+                                                             CGRectMake(p.x, p.y, trial % 2 ? w : -w, 8.0 * band(rng)))};
+            for (const HXDHitTestContext& c : contexts) {
+                for (const bool closest : {true, false}) {
+                    const auto got = controller.newHitTestResultForPrimitives(list, c, closest);
+                    const auto expected = walk(list, c, closest);
+                    ASSERT_EQ(got.size(), expected.size())
+                        << "trial " << trial << (c.kind() == HXDHitTestContext::Kind::Rect ? " band" : " point")
+                        << " closest " << closest;
+                    for (size_t i = 0; i < got.size(); ++i) {
+                        EXPECT_EQ(got[i].primitive().get(), expected[i].primitive) << "trial " << trial << " record " << i;
+                        EXPECT_NEAR(got[i].distance(), expected[i].distance, kPixelTolerance) << "trial " << trial;
+                    }
+                }
+            }
+        }
+    }
+
+    HXDRenderController controller{nullptr, 1.0f};
+};
+
+TEST_F(HitIndexFixture, longList__answersAsAWalkDoesForPointsAndBands) {
+    const HXDPrimitiveArray list = frame(1);
+    ASSERT_GE(list.size(), hxd_internal::PrimitiveIndex::kMinPrimitives) << "the list must be long enough to index";
+    expectAgreesWithWalk(list, 11, 400);
+    {
+        // On a backing scale of 2 the lines reach twice as far: the index is rebuilt for it.
+        installFrame(2.0f);
+        expectAgreesWithWalk(list, 12, 150);
+    }
+    {
+        // A sheared mapping: world boxes no longer bound pixel boxes, and the list is walked.
+        installFrame(1.0f, 0.05);
+        expectAgreesWithWalk(list, 13, 150);
+    }
+}
+
+TEST_F(HitIndexFixture, index__columnsCutTheListAndFindOnlyWhatIsNear) {
+    const HXDPrimitiveArray list = frame(2);
+    hxd_internal::PrimitiveIndex index;
+    index.build(list, 1.0f);
+    EXPECT_TRUE(index.describes(list, 1.0f));
+    EXPECT_FALSE(index.describes(list, 2.0f)) << "the lines' reach follows the backing scale";
+    EXPECT_GT(index.columnCount(), 1u);
+    const auto candidates = index.candidates(list, at(pixel(5.0, -4.5)));
+    EXPECT_LT(candidates.size(), list.size() / 8) << "a pick reads the primitives near it, not the list";
+    EXPECT_TRUE(std::is_sorted(candidates.begin(), candidates.end())) << "candidates come in list order";
+}
+
+TEST_F(HitIndexFixture, list__aNewFrameInTheSameVectorIsSeen) {
+    HXDPrimitiveArray list = frame(3);
+    const CGPoint high = pixel(5.0, 4.8);
+    const auto before = pick(list, high, false);
+
+    // The next frame refills the same vector: same size, same buffer, other primitives.
+    const size_t size = list.size();
+    list.clear();
+    list.push_back(curve(4.8, 0.0, 1.0f, 50));
+    while (list.size() < size) list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, -5, 0.1, 0.1), 1));
+    const auto after = pick(list, high);
+    ASSERT_EQ(after.size(), 1u) << "the new curve through the point is found";
+    EXPECT_EQ(after[0].primitive(), list[0]);
+
+    // One entry replaced in place.
+    list[size / 2] = std::make_shared<HXDScreenspaceQuad>(CGRectMake(4.9, 4.7, 0.2, 0.2), 42);
+    const auto replaced = pick(list, high);
+    ASSERT_EQ(replaced.size(), 1u);
+    EXPECT_EQ(replaced[0].hitID(), 42u) << "a filled shape on the curve wins, once the index sees it";
+}
+
+TEST_F(HitIndexFixture, primitive__geometryChangedAfterATestIsSeen) {
+    HXDPrimitiveArray list = frame(4);
+    auto line = curve(4.8, 0.0, 1.0f, 50);
+    list.push_back(line);
+    const CGPoint p = pixel(5.0, 4.8);
+    const CGPoint off = CGPointMake(p.x, p.y + 6.0);
+    EXPECT_TRUE(pick(list, off).empty()) << "6 px off a 1 pt line is beyond its reach";
+    line->setWidth(8.0f);
+    EXPECT_EQ(pick(list, off).size(), 1u) << "a wider line reaches further";
+
+    // Left of where the curves start, clear of everything else.
+    auto mesh = std::make_shared<HXDMesh>(5, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{-0.9f, 2}, {-0.5f, 2}, {-0.5f, 2.5f}})});
+    list.push_back(mesh);
+    const CGPoint below = pixel(-0.6, 1.8);  // 2 px below the bottom edge
+    EXPECT_TRUE(pick(list, below).empty()) << "outside a filled polygon";
+    mesh->setWireframe(true);
+    EXPECT_EQ(pick(list, below).size(), 1u) << "the outline takes the line tolerance";
+}
+
+}  // namespace
