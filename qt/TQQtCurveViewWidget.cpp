@@ -15,6 +15,11 @@ TQQtCurveViewWidget::TQQtCurveViewWidget(QWidget* parent) : QWidget(parent), _ho
     setAttribute(Qt::WA_OpaquePaintEvent);
     setFocusPolicy(Qt::StrongFocus);
     setMouseTracking(true);
+    _dragRepeat.setSingleShot(true);
+    _dragRepeat.setTimerType(Qt::PreciseTimer);
+    // Just past the view's gate, in whole milliseconds.
+    _dragRepeat.setInterval(static_cast<int>(std::ceil(TQCurveEditorViewBase::kFrameInterval * 1000.0)) + 1);
+    connect(&_dragRepeat, &QTimer::timeout, this, [this] { repeatLastDrag(); });
 }
 
 TQQtCurveViewWidget::~TQQtCurveViewWidget() { setView(nullptr); }
@@ -25,6 +30,8 @@ void TQQtCurveViewWidget::setView(TQCurveEditorViewBase* view) {
     // A gesture does not carry over to another view: its release would reach a view that
     // never saw the press.
     _leftGesture = false;
+    _dragRepeat.stop();
+    _lastDrag.reset();
     _view = view;
     if (_view) {
         _view->setViewHost(&_host);
@@ -104,6 +111,8 @@ void TQQtCurveViewWidget::beginGesture(QMouseEvent* event, bool doubleClick) {
     const std::optional<RWEvent> down = TQQtEvents::mouseEvent(*event, _host, _clickCount);
     if (!down) return;
     event->accept();
+    _dragRepeat.stop();
+    _lastDrag.reset();
     _leftGesture = true;
     _view->mouseDown(*down);
 }
@@ -132,7 +141,14 @@ void TQQtCurveViewWidget::mouseMoveEvent(QMouseEvent* event) {
     const std::optional<RWEvent> drag = TQQtEvents::mouseEvent(*event, _host, _clickCount);
     if (!drag || drag->type() != RWEventType::LeftMouseDragged) return;
     event->accept();
+    _lastDrag = drag;
     _view->mouseDragged(*drag);
+    _dragRepeat.start();
+}
+
+void TQQtCurveViewWidget::repeatLastDrag() {
+    if (!_view || !_leftGesture || !_lastDrag) return;
+    _view->mouseDragged(*_lastDrag);
 }
 
 void TQQtCurveViewWidget::mouseReleaseEvent(QMouseEvent* event) {
@@ -141,6 +157,8 @@ void TQQtCurveViewWidget::mouseReleaseEvent(QMouseEvent* event) {
         return;
     }
     _leftGesture = false;
+    _dragRepeat.stop();
+    _lastDrag.reset();
     const std::optional<RWEvent> up = TQQtEvents::mouseEvent(*event, _host, _clickCount);
     if (!up) return;
     event->accept();

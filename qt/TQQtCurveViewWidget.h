@@ -15,6 +15,11 @@
 // buttons, are not the edit tool's. Key presses go to the view first; keys it does not take
 // go on to the parent, so that window shortcuts still work.
 //
+// The view takes at most one drag step per 1/30 s and drops the moves in between; the next
+// step makes up for them. So that a pointer that stops right after a dropped move still
+// brings its keypoint along, the last move of a drag is handed to the view once more a
+// frame interval later, unless another move came first.
+//
 // Wheel events are folded as the views expect: each one is queued on the host, and one
 // handler run from the event loop takes the first; the view's scrollWheel takes the ones
 // still waiting. Events the view has no handler for are translated by subclasses (see
@@ -24,7 +29,10 @@
 // or another view is set; the owner of the view detaches it (setView(nullptr)) before
 // deleting the view, if the widget lives on.
 
+#include <QTimer>
 #include <QWidget>
+
+#include <optional>
 
 #include "qt/TQQtPainterEncoder.h"
 #include "qt/TQQtServices.h"
@@ -62,6 +70,7 @@ private:
     void deliverQueuedWheel();
     // A left press, counted as the click of a multi-click it may continue.
     void beginGesture(QMouseEvent* event, bool doubleClick);
+    void repeatLastDrag();
 
     TQQtViewHost _host;
     TQQtPainterEncoder _encoder;
@@ -75,4 +84,7 @@ private:
     qint64 _lastPressMs = 0;
     QPointF _lastPressAt;
     bool _hasLastPress = false;
+    // The last move of the drag, handed over again by _dragRepeat.
+    std::optional<RWEvent> _lastDrag;
+    QTimer _dragRepeat;
 };

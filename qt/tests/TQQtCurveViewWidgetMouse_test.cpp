@@ -23,6 +23,8 @@ namespace {
 constexpr double kStepSeconds = 0.05;
 // How far a dragged keypoint must have gone, in pixels, to count as moved.
 constexpr double kMovedPixels = 5.0;
+// How close a dragged keypoint ends to the pointer (rounding of points and of the projection).
+constexpr double kPointerPixels = 2.0;
 
 // One animated channel of the sample scene's first object, alone in the view, so that a
 // press on one of its keypoints cannot pick another curve's.
@@ -133,6 +135,23 @@ TEST_F(CurveViewWidgetMouseTest, drag_on_a_keypoint__changes_the_channel_and_und
     TQChannel* restored = item->channel();
     ASSERT_NE(restored, nullptr) << "the channel is gone after undo";
     EXPECT_TRUE(*restored == *before) << "undo must give back the channel exactly";
+}
+
+TEST_F(CurveViewWidgetMouseTest, drag_that_stops_after_a_dropped_move__still_ends_under_the_pointer) {
+    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+    const TQKeyframeHandle key = keys[keys.size() / 2];
+    const QPoint start = widgetPointOf(key);
+    QTest::mousePress(&widget, Qt::LeftButton, Qt::NoModifier, start);
+    clock.advance(kStepSeconds);
+    QTest::mouseMove(&widget, start + QPoint(0, -10));
+    // Inside the gate: the view drops this move, and the pointer then rests.
+    const QPoint rest = start + QPoint(0, -40);
+    QTest::mouseMove(&widget, rest);
+    clock.advance(kStepSeconds);
+    QTest::qWait(100);  // the widget hands the last move over again
+    QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, rest);
+    drawFrame();
+    EXPECT_NEAR(widgetPointOf(key).y(), rest.y(), kPointerPixels) << "the keypoint stopped short of the pointer";
 }
 
 TEST_F(CurveViewWidgetMouseTest, press_and_release_without_moving__changes_nothing_and_records_no_step) {
