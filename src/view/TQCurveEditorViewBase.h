@@ -553,6 +553,9 @@ private:
     // Scratch of drawPoints: the handles of a large selection, sorted, so that each keypoint
     // is looked up in it by bisection instead of by a walk of the whole selection.
     std::vector<TQKeyframeHandle> _selectedHandleScratch;
+    // Scratch of select: the records of every channel's keypoints, kept between the steps of
+    // a rubber band.
+    std::vector<HXDHitRecord> _bandHitScratch;
     // Expires with the view, so that a delayed redraw scheduled by a frame never calls a
     // dead view.
     std::shared_ptr<char> _lifeToken = std::make_shared<char>(0);

@@ -53,12 +53,15 @@ void TQCurveEditorViewBase::select() {
     const HXDHitTestContext context =
         _renderController->renderingContextForHitTestInRect(CGRectMake(lo.x, lo.y, hi.x - lo.x, hi.y - lo.y));
 
-    std::vector<HXDHitRecord> hits;
+    std::vector<HXDHitRecord>& hits = _bandHitScratch;
+    hits.clear();
     for (const auto& [channelId, quads] : _keypointsPrimitives) {
         std::vector<HXDHitRecord> part = _renderController->newHitTestResultForPrimitives(quads, context, false);
         hits.insert(hits.end(), std::make_move_iterator(part.begin()), std::make_move_iterator(part.end()));
     }
     if (!hits.empty()) processHits(hits, 1);
+    // The records keep their primitives alive: they are not held past the test.
+    hits.clear();
 }
 
 void TQCurveEditorViewBase::processHits(const std::vector<HXDHitRecord>& hits, char keyframesOnly) {
@@ -163,15 +166,13 @@ void TQCurveEditorViewBase::validateSelectedHandles(TQCurveSelectionList* list) 
         const TQCurveEditorItemPtr item = set->itemWithIdentifier(entry->getCurveId());
         TQChannel* channel = item ? item->channel() : nullptr;
         if (!channel) continue;
-        // Only time is compared: the value may have changed since the list was saved.
-        for (TQKeyframeHandle handle : channel->getKeyframes(false)) {
-            CMTime keyTime = kCMTimeInvalid;
-            if (!channel->getKeyframe(handle, &keyTime, nullptr)) continue;
-            if (CMTimeCompare(keyTime, time) != 0) continue;
-            entry->setHandle(handle);
-            _selection->addSelection(entry);
-            break;
-        }
+        // Only time is compared, exactly: the value may have changed since the list was
+        // saved. The channel's own lookup by time keeps a large list from walking every
+        // keyframe once per entry.
+        const TQKeyframeHandle handle = channel->getKeyframe(time);
+        if (!handle) continue;
+        entry->setHandle(handle);
+        _selection->addSelection(entry);
     }
     setNeedsDisplay(1);
 }

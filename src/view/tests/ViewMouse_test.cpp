@@ -204,6 +204,31 @@ TEST_F(ViewMouseEdit, click__commandFlattensOptionOnACurveAddsAKeypoint) {
     }
 }
 
+TEST_F(ViewMouseEdit, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
+    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.25}});
+    const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
+    RWScriptedModal modal;
+    RWServiceSet services;
+    services.modal = &modal;
+    RWInstallServices(services);
+    modal.pushScript([](RWWindow& window, RWModalService& m) {
+        static_cast<TQCurveEditorValueWindow&>(window).value = 0.75;
+        m.stopModalWithCode(RWModalResponseOK);
+    });
+    ASSERT_TRUE(frame());
+    down(5.0, 0.25);
+    up(5.0, 0.25);
+    click(5.0, 0.25, 0, 2);
+    RWResetServices();
+
+    EXPECT_EQ(modal.runs().size(), 1u) << "the second click of the pair opens the panel";
+    EXPECT_NEAR(keyValueAt(item->channel(), 5.0), 0.75, kValueTolerance) << "the typed value is set";
+    EXPECT_EQ(host.undoStack().undoCount(), 1u);
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Keypoint"));
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(*item->channel() == *before) << "the step holds what was typed";
+}
+
 TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
     auto item = linearItem("A", {{2.0, 0.0}, {8.0, 0.0}});
     ASSERT_TRUE(frame());
