@@ -28,6 +28,7 @@ public:
     TQCurveEditorViewBase& curveView() { return _view; }
     TQQtCurveViewWidget* curveWidget() const { return _curveWidget; }
     TQQtEditMenu* editMenu() const { return _editMenu; }
+    QListWidget* objectList() const { return _objectList; }
 
     // Fits the shown curves into the view, in value and in time.
     void frameAll();

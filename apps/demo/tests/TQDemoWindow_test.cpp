@@ -1,0 +1,148 @@
+// The demo window end to end: the object chooser drives what the view shows, a drag through
+// the curve widget changes the shown object's channels as one named step that the Edit menu
+// offers, and the menu's Undo gives every channel back exactly.
+#include <gtest/gtest.h>
+
+#include <QListWidget>
+#include <QTest>
+
+#include <cmath>
+#include <memory>
+#include <vector>
+
+#include "apps/demo/TQDemoWindow.h"
+#include "platform/ui/testing/RWTestDoubles.h"
+#include "qt/TQQtCurveViewWidget.h"
+
+namespace {
+
+constexpr double kStepSeconds = 0.05;  // past the view's 1/30 s gate
+
+class DemoWindowTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        window.curveView().setClock(&clock);
+        window.curveView().setTimer(&timer);
+        window.show();
+        settle();
+        drawFrame();
+        ASSERT_GE(window.curveWidget()->framesDrawn(), 1) << "the window drew no frame";
+    }
+    void TearDown() override {
+        window.curveView().setClock(nullptr);
+        window.curveView().setTimer(nullptr);
+    }
+    static void settle() {
+        for (int i = 0; i < 20; ++i) QCoreApplication::processEvents();
+    }
+    void drawFrame() {
+        clock.advance(kStepSeconds);
+        window.curveWidget()->repaint();
+    }
+
+    // Copies of the channels the view shows, in the set's order.
+    std::vector<std::unique_ptr<TQChannelBase>> snapshot() {
+        std::vector<std::unique_ptr<TQChannelBase>> out;
+        for (TQChannel* channel : shownChannels()) out.emplace_back(channel->cloneChannel());
+        return out;
+    }
+    std::vector<TQChannel*> shownChannels() {
+        std::vector<TQChannel*> out;
+        TQDemoCurveEditorCtrl& controller = window.controller();
+        for (uint32_t i = 0; i < controller.numberOfChannelItems(); ++i)
+            if (TQChannel* c = controller.selectedCurveSet()->channeItemAtIndex(i)->channel()) out.push_back(c);
+        return out;
+    }
+    // How many shown channels differ from the snapshot (a channel gone counts as different).
+    size_t changedCount(const std::vector<std::unique_ptr<TQChannelBase>>& before) {
+        const std::vector<TQChannel*> now = shownChannels();
+        size_t changed = now.size() == before.size() ? 0 : 1;
+        for (size_t i = 0; i < std::min(now.size(), before.size()); ++i)
+            if (!(*now[i] == *before[i])) ++changed;
+        return changed;
+    }
+    // A keyframe of the first shown channel, in the curve widget's coordinates.
+    QPoint keypointInWidget() {
+        TQDemoCurveEditorCtrl& controller = window.controller();
+        const TQCurveEditorItemPtr item = controller.selectedCurveSet()->channeItemAtIndex(0);
+        TQChannel* channel = item ? item->channel() : nullptr;
+        if (!channel || channel->numberOfKeyframes() == 0) return QPoint(-1, -1);
+        const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+        CMTime t = kCMTimeInvalid;
+        double v = 0.0;
+        channel->getKeyframe(keys[keys.size() / 2], &t, &v);
+        const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
+        const CGPoint s =
+            window.curveView().getPointScreen(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
+        const double ratio = window.curveWidget()->devicePixelRatioF();
+        return QPoint(static_cast<int>(std::lround(s.x / ratio)),
+                      static_cast<int>(std::lround(window.curveWidget()->height() - s.y / ratio)));
+    }
+
+    RWManualClock clock;
+    RWManualTimer timer{clock};
+    TQDemoWindow window;
+};
+
+TEST_F(DemoWindowTest, start__shows_the_selected_object_and_lists_every_object) {
+    const std::vector<TQChannelObjectRootBase*> objects = window.host().scene().objects();
+    ASSERT_FALSE(objects.empty());
+    EXPECT_EQ(window.objectList()->count(), static_cast<int>(objects.size())) << "one row per object";
+    EXPECT_EQ(window.controller().shownObject(), objects.front()) << "the sample scene selects its first object";
+    EXPECT_GT(window.controller().numberOfChannelItems(), 1u) << "the object's keyframed channels are shown";
+    EXPECT_FALSE(window.editMenu()->undoAction()->isEnabled()) << "a fresh scene has nothing to undo";
+}
+
+TEST_F(DemoWindowTest, choosing_an_object__selects_it_in_the_scene_and_shows_its_curves) {
+    const std::vector<TQChannelObjectRootBase*> objects = window.host().scene().objects();
+    ASSERT_GE(objects.size(), 2u);
+    window.objectList()->setCurrentRow(1);
+    EXPECT_TRUE(window.host().isObjectSelected(objects[1])) << "the list must select the object in the scene";
+    EXPECT_EQ(window.controller().shownObject(), objects[1]) << "the view must follow the scene's selection";
+    for (TQChannel* channel : shownChannels())
+        EXPECT_EQ(window.host().scene().objectOf(channel), objects[1]) << "a curve of another object is shown";
+
+    // And the other way: the scene selects, the list follows.
+    window.host().selectObject(objects[0]);
+    EXPECT_EQ(window.controller().shownObject(), objects[0]);
+    EXPECT_TRUE(window.objectList()->item(0)->isSelected()) << "the list must show the scene's selection";
+}
+
+TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_channel_exactly) {
+    const auto before = snapshot();
+    const QPoint start = keypointInWidget();
+    ASSERT_TRUE(window.curveWidget()->rect().contains(start)) << "the keypoint is off screen";
+    TQQtCurveViewWidget* widget = window.curveWidget();
+    QTest::mousePress(widget, Qt::LeftButton, Qt::NoModifier, start);
+    for (int step = 1; step <= 10; ++step) {
+        clock.advance(kStepSeconds);
+        QTest::mouseMove(widget, start + QPoint(0, -3 * step));
+    }
+    QTest::mouseRelease(widget, Qt::LeftButton, Qt::NoModifier, start + QPoint(0, -30));
+
+    EXPECT_EQ(changedCount(before), 1u) << "the drag must change exactly the dragged channel";
+    QAction* undo = window.editMenu()->undoAction();
+    EXPECT_TRUE(undo->isEnabled()) << "the Edit menu must follow the host's history without being opened";
+    EXPECT_EQ(undo->text().toStdString(), "Undo Move Keypoint");
+    EXPECT_EQ(window.host().undoStack().undoCount(), 1u) << "ten drag steps are one undo step";
+
+    // The curves are drawn clean; the undo must leave the restored one to be sampled again.
+    drawFrame();
+    const std::vector<TQChannel*> shown = shownChannels();
+    size_t dragged = 0;
+    while (dragged < shown.size() && *shown[dragged] == *before[dragged]) ++dragged;
+    ASSERT_LT(dragged, shown.size());
+    const TQCurveEditorItemPtr item = window.controller().selectedCurveSet()->channeItemAtIndex(
+        static_cast<uint32_t>(dragged));
+
+    undo->trigger();
+    EXPECT_EQ(changedCount(before), 0u) << "Undo must give back every channel exactly";
+    auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
+    ASSERT_NE(channelItem, nullptr);
+    EXPECT_TRUE(channelItem->originalCurveDirty()) << "the restored curve would be drawn from stale samples";
+    EXPECT_EQ(window.editMenu()->redoAction()->text().toStdString(), "Redo Move Keypoint");
+    window.editMenu()->redoAction()->trigger();
+    EXPECT_EQ(changedCount(before), 1u) << "Redo must apply the drag again";
+}
+
+}  // namespace
