@@ -440,6 +440,9 @@ protected:
     void takeHorizontalFromDisplayRange();
     // One drag step of the rubber band by a pointer movement in backing pixels (dy up).
     void rubberBandStep(double dx, double dy, uint64_t modifierFlags);
+    // The Shift band: _selection becomes _previousSelection with the membership of the
+    // keypoints in _currentSelection inverted; joiners go to the front or the back.
+    void invertBandMembership(bool joinAtFront);
     // An event's location in drawable pixels of this view (y up), and in backing pixels of
     // the window (the source of drag deltas).
     CGPoint drawablePointOfEvent(const RWEvent& event) const;
@@ -556,6 +559,11 @@ private:
     // Scratch of select: the records of every channel's keypoints, kept between the steps of
     // a rubber band.
     std::vector<HXDHitRecord> _bandHitScratch;
+    // Scratch of invertBandMembership: sorted keys of the selection at mouse down and of the
+    // covered keypoints that leave it.
+    std::vector<std::pair<uintptr_t, uint64_t>> _bandKeyScratch;
+    std::vector<std::pair<uintptr_t, uint64_t>> _bandLeavingScratch;
+    std::vector<TQCurveSelectionPtr> _bandJoiningScratch;
     // Expires with the view, so that a delayed redraw scheduled by a frame never calls a
     // dead view.
     std::shared_ptr<char> _lifeToken = std::make_shared<char>(0);

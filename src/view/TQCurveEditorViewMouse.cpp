@@ -347,7 +347,8 @@ void TQCurveEditorViewBase::mouseDraggedEdit(const RWEvent& event) {
         return;
     }
 
-    TQCurveSelectionPtr e = selection->selectionAtIndex(0);
+    const TQCurveSelectionPtr e = selection->selectionAtIndex(0);
+    if (!e) return;  // a list given a null entry from outside: nothing to drag
     if (_startDrag) prepareItemsForDrag();
 
     // The scroll band: how far the dragged keypoints (or the pointer) would go past the

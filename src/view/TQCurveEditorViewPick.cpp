@@ -69,6 +69,10 @@ void TQCurveEditorViewBase::processHits(const std::vector<HXDHitRecord>& hits, c
     _currentActivePart = 0;
     const uint32_t tool = _controller ? _controller->getCurrentTool() : 0;
     const TQCurveSetPtr set = _controller ? _controller->selectedCurveSet() : nullptr;
+    // A band's records come channel by channel: the item of the last record is looked up
+    // again only when the channel changes, not once per keypoint.
+    uint32_t lastCurveId = 0;
+    TQCurveEditorItemPtr lastItem;
 
     for (const HXDHitRecord& record : hits) {
         // The other tools take no entries from a click; the box tool takes the part it hit
@@ -84,7 +88,12 @@ void TQCurveEditorViewBase::processHits(const std::vector<HXDHitRecord>& hits, c
         if (!(isKeypoint || ((isCurve || isTangent) && !keyframesOnly))) continue;
 
         // A frame older than the curve set may name items that are gone.
-        const TQCurveEditorItemPtr item = set ? set->itemWithIdentifier(recordCurveId(record)) : nullptr;
+        const uint32_t curveId = recordCurveId(record);
+        if (!lastItem || curveId != lastCurveId) {
+            lastItem = set ? set->itemWithIdentifier(curveId) : nullptr;
+            lastCurveId = curveId;
+        }
+        const TQCurveEditorItemPtr& item = lastItem;
         if (!item) continue;
 
         auto entry = std::make_shared<TQCurveSelection>();
@@ -126,28 +135,53 @@ void TQCurveEditorViewBase::rubberBandStep(double dx, double dy, uint64_t modifi
 
     select();
     _selection->reset();
-    if (!(modifierFlags & RWEventModifierFlagShift)) {
+    if (!(modifierFlags & RWEventModifierFlagShift))
         _selection->setSelection(*_currentSelection);
-    } else {
-        // Shift inverts the membership of what the band covers, against the selection at
-        // mouse down; the direction of this step decides at which end new keypoints join.
-        _selection->setSelection(*_previousSelection);
-        for (const TQCurveSelectionPtr& entry : _currentSelection->getSelectionArray()) {
-            if (!entry || !entry->isKeypoint()) continue;
-            if (_previousSelection->isSelection(*entry))
-                _selection->delSelection(*entry);
-            else if (ax >= 0.0)
-                _selection->addSelection(entry);
-            else
-                _selection->addSelectionFront(entry);
-        }
-    }
+    else
+        invertBandMembership(ax < 0.0);
     if (_controller) _controller->selectionChangedTo(_selection.get());
     _currentSelection->reset();
 
     updateDrag(ax, -ay);
     setNeedsDisplay(1);
     _startDrag = 0;
+}
+
+void TQCurveEditorViewBase::invertBandMembership(bool joinAtFront) {
+    // Shift inverts the membership of what the band covers, against the selection at mouse
+    // down: a covered keypoint that was selected leaves (with every entry equal to it), one
+    // that was not joins. Each addSelectionFront puts the entry before the previous one, so
+    // front joiners end up in reverse order. Membership is tested against sorted keys, so a
+    // band over thousands of keypoints costs a sort per step, not a walk per keypoint.
+    // What isEqual compares; the handle as an integer, which orders totally.
+    using Key = std::pair<uintptr_t, uint64_t>;
+    auto keyOf = [](const TQCurveSelection& e) { return Key{reinterpret_cast<uintptr_t>(e.getHandle()), e.getFlags()}; };
+    std::vector<Key>& before = _bandKeyScratch;
+    before.clear();
+    for (const TQCurveSelectionPtr& entry : _previousSelection->getSelectionArray())
+        if (entry) before.push_back(keyOf(*entry));
+    std::sort(before.begin(), before.end());
+
+    std::vector<Key>& leaving = _bandLeavingScratch;
+    leaving.clear();
+    std::vector<TQCurveSelectionPtr>& joining = _bandJoiningScratch;
+    joining.clear();
+    for (const TQCurveSelectionPtr& entry : _currentSelection->getSelectionArray()) {
+        if (!entry || !entry->isKeypoint()) continue;
+        if (std::binary_search(before.begin(), before.end(), keyOf(*entry)))
+            leaving.push_back(keyOf(*entry));
+        else
+            joining.push_back(entry);
+    }
+    std::sort(leaving.begin(), leaving.end());
+
+    std::vector<TQCurveSelectionPtr>& out = _selection->getSelectionArray();
+    out.reserve(_previousSelection->size() + joining.size());
+    if (joinAtFront) out.insert(out.end(), joining.rbegin(), joining.rend());
+    for (const TQCurveSelectionPtr& entry : _previousSelection->getSelectionArray())
+        if (!entry || !std::binary_search(leaving.begin(), leaving.end(), keyOf(*entry))) out.push_back(entry);
+    if (!joinAtFront) out.insert(out.end(), joining.begin(), joining.end());
+    joining.clear();  // holds no entry past the step
 }
 
 // ---- Selection care ------------------------------------------------------------------------

@@ -188,13 +188,6 @@ TEST_F(ViewMouseEdit, click__commandFlattensOptionOnACurveAddsAKeypoint) {
         EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Add keypoint"));
     }
     {
-        // A plain click on the curve selects the curve.
-        ASSERT_TRUE(frame());
-        click(3.5, 0.25);
-        ASSERT_EQ(view.getSelection()->size(), 1u);
-        EXPECT_TRUE(view.getSelection()->selectionAtIndex(0)->isCurve());
-    }
-    {
         c->setInterpolation(kTQInterpolationBezier);
         ASSERT_TRUE(frame());
         click(5.0, 0.5, kCommand);
@@ -251,31 +244,6 @@ TEST_F(ViewMouseEdit, drag__pastTheRightEdgePansByTheOverrun) {
     ASSERT_EQ(range().offsets.size(), 1u) << "one horizontal pan";
     EXPECT_NEAR(range().offsets[0], 0.5, kDragTolerance) << "by the overrun of 40 px";
     up(10.5, 0.0);
-}
-
-TEST_F(ViewMouseEdit, mouseUp__endsTheGhostAndRestoresTheSampleCount) {
-    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}});
-    ASSERT_TRUE(frame());
-    down(5.0, 0.0);
-    dragTo(5.5, 0.1);
-    EXPECT_TRUE(item->drawGhost()) << "a drag shows the ghost";
-    EXPECT_EQ(item->numberOfSamples(), 161u) << "and samples a fifth of the width";
-    up(5.5, 0.1);
-    EXPECT_FALSE(item->drawGhost());
-    EXPECT_EQ(item->numberOfSamples(), 801u);
-}
-
-TEST_F(ViewMouseEdit, keys__spaceRepeatArmsAndKeyUpEndsIt) {
-    EXPECT_FALSE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, " ")))
-        << "a first, non-repeated space is passed on";
-    EXPECT_TRUE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, " ", 0, 49, true)));
-    EXPECT_TRUE(view.space());
-    EXPECT_TRUE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
-    EXPECT_FALSE(view.space());
-    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyChannelsChanged});
-    EXPECT_TRUE(view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " ")));
-    EXPECT_TRUE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, "a"))) << "any key's release ends the mode";
-    EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, "a"))) << "without the mode a release is passed on";
 }
 
 }  // namespace
