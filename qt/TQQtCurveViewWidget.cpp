@@ -165,6 +165,19 @@ void TQQtCurveViewWidget::mouseReleaseEvent(QMouseEvent* event) {
     _view->mouseUp(*up);
 }
 
+bool TQQtCurveViewWidget::event(QEvent* event) {
+    if (event->type() == QEvent::ShortcutOverride && _view) {
+        auto* keyEvent = static_cast<QKeyEvent*>(event);
+        const RWEvent key = TQQtEvents::keyEvent(*keyEvent);
+        // Accepting the override keeps the key from the shortcuts: it arrives as a key press.
+        if (key.type() == RWEventType::KeyDown && _view->customKeyEquivalent(key)) {
+            event->accept();
+            return true;
+        }
+    }
+    return QWidget::event(event);
+}
+
 void TQQtCurveViewWidget::keyPressEvent(QKeyEvent* event) {
     if (_view) {
         const RWEvent key = TQQtEvents::keyEvent(*event);

@@ -12,8 +12,9 @@
 // of TQQtEvents (Ctrl is Command, Alt is Option). A press that follows the last one within the
 // platform's double-click interval, near where it was, counts one click more (2 for Qt's
 // double click, 3 for a third press...). Moves without a gesture under way, and the other
-// buttons, are not the edit tool's. Key presses go to the view first; keys it does not take
-// go on to the parent, so that window shortcuts still work.
+// buttons, are not the edit tool's. A key press is offered to the view's customKeyEquivalent
+// before any shortcut of the window (Qt's shortcut override), then to its keyDown; keys it
+// does not take go on to the parent, so that window shortcuts still work.
 //
 // The view takes at most one drag step per 1/30 s and drops the moves in between; the next
 // step makes up for them. So that a pointer that stops right after a dropped move still
@@ -62,6 +63,8 @@ protected:
     void mouseDoubleClickEvent(QMouseEvent* event) override;
     void mouseMoveEvent(QMouseEvent* event) override;
     void mouseReleaseEvent(QMouseEvent* event) override;
+    // Key equivalents: the view sees a key press before the window's shortcuts do.
+    bool event(QEvent* event) override;
     void keyPressEvent(QKeyEvent* event) override;
     void keyReleaseEvent(QKeyEvent* event) override;
 

@@ -115,7 +115,8 @@ RWEvent wheelEvent(const QWheelEvent& event, const TQQtViewHost& host) {
 }
 
 RWEvent keyEvent(const QKeyEvent& event) {
-    const bool press = event.type() == QEvent::KeyPress;
+    // A shortcut override is Qt's look at a key press before the shortcuts take it.
+    const bool press = event.type() == QEvent::KeyPress || event.type() == QEvent::ShortcutOverride;
     Qt::KeyboardModifiers modifiers = event.modifiers();
     if (const auto modifier = modifierOfKey(event.key())) {
         // Platforms differ on whether the state already holds the key being pressed.

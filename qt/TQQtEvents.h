@@ -36,8 +36,8 @@ std::optional<RWEvent> mouseEvent(const QMouseEvent& event, const TQQtViewHost& 
 // touchpad) gives its pixel deltas in points instead. Positive y scrolls up.
 RWEvent wheelEvent(const QWheelEvent& event, const TQQtViewHost& host);
 
-// A key press or release; a press or release of a modifier key alone becomes a
-// FlagsChanged event with the new modifier state.
+// A key press (also the shortcut override Qt sends before it) or release; a press or
+// release of a modifier key alone becomes a FlagsChanged event with the new modifier state.
 RWEvent keyEvent(const QKeyEvent& event);
 
 }  // namespace TQQtEvents

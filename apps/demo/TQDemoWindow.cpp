@@ -7,6 +7,7 @@
 #include <QSignalBlocker>
 #include <QSplitter>
 #include <QStatusBar>
+#include <QTimer>
 
 #include "host/TQHostSampleScene.h"
 #include "qt/TQQtCurveViewWidget.h"
@@ -64,7 +65,6 @@ TQDemoWindow::TQDemoWindow() {
     const CMTimeRange range = _host.displayRange();
     _view.setDisplayRange(&range.start, &range.duration);
     // The load posts its words before the view knows its range: show the selection again.
-    _controller.showObject(nullptr);
     const std::vector<TQChannelBase*> selected = _host.selectedObjectsRootChannels();
     _controller.showObject(selected.empty() ? nullptr : selected.front());
     refreshObjectList();
@@ -73,8 +73,10 @@ TQDemoWindow::TQDemoWindow() {
 }
 
 TQDemoWindow::~TQDemoWindow() {
-    // Qt deletes the child widgets after these members are gone: detach them first.
+    // Qt deletes the child widgets after these members are gone: detach them first, and
+    // let no signal of a dying child reach this window.
     _host.removeNotificationReceiver(this);
+    QObject::disconnect(_objectList, nullptr, this, nullptr);
     _curveWidget->setView(nullptr);
     _editMenu->setHistory(nullptr);
     _view.setController(nullptr);
@@ -103,6 +105,14 @@ void TQDemoWindow::buildMenus() {
     connect(frame, &QAction::triggered, this, [this] { frameAll(); });
 }
 
+void TQDemoWindow::showEvent(QShowEvent* event) {
+    QMainWindow::showEvent(event);
+    if (_framedOnce) return;
+    // Framing fits the curves to the view's size, which the layout settles after the show.
+    _framedOnce = true;
+    QTimer::singleShot(0, this, [this] { frameAll(); });
+}
+
 void TQDemoWindow::frameAll() {
     _view.frameAll(1);
     _view.setAllOriginalCurveDirty(1);
@@ -112,11 +122,25 @@ void TQDemoWindow::frameAll() {
 void TQDemoWindow::refreshObjectList() {
     _refreshingList = true;
     const QSignalBlocker blocker(_objectList);
-    _objectList->clear();
-    for (TQChannelObjectRootBase* object : _host.scene().objects()) {
-        auto* row = new QListWidgetItem(QString::fromStdString(object->getName()), _objectList);
-        row->setData(kObjectIdRole, static_cast<qulonglong>(object->getChannelId()));
-        if (object == _controller.shownObject()) row->setSelected(true);
+    const std::vector<TQChannelObjectRootBase*> objects = _host.scene().objects();
+    // The rows are kept when the objects are the same: this runs inside the list's own
+    // selection signal when the user picks a row, and its rows must not vanish under it.
+    bool same = _objectList->count() == static_cast<int>(objects.size());
+    for (int i = 0; same && i < _objectList->count(); ++i)
+        same = _objectList->item(i)->data(kObjectIdRole).toULongLong() == objects[static_cast<size_t>(i)]->getChannelId() &&
+               _objectList->item(i)->text() == QString::fromStdString(objects[static_cast<size_t>(i)]->getName());
+    if (!same) {
+        _objectList->clear();
+        for (TQChannelObjectRootBase* object : objects) {
+            auto* row = new QListWidgetItem(QString::fromStdString(object->getName()), _objectList);
+            row->setData(kObjectIdRole, static_cast<qulonglong>(object->getChannelId()));
+        }
+    }
+    const TQChannelObjectRootBase* shown = _controller.shownObject();
+    for (int i = 0; i < _objectList->count(); ++i) {
+        const bool isShown = shown && objects[static_cast<size_t>(i)] == shown;
+        _objectList->item(i)->setSelected(isShown);
+        if (isShown) _objectList->setCurrentRow(i, QItemSelectionModel::Current);
     }
     _refreshingList = false;
 }

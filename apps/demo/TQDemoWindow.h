@@ -45,6 +45,9 @@ public:
     bool undo() override { return _controller.undo(); }
     bool redo() override { return _controller.redo(); }
 
+protected:
+    void showEvent(QShowEvent* event) override;
+
 private:
     void buildMenus();
     // The list shows the scene's objects, the scene's selected object selected.
@@ -61,4 +64,5 @@ private:
     TQQtCurveViewWidget* _curveWidget = nullptr;
     TQQtEditMenu* _editMenu = nullptr;
     bool _refreshingList = false;
+    bool _framedOnce = false;
 };

@@ -58,8 +58,6 @@ int main(int argc, char** argv) {
     if (screenshot.isEmpty()) return QApplication::exec();
 
     settle(kSettleMilliseconds);
-    window.frameAll();
-    settle(kSettleMilliseconds);
     const QPixmap image = window.grab();
     if (image.isNull() || !image.save(screenshot, "PNG")) {
         std::fprintf(stderr, "vce_demo: could not write %s\n", screenshot.toLocal8Bit().constData());

@@ -193,4 +193,15 @@ TEST_F(CurveViewWidgetMouseTest, double_click_on_the_curve__adds_one_keypoint_as
     EXPECT_EQ(host.undoStack().undoCount(), 1u) << "the added keypoint is one undo step";
 }
 
+TEST_F(CurveViewWidgetMouseTest, space_bar__arms_on_the_first_press_and_ends_on_release) {
+    // Shortcut overrides go to the focus object of the active window.
+    widget.activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&widget)) << "the offscreen window did not become active";
+    widget.setFocus();
+    QTest::keyPress(&widget, Qt::Key_Space);
+    EXPECT_EQ(view.space(), 1) << "the first space press must reach the view as a key equivalent";
+    QTest::keyRelease(&widget, Qt::Key_Space);
+    EXPECT_EQ(view.space(), 0) << "the release must end the space-bar mode";
+}
+
 }  // namespace
