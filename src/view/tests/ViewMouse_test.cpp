@@ -235,15 +235,41 @@ TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
     EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Curve"));
 }
 
-TEST_F(ViewMouseEdit, drag__pastTheRightEdgePansByTheOverrun) {
+TEST_F(ViewMouseEdit, drag__intoTheEdgeBandZoomsOrPans) {
     auto item = linearItem("A", {{2.0, 0.0}, {9.5, 0.0}});
-    view.setAutoZoom(0);  // auto-pan on
-    ASSERT_TRUE(frame());
-    down(9.5, 0.0);
-    dragTo(10.5, 0.0);  // 80 px beyond the right edge
-    ASSERT_EQ(range().offsets.size(), 1u) << "one horizontal pan";
-    EXPECT_NEAR(range().offsets[0], 0.5, kDragTolerance) << "by the overrun of 40 px";
-    up(10.5, 0.0);
+    const TQKeyframeHandle k2 = keyAt(item, 2.0);
+    {
+        // Auto-zoom: into the top 5 percent (above 0.9) asks for a refit at the next draw.
+        ASSERT_TRUE(frame());
+        down(2.0, 0.0);
+        dragTo(2.0, 0.5);
+        EXPECT_FALSE(view.needsAutoZoom());
+        dragTo(2.0, 0.95);
+        EXPECT_TRUE(view.needsAutoZoom());
+        EXPECT_TRUE(range().panned.empty()) << "auto-zoom does not pan";
+        up(2.0, 0.95);
+    }
+    view.setAutoZoom(0);  // auto-pan instead, on the volume of the fixture
+    view.setNeedsAutoZoom(0);
+    view.setCurrentViewVolume(CGRectMake(0.0, -1.0, 10.0, 2.0));
+    {
+        ASSERT_TRUE(frame());
+        down(9.5, 0.0);
+        dragTo(10.5, 0.0);  // 80 px right, ending 40 px past the edge
+        ASSERT_EQ(range().offsets.size(), 1u) << "one horizontal pan";
+        EXPECT_NEAR(range().offsets[0], 0.5, kDragTolerance) << "by the overrun, with no padding";
+        up(10.5, 0.0);
+    }
+    {
+        ASSERT_TRUE(frame());
+        const CGRect before = view.getCurrentViewVolume();
+        const auto [t, v] = keyOf(item, k2);
+        down(t, v);
+        dragTo(t, -0.95);  // 10 px into the bottom band of 20 px
+        EXPECT_NEAR(view.getCurrentViewVolume().origin.y, before.origin.y - 0.05, kDragTolerance)
+            << "the view scrolls down by the overrun";
+        up(t, -0.95);
+    }
 }
 
 }  // namespace
