@@ -90,6 +90,33 @@ uint32_t firstTrueNear(uint32_t n, uint32_t guess, Pred&& pred) {
 }
 }  // namespace
 
+bool monotoneYExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo,
+                          double& hi) {
+    if (vertices.size() < 2 || !(x0 <= x1)) return false;
+    const uint32_t segments = static_cast<uint32_t>(vertices.size() - 1);
+    const double head = vertices.front().start.x;
+    const double span = static_cast<double>(vertices.back().start.x) - head;
+    // Where x0 and x1 would fall if the samples were evenly spaced.
+    const auto guess = [&](double x) {
+        const double f = span > 0.0 ? (x - head) / span : 0.0;
+        if (!(f > 0.0)) return 0u;
+        return static_cast<uint32_t>(std::min(f, 1.0) * segments);
+    };
+    // Segment i meets [x0, x1] when x[i + 1] >= x0 and x[i] <= x1.
+    const uint32_t first =
+        firstTrueNear(segments, guess(x0), [&](uint32_t i) { return vertices[i + 1].start.x >= x0; });
+    const uint32_t end = firstTrueNear(segments, guess(x1), [&](uint32_t i) { return vertices[i].start.x > x1; });
+    if (first >= end) return false;
+    float minY = vertices[first].start.y, maxY = minY;
+    for (uint32_t v = first + 1; v <= end; ++v) {
+        minY = std::min(minY, vertices[v].start.y);
+        maxY = std::max(maxY, vertices[v].start.y);
+    }
+    lo = minY;
+    hi = maxY;
+    return true;
+}
+
 void PolylineIndex::fillBin(const std::vector<HXDLineVertex>& vertices, uint32_t k) {
     const uint32_t segments = static_cast<uint32_t>(vertices.size() - 1);
     // Sampled curves are close to uniform in x, so bin k's segments start near the same
@@ -330,6 +357,10 @@ HXDHitBounds HXDMultiline::hitBounds(float backingScale) const {
 }
 
 bool HXDMultiline::hitYExtentOverX(double x0, double x1, double& minY, double& maxY) const {
+    // A curve answers from its vertices, without building its bins: a frame's index asks
+    // every curve crossing the columns a pick reaches, and only the few near the point are
+    // then tested (and indexed) themselves.
+    if (_monotoneX && !_loop) return hxd_internal::monotoneYExtentOverX(_vertices, x0, x1, minY, maxY);
     return index().yExtentOverX(_vertices, x0, x1, minY, maxY);
 }
 

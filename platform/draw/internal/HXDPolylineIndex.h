@@ -20,6 +20,11 @@ struct HXDLineVertex;
 
 namespace hxd_internal {
 
+// For one run of finite vertices whose x never decreases: the y extent of the segments that
+// meet world x in [x0, x1] (exact); false when none does. Reads the vertices near the range
+// only, found by a search from where even spacing would put them.
+bool monotoneYExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo, double& hi);
+
 struct PolylineIndex {
     static constexpr uint32_t kNone = std::numeric_limits<uint32_t>::max();
     static constexpr uint32_t kUnfilled = kNone - 1;

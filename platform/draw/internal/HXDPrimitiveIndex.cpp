@@ -17,9 +17,22 @@ constexpr double kSlackPixels = 1.0;
 constexpr size_t kPrimitivesPerColumn = 32;
 constexpr size_t kMaxColumns = 4096;
 
+// Within single precision (with room for the reach's growth): beyond it a bound would round
+// to infinity, and such a primitive is left to every test instead.
+bool fits(double v) { return std::fabs(v) < 1e37; }
+
 bool finiteBox(const HXDHitBounds& b) {
-    return std::isfinite(b.minX) && std::isfinite(b.maxX) && std::isfinite(b.minY) && std::isfinite(b.maxY) &&
-           b.minX <= b.maxX && b.minY <= b.maxY;
+    return fits(b.minX) && fits(b.maxX) && fits(b.minY) && fits(b.maxY) && b.minX <= b.maxX && b.minY <= b.maxY;
+}
+
+float down(double v) {
+    const float f = static_cast<float>(v);
+    return static_cast<double>(f) > v ? std::nextafter(f, -std::numeric_limits<float>::infinity()) : f;
+}
+
+float up(double v) {
+    const float f = static_cast<float>(v);
+    return static_cast<double>(f) < v ? std::nextafter(f, std::numeric_limits<float>::infinity()) : f;
 }
 }  // namespace
 
@@ -64,27 +77,31 @@ void PrimitiveIndex::build(const HXDPrimitiveArray& primitives, float backingSca
     _backingScale = backingScale;
     _listBytes.resize(_count * sizeof(std::shared_ptr<HXDDrawPrimitive>));
     std::memcpy(_listBytes.data(), static_cast<const void*>(primitives.data()), _listBytes.size());
-    _pins.assign(primitives.begin(), primitives.end());
+    _pins.reserve(_count);
     _entries.reserve(_count);
 
     double lo = std::numeric_limits<double>::infinity();
     double hi = -lo;
     size_t placed = 0;  // boxes and spans
     for (uint32_t i = 0; i < _count; ++i) {
+        _pins.emplace_back(primitives[i]);  // in the same pass: the object's line is being read
         const HXDDrawPrimitive* p = primitives[i].get();
         if (!p) continue;
         p->markHitIndexed();
         const HXDHitBounds b = p->hitBounds(backingScale);
         if (b.kind == HXDHitBounds::Kind::Nowhere) continue;
-        Entry e{b.minX, b.minY, b.maxX, b.maxY, b.reach, i, Kind::Anywhere};
-        const bool spanned = b.kind == HXDHitBounds::Kind::XSpan && std::isfinite(b.minX) &&
-                             std::isfinite(b.maxX) && b.minX <= b.maxX;
+        Entry e{0.0f, 0.0f, 0.0f, 0.0f, 0.0f, i, Kind::Anywhere};
+        const bool spanned =
+            b.kind == HXDHitBounds::Kind::XSpan && fits(b.minX) && fits(b.maxX) && b.minX <= b.maxX;
         const bool boxed = b.kind == HXDHitBounds::Kind::Box && finiteBox(b);
-        if ((spanned || boxed) && std::isfinite(b.reach) && b.reach >= 0.0) {
+        if ((spanned || boxed) && b.reach >= 0.0 && b.reach < 1e6) {
             e.kind = spanned ? Kind::Span : Kind::Box;
-            lo = std::min(lo, b.minX);
-            hi = std::max(hi, b.maxX);
-            _maxReach = std::max(_maxReach, b.reach);
+            e.minX = down(b.minX), e.maxX = up(b.maxX);
+            if (boxed) e.minY = down(b.minY), e.maxY = up(b.maxY);
+            e.reach = up(b.reach);
+            lo = std::min(lo, static_cast<double>(e.minX));
+            hi = std::max(hi, static_cast<double>(e.maxX));
+            _maxReach = std::max(_maxReach, static_cast<double>(e.reach));
             ++placed;
             if (spanned) _spans.push_back(static_cast<uint32_t>(_entries.size()));
         } else {
@@ -117,14 +134,15 @@ void PrimitiveIndex::build(const HXDPrimitiveArray& primitives, float backingSca
     for (size_t c = 0; c < columns; ++c) counts[c + 1] += counts[c];
     _columnBoxes.resize(counts[columns]);
     for (size_t c = 0; c < columns; ++c) _columns[c].boxBegin = _columns[c].boxEnd = counts[c];
-    for (const Entry& e : _entries) {
+    for (uint32_t k = 0; k < _entries.size(); ++k) {
+        const Entry& e = _entries[k];
         if (e.kind != Kind::Box) continue;
         const uint32_t c0 = columnOf(e.minX), c1 = columnOf(e.maxX);
         if (c1 - c0 + 1 > wide) {
             _wideBoxes.push_back(e);
             continue;
         }
-        for (uint32_t c = c0; c <= c1; ++c) _columnBoxes[_columns[c].boxEnd++] = e;
+        for (uint32_t c = c0; c <= c1; ++c) _columnBoxes[_columns[c].boxEnd++] = k;
     }
 }
 
@@ -156,8 +174,8 @@ void PrimitiveIndex::fillSpans(const HXDPrimitiveArray& primitives, uint32_t col
         double minY = 0.0, maxY = 0.0;
         if (!primitives[e.index]->hitYExtentOverX(from, to, minY, maxY)) continue;
         Entry part = e;
-        part.minY = minY;
-        part.maxY = maxY;
+        part.minY = down(minY);
+        part.maxY = up(maxY);
         _columnSpans.push_back(part);
     }
     col.spanEnd = static_cast<uint32_t>(_columnSpans.size());
@@ -201,8 +219,10 @@ std::span<const uint32_t> PrimitiveIndex::candidates(const HXDPrimitiveArray& pr
     for (uint32_t c = c0; c <= c1; ++c) {
         if (!_columns[c].spansFilled) fillSpans(primitives, c);
         const Column& col = _columns[c];
-        for (uint32_t k = col.boxBegin; k < col.boxEnd; ++k)
-            if (q.meets(_columnBoxes[k])) _candidates.push_back(_columnBoxes[k].index);
+        for (uint32_t k = col.boxBegin; k < col.boxEnd; ++k) {
+            const Entry& e = _entries[_columnBoxes[k]];
+            if (q.meets(e)) _candidates.push_back(e.index);
+        }
         for (uint32_t k = col.spanBegin; k < col.spanEnd; ++k)
             if (q.meets(_columnSpans[k])) _candidates.push_back(_columnSpans[k].index);
     }

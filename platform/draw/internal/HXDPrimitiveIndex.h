@@ -56,9 +56,11 @@ public:
 
 private:
     enum class Kind : uint8_t { Anywhere, Box, Span };
+    // Single precision, rounded outward: half the memory a frame's build writes and a test
+    // reads, and never a bound tighter than the shape's.
     struct Entry {
-        double minX, minY, maxX, maxY;
-        double reach;  // drawable pixels
+        float minX, minY, maxX, maxY;
+        float reach;  // drawable pixels
         uint32_t index;
         Kind kind;
     };
@@ -97,7 +99,7 @@ private:
     double _columnWidth = 0.0;
     double _invColumnWidth = 0.0;
     std::vector<Column> _columns;
-    std::vector<Entry> _columnBoxes;
+    std::vector<uint32_t> _columnBoxes;  // positions in _entries
     std::vector<Entry> _columnSpans;
 
     std::vector<uint32_t> _candidates;  // reused by every test
