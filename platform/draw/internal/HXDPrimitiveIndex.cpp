@@ -179,6 +179,12 @@ void PrimitiveIndex::fillSpans(const HXDPrimitiveArray& primitives, uint32_t col
         _columnSpans.push_back(part);
     }
     col.spanEnd = static_cast<uint32_t>(_columnSpans.size());
+    // By their lower edge, so that a test starts near its own height: curves drawn in bands
+    // are hundreds to a column, and a pick is near a few.
+    const auto first = _columnSpans.begin() + col.spanBegin;
+    std::sort(first, _columnSpans.end(), [](const Entry& a, const Entry& b) { return a.minY < b.minY; });
+    for (auto e = first; e != _columnSpans.end(); ++e)
+        col.tallestSpan = std::max(col.tallestSpan, static_cast<double>(e->maxY) - static_cast<double>(e->minY));
 }
 
 std::span<const uint32_t> PrimitiveIndex::walkEntries(const Query& q) {
@@ -209,6 +215,7 @@ std::span<const uint32_t> PrimitiveIndex::candidates(const HXDPrimitiveArray& pr
     if (_columns.empty()) return walkEntries(q);
 
     const double g = (_maxReach + kSlackPixels) * q.perPixelX;
+    const double gy = (_maxReach + kSlackPixels) * q.perPixelY;
     const uint32_t c0 = columnOf(q.x0 - g), c1 = columnOf(q.x1 + g);
     // A band across much of the list: one pass over the compact entries beats the columns.
     if (c1 - c0 >= std::max<size_t>(8, _columns.size() / 8)) return walkEntries(q);
@@ -223,8 +230,13 @@ std::span<const uint32_t> PrimitiveIndex::candidates(const HXDPrimitiveArray& pr
             const Entry& e = _entries[_columnBoxes[k]];
             if (q.meets(e)) _candidates.push_back(e.index);
         }
-        for (uint32_t k = col.spanBegin; k < col.spanEnd; ++k)
-            if (q.meets(_columnSpans[k])) _candidates.push_back(_columnSpans[k].index);
+        // A span that meets the test reaches above y0 - gy, so its lower edge lies no lower
+        // than that by the tallest span's height; and none starting above y1 + gy meets it.
+        const Entry* const spans = _columnSpans.data();
+        const Entry* e = std::lower_bound(spans + col.spanBegin, spans + col.spanEnd, q.y0 - gy - col.tallestSpan,
+                                          [](const Entry& a, double y) { return a.minY < y; });
+        for (; e != spans + col.spanEnd && e->minY <= q.y1 + gy; ++e)
+            if (q.meets(*e)) _candidates.push_back(e->index);
     }
     // The exact tests run in list order, as a walk would; a primitive filed in several
     // columns is found once per column.

@@ -66,7 +66,8 @@ private:
     };
     struct Column {
         uint32_t boxBegin = 0, boxEnd = 0;    // in _columnBoxes
-        uint32_t spanBegin = 0, spanEnd = 0;  // in _columnSpans, once filled
+        uint32_t spanBegin = 0, spanEnd = 0;  // in _columnSpans by minY, once filled
+        double tallestSpan = 0.0;             // the greatest maxY - minY among them
         bool spansFilled = false;
     };
     // The query of one test: its world rectangle and the world size of a pixel.
