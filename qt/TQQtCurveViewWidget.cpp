@@ -111,14 +111,30 @@ void TQQtCurveViewWidget::beginGesture(QMouseEvent* event, bool doubleClick) {
     const std::optional<RWEvent> down = TQQtEvents::mouseEvent(*event, _host, _clickCount);
     if (!down) return;
     event->accept();
+    // A gesture whose release never came (it went to a window that was modal then) ends
+    // before the next one starts, so that the view is never left with its button down.
+    if (_leftGesture) endGesture(*down);
     _dragRepeat.stop();
     _lastDrag.reset();
     _leftGesture = true;
     _view->mouseDown(*down);
+    // The press may have run a modal panel (a double click types a value) during which the
+    // button came up: that release went to the panel, so it is made up for here.
+    if (_view && _leftGesture && !(QGuiApplication::mouseButtons() & Qt::LeftButton)) endGesture(*down);
 }
 
+void TQQtCurveViewWidget::endGesture(const RWEvent& at) {
+    _leftGesture = false;
+    _dragRepeat.stop();
+    _lastDrag.reset();
+    if (!_view) return;
+    _view->mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, at.locationInWindow(), at.modifierFlags(),
+                                       at.clickCount(), at.timestamp()));
+}
+
+
 void TQQtCurveViewWidget::mousePressEvent(QMouseEvent* event) {
-    if (!_view || event->button() != Qt::LeftButton || _leftGesture) {
+    if (!_view || event->button() != Qt::LeftButton) {
         QWidget::mousePressEvent(event);
         return;
     }
@@ -126,7 +142,7 @@ void TQQtCurveViewWidget::mousePressEvent(QMouseEvent* event) {
 }
 
 void TQQtCurveViewWidget::mouseDoubleClickEvent(QMouseEvent* event) {
-    if (!_view || event->button() != Qt::LeftButton || _leftGesture) {
+    if (!_view || event->button() != Qt::LeftButton) {
         QWidget::mouseDoubleClickEvent(event);
         return;
     }

@@ -74,6 +74,8 @@ private:
     // A left press, counted as the click of a multi-click it may continue.
     void beginGesture(QMouseEvent* event, bool doubleClick);
     void repeatLastDrag();
+    // Ends the gesture in the view with a release where `at` happened.
+    void endGesture(const RWEvent& at);
 
     TQQtViewHost _host;
     TQQtPainterEncoder _encoder;

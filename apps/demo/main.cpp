@@ -12,6 +12,7 @@
 #include <cstdlib>
 
 #include "apps/demo/TQDemoWindow.h"
+#include "qt/TQQtModal.h"
 #include "qt/TQQtServices.h"
 
 namespace {
@@ -52,6 +53,9 @@ int main(int argc, char** argv) {
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("VantaCurveEditor Demo"));
     TQQtServiceInstaller services;
+    // The number panel of a double-clicked keypoint.
+    TQQtModalService modal;
+    modal.install();
 
     TQDemoWindow window;
     window.show();

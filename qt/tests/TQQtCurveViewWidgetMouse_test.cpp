@@ -193,6 +193,24 @@ TEST_F(CurveViewWidgetMouseTest, double_click_on_the_curve__adds_one_keypoint_as
     EXPECT_EQ(host.undoStack().undoCount(), 1u) << "the added keypoint is one undo step";
 }
 
+TEST_F(CurveViewWidgetMouseTest, press_while_a_gesture_is_open__ends_it_first) {
+    // The release of a drag can go astray (to a window that was modal meanwhile); the next
+    // press must not find the view still dragging with its undo step open.
+    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+    const QPoint start = widgetPointOf(keys[keys.size() / 2]);
+    QTest::mousePress(&widget, Qt::LeftButton, Qt::NoModifier, start);
+    clock.advance(kStepSeconds);
+    QTest::mouseMove(&widget, start + QPoint(0, -20));
+    ASSERT_TRUE(host.undoStack().isStepOpen()) << "the drag should have opened its step";
+
+    QMouseEvent press(QEvent::MouseButtonPress, QPointF(start), widget.mapToGlobal(QPointF(start)), Qt::LeftButton,
+                      Qt::LeftButton, Qt::NoModifier);
+    QCoreApplication::sendEvent(&widget, &press);
+    EXPECT_FALSE(host.undoStack().isStepOpen()) << "the lost release must be made up before the new press";
+    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "the first drag is one step";
+    QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, start);
+}
+
 TEST_F(CurveViewWidgetMouseTest, space_bar__arms_on_the_first_press_and_ends_on_release) {
     // Shortcut overrides go to the focus object of the active window.
     widget.activateWindow();

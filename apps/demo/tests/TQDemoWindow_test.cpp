@@ -3,7 +3,11 @@
 // offers, and the menu's Undo gives every channel back exactly.
 #include <gtest/gtest.h>
 
+#include <QDialogButtonBox>
+#include <QLineEdit>
 #include <QListWidget>
+#include <QPushButton>
+#include <QTimer>
 #include <QTest>
 
 #include <cmath>
@@ -13,6 +17,7 @@
 #include "apps/demo/TQDemoWindow.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "qt/TQQtCurveViewWidget.h"
+#include "qt/TQQtModal.h"
 
 namespace {
 
@@ -143,6 +148,39 @@ TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_c
     EXPECT_EQ(window.editMenu()->redoAction()->text().toStdString(), "Redo Move Keypoint");
     window.editMenu()->redoAction()->trigger();
     EXPECT_EQ(changedCount(before), 1u) << "Redo must apply the drag again";
+}
+
+TEST_F(DemoWindowTest, double_click_on_a_keypoint__types_its_value_in_the_panel_as_one_step) {
+    TQQtModalService modal;
+    modal.install();
+    const auto before = snapshot();
+    const QPoint at = keypointInWidget();
+    ASSERT_TRUE(window.curveWidget()->rect().contains(at)) << "the keypoint is off screen";
+    bool panelShown = false;
+    QTimer::singleShot(0, [&] {
+        QDialog* dialog = modal.activeDialog();
+        if (!dialog) return;
+        panelShown = true;
+        dialog->findChild<QLineEdit*>("value")->setText("12.5");
+        dialog->findChild<QDialogButtonBox*>()->button(QDialogButtonBox::Ok)->click();
+    });
+    QTest::mouseDClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
+    QTest::mouseRelease(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
+
+    ASSERT_TRUE(panelShown) << "a double click on a keypoint must open the value panel";
+    ASSERT_EQ(changedCount(before), 1u) << "the typed value must change the clicked keypoint's channel";
+    bool found = false;
+    for (TQChannel* channel : shownChannels()) {
+        const double scale = channel->getInfo()->displayScale;
+        for (TQKeyframeHandle h : channel->getKeyframes(false)) {
+            double v = 0.0;
+            if (channel->getKeyframe(h, nullptr, &v) && std::fabs(v * scale - 12.5) < 1e-9) found = true;
+        }
+    }
+    EXPECT_TRUE(found) << "no keypoint shows the typed value";
+    EXPECT_EQ(window.editMenu()->undoAction()->text().toStdString(), "Undo Move Keypoint");
+    window.editMenu()->undoAction()->trigger();
+    EXPECT_EQ(changedCount(before), 0u) << "Undo must take the typed value back";
 }
 
 }  // namespace
