@@ -137,6 +137,8 @@ void TQDemoWindow::refreshObjectList() {
         }
     }
     const TQChannelObjectRootBase* shown = _controller.shownObject();
+    setWindowTitle(shown ? tr("VantaCurveEditor Demo - %1").arg(QString::fromStdString(shown->getName()))
+                         : tr("VantaCurveEditor Demo"));
     for (int i = 0; i < _objectList->count(); ++i) {
         const bool isShown = shown && objects[static_cast<size_t>(i)] == shown;
         _objectList->item(i)->setSelected(isShown);
