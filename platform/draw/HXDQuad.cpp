@@ -18,6 +18,20 @@ void HXDQuadTexture::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingCo
 }
 
 namespace {
+// Whether a world rectangle lies clearly apart from the test, a pixel to spare, decided
+// without mapping it: short lists (a channel's keypoints under a rubber band) are walked, and
+// most of their quads are far from the test. Only where the mapping is axis-aligned, since
+// then a rectangle's pixel box is the rectangle mapped; otherwise the exact test decides.
+bool clearlyApart(const CGRect& world, const HXDHitTestContext& context) {
+    if (!context.mapping().isAxisAligned()) return false;
+    const CGRect q = context.worldQueryRect(1.0);
+    const double xa = world.origin.x, xb = xa + world.size.width;
+    const double ya = world.origin.y, yb = ya + world.size.height;
+    // A rectangle with a NaN edge is never hit by the exact test either, whatever this says.
+    return std::max(xa, xb) < q.origin.x || std::min(xa, xb) > q.origin.x + q.size.width ||
+           std::max(ya, yb) < q.origin.y || std::min(ya, yb) > q.origin.y + q.size.height;
+}
+
 bool alphaTested(const HXDQuadTexture& quad) {
     return quad.useTextureAlphaForHitTest() && quad.texture() && quad.texture()->width() > 0 &&
            quad.texture()->height() > 0;
@@ -41,6 +55,7 @@ bool HXDQuadTexture::opaqueAt(const CGRect& pixels, double px, double py) const 
 }
 
 float HXDQuadTexture::hitDistanceAtPoint(const HXDHitTestContext& context) const {
+    if (clearlyApart(_destinationRect, context)) return -1.0f;
     const CGRect pixels = context.mapping().worldRectToPixels(_destinationRect);
     const CGPoint p = context.point();
     if (!hxd_internal::rectContains(pixels, p.x, p.y)) return -1.0f;
@@ -49,6 +64,7 @@ float HXDQuadTexture::hitDistanceAtPoint(const HXDHitTestContext& context) const
 }
 
 bool HXDQuadTexture::intersectsRect(const HXDHitTestContext& context) const {
+    if (clearlyApart(_destinationRect, context)) return false;
     const CGRect pixels = context.mapping().worldRectToPixels(_destinationRect);
     const CGRect& r = context.rect();
     if (!hxd_internal::rectsMeet(pixels, r)) return false;
@@ -80,11 +96,13 @@ void HXDScreenspaceQuad::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderi
 }
 
 float HXDScreenspaceQuad::hitDistanceAtPoint(const HXDHitTestContext& context) const {
+    if (clearlyApart(_frame, context)) return -1.0f;
     const CGRect pixels = context.mapping().worldRectToPixels(_frame);
     const CGPoint p = context.point();
     return hxd_internal::rectContains(pixels, p.x, p.y) ? 0.0f : -1.0f;
 }
 
 bool HXDScreenspaceQuad::intersectsRect(const HXDHitTestContext& context) const {
+    if (clearlyApart(_frame, context)) return false;
     return hxd_internal::rectsMeet(context.mapping().worldRectToPixels(_frame), context.rect());
 }

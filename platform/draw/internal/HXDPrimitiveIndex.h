@@ -7,8 +7,10 @@
 // columns they cross when the index is built. Spans (multilines: a curve's x extent is known
 // from its ends, its y extent only from its vertices) are filed lazily: the first test that
 // reaches a column asks each span crossing it for its y extent there, which a curve answers
-// from a few of its own bins. So the first pick after a frame reads a few bins per curve, not
-// every vertex, and later picks in the same columns read compact entries only.
+// from the dozen vertices under the column, and keeps them by their lower edge. So the first
+// pick after a frame reads a few vertices per curve, not every vertex, and later picks in the
+// same columns read the compact entries near their height only. Boxes across more than an
+// eighth of the columns, and bands across many columns, are checked in one pass instead.
 //
 // Validity. Frames rebuild their lists; the index must notice any change without walking the
 // primitives. It keeps the bytes of the list's shared pointers (object and control block) and

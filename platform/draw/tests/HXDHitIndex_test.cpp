@@ -209,4 +209,30 @@ TEST_F(HitIndexFixture, primitive__geometryChangedAfterATestIsSeen) {
     EXPECT_EQ(pick(list, below).size(), 1u) << "the outline takes the line tolerance";
 }
 
+// Quads reject far tests in world space before mapping themselves: the edges must still
+// decide as the pixel test does.
+TEST_F(HitIndexFixture, quad__edgesDecideAsInPixels) {
+    const auto quad = std::make_shared<HXDScreenspaceQuad>(CGRectMake(6, 1, -2, 2), 1);  // negative width
+    const CGPoint lo = pixel(4, 1), hi = pixel(6, 3);
+    // Points go through single precision on the way in: a thousandth of a pixel inside a
+    // corner is on the quad, a hundredth outside is not.
+    constexpr double kJustIn = 0.001, kJustOff = 0.01;
+    for (const CGPoint edge : {lo, hi, CGPointMake(lo.x, hi.y), CGPointMake(hi.x, lo.y)}) {
+        const CGPoint in = CGPointMake(edge.x + (edge.x == lo.x ? kJustIn : -kJustIn),
+                                       edge.y + (edge.y == lo.y ? kJustIn : -kJustIn));
+        EXPECT_EQ(pick({quad}, in).size(), 1u) << "inside the corner at " << edge.x << ", " << edge.y;
+        const CGPoint off = CGPointMake(edge.x + (edge.x == lo.x ? -kJustOff : kJustOff), edge.y);
+        EXPECT_TRUE(pick({quad}, off).empty()) << "just beside the corner at " << edge.x << ", " << edge.y;
+        const CGRect band = CGRectMake(off.x, off.y, edge.x == lo.x ? -5.0 : 5.0, 1.0);
+        EXPECT_TRUE(controller.newHitTestResultForPrimitives({quad}, controller.renderingContextForHitTestInRect(band), false)
+                        .empty())
+            << "a band just beside the edge";
+        const CGRect touching = CGRectMake(edge.x, edge.y, edge.x == lo.x ? -5.0 : 5.0, 1.0);
+        EXPECT_EQ(controller.newHitTestResultForPrimitives({quad}, controller.renderingContextForHitTestInRect(touching), false)
+                      .size(),
+                  1u)
+            << "a band touching the edge";
+    }
+}
+
 }  // namespace
