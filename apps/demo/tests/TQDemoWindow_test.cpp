@@ -113,6 +113,26 @@ TEST_F(DemoWindowTest, choosing_an_object__selects_it_in_the_scene_and_shows_its
     EXPECT_TRUE(window.objectList()->item(0)->isSelected()) << "the list must show the scene's selection";
 }
 
+TEST_F(DemoWindowTest, shown_object_removed__the_view_empties_and_still_draws) {
+    TQChannelObjectRootBase* shown = window.controller().shownObject();
+    ASSERT_NE(shown, nullptr);
+    const int rows = window.objectList()->count();
+    // A keypoint of the object is selected when it goes.
+    const QPoint at = keypointInWidget();
+    QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
+    ASSERT_TRUE(window.host().removeObject(shown));
+
+    EXPECT_EQ(window.controller().shownObject(), nullptr) << "nothing is selected in the scene any more";
+    EXPECT_EQ(window.controller().numberOfChannelItems(), 0u) << "curves of a removed object are still shown";
+    EXPECT_EQ(window.curveView().getSelection()->size(), 0u) << "the selection still names the removed channels";
+    EXPECT_EQ(window.objectList()->count(), rows - 1) << "the list must lose the removed object's row";
+    const int frames = window.curveWidget()->framesDrawn();
+    drawFrame();
+    EXPECT_GT(window.curveWidget()->framesDrawn(), frames) << "the empty view must still draw";
+    QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);  // on nothing: no effect
+    EXPECT_FALSE(window.host().canUndo());
+}
+
 TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_channel_exactly) {
     const auto before = snapshot();
     const QPoint start = keypointInWidget();
