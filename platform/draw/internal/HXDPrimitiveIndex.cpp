@@ -16,6 +16,7 @@ constexpr double kSlackPixels = 1.0;
 // About this many boxed or spanned primitives per column: a pick reads two or three columns.
 constexpr size_t kPrimitivesPerColumn = 32;
 constexpr size_t kMaxColumns = 4096;
+constexpr size_t kPrefetchAhead = 8;
 
 // Within single precision (with room for the reach's growth): beyond it a bound would round
 // to infinity, and such a primitive is left to every test instead.
@@ -84,6 +85,9 @@ void PrimitiveIndex::build(const HXDPrimitiveArray& primitives, float backingSca
     double hi = -lo;
     size_t placed = 0;  // boxes and spans
     for (uint32_t i = 0; i < _count; ++i) {
+        // A frame's primitives are scattered and cold after the frame: ask for the ones a few
+        // steps ahead while this one is read, so that the misses overlap.
+        if (i + kPrefetchAhead < _count) __builtin_prefetch(primitives[i + kPrefetchAhead].get());
         _pins.emplace_back(primitives[i]);  // in the same pass: the object's line is being read
         const HXDDrawPrimitive* p = primitives[i].get();
         if (!p) continue;
