@@ -85,10 +85,6 @@ protected:
         CMTime t = kCMTimeInvalid;
         double v = 0.0;
         if (!channel->getKeyframe(handle, &t, &v)) return QPoint(-1, -1);
-        return widgetPointAt(t, v);
-    }
-    // Where a point of the channel (channel time and value) lies in the widget.
-    QPoint widgetPointAt(const CMTime& t, double v) const {
         const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
         const CGPoint screen = view.getPointScreen(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
         const double ratio = widget.devicePixelRatioF();
@@ -152,45 +148,6 @@ TEST_F(CurveViewWidgetMouseTest, drag_that_stops_after_a_dropped_move__still_end
     QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, rest);
     drawFrame();
     EXPECT_NEAR(widgetPointOf(key).y(), rest.y(), kPointerPixels) << "the keypoint stopped short of the pointer";
-}
-
-TEST_F(CurveViewWidgetMouseTest, press_and_release_without_moving__changes_nothing_and_records_no_step) {
-    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
-    const QPoint at = widgetPointOf(keys[keys.size() / 2]);
-    const std::unique_ptr<TQChannelBase> before(channel->cloneChannel());
-    QTest::mouseClick(&widget, Qt::LeftButton, Qt::NoModifier, at);
-    EXPECT_TRUE(*channel == *before) << "a click must not change the channel";
-    EXPECT_FALSE(host.canUndo()) << "a click must not leave an undo step";
-    EXPECT_EQ(view.getSelection()->size(), 1u) << "the click should have selected the keypoint";
-}
-
-TEST_F(CurveViewWidgetMouseTest, double_click_on_the_curve__adds_one_keypoint_as_one_step) {
-    // Zoomed in, two neighbouring keyframes far enough apart on screen that their midpoint is
-    // curve alone.
-    CGRect volume = view.getCurrentViewVolume();
-    volume.origin.x += volume.size.width * 0.375;
-    volume.size.width *= 0.25;
-    view.setCurrentViewVolume(volume);
-    view.setAllOriginalCurveDirty(1);
-    drawFrame();
-    const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
-    CMTime mid = kCMTimeInvalid;
-    for (size_t i = 0; i + 1 < keys.size() && !CMTIME_IS_NUMERIC(mid); ++i) {
-        const QPoint a = widgetPointOf(keys[i]), b = widgetPointOf(keys[i + 1]);
-        if (!widget.rect().contains(a) || !widget.rect().contains(b) || b.x() - a.x() < 40) continue;
-        CMTime ta = kCMTimeInvalid, tb = kCMTimeInvalid;
-        channel->getKeyframe(keys[i], &ta, nullptr);
-        channel->getKeyframe(keys[i + 1], &tb, nullptr);
-        mid = CMTimeMake((ta.value + tb.value) / 2, ta.timescale);
-    }
-    ASSERT_TRUE(CMTIME_IS_NUMERIC(mid)) << "no two neighbouring keyframes lie 40 pixels apart on screen";
-    const QPoint at = widgetPointAt(mid, channel->getCurveValue(mid));
-    const unsigned before = channel->numberOfKeyframes();
-
-    QTest::mouseDClick(&widget, Qt::LeftButton, Qt::NoModifier, at);
-
-    EXPECT_EQ(channel->numberOfKeyframes(), before + 1) << "a double click on the curve adds one keypoint";
-    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "the added keypoint is one undo step";
 }
 
 TEST_F(CurveViewWidgetMouseTest, press_while_a_gesture_is_open__ends_it_first) {

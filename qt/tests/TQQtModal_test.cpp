@@ -58,16 +58,9 @@ TEST_F(QtModalTest, value_panel__text_that_is_no_number_keeps_it_open_and_cancel
     EXPECT_NEAR(window.value, 2.5, kValueTolerance) << "a cancelled panel must not change the value";
 }
 
-TEST_F(QtModalTest, stop_calls__end_the_run_with_their_code) {
+TEST_F(QtModalTest, stop_and_unknown_windows__end_or_refuse_the_run) {
     EXPECT_EQ(runWith([this](QDialog&) { service.stopModalWithCode(42); }), 42);
-    EXPECT_EQ(runWith([this](QDialog&) { service.abortModal(); }), RWModalResponseAbort);
     service.stopModal();  // outside a run: nothing to stop, no failure
-}
-
-TEST_F(QtModalTest, window_without_a_dialog__is_an_aborted_run) {
-    RWWindow other;
-    other.setTitle("NoSuchPanel");
-    EXPECT_EQ(service.runModalForWindow(other), RWModalResponseAbort);
     RWWindow wrongKind;  // the value panel's title on a window that carries no value
     wrongKind.setTitle("TQCurveEditorValueView");
     EXPECT_EQ(service.runModalForWindow(wrongKind), RWModalResponseAbort);
