@@ -33,6 +33,27 @@ bool optionAndCommand(uint64_t flags) { return (flags & kOptionCommandMask) == k
 
 CMTime timeOfWorldX(double x) { return TQTarnTimeForChannelSeconds(x, kChannelTimescale); }
 
+// The channel items of a selection's entries. Entries of one curve usually follow each other,
+// so the lookup through the curve set runs again only when the curve changes.
+class ChannelItemLookup {
+public:
+    explicit ChannelItemLookup(const TQCurveEditorCtrlBase& controller) : _controller(controller) {}
+    TQCurveEditorChannelItem* operator()(uint32_t curveId) {
+        if (!_looked || curveId != _curveId) {
+            _item = _controller.channelItemWithIdentifier(curveId);
+            _curveId = curveId;
+            _looked = true;
+        }
+        return dynamic_cast<TQCurveEditorChannelItem*>(_item.get());
+    }
+
+private:
+    const TQCurveEditorCtrlBase& _controller;
+    TQCurveEditorItemPtr _item;
+    uint32_t _curveId = 0;
+    bool _looked = false;
+};
+
 }  // namespace
 
 // ---- Event geometry ------------------------------------------------------------------------
@@ -152,10 +173,10 @@ void TQCurveEditorViewBase::prepareItemsForDrag() {
     const bool snapshot = _controller->snapshotChannels();
     // A coarser curve while dragging; the next draw takes this count for the dirty curve.
     const auto dragSamples = static_cast<uint32_t>(bounds().size.width / 5.0 + 1.0);
+    ChannelItemLookup itemOf(*_controller);
     for (const TQCurveSelectionPtr& entry : _selection->getSelectionArray()) {
         if (!entry) continue;
-        auto* item = dynamic_cast<TQCurveEditorChannelItem*>(
-            _controller->channelItemWithIdentifier(entry->getCurveId()).get());
+        TQCurveEditorChannelItem* item = itemOf(entry->getCurveId());
         if (!item) continue;
         // Several entries of one curve take one snapshot: the ghost is on after the first.
         if ((!snapshot && !item->drawGhost()) || item->numberOfSamplesSnapshot() == 0)
@@ -173,10 +194,10 @@ void TQCurveEditorViewBase::restoreItemsAfterDrag() {
     // The view in points and not in backing pixels, as it has always been compared here.
     const double worldTop = getPointWorld(CGPointMake(0.0, b.size.height)).y;
     const double worldBottom = getPointWorld(CGPointZero).y;
+    ChannelItemLookup itemOf(*_controller);
     for (const TQCurveSelectionPtr& entry : _selection->getSelectionArray()) {
         if (!entry) continue;
-        auto* item = dynamic_cast<TQCurveEditorChannelItem*>(
-            _controller->channelItemWithIdentifier(entry->getCurveId()).get());
+        TQCurveEditorChannelItem* item = itemOf(entry->getCurveId());
         if (!item) continue;
         if (item->drawGhost() && !snapshot) item->setDrawGhost(0);
         item->setNumberOfSamples(fullSamples);
