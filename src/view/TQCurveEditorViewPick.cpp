@@ -73,6 +73,7 @@ void TQCurveEditorViewBase::processHits(const std::vector<HXDHitRecord>& hits, c
     // again only when the channel changes, not once per keypoint.
     uint32_t lastCurveId = 0;
     TQCurveEditorItemPtr lastItem;
+    bool looked = false;
 
     for (const HXDHitRecord& record : hits) {
         // The other tools take no entries from a click; the box tool takes the part it hit
@@ -89,9 +90,10 @@ void TQCurveEditorViewBase::processHits(const std::vector<HXDHitRecord>& hits, c
 
         // A frame older than the curve set may name items that are gone.
         const uint32_t curveId = recordCurveId(record);
-        if (!lastItem || curveId != lastCurveId) {
+        if (!looked || curveId != lastCurveId) {
             lastItem = set ? set->itemWithIdentifier(curveId) : nullptr;
             lastCurveId = curveId;
+            looked = true;
         }
         const TQCurveEditorItemPtr& item = lastItem;
         if (!item) continue;
