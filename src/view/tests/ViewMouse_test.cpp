@@ -2,6 +2,8 @@
 // constraint, one undo step per drag and none for a click, Command-drags that pull tangents,
 // the 1/30 s gate on drag steps, and the clicks that add, flatten and break.
 
+#include <cmath>
+
 #include "src/view/tests/ViewMouseFixture.h"
 
 namespace view_test {
@@ -220,6 +222,40 @@ TEST_F(ViewMouseEdit, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
     EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Keypoint"));
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(*item->channel() == *before) << "the step holds what was typed";
+}
+
+TEST_F(ViewMouseEdit, tangent__optionClickBreaksAndShiftDragStepsBy45DegreesFromTheOriginalAngle) {
+    TQChannel* c = addChannel("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
+    c->setInterpolation(kTQInterpolationBezier);
+    auto item = addItem(c);
+    const TQKeyframeHandle k = keyAt(item, 5.0);
+    c->setKeyframeOutputTangents(k, 1.0, 0.2);
+    c->setKeyframeInputTangents(k, -1.0, -0.2);
+    selectInView({keypointEntry(item, 5.0)});
+    ASSERT_TRUE(frame());
+    // On screen (80 px a second, 200 px a unit) the handle points at atan(40 / 80).
+    const double original = std::atan2(0.2 * 200.0, 1.0 * 80.0);
+
+    click(6.0, 0.2, kOption);
+    EXPECT_TRUE(c->getKeyframeTangentsBroken(k));
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Break Tangents"));
+    ASSERT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionOutTangent);
+
+    down(6.0, 0.2, kShift);
+    dragTo(6.0, 0.6, kShift);
+    dragTo(5.9, 0.7, kShift);
+    up(5.9, 0.7, kShift);
+    double u = 0.0;
+    double v = 0.0;
+    c->getKeyframeOutputTangents(k, &u, &v);
+    const double steps = (std::atan2(v * 200.0, u * 80.0) - original) / (M_PI / 4.0);
+    EXPECT_NEAR(steps, std::round(steps), 1e-3) << "the handle turned by whole 45-degree steps on screen";
+    EXPECT_NE(std::round(steps), 0.0) << "and followed the pointer upward";
+    double inU = 0.0;
+    double inV = 0.0;
+    c->getKeyframeInputTangents(k, &inU, &inV);
+    EXPECT_NEAR(inV, -0.2, kValueTolerance) << "broken: the input handle stays";
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Tangents"));
 }
 
 TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
