@@ -164,56 +164,91 @@ double solveBracketed(const CurveSegment& seg, double tr, double guess) {
 constexpr int kHalleySteps = 3;
 constexpr double kHalleyStepTolerance = 1e-5;
 
-}  // namespace
+// The lane kernels below run the same arithmetic on every lane without branches, so the
+// compiler turns their loops into vector code; on x86-64 a second copy for the AVX2 and FMA
+// generation is picked at load time. Sanitizer builds keep one copy.
+#if defined(__x86_64__) && defined(__GNUC__) && defined(__ELF__) && !defined(__SANITIZE_ADDRESS__)
+#define TQ_LANE_CLONES __attribute__((target_clones("arch=x86-64-v3", "default")))
+#else
+#define TQ_LANE_CLONES
+#endif
 
-namespace {
+inline double clampUnit(double s) { return std::min(std::max(s, 0.0), 1.0); }
 
-// One Halley step for time(s) = tr; answers the step taken (1 when the step is undefined,
-// which marks the sample as unsettled).
-inline double halleyStep(const CurveSegment& seg, double tr, double& s) {
-    const double f = bezierTime(seg, s) - tr;
-    const double d = bezierTimeSlope(seg, s);
-    const double d2 = 2.0 * seg.x[1] + 6.0 * seg.x[2] * s;
-    const double den = 2.0 * d * d - f * d2;
-    const double step = den > 0.0 ? 2.0 * f * d / den : 1.0;
-    s = std::clamp(s - step, 0.0, 1.0);
-    return step;
+// Samples solved side by side, one per lane, structure of arrays. A batch is padded to whole
+// groups of lanes with copies of lane 0, so the kernels always run whole vectors.
+constexpr unsigned kLaneGroup = 4;
+struct Lanes {
+    alignas(64) double c0[kColdBatch];  // time(s) - t0 = s (c0 + s (c1 + s c2))
+    alignas(64) double c1[kColdBatch];
+    alignas(64) double c2[kColdBatch];
+    alignas(64) double tr[kColdBatch];  // target time - t0
+    alignas(64) double s[kColdBatch];
+    alignas(64) double step[kColdBatch];
+};
+
+// kHalleySteps Halley steps for time(s) = tr on every lane; step keeps the last step taken, 1
+// where the step was undefined, which marks the lane as unsettled.
+TQ_LANE_CLONES void halleyLanes(Lanes& l, unsigned lanes) {
+    for (int k = 0; k < kHalleySteps; ++k) {
+        for (unsigned m = 0; m < lanes; ++m) {
+            const double s = l.s[m];
+            const double f = s * (l.c0[m] + s * (l.c1[m] + s * l.c2[m])) - l.tr[m];
+            const double d = l.c0[m] + s * (2.0 * l.c1[m] + 3.0 * l.c2[m] * s);
+            const double d2 = 2.0 * l.c1[m] + 6.0 * l.c2[m] * s;
+            const double den = 2.0 * d * d - f * d2;
+            const bool defined = den > 0.0;
+            // Divide unconditionally and select after: a branch would keep the loop scalar.
+            const double q = (2.0 * f * d) / (defined ? den : 1.0);
+            const double step = defined ? q : 1.0;
+            l.s[m] = clampUnit(s - step);
+            l.step[m] = step;
+        }
+    }
 }
 
 }  // namespace
 
 double solveBezierParameter(const CurveSegment& seg, double target, double guess) {
     const double tr = target - seg.t0;
-    // Fixed steps without data-dependent branches; the bracketed solver takes what they
-    // leave unsettled.
-    double s = std::clamp(guess, 0.0, 1.0);
+    // Fixed Halley steps; the bracketed solver takes what they leave unsettled.
+    double s = clampUnit(guess);
     double step = 1.0;
-    for (int k = 0; k < kHalleySteps; ++k) step = halleyStep(seg, tr, s);
+    for (int k = 0; k < kHalleySteps; ++k) {
+        const double f = bezierTime(seg, s) - tr;
+        const double d = bezierTimeSlope(seg, s);
+        const double d2 = 2.0 * seg.x[1] + 6.0 * seg.x[2] * s;
+        const double den = 2.0 * d * d - f * d2;
+        step = den > 0.0 ? 2.0 * f * d / den : 1.0;
+        s = clampUnit(s - step);
+    }
     if (std::fabs(step) <= kHalleyStepTolerance) return s;
     return solveBracketed(seg, tr, s);
 }
 
 void CurveCache::solveColdBatch(const ColdSample* batch, unsigned n, double* values,
                                 double* solved) const {
-    // The same steps as solveBezierParameter, with the samples interleaved step by step: the
-    // samples lie in different segments and don't depend on each other, so the processor
-    // runs their chains side by side.
-    double s[kColdBatch];
-    double step[kColdBatch];
-    double tr[kColdBatch];
-    for (unsigned m = 0; m < n; ++m) {
-        tr[m] = batch[m].seconds - batch[m].segment->t0;
-        const double guess = batch[m].guess >= 0.0 ? batch[m].guess : tr[m] * batch[m].segment->invDt;
-        s[m] = std::clamp(guess, 0.0, 1.0);
+    if (n == 0) return;
+    // The same steps as solveBezierParameter, one sample per lane: the samples lie in
+    // different segments and don't depend on each other.
+    Lanes l;
+    const unsigned lanes = std::min((n + kLaneGroup - 1) / kLaneGroup * kLaneGroup, kColdBatch);
+    for (unsigned m = 0; m < lanes; ++m) {
+        const ColdSample& c = batch[m < n ? m : 0];
+        const CurveSegment& seg = *c.segment;
+        l.c0[m] = seg.x[0];
+        l.c1[m] = seg.x[1];
+        l.c2[m] = seg.x[2];
+        l.tr[m] = c.seconds - seg.t0;
+        l.s[m] = clampUnit(c.guess >= 0.0 ? c.guess : l.tr[m] * seg.invDt);
     }
-    for (int k = 0; k < kHalleySteps; ++k) {
-        for (unsigned m = 0; m < n; ++m) step[m] = halleyStep(*batch[m].segment, tr[m], s[m]);
-    }
+    halleyLanes(l, lanes);
     for (unsigned m = 0; m < n; ++m) {
         const CurveSegment& seg = *batch[m].segment;
-        if (!(std::fabs(step[m]) <= kHalleyStepTolerance)) s[m] = solveBracketed(seg, tr[m], s[m]);
-        values[batch[m].index] = polynomial(seg, s[m]);
-        if (solved) solved[m] = s[m];
+        double s = l.s[m];
+        if (!(std::fabs(l.step[m]) <= kHalleyStepTolerance)) s = solveBracketed(seg, l.tr[m], s);
+        values[batch[m].index] = polynomial(seg, s);
+        if (solved) solved[m] = s;
     }
 }
 
@@ -397,16 +432,75 @@ namespace {
 
 // Samples solved together from one warm start. Within a block no sample waits for another,
 // so their Newton steps overlap in the processor instead of forming one long chain.
-constexpr unsigned kBlock = 8;
+constexpr unsigned kBlock = 16;
 
-// Samples this close to the end of their segment are solved cold.
-constexpr CMTimeValue kShortRun = 3;
+// A segment's last samples, and every sample of a segment with fewer than this, are solved
+// cold, side by side with those of the segments around: a warm start pays off over a long
+// run only, since each block waits for the one before.
+constexpr CMTimeValue kShortRun = 24;
 // How far in s the warm start's series is trusted; farther samples are solved cold.
-constexpr double kWarmReach = 0.05;
-// Corrections of each warm start, and the size the last must be under for the block's answer
-// to stand: the error left is that step times about |x''/x'| times the warm start's error.
-constexpr int kBlockSteps = 2;
+constexpr double kWarmReach = 0.1;
+// Each warm start gets two corrections; the last must be under this for the block's answer to
+// stand: the error left is that step times about |x''/x'| times the warm start's error.
 constexpr double kBlockStepTolerance = 1e-10;
+
+// One block of a run of samples in one Bezier segment, one sample per lane.
+struct WarmBlock {
+    alignas(64) double secs[kBlock];   // in: the sample times
+    alignas(64) double s[kBlock];      // out: the parameter reached, or where to solve from
+    alignas(64) double value[kBlock];  // out: the value at s
+    alignas(64) double step[kBlock];   // out: the last step; 1 where the warm start failed
+    // Between passes:
+    alignas(64) double tr[kBlock];     // sample time - t0
+    alignas(64) double rm[kBlock];     // 1 / slope at the warm start
+    alignas(64) double reach[kBlock];  // distance in s from the anchor
+    alignas(64) double sloped[kBlock]; // 1 where the slope at the warm start is positive
+};
+
+// Warm starts from the last solved sample (anchorT, anchorS): the inverse's Taylor series to
+// second order, s(t + h) = s + h / x' - x'' h^2 / (2 x'^3), accurate to O(h^3), then two
+// Newton steps with the slope taken once, at the warm start: it is within O(h^2) of the slope
+// at the root, so each step gains far more than its size, at one division per sample. Lanes
+// too far from the anchor for the series get the chord's parameter to start a cold solve from.
+//
+// Done in passes over the block, each a loop without branches that vectorises; in one loop
+// the compiler turns the clamps into branches.
+TQ_LANE_CLONES void warmLanes(const CurveSegment& seg, double anchorT, double anchorS,
+                              WarmBlock& b) {
+    const double x0 = seg.x[0], x1 = seg.x[1], x2 = seg.x[2];
+    const double r = 1.0 / (x0 + anchorS * (2.0 * x1 + 3.0 * x2 * anchorS));
+    const double curl = (2.0 * x1 + 6.0 * x2 * anchorS) * 0.5 * r;
+    const double t0 = seg.t0;
+    for (unsigned m = 0; m < kBlock; ++m) {
+        const double ds = (b.secs[m] - anchorT) * r;
+        const double sp = clampUnit(anchorS + ds - curl * ds * ds);
+        const double slope = x0 + sp * (2.0 * x1 + 3.0 * x2 * sp);
+        const bool sloped = slope > 0.0;
+        b.tr[m] = b.secs[m] - t0;
+        b.s[m] = sp;
+        b.rm[m] = 1.0 / (sloped ? slope : 1.0);
+        b.reach[m] = std::fabs(ds);
+        b.sloped[m] = sloped ? 1.0 : 0.0;
+    }
+    for (int k = 0; k < 2; ++k) {
+        for (unsigned m = 0; m < kBlock; ++m) {
+            const double sp = b.s[m];
+            const double step = (sp * (x0 + sp * (x1 + sp * x2)) - b.tr[m]) * b.rm[m];
+            b.s[m] = clampUnit(sp - step);
+            b.step[m] = step;
+        }
+    }
+    const double y0 = seg.y[0], y1 = seg.y[1], y2 = seg.y[2], y3 = seg.y[3];
+    const double invDt = seg.invDt;
+    for (unsigned m = 0; m < kBlock; ++m) {
+        const double sp = b.s[m];
+        const bool near = b.reach[m] <= kWarmReach;
+        b.value[m] = y0 + sp * (y1 + sp * (y2 + sp * y3));
+        const double settledStep = b.sloped[m] > 0.0 ? b.step[m] : 1.0;
+        b.step[m] = near ? settledStep : 1.0;
+        b.s[m] = near ? sp : b.tr[m] * invDt;
+    }
+}
 
 }  // namespace
 
@@ -419,70 +513,44 @@ unsigned CurveCache::sampleBezierRun(const CurveSegment& seg, CMTimeValue value,
     values[0] = polynomial(seg, lastS);
     unsigned done = 1;
 
-    double secs[kBlock];
-    double params[kBlock];
-    bool unsettled[kBlock];
+    WarmBlock b;
     while (done < remaining) {
         unsigned n = 0;
         for (; n < kBlock && done + n < remaining; ++n) {
             // Sample done + n exists (it is below `remaining`), so its time value fits.
             const double t = double(value + CMTimeValue(done + n) * stepValue) / scale;
             if (!(t < seg.t1)) break;
-            secs[n] = t;
+            b.secs[n] = t;
         }
         if (n == 0) break;
-        // Warm start: the inverse's Taylor series to second order around the last solved
-        // sample, s(t + h) = s + h / x' - x'' h^2 / (2 x'^3), which is accurate to O(h^3).
-        const double d1 = bezierTimeSlope(seg, lastS);
-        if (!(d1 > 1e-6 * (seg.t1 - seg.t0))) {
-            for (unsigned m = 0; m < n; ++m) {  // no slope to extrapolate with: all cold
-                params[m] = -1.0;
-                unsettled[m] = true;
-            }
-        } else {
-            const double r = 1.0 / d1;
-            const double curl = (2.0 * seg.x[1] + 6.0 * seg.x[2] * lastS) * 0.5 * r;
-            const double tr0 = seg.t0;
-            for (unsigned m = 0; m < n; ++m) {
-                const double ds = (secs[m] - lastT) * r;
-                if (!(std::fabs(ds) <= kWarmReach)) {  // too far for the series: start cold
-                    params[m] = -1.0;
-                    unsettled[m] = true;
-                    continue;
-                }
-                double sp = lastS + ds - curl * ds * ds;
-                // Newton with the slope taken once, at the warm start: it is within O(h^2)
-                // of the slope at the root, so each step gains far more than the step's
-                // size, at one division per sample.
-                const double rm = 1.0 / bezierTimeSlope(seg, std::clamp(sp, 0.0, 1.0));
-                double step = 0.0;
-                for (int k = 0; k < kBlockSteps; ++k) {
-                    step = (bezierTime(seg, sp) - (secs[m] - tr0)) * rm;
-                    sp = std::clamp(sp - step, 0.0, 1.0);
-                }
-                params[m] = sp;
-                unsettled[m] = !(std::fabs(step) <= kBlockStepTolerance);
-            }
-        }
-        // Where the curve bends hard within the block, or the samples lie far apart in the
-        // segment, the warm start was not close enough: those samples are solved like cold
-        // ones, from where the block got to.
+        for (unsigned m = n; m < kBlock; ++m) b.secs[m] = b.secs[0];
         ColdSample rest[kBlock];
         unsigned restCount = 0;
-        for (unsigned m = 0; m < n; ++m) {
-            if (unsettled[m]) {
-                rest[restCount++] = ColdSample{&seg, secs[m], done + m, params[m]};
-            } else {
-                values[done + m] = polynomial(seg, params[m]);
+        if (!(bezierTimeSlope(seg, lastS) > 1e-6 * (seg.t1 - seg.t0))) {
+            // No slope to extrapolate with: all cold.
+            for (unsigned m = 0; m < n; ++m) {
+                rest[restCount++] = ColdSample{&seg, b.secs[m], done + m, -1.0};
+            }
+        } else {
+            warmLanes(seg, lastT, lastS, b);
+            // Where the curve bends hard within the block, or the samples lie far apart in
+            // the segment, the warm start was not close enough: those samples are solved like
+            // cold ones, from where the block got to.
+            for (unsigned m = 0; m < n; ++m) {
+                if (std::fabs(b.step[m]) <= kBlockStepTolerance) {
+                    values[done + m] = b.value[m];
+                } else {
+                    rest[restCount++] = ColdSample{&seg, b.secs[m], done + m, b.s[m]};
+                }
             }
         }
         if (restCount > 0) {
             double solved[kBlock];
             solveColdBatch(rest, restCount, values, solved);
-            for (unsigned m = 0; m < restCount; ++m) params[rest[m].index - done] = solved[m];
+            for (unsigned m = 0; m < restCount; ++m) b.s[rest[m].index - done] = solved[m];
         }
-        lastS = params[n - 1];
-        lastT = secs[n - 1];
+        lastS = b.s[n - 1];
+        lastT = b.secs[n - 1];
         done += n;
         if (n < kBlock) break;
     }
@@ -499,6 +567,7 @@ void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeSca
     }
     if (!values) return;
     const double scale = double(timescale);
+    const double shortRun = double(kShortRun) * double(stepValue) / scale;
     CurveCursor cursor;
     ColdSample cold[kColdBatch];
     unsigned coldCount = 0;
@@ -511,9 +580,9 @@ void CurveCache::sample(CMTimeValue startValue, CMTimeValue stepValue, CMTimeSca
             cursor.segment = k;
             const CurveSegment& seg = _segments[k];
             if (seg.kind == SegmentKind::Bezier) {
-                if (!(t + double(kShortRun * stepValue) / scale < seg.t1)) {
-                    // One of the last few samples in this segment: too few to gain from a
-                    // warm start. Solved with the next few such samples, side by side.
+                if (!(t + shortRun < seg.t1)) {
+                    // One of the last samples in this segment: too few left to gain from a
+                    // warm start. Solved with the next such samples, side by side.
                     cold[coldCount++] = ColdSample{&seg, t, i, -1.0};
                     if (coldCount == kColdBatch) {
                         solveColdBatch(cold, coldCount, values);

@@ -45,7 +45,7 @@ struct ColdSample {
     unsigned index;  // where its value goes
     double guess;    // a parameter to start from, or negative for the chord's
 };
-inline constexpr unsigned kColdBatch = 8;
+inline constexpr unsigned kColdBatch = 16;
 
 class CurveCache {
 public:
