@@ -334,16 +334,27 @@ void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
     }
 }
 
-size_t CurveCache::locate(double seconds, CurveCursor& cursor) const {
-    // Galloping search from the cursor's segment: O(log d) for a sample d segments away, so a
-    // sorted walk costs what the segments crossed cost, and stays within nearby memory.
+size_t CurveCache::locate(double seconds, const CurveCursor& cursor) const {
+    // The cursor's segment or the next: what a sorted walk mostly asks, kept small enough to
+    // be inlined into the walk.
     const size_t n = _starts.size();
     const size_t i = cursor.segment < n ? cursor.segment : 0;
     const double* starts = _starts.data();
     if (seconds >= starts[i]) {
         if (i + 1 == n || seconds < starts[i + 1]) return i;
-        if (i + 2 == n || seconds < starts[i + 2]) return i + 1;  // the usual next segment
-        size_t lo = i + 2;
+        if (i + 2 == n || seconds < starts[i + 2]) return i + 1;
+    }
+    return locateFar(seconds, i);
+}
+
+size_t CurveCache::locateFar(double seconds, size_t i) const {
+    // For a time before segment i or past segment i + 1. Galloping search from segment i:
+    // O(log d) for a sample d segments away, so a sorted walk costs what the segments crossed
+    // cost, and stays within nearby memory.
+    const size_t n = _starts.size();
+    const double* starts = _starts.data();
+    if (seconds >= starts[i]) {
+        size_t lo = i + 2;  // at or before `seconds`
         size_t step = 1;
         while (lo + step < n && starts[lo + step] <= seconds) {
             lo += step;
@@ -437,7 +448,7 @@ constexpr unsigned kBlock = 16;
 // A segment's last samples, and every sample of a segment with fewer than this, are solved
 // cold, side by side with those of the segments around: a warm start pays off over a long
 // run only, since each block waits for the one before.
-constexpr CMTimeValue kShortRun = 24;
+constexpr CMTimeValue kShortRun = 64;
 // How far in s the warm start's series is trusted; farther samples are solved cold.
 constexpr double kWarmReach = 0.1;
 // Each warm start gets two corrections; the last must be under this for the block's answer to

@@ -68,7 +68,8 @@ public:
 private:
     double evaluateInside(double seconds, CurveCursor& cursor) const;
     double evaluateOutside(double seconds, bool before, CurveCursor& cursor) const;
-    size_t locate(double seconds, CurveCursor& cursor) const;
+    size_t locate(double seconds, const CurveCursor& cursor) const;
+    size_t locateFar(double seconds, size_t from) const;
     // Samples the run of evenly spaced times, from `value` on, that fall in one Bezier
     // segment; answers how many it wrote (at least one).
     // Solves the samples side by side and writes their values; `solved`, if given, receives
