@@ -334,7 +334,7 @@ void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
     }
 }
 
-size_t CurveCache::locate(double seconds, const CurveCursor& cursor) const {
+size_t CurveCache::locate(double seconds, CurveCursor& cursor) const {
     // The cursor's segment or the next: what a sorted walk mostly asks, kept small enough to
     // be inlined into the walk.
     const size_t n = _starts.size();
@@ -344,10 +344,10 @@ size_t CurveCache::locate(double seconds, const CurveCursor& cursor) const {
         if (i + 1 == n || seconds < starts[i + 1]) return i;
         if (i + 2 == n || seconds < starts[i + 2]) return i + 1;
     }
-    return locateFar(seconds, i);
+    return locateFar(seconds, i, cursor.stride);
 }
 
-size_t CurveCache::locateFar(double seconds, size_t i) const {
+size_t CurveCache::locateFar(double seconds, size_t i, size_t& stride) const {
     // For a time before segment i or past segment i + 1. Galloping search from segment i:
     // O(log d) for a sample d segments away, so a sorted walk costs what the segments crossed
     // cost, and stays within nearby memory.
@@ -355,13 +355,27 @@ size_t CurveCache::locateFar(double seconds, size_t i) const {
     const double* starts = _starts.data();
     if (seconds >= starts[i]) {
         size_t lo = i + 2;  // at or before `seconds`
-        size_t step = 1;
-        while (lo + step < n && starts[lo + step] <= seconds) {
-            lo += step;
-            step *= 2;
+        size_t hi = n;
+        // Evenly spaced samples cross about as many segments each time: look there first.
+        const size_t guess = i + stride;
+        if (stride > 2 && guess < n) {
+            if (starts[guess] <= seconds) {
+                lo = guess;
+            } else {
+                hi = guess;
+            }
         }
-        const size_t hi = std::min(lo + step, n);
-        return size_t(std::upper_bound(starts + lo, starts + hi, seconds) - starts) - 1;
+        if (hi == n) {
+            size_t step = 1;
+            while (lo + step < n && starts[lo + step] <= seconds) {
+                lo += step;
+                step *= 2;
+            }
+            hi = std::min(lo + step, n);
+        }
+        const size_t k = size_t(std::upper_bound(starts + lo, starts + hi, seconds) - starts) - 1;
+        stride = k - i;
+        return k;
     }
     size_t hi = i;  // the answer lies below hi
     size_t step = 1;

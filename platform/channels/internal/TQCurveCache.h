@@ -36,6 +36,7 @@ struct CurveCursor {
     bool warm = false;  // lastS / lastT belong to `segment`
     double lastS = 0.0;
     double lastT = 0.0;
+    size_t stride = 0;  // segments crossed by the last long step forward
 };
 
 // A sample waiting for a cold solve in its segment.
@@ -68,8 +69,8 @@ public:
 private:
     double evaluateInside(double seconds, CurveCursor& cursor) const;
     double evaluateOutside(double seconds, bool before, CurveCursor& cursor) const;
-    size_t locate(double seconds, const CurveCursor& cursor) const;
-    size_t locateFar(double seconds, size_t from) const;
+    size_t locate(double seconds, CurveCursor& cursor) const;
+    size_t locateFar(double seconds, size_t from, size_t& stride) const;
     // Samples the run of evenly spaced times, from `value` on, that fall in one Bezier
     // segment; answers how many it wrote (at least one).
     // Solves the samples side by side and writes their values; `solved`, if given, receives

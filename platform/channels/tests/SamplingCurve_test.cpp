@@ -60,6 +60,35 @@ TEST_F(SamplingCurve, every_density__from_many_segments_per_sample_to_many_sampl
     }
 }
 
+TEST_F(SamplingCurve, clustered_keyframes__segments_crossed_per_sample_vary_widely) {
+    // Bursts of 1 to 200 keyframes a millisecond apart between gaps of a second: from one sample
+    // to the next the walk crosses none, a few or hundreds of segments, so any guess it makes
+    // from the last step is often wrong in both directions.
+    auto c = makeChannel("clustered");
+    Lcg rng{11};
+    double t = 0.0;
+    for (int burst = 0; burst < 40; ++burst) {
+        const int size = 1 + int(rng.next() * 200.0);
+        for (int k = 0; k < size; ++k) {
+            TQKeyframeHandle h = c->setKeyframe(seconds(t), rng.next() * 20.0 - 10.0);
+            c->setKeyframeTangentsBroken(h, true);
+            c->setKeyframeInputTangents(h, -rng.next() * 0.001, rng.next() * 2.0 - 1.0);
+            c->setKeyframeOutputTangents(h, rng.next() * 0.6, rng.next() * 8.0 - 4.0);
+            t += 0.001;
+        }
+        t += 1.0;
+    }
+    for (const double step : {0.0007, 0.013, 0.37}) {
+        const unsigned n = unsigned(t / step);
+        Samples s = sample(*c, seconds(0.0), seconds(step), n);
+        ASSERT_EQ(s.count, n);
+        for (unsigned i = 0; i < s.count; ++i) {
+            ASSERT_NEAR(s.values[i], c->getCurveValue(s.times[i]), kValueTolerance)
+                << "step " << step << ", sample " << i;
+        }
+    }
+}
+
 TEST_F(SamplingCurve, dense_backwards_cursor__ping_pong_walks_back_through_segments) {
     auto c = dense(2000);
     c->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter);
