@@ -1,8 +1,9 @@
 // Sampling cost of Bezier channels: 2000 evenly spaced samples across the whole keyframe span,
 // for channels of 4 to 100k keyframes, reported as time per sample (items = samples).
 //
-//   BM_GetSamples        TQChannel::getSamples: a cursor walk over the segments with a Newton
-//                        solve warm-started from the previous sample.
+//   BM_GetSamples        TQChannel::getSamples: a cursor walk over the segments; the time
+//                        equations are solved side by side in vector lanes, from the chord
+//                        or, within long runs in one segment, from the samples before.
 //   BM_ClosedFormSamples the textbook baseline: for every sample a binary search for the
 //                        segment and a closed-form (Cardano / trigonometric) cubic solve.
 // Both fill the same time and value arrays from the same clamped control points.
