@@ -1,7 +1,10 @@
 #include "qt/TQQtServices.h"
 
 #include <QCursor>
+#include <QPainter>
+#include <QPixmap>
 #include <QTimer>
+#include <QtMath>
 #include <QWindow>
 
 #include <chrono>
@@ -64,8 +67,51 @@ Qt::CursorShape TQQtViewHost::cursorShape(RWCursor cursor) {
         case RWCursor::CrossHairs: return Qt::CrossCursor;
         case RWCursor::Sketch: return Qt::CrossCursor;
         case RWCursor::PenAddControlPoint: return Qt::CrossCursor;
+        case RWCursor::ZoomIn: return Qt::BitmapCursor;
+        case RWCursor::ZoomOut: return Qt::BitmapCursor;
     }
     return Qt::ArrowCursor;
+}
+
+namespace {
+
+// A magnifying glass with a plus or a minus in the lens, dark lines on a light outline so it
+// reads on the dark curve view and on light windows alike. Hot spot at the lens's centre.
+QCursor magnifierCursor(bool plus, qreal ratio) {
+    constexpr int kSize = 24;
+    const QPointF centre(9.5, 9.5);
+    constexpr qreal kRadius = 6.5;
+    constexpr qreal kSign = 3.5;
+    QPixmap pixmap(qCeil(kSize * ratio), qCeil(kSize * ratio));
+    pixmap.setDevicePixelRatio(ratio);
+    pixmap.fill(Qt::transparent);
+    QPainter painter(&pixmap);
+    painter.setRenderHint(QPainter::Antialiasing);
+    painter.setPen(Qt::NoPen);
+    painter.setBrush(QColor(255, 255, 255, 190));
+    painter.drawEllipse(centre, kRadius, kRadius);
+    const auto glass = [&](const QColor& colour, qreal width) {
+        painter.setPen(QPen(colour, width, Qt::SolidLine, Qt::RoundCap));
+        painter.setBrush(Qt::NoBrush);
+        painter.drawEllipse(centre, kRadius, kRadius);
+        painter.drawLine(QPointF(14.6, 14.6), QPointF(21.5, 21.5));
+        painter.drawLine(centre - QPointF(kSign, 0.0), centre + QPointF(kSign, 0.0));
+        if (plus) painter.drawLine(centre - QPointF(0.0, kSign), centre + QPointF(0.0, kSign));
+    };
+    glass(QColor(255, 255, 255), 3.6);
+    glass(QColor(20, 20, 20), 1.6);
+    painter.end();
+    return QCursor(pixmap, qRound(centre.x()), qRound(centre.y()));
+}
+
+}  // namespace
+
+QCursor TQQtViewHost::qtCursor(RWCursor cursor, qreal devicePixelRatio) {
+    switch (cursor) {
+        case RWCursor::ZoomIn: return magnifierCursor(true, devicePixelRatio);
+        case RWCursor::ZoomOut: return magnifierCursor(false, devicePixelRatio);
+        default: return QCursor(cursorShape(cursor));
+    }
 }
 
 void TQQtViewHost::setCursor(RWCursor cursor) {
@@ -80,7 +126,11 @@ void TQQtViewHost::setCursorHidden(bool hidden) {
 
 void TQQtViewHost::applyCursor() {
     if (!_widget) return;
-    _widget->setCursor(QCursor(_cursorHidden ? Qt::BlankCursor : cursorShape(_cursor)));
+    if (_cursorHidden) {
+        _widget->setCursor(Qt::BlankCursor);
+    } else {
+        _widget->setCursor(qtCursor(_cursor, _widget->devicePixelRatioF()));
+    }
 }
 
 CGPoint TQQtViewHost::convertPointFromWindow(const CGPoint& pointInWindow) const {

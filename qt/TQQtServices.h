@@ -6,6 +6,7 @@
 // QWidget has its origin at the top left and y down. Qt's logical pixels are our points and
 // devicePixelRatio is the backing scale, so only the y axis needs flipping.
 
+#include <QCursor>
 #include <QElapsedTimer>
 #include <QObject>
 #include <QPointer>
@@ -73,8 +74,11 @@ public:
     RWCursor cursor() const { return _cursor; }
     bool cursorHidden() const { return _cursorHidden; }
 
-    // The Qt shape shown for a cursor of the views.
+    // The Qt shape shown for a cursor of the views; Qt::BitmapCursor for the shapes Qt has no
+    // cursor of its own for (the zoom cursors), which qtCursor draws.
     static Qt::CursorShape cursorShape(RWCursor cursor);
+    // The cursor shown, drawn at the given device pixel ratio where it is an image.
+    static QCursor qtCursor(RWCursor cursor, qreal devicePixelRatio);
 
 private:
     void applyCursor();

@@ -42,7 +42,9 @@ enum class RWCursor : uint32_t {
     EditPoints,         // pointer over a keypoint
     CrossHairs,         // rubber band
     Sketch,             // the sketch tool
-    PenAddControlPoint  // a click adds a keypoint
+    PenAddControlPoint, // a click adds a keypoint
+    ZoomIn,             // a space-bar zoom that magnifies
+    ZoomOut             // a space-bar zoom that shrinks
 };
 
 // What a view knows of the widget that shows it. One host per view, not owned by the view;

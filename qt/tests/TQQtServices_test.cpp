@@ -41,6 +41,27 @@ TEST(QtViewHostTest, setCursor__hidden_wins_until_shown_again) {
     EXPECT_EQ(view.cursor().shape(), Qt::CrossCursor);
 }
 
+TEST(QtViewHostTest, zoomCursors__are_drawn_images_that_tell_in_from_out) {
+    QWidget view;
+    TQQtViewHost host(&view);
+    host.setCursor(RWCursor::ZoomIn);
+    const QCursor in = view.cursor();
+    host.setCursor(RWCursor::ZoomOut);
+    const QCursor out = view.cursor();
+    ASSERT_EQ(in.shape(), Qt::BitmapCursor);
+    ASSERT_EQ(out.shape(), Qt::BitmapCursor);
+    const QImage inImage = in.pixmap().toImage();
+    const QImage outImage = out.pixmap().toImage();
+    ASSERT_FALSE(inImage.isNull());
+    EXPECT_NE(inImage, outImage) << "the plus and the minus differ";
+    EXPECT_GT(qAlpha(inImage.pixel(in.hotSpot())), 0) << "the hot spot lies on the glass";
+    EXPECT_EQ(qAlpha(inImage.pixel(0, inImage.height() - 1)), 0) << "around the glass is clear";
+
+    const QCursor sharp = TQQtViewHost::qtCursor(RWCursor::ZoomIn, 2.0);
+    EXPECT_EQ(sharp.pixmap().width(), 2 * in.pixmap().width()) << "drawn for the screen's pixels";
+    EXPECT_EQ(sharp.pixmap().deviceIndependentSize(), in.pixmap().deviceIndependentSize());
+}
+
 TEST(QtTimerServiceTest, dispatchAfter__runs_later_from_the_loop_and_never_after_the_service_died) {
     int runs = 0;
     {

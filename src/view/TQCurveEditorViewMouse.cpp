@@ -356,8 +356,7 @@ void TQCurveEditorViewBase::mouseDraggedEdit(const RWEvent& event) {
                 pan(_canPanHorizontally ? dx : 0.0, _canPanVertically ? ny : 0.0);
             _controller->windowWasPanned(dy / height);
         } else {
-            // No zoom shapes among the cursors: the cross hair stands for both directions.
-            setCursorShape(RWCursor::CrossHair);
+            setCursorShape(std::max(dx, ny) > 1.0 ? RWCursor::ZoomIn : RWCursor::ZoomOut);
             zoom(dx, ny);
             _controller->windowWasZoomed();
         }

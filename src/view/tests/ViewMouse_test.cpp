@@ -1,6 +1,7 @@
 // Gestures of the edit tool through the view: which keypoint a drag moves, the Shift axis
 // constraint, one undo step per drag and none for a click, Command-drags that pull tangents,
-// the 1/30 s gate on drag steps, and the clicks that add, flatten and break.
+// the 1/30 s gate on drag steps, the clicks that add, flatten and break, and the space-bar
+// navigation.
 
 #include <cmath>
 
@@ -306,6 +307,37 @@ TEST_F(ViewMouseEdit, drag__intoTheEdgeBandZoomsOrPans) {
             << "the view scrolls down by the overrun";
         up(t, -0.95);
     }
+}
+
+TEST_F(ViewMouseEdit, spaceDrag__pansOrWithCommandZoomsShowingWhichInTheCursor) {
+    linearItem("A", {{2.0, 0.0}, {8.0, 0.0}});
+    view.setAutoZoom(0);  // with auto-zoom a drag on nothing is always a band
+    ASSERT_TRUE(frame());
+    const auto lastCursor = [&] {
+        return viewHost.cursors().empty() ? RWCursor::Arrow : viewHost.cursors().back();
+    };
+    ASSERT_TRUE(view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " ")));
+
+    down(4.0, 0.5);
+    dragTo(3.0, 0.5);  // 80 px left
+    EXPECT_EQ(lastCursor(), RWCursor::OpenHand);
+    ASSERT_EQ(range().offsets.size(), 1u) << "a pan moves the display range";
+    EXPECT_NEAR(range().offsets[0], 1.0, kDragTolerance) << "by the pointer's movement, the other way";
+    EXPECT_EQ(range().panned.size(), 1u);
+
+    // With Command, a drag to the right magnifies time about where the drag began.
+    const double before = CMTimeGetSeconds(view.getDisplayRange().duration);
+    dragTo(4.0, 0.5, kCommand);
+    EXPECT_EQ(lastCursor(), RWCursor::ZoomIn);
+    const double magnified = CMTimeGetSeconds(view.getDisplayRange().duration);
+    EXPECT_LT(magnified, before);
+    dragTo(2.0, 0.5, kCommand);
+    EXPECT_EQ(lastCursor(), RWCursor::ZoomOut);
+    EXPECT_GT(CMTimeGetSeconds(view.getDisplayRange().duration), magnified);
+    up(2.0, 0.5, kCommand);
+
+    EXPECT_TRUE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
+    EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " "))) << "the space bar is released";
 }
 
 }  // namespace
