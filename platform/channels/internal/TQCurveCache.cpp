@@ -458,6 +458,7 @@ namespace {
 // Samples solved together from one warm start. Within a block no sample waits for another,
 // so their Newton steps overlap in the processor instead of forming one long chain.
 constexpr unsigned kBlock = 16;
+static_assert(kBlock <= kColdBatch, "a block's unsettled samples are solved as one cold batch");
 
 // A segment's last samples, and every sample of a segment with fewer than this, are solved
 // cold, side by side with those of the segments around: a warm start pays off over a long
