@@ -166,8 +166,9 @@ constexpr double kHalleyStepTolerance = 1e-5;
 
 // The lane kernels below run the same arithmetic on every lane without branches, so the
 // compiler turns their loops into vector code; on x86-64 a second copy for the AVX2 and FMA
-// generation is picked at load time. Sanitizer builds keep one copy.
-#if defined(__x86_64__) && defined(__GNUC__) && defined(__ELF__) && !defined(__SANITIZE_ADDRESS__)
+// generation is picked at load time (GCC on ELF). Sanitizer builds keep one copy.
+#if defined(__x86_64__) && defined(__GNUC__) && !defined(__clang__) && defined(__ELF__) && \
+    !defined(__SANITIZE_ADDRESS__)
 #define TQ_LANE_CLONES __attribute__((target_clones("arch=x86-64-v3", "default")))
 #else
 #define TQ_LANE_CLONES
