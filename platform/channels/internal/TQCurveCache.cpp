@@ -188,22 +188,27 @@ struct Lanes {
     alignas(64) double step[kColdBatch];
 };
 
-// kHalleySteps Halley steps for time(s) = tr on every lane; step keeps the last step taken, 1
-// where the step was undefined, which marks the lane as unsettled.
+// One Halley step for time(s) = tr, given the time polynomial's coefficients: moves s and
+// answers the step taken, 1 where it is undefined, which marks the sample as unsettled.
+// Without branches, so that the lane kernel's loop vectorises.
+inline double halleyStep(double c0, double c1, double c2, double tr, double& s) {
+    const double f = s * (c0 + s * (c1 + s * c2)) - tr;
+    const double d = c0 + s * (2.0 * c1 + 3.0 * c2 * s);
+    const double d2 = 2.0 * c1 + 6.0 * c2 * s;
+    const double den = 2.0 * d * d - f * d2;
+    const bool defined = den > 0.0;
+    // Divide unconditionally and select after: a branch would keep the loop scalar.
+    const double q = (2.0 * f * d) / (defined ? den : 1.0);
+    const double step = defined ? q : 1.0;
+    s = clampUnit(s - step);
+    return step;
+}
+
+// kHalleySteps Halley steps on every lane; step keeps each lane's last step.
 TQ_LANE_CLONES void halleyLanes(Lanes& l, unsigned lanes) {
     for (int k = 0; k < kHalleySteps; ++k) {
         for (unsigned m = 0; m < lanes; ++m) {
-            const double s = l.s[m];
-            const double f = s * (l.c0[m] + s * (l.c1[m] + s * l.c2[m])) - l.tr[m];
-            const double d = l.c0[m] + s * (2.0 * l.c1[m] + 3.0 * l.c2[m] * s);
-            const double d2 = 2.0 * l.c1[m] + 6.0 * l.c2[m] * s;
-            const double den = 2.0 * d * d - f * d2;
-            const bool defined = den > 0.0;
-            // Divide unconditionally and select after: a branch would keep the loop scalar.
-            const double q = (2.0 * f * d) / (defined ? den : 1.0);
-            const double step = defined ? q : 1.0;
-            l.s[m] = clampUnit(s - step);
-            l.step[m] = step;
+            l.step[m] = halleyStep(l.c0[m], l.c1[m], l.c2[m], l.tr[m], l.s[m]);
         }
     }
 }
@@ -215,14 +220,7 @@ double solveBezierParameter(const CurveSegment& seg, double target, double guess
     // Fixed Halley steps; the bracketed solver takes what they leave unsettled.
     double s = clampUnit(guess);
     double step = 1.0;
-    for (int k = 0; k < kHalleySteps; ++k) {
-        const double f = bezierTime(seg, s) - tr;
-        const double d = bezierTimeSlope(seg, s);
-        const double d2 = 2.0 * seg.x[1] + 6.0 * seg.x[2] * s;
-        const double den = 2.0 * d * d - f * d2;
-        step = den > 0.0 ? 2.0 * f * d / den : 1.0;
-        s = clampUnit(s - step);
-    }
+    for (int k = 0; k < kHalleySteps; ++k) step = halleyStep(seg.x[0], seg.x[1], seg.x[2], tr, s);
     if (std::fabs(step) <= kHalleyStepTolerance) return s;
     return solveBracketed(seg, tr, s);
 }
