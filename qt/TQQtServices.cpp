@@ -128,9 +128,20 @@ void TQQtViewHost::applyCursor() {
     if (!_widget) return;
     if (_cursorHidden) {
         _widget->setCursor(Qt::BlankCursor);
-    } else {
-        _widget->setCursor(qtCursor(_cursor, _widget->devicePixelRatioF()));
+        return;
     }
+    if (cursorShape(_cursor) != Qt::BitmapCursor) {
+        _widget->setCursor(cursorShape(_cursor));
+        return;
+    }
+    // A zoom drag asks for its cursor at every step: the images are drawn once per pixel ratio.
+    const qreal ratio = _widget->devicePixelRatioF();
+    if (ratio != _zoomCursorRatio) {
+        _zoomCursors[0] = qtCursor(RWCursor::ZoomOut, ratio);
+        _zoomCursors[1] = qtCursor(RWCursor::ZoomIn, ratio);
+        _zoomCursorRatio = ratio;
+    }
+    _widget->setCursor(_zoomCursors[_cursor == RWCursor::ZoomIn ? 1 : 0]);
 }
 
 CGPoint TQQtViewHost::convertPointFromWindow(const CGPoint& pointInWindow) const {

@@ -86,6 +86,8 @@ private:
     QPointer<QWidget> _widget;
     RWCursor _cursor = RWCursor::Arrow;
     bool _cursorHidden = false;
+    QCursor _zoomCursors[2];  // out, in; drawn at _zoomCursorRatio
+    qreal _zoomCursorRatio = 0.0;
     std::deque<RWEvent> _pending;
 };
 
