@@ -164,7 +164,7 @@ void drawRemove(ImageCanvas& canvas) {
     canvas.draw(capsule({c - 4.5, c}, {c + 4.5, c}, 0.8), solid(kGlyph));
 }
 
-// Inspector images: the parameter menu button of a channel row, the reset button of a mini
+// Images of the inspector rows: the parameter menu button of a channel row, the reset button of a mini
 // editor strip, and the border drawn over the strip (stretched to its bounds, so only its
 // edges carry anything).
 constexpr double kMenuButtonSize = 16.0;
@@ -253,8 +253,9 @@ int main(int argc, char** argv) {
     ok &= writeBothScales(folder, "K_KeyframeEditor_TransformKeyframes", kToolIconSize, drawTransformTool);
     ok &= writeBothScales(folder, "K_General_Add", kSmallIconSize, drawAdd);
     ok &= writeBothScales(folder, "K_General_Remove", kSmallIconSize, drawRemove);
-    ok &= writeBothScales(folder, "S_Inspector_ParameterMenu_Normal", kMenuButtonSize, drawParameterMenu);
-    ok &= writeBothScales(folder, "Shared_Inspector_Reset", kSmallIconSize, drawReset);
-    ok &= writeBothScales(folder, "K_Inspector_Gradient-Border", kBorderSize, drawGradientBorder);
+    // Files named by this project; BNImage.cpp maps them onto the resource names asked for.
+    ok &= writeBothScales(folder, "ChannelRowMenu", kMenuButtonSize, drawParameterMenu);
+    ok &= writeBothScales(folder, "StripReset", kSmallIconSize, drawReset);
+    ok &= writeBothScales(folder, "StripBorder", kBorderSize, drawGradientBorder);
     return ok ? 0 : 1;
 }
