@@ -8,7 +8,6 @@
 #include <mutex>
 #include <string_view>
 #include <unordered_map>
-#include <utility>
 
 BNImage::BNImage(int pixelsWide, int pixelsHigh, double scale, std::vector<std::uint8_t> pixels)
     : _pixelsWide(std::max(pixelsWide, 0)),
@@ -71,27 +70,16 @@ namespace {
 constexpr std::string_view kRetinaSuffix = "@2x";
 constexpr std::string_view kExtension = ".png";
 
-// Files whose names differ from the resource names the panels ask for.
-constexpr std::pair<std::string_view, std::string_view> kResourceOfFile[] = {
-    {"ChannelRowMenu", "S_Inspector_ParameterMenu_Normal"},
-    {"StripReset", "Shared_Inspector_Reset"},
-    {"StripBorder", "K_Inspector_Gradient-Border"},
-};
-
 // The resource name and scale of an embedded file name; empty name for a file that does not
 // follow "Name.png" / "Name@2x.png".
 std::pair<std::string_view, double> splitFileName(std::string_view fileName) {
     if (!fileName.ends_with(kExtension)) return {{}, 0.0};
     fileName.remove_suffix(kExtension.size());
-    double scale = 1.0;
     if (fileName.ends_with(kRetinaSuffix)) {
         fileName.remove_suffix(kRetinaSuffix.size());
-        scale = 2.0;
+        return {fileName, 2.0};
     }
-    for (const auto& [file, resource] : kResourceOfFile) {
-        if (fileName == file) return {resource, scale};
-    }
-    return {fileName, scale};
+    return {fileName, 1.0};
 }
 
 struct ResourceFiles {

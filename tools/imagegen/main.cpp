@@ -253,7 +253,8 @@ int main(int argc, char** argv) {
     ok &= writeBothScales(folder, "K_KeyframeEditor_TransformKeyframes", kToolIconSize, drawTransformTool);
     ok &= writeBothScales(folder, "K_General_Add", kSmallIconSize, drawAdd);
     ok &= writeBothScales(folder, "K_General_Remove", kSmallIconSize, drawRemove);
-    // Files named by this project; BNImage.cpp maps them onto the resource names asked for.
+    // Files named by this project; the embedding step lists them under the resource names
+    // the panels ask for (src/resources/cmake/EmbedImages.cmake).
     ok &= writeBothScales(folder, "ChannelRowMenu", kMenuButtonSize, drawParameterMenu);
     ok &= writeBothScales(folder, "StripReset", kSmallIconSize, drawReset);
     ok &= writeBothScales(folder, "StripBorder", kBorderSize, drawGradientBorder);

@@ -15,6 +15,13 @@ string(REPEAT "[0-9a-f]" 64 lineOfHex)
 file(GLOB files RELATIVE "${INPUT_DIR}" "${INPUT_DIR}/*.png")
 list(SORT files)
 
+# Files whose names differ from the resource names the panels ask for: the table lists each
+# under its resource name, so the library sees only those.
+set(resourceOfFile
+  "ChannelRowMenu=S_Inspector_ParameterMenu_Normal"
+  "StripReset=Shared_Inspector_Reset"
+  "StripBorder=K_Inspector_Gradient-Border")
+
 set(source "// Generated from the images folder at build time; edit the PNG files, not this file.\n")
 string(APPEND source "#include \"src/resources/internal/TQEmbeddedImages.h\"\n\n")
 string(APPEND source "namespace {\n")
@@ -31,7 +38,16 @@ foreach(name ${files})
   string(REGEX REPLACE "(${lineOfHex})" "\\1\n" hex "${hex}")
   string(REGEX REPLACE "([0-9a-f][0-9a-f])" "0x\\1," bytes "${hex}")
   string(APPEND source "// ${name}\nconstexpr unsigned char kImage${index}[] = {\n${bytes}};\n")
-  string(APPEND table "    {\"${name}\", kImage${index}, ${byteCount}},\n")
+  set(resourceFileName "${name}")
+  foreach(pair ${resourceOfFile})
+    string(REPLACE "=" ";" pair "${pair}")
+    list(GET pair 0 fileStem)
+    list(GET pair 1 resource)
+    if(name MATCHES "^${fileStem}(@2x)?\\.png$")
+      set(resourceFileName "${resource}${CMAKE_MATCH_1}.png")
+    endif()
+  endforeach()
+  string(APPEND table "    {\"${resourceFileName}\", kImage${index}, ${byteCount}},\n")
   math(EXPR index "${index} + 1")
 endforeach()
 string(APPEND source "\nconstexpr TQEmbeddedImageFile kFiles[] = {\n${table}    {nullptr, nullptr, 0},\n};\n")
