@@ -93,7 +93,7 @@ void BM_GetSamples(benchmark::State& state) {
 // The channel's Bezier segments as control points, with the same clamp of handle reach to the
 // segment that keeps time monotone.
 struct ControlPoints {
-    std::vector<double> t;                  // keyframe times
+    std::vector<double> t;                       // keyframe times
     std::vector<double> x1, x2, y0, y1, y2, y3;  // per segment
 };
 
@@ -170,7 +170,8 @@ void BM_ClosedFormSamples(benchmark::State& state) {
             const CMTimeValue value = span.start.value + CMTimeValue(i) * span.step.value;
             times[i] = CMTime{value, kTimescale, kCMTimeFlags_Valid, 0};
             const double t = double(value) / double(kTimescale);
-            const size_t upper = size_t(std::upper_bound(cp.t.begin(), cp.t.end(), t) - cp.t.begin());
+            const size_t upper =
+                size_t(std::upper_bound(cp.t.begin(), cp.t.end(), t) - cp.t.begin());
             const size_t seg = std::min(upper == 0 ? 0 : upper - 1, segments - 1);
             const double x0 = cp.t[seg], x3 = cp.t[seg + 1];
             const double x1 = cp.x1[seg], x2 = cp.x2[seg];
@@ -192,4 +193,10 @@ void BM_ClosedFormSamples(benchmark::State& state) {
 
 BENCHMARK(BM_GetSamples)->Arg(4)->Arg(10)->Arg(100)->Arg(1000)->Arg(2000)->Arg(10000)->Arg(100000);
 BENCHMARK(BM_ClosedFormSamples)
-    ->Arg(4)->Arg(10)->Arg(100)->Arg(1000)->Arg(2000)->Arg(10000)->Arg(100000);
+    ->Arg(4)
+    ->Arg(10)
+    ->Arg(100)
+    ->Arg(1000)
+    ->Arg(2000)
+    ->Arg(10000)
+    ->Arg(100000);

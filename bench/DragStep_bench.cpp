@@ -39,7 +39,8 @@ struct DragScene {
         ctrl.setAppDelegate(&host);
         set->initWithName("Drag", &host);
         ctrl.setSelectedCurveSet(set);
-        auto* object = host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
+        auto* object =
+            host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
         for (int c = 0; c < kChannels; ++c) {
             char name[16];
             std::snprintf(name, sizeof name, "C%d", c);
@@ -48,7 +49,8 @@ struct DragScene {
             channel->setInterpolation(kTQInterpolationBezier);
             for (int k = 0; k < kKeyframesPerChannel; ++k)
                 channel->setKeyframe(seconds(k * kKeySpacing), (k % 7) * 0.25 + c);
-            auto item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(ctrl.appendChannel(channel, set));
+            auto item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(
+                ctrl.appendChannel(channel, set));
             item->setScaleY(1.0);
             item->setOffsetY(0.0);
             items.push_back(item);

@@ -41,8 +41,12 @@ public:
     HXDTexture* nextDrawable() override { return &_target; }
     void beginEncoding(HXDTexture&, const HXDColor&) override {}
     void endEncoding() override {}
-    void encodeMultiline(const HXDMultiline& m, const HXDRenderingContext&) override { benchmark::DoNotOptimize(&m); }
-    void encodeQuadTexture(const HXDQuadTexture& q, const HXDRenderingContext&) override { benchmark::DoNotOptimize(&q); }
+    void encodeMultiline(const HXDMultiline& m, const HXDRenderingContext&) override {
+        benchmark::DoNotOptimize(&m);
+    }
+    void encodeQuadTexture(const HXDQuadTexture& q, const HXDRenderingContext&) override {
+        benchmark::DoNotOptimize(&q);
+    }
     void encodeScreenspaceQuad(const HXDScreenspaceQuad&, const HXDRenderingContext&) override {}
     void encodeMesh(const HXDMesh&, const HXDRenderingContext&) override {}
     void encodeText(const HXDText&, const HXDRenderingContext&) override {}
@@ -77,22 +81,25 @@ struct FrameScene {
         const CMTime start = seconds(0.0);
         const CMTime duration = seconds(kDurationSeconds);
         view.setDisplayRange(&start, &duration);
-        view.setCurrentViewVolume(CGRectMake(0.0, -1.0, kDurationSeconds, 2.0 * kCurves / 10.0 + 2.0));
+        view.setCurrentViewVolume(
+            CGRectMake(0.0, -1.0, kDurationSeconds, 2.0 * kCurves / 10.0 + 2.0));
         view.setOriginalViewVolume(view.getCurrentViewVolume());
         view.drawProjection();
         ctrl.setSelectedCurveSet(set);
 
-        auto* object = host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
+        auto* object =
+            host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
         const double spacing = kDurationSeconds / kKeyframesPerCurve;
         for (int c = 0; c < kCurves; ++c) {
             char name[16];
             std::snprintf(name, sizeof name, "C%d", c);
-            auto* channel = static_cast<TQChannel*>(
-                object->addChild(std::make_unique<TQChannel>(name, static_cast<TQChannelId>(100 + c))));
+            auto* channel = static_cast<TQChannel*>(object->addChild(
+                std::make_unique<TQChannel>(name, static_cast<TQChannelId>(100 + c))));
             channel->setInterpolation(kTQInterpolationBezier);
             // Each curve a wave in its own band, 0.2 units apart.
             for (int k = 0; k < kKeyframesPerCurve; ++k)
-                channel->setKeyframe(seconds(spacing * (k + 0.5)), c * 0.2 + 0.08 * std::sin(k + c));
+                channel->setKeyframe(seconds(spacing * (k + 0.5)),
+                                     c * 0.2 + 0.08 * std::sin(k + c));
             ctrl.appendChannel(channel, set);
         }
         // The first frame fetches and caches every curve's samples.
@@ -122,14 +129,16 @@ void BM_PickClosest(benchmark::State& state) {
     std::vector<HXDFloat2> points;
     for (int i = 0; i < 64; ++i) {
         const int c = (i * 37) % kCurves;
-        const double t = (i % 3 == 0) ? (kDurationSeconds / kKeyframesPerCurve) * ((i % kKeyframesPerCurve) + 0.5)
+        const double t = (i % 3 == 0) ? (kDurationSeconds / kKeyframesPerCurve) *
+                                            ((i % kKeyframesPerCurve) + 0.5)
                                       : 0.37 + i * 0.29;
         const double v = c * 0.2 + (i % 4 == 3 ? 0.1 : 0.0);
         const CGPoint p = scene.view.getPointScreen(CGPointMake(t, v));
         points.push_back(HXDFloat2{static_cast<float>(p.x), static_cast<float>(p.y)});
     }
     // The first pick after a frame builds the curves' indexes: not what a click costs.
-    benchmark::DoNotOptimize(rc->newHitTestResultForPrimitives(pickable, rc->renderingContextForHitTestAtCoords(points[0]), true));
+    benchmark::DoNotOptimize(rc->newHitTestResultForPrimitives(
+        pickable, rc->renderingContextForHitTestAtCoords(points[0]), true));
     size_t i = 0;
     size_t hits = 0;
     for (auto _ : state) {

@@ -84,17 +84,19 @@ struct GestureScene {
         view.setAutoZoom(0);
         view.setAutoPan(0);
         ctrl.setSelectedCurveSet(set);
-        auto* object = host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
+        auto* object =
+            host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
         const double spacing = kDuration / kKeyframesPerCurve;
         for (int c = 0; c < kCurves; ++c) {
             char name[16];
             std::snprintf(name, sizeof name, "C%d", c);
-            auto* channel = static_cast<TQChannel*>(
-                object->addChild(std::make_unique<TQChannel>(name, static_cast<TQChannelId>(100 + c))));
+            auto* channel = static_cast<TQChannel*>(object->addChild(
+                std::make_unique<TQChannel>(name, static_cast<TQChannelId>(100 + c))));
             channel->setInterpolation(kTQInterpolationBezier);
             channel->setFlag(kTQChannelFlagEnabledInCurveEditor);
             for (int k = 0; k < kKeyframesPerCurve; ++k)
-                channel->setKeyframe(seconds(spacing * (k + 0.5)), c * 0.2 + 0.08 * std::sin(k + c));
+                channel->setKeyframe(seconds(spacing * (k + 0.5)),
+                                     c * 0.2 + 0.08 * std::sin(k + c));
             ctrl.appendChannel(channel, set);
         }
         frame();
@@ -124,8 +126,8 @@ void bandSteps(benchmark::State& state, uint64_t mods) {
     for (auto _ : state) {
         scene.clock.advance(kStep);
         // Back and forth between a band over everything and one a little smaller.
-        scene.view.mouseDragged(
-            scene.at(RWEventType::LeftMouseDragged, out ? kDuration - 0.01 : kDuration - 0.5, -0.5, mods));
+        scene.view.mouseDragged(scene.at(RWEventType::LeftMouseDragged,
+                                         out ? kDuration - 0.01 : kDuration - 0.5, -0.5, mods));
         out = !out;
     }
     state.counters["selected"] = static_cast<double>(scene.view.getSelection()->size());
@@ -151,7 +153,8 @@ void BM_DragStepThroughView(benchmark::State& state) {
     for (auto _ : state) {
         scene.clock.advance(kStep);
         // A third of a frame to and fro: every keypoint moves, none meets another.
-        scene.view.mouseDragged(scene.at(RWEventType::LeftMouseDragged, forward ? t + 0.011 : t, v));
+        scene.view.mouseDragged(
+            scene.at(RWEventType::LeftMouseDragged, forward ? t + 0.011 : t, v));
         forward = !forward;
     }
     state.counters["keypoints"] = static_cast<double>(scene.view.getSelection()->size());

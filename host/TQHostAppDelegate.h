@@ -41,7 +41,8 @@ public:
     TQHostScene& scene() { return _scene; }
     const TQHostScene& scene() const { return _scene; }
     // Adds an object of the scene's family and posts kTQNotifySceneChanged.
-    TQChannelObjectRootBase* addObject(const BNString& name, const TQHostObjectOptions& options = {});
+    TQChannelObjectRootBase* addObject(const BNString& name,
+                                       const TQHostObjectOptions& options = {});
     // Posts kTQNotifySceneChanged, and kTQNotifyObjectSelectionChanged too when the object was
     // selected. False (and no word) when it is not an object of the scene.
     bool removeObject(const TQChannelBase* object);
@@ -76,7 +77,9 @@ public:
     bool isEventCoalescingSuppressed() const { return _coalescingSuppressed > 0; }
 
     // --- Notifications ---
-    void addNotificationReceiver(TQNotificationReceiver* receiver) { _notifications.addReceiver(receiver); }
+    void addNotificationReceiver(TQNotificationReceiver* receiver) {
+        _notifications.addReceiver(receiver);
+    }
     void removeNotificationReceiver(TQNotificationReceiver* receiver) {
         _notifications.removeReceiver(receiver);
     }
@@ -97,7 +100,9 @@ public:
     void unregisterUndoClient(const void* object) { _undo.unregisterClient(object); }
 
     // --- Document ---
-    void setCurveSetListSerializer(TQCurveSetListSerializer* serializer) { _curveSets = serializer; }
+    void setCurveSetListSerializer(TQCurveSetListSerializer* serializer) {
+        _curveSets = serializer;
+    }
     void setVersion(double version) { _version = version; }
 
     // --- TQCurveEditorAppDelegate ---
@@ -135,7 +140,9 @@ public:
         _undo.beginStep(undoDescription);
     }
     void endCaptureModifiedChannels() override { _undo.endStep(); }
-    void willChangeChannel(const TQChannelBase* channel) override { _undo.announceChannel(channel); }
+    void willChangeChannel(const TQChannelBase* channel) override {
+        _undo.announceChannel(channel);
+    }
     // The state after a change is taken when the step closes, so the did... calls, which may
     // be missing, carry nothing the host needs.
     void didChangeChannel(const TQChannelBase*) override {}

@@ -36,7 +36,9 @@ void TQHostNotificationCenter::post(TQNotificationWord word) {
     // Cleared and compacted on every way out, an unwinding receiver included.
     struct DeliveryScope {
         TQHostNotificationCenter& center;
-        explicit DeliveryScope(TQHostNotificationCenter& c) : center(c) { center._delivering = true; }
+        explicit DeliveryScope(TQHostNotificationCenter& c) : center(c) {
+            center._delivering = true;
+        }
         ~DeliveryScope() {
             center._delivering = false;
             center._pending.clear();

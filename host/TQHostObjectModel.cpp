@@ -1,6 +1,5 @@
 #include "host/TQHostObjectModel.h"
 
-
 #include "platform/channels/TQChannelTypes.h"
 
 namespace {
@@ -184,27 +183,23 @@ const TQHostTypedChannelPaths& TQHostTypedPaths(TQHostObjectFamily family) {
     auto make = [](TQChannelId properties, TQChannelId blending, TQChannelId visible,
                    TQChannelId audio, TQChannelId style) {
         return TQHostTypedChannelPaths{
-            path({properties, blending, visible}),
-            path({properties, audio, kVolume}),
-            path({properties, style, kOffset}),
-            path({properties, style, kGradient}),
-            path({properties, style, kTaper}),
-            path({properties, style, kSoftness}),
-            path({properties, style, kFontIndex}),
-            path({properties, style, kOrientation}),
+            path({properties, blending, visible}), path({properties, audio, kVolume}),
+            path({properties, style, kOffset}),    path({properties, style, kGradient}),
+            path({properties, style, kTaper}),     path({properties, style, kSoftness}),
+            path({properties, style, kFontIndex}), path({properties, style, kOrientation}),
         };
     };
-    static const TQHostTypedChannelPaths kestrel = make(
-        kKestrelProperties, kKestrelBlending, kKestrelVisible, kKestrelAudio, kKestrelStyle);
-    static const TQHostTypedChannelPaths other = make(
-        kOtherProperties, kOtherCompositing, kOtherVisible, kOtherAudio, kOtherStyle);
+    static const TQHostTypedChannelPaths kestrel =
+        make(kKestrelProperties, kKestrelBlending, kKestrelVisible, kKestrelAudio, kKestrelStyle);
+    static const TQHostTypedChannelPaths other =
+        make(kOtherProperties, kOtherCompositing, kOtherVisible, kOtherAudio, kOtherStyle);
     return family == TQHostObjectFamily::Kestrel ? kestrel : other;
 }
 
 std::unique_ptr<TQChannelObjectRootBase> TQHostMakeObject(const BNString& name,
-                                                         TQChannelId objectId,
-                                                         TQHostObjectFamily family,
-                                                         const TQHostObjectOptions& options) {
+                                                          TQChannelId objectId,
+                                                          TQHostObjectFamily family,
+                                                          const TQHostObjectOptions& options) {
     auto root = std::make_unique<TQChannelObjectRootBase>(name, objectId);
     if (family == TQHostObjectFamily::Kestrel)
         buildKestrel(*root, options);

@@ -36,14 +36,14 @@ const std::vector<BNString>& TQHostPropertyPaths(TQHostObjectFamily family,
 
 // Ids of the channels every object carries beyond the tables.
 struct TQHostTypedChannelPaths {
-    BNString visible;        // TQChannelBool
-    BNString volume;         // TQChannelDecibel
-    BNString offset;         // TQChannel2D
-    BNString gradient;       // TQChannel2DOverRange
-    BNString taper;          // TQChannelScaleOverRange
-    BNString softness;       // TQChannelCurve
-    BNString fontIndex;      // TQChannelBlindData
-    BNString orientation;    // TQChannelRotation3D, quaternion mode
+    BNString visible;      // TQChannelBool
+    BNString volume;       // TQChannelDecibel
+    BNString offset;       // TQChannel2D
+    BNString gradient;     // TQChannel2DOverRange
+    BNString taper;        // TQChannelScaleOverRange
+    BNString softness;     // TQChannelCurve
+    BNString fontIndex;    // TQChannelBlindData
+    BNString orientation;  // TQChannelRotation3D, quaternion mode
 };
 const TQHostTypedChannelPaths& TQHostTypedPaths(TQHostObjectFamily family);
 
@@ -54,6 +54,6 @@ struct TQHostObjectOptions {
 
 // A new object of the family in its default state, owned by the caller.
 std::unique_ptr<TQChannelObjectRootBase> TQHostMakeObject(const BNString& name,
-                                                         TQChannelId objectId,
-                                                         TQHostObjectFamily family,
-                                                         const TQHostObjectOptions& options = {});
+                                                          TQChannelId objectId,
+                                                          TQHostObjectFamily family,
+                                                          const TQHostObjectOptions& options = {});

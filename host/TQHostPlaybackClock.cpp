@@ -7,15 +7,12 @@ CMTimeValue ticksOf(const CMTime& time) {
     return CMTimeConvertScale(time, TQHostPlaybackClock::kTimescale).value;
 }
 
-CMTime timeOfTicks(CMTimeValue ticks) {
-    return CMTimeMake(ticks, TQHostPlaybackClock::kTimescale);
-}
+CMTime timeOfTicks(CMTimeValue ticks) { return CMTimeMake(ticks, TQHostPlaybackClock::kTimescale); }
 
 }  // namespace
 
 TQHostPlaybackClock::TQHostPlaybackClock()
-    : _currentTime(kCMTimeZero),
-      _playRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(10, 1))) {}
+    : _currentTime(kCMTimeZero), _playRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(10, 1))) {}
 
 bool TQHostPlaybackClock::setCurrentTime(const CMTime& time) {
     if (!CMTIME_IS_NUMERIC(time)) return false;

@@ -48,7 +48,7 @@ struct KeySpec {
     int count;
     double base;
     double amplitude;
-    bool positive = false;  // values kept above zero (scales, decibel amplitudes)
+    bool positive = false;      // values kept above zero (scales, decibel amplitudes)
     int frames = kSceneFrames;  // the span the keys spread over, in frames
 };
 
@@ -93,7 +93,9 @@ TQChannel* channelAt(TQChannelBase* object, const BNString& path) {
 
 void animateObject(TQChannelObjectRootBase& object, TQHostObjectFamily family, Generator& random,
                    double density, bool quaternionRotation) {
-    auto paths = [family](TQHostProperty property) { return TQHostPropertyPaths(family, property); };
+    auto paths = [family](TQHostProperty property) {
+        return TQHostPropertyPaths(family, property);
+    };
     const TQHostTypedChannelPaths& typed = TQHostTypedPaths(family);
 
     for (const BNString& path : paths(TQHostProperty::Position))
@@ -106,14 +108,14 @@ void animateObject(TQChannelObjectRootBase& object, TQHostObjectFamily family, G
             addKeys(channelAt(&object, path), {rotationKeys, 0.0, 1.5}, random,
                     kQuaternionInterpolations, density);
         else
-            addKeys(channelAt(&object, path), {rotationKeys, 0.0, 1.5}, random,
-                    kAllInterpolations, density);
+            addKeys(channelAt(&object, path), {rotationKeys, 0.0, 1.5}, random, kAllInterpolations,
+                    density);
     }
 
     const auto scales = paths(TQHostProperty::Scale);
     for (size_t axis = 0; axis < std::min<size_t>(scales.size(), 2); ++axis)
-        addKeys(channelAt(&object, scales[axis]), {25, 1.0, 0.5, true}, random,
-                kAllInterpolations, density);
+        addKeys(channelAt(&object, scales[axis]), {25, 1.0, 0.5, true}, random, kAllInterpolations,
+                density);
 
     for (const BNString& path : paths(TQHostProperty::Opacity))
         addKeys(channelAt(&object, path), {20, 0.6, 0.4, true}, random, kAllInterpolations,
@@ -159,7 +161,8 @@ void TQHostPopulateSampleScene(TQHostScene& scene, const TQHostSampleSceneSpec& 
 
         if (name == kTQHostSampleBehaviorObject) {
             const TQHostObjectFamily family = scene.family();
-            if (auto* x = channelAt(object, TQHostPropertyPaths(family, TQHostProperty::Position)[0]))
+            if (auto* x =
+                    channelAt(object, TQHostPropertyPaths(family, TQHostProperty::Position)[0]))
                 x->addBehavior(std::make_unique<TQOscillateBehavior>(40.0, 0.5));
             if (auto* opacity =
                     channelAt(object, TQHostPropertyPaths(family, TQHostProperty::Opacity)[0]))

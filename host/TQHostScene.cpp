@@ -140,9 +140,8 @@ std::vector<TQChannelBase*> TQHostScene::selectedObjects() const {
 
 bool TQHostScene::isObjectSelected(const TQChannelBase* object) const {
     TQChannelObjectRootBase* found = asObject(object);
-    return found &&
-           std::find(_selection.begin(), _selection.end(), found->getChannelId()) !=
-               _selection.end();
+    return found && std::find(_selection.begin(), _selection.end(), found->getChannelId()) !=
+                        _selection.end();
 }
 
 bool TQHostScene::hasSelection() const {

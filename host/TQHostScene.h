@@ -29,7 +29,8 @@ public:
 
     // --- Objects ---
     // A new object of the scene's family, with the next free object id, appended.
-    TQChannelObjectRootBase* addObject(const BNString& name, const TQHostObjectOptions& options = {});
+    TQChannelObjectRootBase* addObject(const BNString& name,
+                                       const TQHostObjectOptions& options = {});
     // Takes ownership of an object built elsewhere. Its id is kept when no other object has it,
     // and replaced by the next free id otherwise. Null is ignored (answers null).
     TQChannelObjectRootBase* adoptObject(std::unique_ptr<TQChannelObjectRootBase> object);

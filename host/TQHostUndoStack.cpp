@@ -18,9 +18,7 @@ private:
     bool& _flag;
 };
 
-bool sameClass(const TQChannelBase& a, const TQChannelBase& b) {
-    return typeid(a) == typeid(b);
-}
+bool sameClass(const TQChannelBase& a, const TQChannelBase& b) { return typeid(a) == typeid(b); }
 
 }  // namespace
 

@@ -128,7 +128,8 @@ private:
     void settlePending();
     void pushUndo(std::unique_ptr<Step> step);
     void apply(Step& step, bool undoing);
-    void restoreChannel(const ChannelPart& part, const TQChannelBase* snapshot, TQChannelBase* root);
+    void restoreChannel(const ChannelPart& part, const TQChannelBase* snapshot,
+                        TQChannelBase* root);
     void swapClientState(ClientPart& part);
 
     SceneRootProvider _sceneRoot;

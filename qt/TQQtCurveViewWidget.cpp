@@ -18,7 +18,8 @@ TQQtCurveViewWidget::TQQtCurveViewWidget(QWidget* parent) : QWidget(parent), _ho
     _dragRepeat.setSingleShot(true);
     _dragRepeat.setTimerType(Qt::PreciseTimer);
     // Just past the view's gate, in whole milliseconds.
-    _dragRepeat.setInterval(static_cast<int>(std::ceil(TQCurveEditorViewBase::kFrameInterval * 1000.0)) + 1);
+    _dragRepeat.setInterval(
+        static_cast<int>(std::ceil(TQCurveEditorViewBase::kFrameInterval * 1000.0)) + 1);
     connect(&_dragRepeat, &QTimer::timeout, this, [this] { repeatLastDrag(); });
 }
 
@@ -71,7 +72,8 @@ void TQQtCurveViewWidget::paintEvent(QPaintEvent*) {
         painter.drawImage(QRectF(rect()), frame, QRectF(frame.rect()));
     } else {
         const GDColor c = GDColor::curveEditorBackgroundColor0();
-        painter.fillRect(rect(), TQQtPainterEncoder::qColor(HXDColor{c.red, c.green, c.blue, 1.0f}));
+        painter.fillRect(rect(),
+                         TQQtPainterEncoder::qColor(HXDColor{c.red, c.green, c.blue, 1.0f}));
     }
 }
 
@@ -99,11 +101,14 @@ void TQQtCurveViewWidget::beginGesture(QMouseEvent* event, bool doubleClick) {
     const QPointF at = event->position();
     // Qt reports the second press of a double click by itself; later presses of a longer
     // run are counted here by the same rules of time and distance.
-    const bool continues = _hasLastPress &&
-                           nowMs - _lastPressMs <= QGuiApplication::styleHints()->mouseDoubleClickInterval() &&
-                           (at - _lastPressAt).manhattanLength() <= QGuiApplication::styleHints()->startDragDistance();
-    if (doubleClick) _clickCount = std::max<int64_t>(2, continues ? _clickCount + 1 : 2);
-    else _clickCount = continues ? _clickCount + 1 : 1;
+    const bool continues =
+        _hasLastPress &&
+        nowMs - _lastPressMs <= QGuiApplication::styleHints()->mouseDoubleClickInterval() &&
+        (at - _lastPressAt).manhattanLength() <= QGuiApplication::styleHints()->startDragDistance();
+    if (doubleClick)
+        _clickCount = std::max<int64_t>(2, continues ? _clickCount + 1 : 2);
+    else
+        _clickCount = continues ? _clickCount + 1 : 1;
     _hasLastPress = true;
     _lastPressMs = nowMs;
     _lastPressAt = at;
@@ -120,7 +125,8 @@ void TQQtCurveViewWidget::beginGesture(QMouseEvent* event, bool doubleClick) {
     _view->mouseDown(*down);
     // The press may have run a modal panel (a double click types a value) during which the
     // button came up: that release went to the panel, so it is made up for here.
-    if (_view && _leftGesture && !(QGuiApplication::mouseButtons() & Qt::LeftButton)) endGesture(*down);
+    if (_view && _leftGesture && !(QGuiApplication::mouseButtons() & Qt::LeftButton))
+        endGesture(*down);
 }
 
 void TQQtCurveViewWidget::endGesture(const RWEvent& at) {
@@ -128,10 +134,9 @@ void TQQtCurveViewWidget::endGesture(const RWEvent& at) {
     _dragRepeat.stop();
     _lastDrag.reset();
     if (!_view) return;
-    _view->mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, at.locationInWindow(), at.modifierFlags(),
-                                       at.clickCount(), at.timestamp()));
+    _view->mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, at.locationInWindow(),
+                                       at.modifierFlags(), at.clickCount(), at.timestamp()));
 }
-
 
 void TQQtCurveViewWidget::mousePressEvent(QMouseEvent* event) {
     if (!_view || event->button() != Qt::LeftButton) {

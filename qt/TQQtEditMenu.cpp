@@ -30,8 +30,10 @@ QString TQQtEditMenu::actionTitle(const QString& verb, const std::string& descri
 void TQQtEditMenu::refresh() {
     const bool canUndo = _history && _history->canUndo();
     const bool canRedo = _history && _history->canRedo();
-    _undo->setText(actionTitle(QObject::tr("Undo"), canUndo ? _history->undoDescription() : std::string()));
-    _redo->setText(actionTitle(QObject::tr("Redo"), canRedo ? _history->redoDescription() : std::string()));
+    _undo->setText(
+        actionTitle(QObject::tr("Undo"), canUndo ? _history->undoDescription() : std::string()));
+    _redo->setText(
+        actionTitle(QObject::tr("Redo"), canRedo ? _history->redoDescription() : std::string()));
     _undo->setEnabled(canUndo);
     _redo->setEnabled(canRedo);
 }
@@ -40,8 +42,10 @@ void TQQtEditMenu::perform(bool undo) {
     if (!_history) return;
     // A shortcut can fire before the menu was refreshed: ask the history, not the action.
     if (undo ? _history->canUndo() : _history->canRedo()) {
-        if (undo) _history->undo();
-        else _history->redo();
+        if (undo)
+            _history->undo();
+        else
+            _history->redo();
     }
     refresh();
 }

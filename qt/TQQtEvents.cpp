@@ -6,9 +6,7 @@ namespace {
 
 double seconds(const QInputEvent& event) { return static_cast<double>(event.timestamp()) / 1000.0; }
 
-std::string utf8(char32_t c) {
-    return QString::fromUcs4(&c, 1).toStdString();
-}
+std::string utf8(char32_t c) { return QString::fromUcs4(&c, 1).toStdString(); }
 
 // The modifier a modifier key stands for, if it is one.
 std::optional<Qt::KeyboardModifier> modifierOfKey(int key) {
@@ -56,11 +54,13 @@ std::string functionKeyCharacters(int key) {
         case Qt::Key_Backtab: return utf8(0x19);
         default: break;
     }
-    if (key >= Qt::Key_F1 && key <= Qt::Key_F35) return utf8(0xF704 + static_cast<char32_t>(key - Qt::Key_F1));
+    if (key >= Qt::Key_F1 && key <= Qt::Key_F35)
+        return utf8(0xF704 + static_cast<char32_t>(key - Qt::Key_F1));
     return {};
 }
 
-std::optional<RWEvent> mouseEvent(const QMouseEvent& event, const TQQtViewHost& host, int64_t clickCount) {
+std::optional<RWEvent> mouseEvent(const QMouseEvent& event, const TQQtViewHost& host,
+                                  int64_t clickCount) {
     const auto pick = [](Qt::MouseButton button, RWEventType left, RWEventType right,
                          RWEventType other) -> std::optional<RWEventType> {
         switch (button) {
@@ -78,14 +78,19 @@ std::optional<RWEvent> mouseEvent(const QMouseEvent& event, const TQQtViewHost& 
                         RWEventType::OtherMouseDown);
             break;
         case QEvent::MouseButtonRelease:
-            type = pick(event.button(), RWEventType::LeftMouseUp, RWEventType::RightMouseUp, RWEventType::OtherMouseUp);
+            type = pick(event.button(), RWEventType::LeftMouseUp, RWEventType::RightMouseUp,
+                        RWEventType::OtherMouseUp);
             break;
         case QEvent::MouseMove:
             // The drag of the button held longest in the views' order: left, right, other.
-            if (event.buttons() & Qt::LeftButton) type = RWEventType::LeftMouseDragged;
-            else if (event.buttons() & Qt::RightButton) type = RWEventType::RightMouseDragged;
-            else if (event.buttons() & Qt::MiddleButton) type = RWEventType::OtherMouseDragged;
-            else type = RWEventType::MouseMoved;
+            if (event.buttons() & Qt::LeftButton)
+                type = RWEventType::LeftMouseDragged;
+            else if (event.buttons() & Qt::RightButton)
+                type = RWEventType::RightMouseDragged;
+            else if (event.buttons() & Qt::MiddleButton)
+                type = RWEventType::OtherMouseDragged;
+            else
+                type = RWEventType::MouseMoved;
             break;
         default: break;
     }
@@ -139,7 +144,8 @@ RWEvent keyEvent(const QKeyEvent& event) {
         }
     }
     return RWEvent::keyEvent(press ? RWEventType::KeyDown : RWEventType::KeyUp, characters,
-                             modifierFlags(modifiers), static_cast<uint16_t>(event.nativeVirtualKey() & 0xFFFF),
+                             modifierFlags(modifiers),
+                             static_cast<uint16_t>(event.nativeVirtualKey() & 0xFFFF),
                              event.isAutoRepeat(), ignoringModifiers, seconds(event));
 }
 

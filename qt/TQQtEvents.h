@@ -30,7 +30,8 @@ std::string functionKeyCharacters(int qtKey);
 // A mouse event of the widget behind `host`. clickCount counts presses of one multi-click
 // (Qt reports the second press as a double click). Answers nothing for buttons the views do
 // not know (back, forward...) and for event types that are not mouse events.
-std::optional<RWEvent> mouseEvent(const QMouseEvent& event, const TQQtViewHost& host, int64_t clickCount = 1);
+std::optional<RWEvent> mouseEvent(const QMouseEvent& event, const TQQtViewHost& host,
+                                  int64_t clickCount = 1);
 
 // A wheel event: one notch (120 eighths of a degree) is one line; a precise device (a
 // touchpad) gives its pixel deltas in points instead. Positive y scrolls up.

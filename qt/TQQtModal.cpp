@@ -37,8 +37,10 @@ void TQQtModalService::install() {
 }
 
 void TQQtModalService::registerDialog(const std::string& windowTitle, DialogFactory factory) {
-    if (factory) _factories[windowTitle] = std::move(factory);
-    else _factories.erase(windowTitle);
+    if (factory)
+        _factories[windowTitle] = std::move(factory);
+    else
+        _factories.erase(windowTitle);
 }
 
 RWModalResponse TQQtModalService::runModalForWindow(RWWindow& window) {
@@ -77,11 +79,13 @@ std::unique_ptr<QDialog> TQQtModalService::makeValueDialog(RWWindow& window) {
     line->setText(QLocale::c().toString(valueWindow->value, 'g', 10));
     line->selectAll();
     layout->addWidget(line);
-    auto* buttons = new QDialogButtonBox(QDialogButtonBox::Ok | QDialogButtonBox::Cancel, dialog.get());
+    auto* buttons =
+        new QDialogButtonBox(QDialogButtonBox::Ok | QDialogButtonBox::Cancel, dialog.get());
     layout->addWidget(buttons);
 
     QDialog* raw = dialog.get();
-    QObject::connect(buttons, &QDialogButtonBox::rejected, raw, [raw] { raw->done(dialogCode(RWModalResponseCancel)); });
+    QObject::connect(buttons, &QDialogButtonBox::rejected, raw,
+                     [raw] { raw->done(dialogCode(RWModalResponseCancel)); });
     QObject::connect(buttons, &QDialogButtonBox::accepted, raw, [raw, line, valueWindow] {
         bool ok = false;
         const double typed = QLocale::c().toDouble(line->text().trimmed(), &ok);
@@ -96,8 +100,9 @@ std::unique_ptr<QDialog> TQQtModalService::makeValueDialog(RWWindow& window) {
 
     // At the point of the click: window points with y up, in the window the click was in.
     if (parent) {
-        const QPoint local(static_cast<int>(std::lround(valueWindow->location.x)),
-                           static_cast<int>(std::lround(parent->height() - valueWindow->location.y)));
+        const QPoint local(
+            static_cast<int>(std::lround(valueWindow->location.x)),
+            static_cast<int>(std::lround(parent->height() - valueWindow->location.y)));
         dialog->move(parent->mapToGlobal(local));
     }
     return dialog;

@@ -25,7 +25,9 @@ Qt::PenJoinStyle penJoin(HXDLineJoin join) {
 
 // Flat ends keep stipple steps exactly as long as the pattern says; round joins get round
 // ends so that separately stroked pieces meet without notches.
-Qt::PenCapStyle penCap(Qt::PenJoinStyle join) { return join == Qt::RoundJoin ? Qt::RoundCap : Qt::FlatCap; }
+Qt::PenCapStyle penCap(Qt::PenJoinStyle join) {
+    return join == Qt::RoundJoin ? Qt::RoundCap : Qt::FlatCap;
+}
 
 // Lines of at most one pixel take Qt's cosmetic stroker, many times faster than the general
 // one on long antialiased polylines; a thinner line is drawn one pixel wide with its colour
@@ -52,7 +54,8 @@ QPointF lerp(const QPointF& a, const QPointF& b, double t) { return a + (b - a) 
 
 HXDColor lerp(const HXDColor& a, const HXDColor& b, double t) {
     const auto mix = [t](float x, float y) { return static_cast<float>(x + (y - x) * t); };
-    return HXDColor{mix(a.red, b.red), mix(a.green, b.green), mix(a.blue, b.blue), mix(a.alpha, b.alpha)};
+    return HXDColor{mix(a.red, b.red), mix(a.green, b.green), mix(a.blue, b.blue),
+                    mix(a.alpha, b.alpha)};
 }
 
 // Liang-Barsky: the part [u0, u1] of the segment a-b (as fractions of it) inside the
@@ -70,8 +73,10 @@ bool clipToRect(const QPointF& a, const QPointF& b, const QRectF& r, double& u0,
             continue;
         }
         const double u = q[k] / p[k];
-        if (p[k] < 0.0) u0 = std::max(u0, u);
-        else u1 = std::min(u1, u);
+        if (p[k] < 0.0)
+            u0 = std::max(u0, u);
+        else
+            u1 = std::min(u1, u);
         if (u0 > u1) return false;
     }
     return true;
@@ -82,15 +87,17 @@ bool clipToRect(const QPointF& a, const QPointF& b, const QRectF& r, double& u0,
 // ---- Text metrics ---------------------------------------------------------------------------
 
 QFont TQQtTextMetrics::fontFor(const HXDTextAttributes& attributes) {
-    QFont font = attributes.fontFamily.empty() ? QFontDatabase::systemFont(QFontDatabase::GeneralFont)
-                                               : QFont(QString::fromStdString(attributes.fontFamily));
+    QFont font = attributes.fontFamily.empty()
+                     ? QFontDatabase::systemFont(QFontDatabase::GeneralFont)
+                     : QFont(QString::fromStdString(attributes.fontFamily));
     // A point of the views is one logical pixel, whatever the screen's dpi says.
     const float size = std::isfinite(attributes.fontSize) ? attributes.fontSize : 8.0f;
     font.setPixelSize(std::max(1, static_cast<int>(std::lround(size))));
     return font;
 }
 
-CGSize TQQtTextMetrics::sizeOfText(const std::string& text, const HXDTextAttributes& attributes) const {
+CGSize TQQtTextMetrics::sizeOfText(const std::string& text,
+                                   const HXDTextAttributes& attributes) const {
     const QFontMetricsF metrics(fontFor(attributes));
     return CGSizeMake(metrics.horizontalAdvance(QString::fromStdString(text)), metrics.height());
 }
@@ -104,7 +111,8 @@ TQQtPainterEncoder::~TQQtPainterEncoder() {
 HXDTexture* TQQtPainterEncoder::nextDrawable() {
     if (_drawableSize.isEmpty()) return nullptr;
     QImage& image = _target.image();
-    if (image.size() != _drawableSize) image = QImage(_drawableSize, QImage::Format_ARGB32_Premultiplied);
+    if (image.size() != _drawableSize)
+        image = QImage(_drawableSize, QImage::Format_ARGB32_Premultiplied);
     if (image.isNull()) return nullptr;  // out of memory for a huge drawable
     return &_target;
 }
@@ -130,7 +138,9 @@ void TQQtPainterEncoder::endEncoding() {
 }
 
 QColor TQQtPainterEncoder::qColor(const HXDColor& c) {
-    const auto clamp01 = [](float v) { return std::isfinite(v) ? std::clamp(v, 0.0f, 1.0f) : 0.0f; };
+    const auto clamp01 = [](float v) {
+        return std::isfinite(v) ? std::clamp(v, 0.0f, 1.0f) : 0.0f;
+    };
     return QColor::fromRgbF(clamp01(c.red), clamp01(c.green), clamp01(c.blue), clamp01(c.alpha));
 }
 
@@ -147,16 +157,19 @@ QPainter::CompositionMode TQQtPainterEncoder::compositionModeFor(const HXDBlendi
     // QPainter works on premultiplied colours, so a source factor of SourceAlpha (straight
     // colour) and One (premultiplied colour) are the same mode here.
     const bool srcOver = b.sourceRGB == F::SourceAlpha || b.sourceRGB == F::One;
-    if (srcOver && b.destinationRGB == F::OneMinusSourceAlpha) return QPainter::CompositionMode_SourceOver;
+    if (srcOver && b.destinationRGB == F::OneMinusSourceAlpha)
+        return QPainter::CompositionMode_SourceOver;
     if (srcOver && b.destinationRGB == F::One) return QPainter::CompositionMode_Plus;
     if (srcOver && b.destinationRGB == F::Zero) return QPainter::CompositionMode_Source;
     if ((b.sourceRGB == F::DestinationColor && b.destinationRGB == F::Zero) ||
         (b.sourceRGB == F::Zero && b.destinationRGB == F::SourceColor))
         return QPainter::CompositionMode_Multiply;
-    if (b.sourceRGB == F::One && b.destinationRGB == F::OneMinusSourceColor) return QPainter::CompositionMode_Screen;
+    if (b.sourceRGB == F::One && b.destinationRGB == F::OneMinusSourceColor)
+        return QPainter::CompositionMode_Screen;
     if (b.sourceRGB == F::Zero && b.destinationRGB == F::OneMinusSourceAlpha)
         return QPainter::CompositionMode_DestinationOut;
-    if (b.sourceRGB == F::Zero && b.destinationRGB == F::One) return QPainter::CompositionMode_Destination;
+    if (b.sourceRGB == F::Zero && b.destinationRGB == F::One)
+        return QPainter::CompositionMode_Destination;
     if (b.sourceRGB == F::OneMinusDestinationAlpha && b.destinationRGB == F::One)
         return QPainter::CompositionMode_DestinationOver;
     if (b.sourceRGB == F::DestinationAlpha && b.destinationRGB == F::OneMinusSourceAlpha)
@@ -177,7 +190,8 @@ const HXDScreenMapping& TQQtPainterEncoder::mappingFor(const HXDRenderingContext
 
 QRectF TQQtPainterEncoder::toDevice(const CGRect& r) const {
     const CGRect s = CGRectStandardize(r);
-    return QRectF(s.origin.x, _deviceHeight - (s.origin.y + s.size.height), s.size.width, s.size.height);
+    return QRectF(s.origin.x, _deviceHeight - (s.origin.y + s.size.height), s.size.width,
+                  s.size.height);
 }
 
 bool TQQtPainterEncoder::prepare(const HXDDrawPrimitive& primitive) {
@@ -189,7 +203,8 @@ bool TQQtPainterEncoder::prepare(const HXDDrawPrimitive& primitive) {
 
 // ---- Multilines -----------------------------------------------------------------------------
 
-void TQQtPainterEncoder::encodeMultiline(const HXDMultiline& multiline, const HXDRenderingContext& context) {
+void TQQtPainterEncoder::encodeMultiline(const HXDMultiline& multiline,
+                                         const HXDRenderingContext& context) {
     if (!prepare(multiline) || !mappingFor(context).isValid()) return;
     const double widthPixels = static_cast<double>(multiline.width()) * context.backingScale();
     if (!(widthPixels >= 0.0) || multiline.vertices().size() < 2) return;
@@ -208,8 +223,8 @@ void TQQtPainterEncoder::encodeMultiline(const HXDMultiline& multiline, const HX
     strokeMultiline(_painter, multiline, widthPixels, step);
 }
 
-void TQQtPainterEncoder::strokeMultiline(QPainter& painter, const HXDMultiline& multiline, double widthPixels,
-                                         double step) {
+void TQQtPainterEncoder::strokeMultiline(QPainter& painter, const HXDMultiline& multiline,
+                                         double widthPixels, double step) {
     const Qt::PenJoinStyle join = penJoin(multiline.lineJoin());
     const auto& vertices = multiline.vertices();
     StipplePhase phase{0, step};
@@ -230,12 +245,13 @@ void TQQtPainterEncoder::strokeMultiline(QPainter& painter, const HXDMultiline& 
     }
 }
 
-void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double step, uint32_t pattern,
-                                   Qt::PenJoinStyle join, StipplePhase& phase) {
+void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double step,
+                                   uint32_t pattern, Qt::PenJoinStyle join, StipplePhase& phase) {
     // Segments are clipped to the drawable grown by a margin: a curve zoomed far out of
     // view keeps its direction where it enters, and the rasteriser never sees huge numbers.
     const double margin = 16.0 + widthPixels;
-    const QRectF guard = QRectF(QPointF(0, 0), QSizeF(_target.image().size())).adjusted(-margin, -margin, margin, margin);
+    const QRectF guard = QRectF(QPointF(0, 0), QSizeF(_target.image().size()))
+                             .adjusted(-margin, -margin, margin, margin);
     _polyline.clear();
     if (step <= 0.0 && drawWholeRun(painter, guard, widthPixels, join)) return;
     for (size_t i = 0; i + 1 < _points.size(); ++i) {
@@ -243,7 +259,8 @@ void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double
         const QPointF& b = _points[i + 1];
         const HXDColor& ca = _colors[i];
         const HXDColor& cb = _colors[i + 1];
-        if (!std::isfinite(a.x()) || !std::isfinite(a.y()) || !std::isfinite(b.x()) || !std::isfinite(b.y())) {
+        if (!std::isfinite(a.x()) || !std::isfinite(a.y()) || !std::isfinite(b.x()) ||
+            !std::isfinite(b.y())) {
             flushPolyline(painter, widthPixels, join);
             continue;
         }
@@ -283,7 +300,8 @@ void TQQtPainterEncoder::strokeRun(QPainter& painter, double widthPixels, double
                     appendToPolyline(painter, pa, pb, ca, widthPixels, join);
                 } else {
                     flushPolyline(painter, widthPixels, join);
-                    drawSegment(painter, pa, pb, lerp(ca, cb, t0), lerp(ca, cb, t1), widthPixels, join);
+                    drawSegment(painter, pa, pb, lerp(ca, cb, t0), lerp(ca, cb, t1), widthPixels,
+                                join);
                 }
             } else {
                 flushPolyline(painter, widthPixels, join);
@@ -311,7 +329,8 @@ bool TQQtPainterEncoder::drawWholeRun(QPainter& painter, const QRectF& guard, do
     for (size_t i = 0; i < _points.size(); ++i) {
         if (!(_colors[i] == color)) return false;
         const QPointF& p = _points[i];
-        if (!(p.x() >= guard.left() && p.x() <= guard.right() && p.y() >= guard.top() && p.y() <= guard.bottom()))
+        if (!(p.x() >= guard.left() && p.x() <= guard.right() && p.y() >= guard.top() &&
+              p.y() <= guard.bottom()))
             return false;  // NaN included
     }
     _polyline.reserve(static_cast<qsizetype>(_points.size()));
@@ -336,7 +355,8 @@ void TQQtPainterEncoder::advancePhase(StipplePhase& phase, double distance, doub
 }
 
 void TQQtPainterEncoder::appendToPolyline(QPainter& painter, const QPointF& a, const QPointF& b,
-                                          const HXDColor& color, double widthPixels, Qt::PenJoinStyle join) {
+                                          const HXDColor& color, double widthPixels,
+                                          Qt::PenJoinStyle join) {
     if (!_polyline.isEmpty() && color == _polylineColor && nearlySame(_polyline.back(), a)) {
         _polyline.append(b);
         return;
@@ -347,7 +367,8 @@ void TQQtPainterEncoder::appendToPolyline(QPainter& painter, const QPointF& a, c
     _polylineColor = color;
 }
 
-void TQQtPainterEncoder::flushPolyline(QPainter& painter, double widthPixels, Qt::PenJoinStyle join) {
+void TQQtPainterEncoder::flushPolyline(QPainter& painter, double widthPixels,
+                                       Qt::PenJoinStyle join) {
     if (_polyline.size() >= 2) {
         painter.setPen(linePen(QBrush(qColor(_polylineColor)), widthPixels, join));
         painter.drawPolyline(_polyline);
@@ -355,8 +376,9 @@ void TQQtPainterEncoder::flushPolyline(QPainter& painter, double widthPixels, Qt
     _polyline.clear();
 }
 
-void TQQtPainterEncoder::drawSegment(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& ca,
-                                     const HXDColor& cb, double widthPixels, Qt::PenJoinStyle join) {
+void TQQtPainterEncoder::drawSegment(QPainter& painter, const QPointF& a, const QPointF& b,
+                                     const HXDColor& ca, const HXDColor& cb, double widthPixels,
+                                     Qt::PenJoinStyle join) {
     if (nearlySame(a, b)) return;
     QLinearGradient gradient(a, b);
     gradient.setColorAt(0.0, qColor(ca));
@@ -365,8 +387,8 @@ void TQQtPainterEncoder::drawSegment(QPainter& painter, const QPointF& a, const 
     painter.drawLine(a, b);
 }
 
-void TQQtPainterEncoder::strokeWithGamma(const HXDMultiline& multiline, double widthPixels, double step,
-                                         float gamma) {
+void TQQtPainterEncoder::strokeWithGamma(const HXDMultiline& multiline, double widthPixels,
+                                         double step, float gamma) {
     // Bounds of the line in device pixels, grown by its width and the antialiased fringe.
     double x0 = INFINITY, y0 = INFINITY, x1 = -INFINITY, y1 = -INFINITY;
     for (const HXDLineVertex& v : multiline.vertices()) {
@@ -417,15 +439,16 @@ const QImage* TQQtPainterEncoder::textureImage(const HXDPixelTexture& texture) {
     if (found != _textures.end()) return &found->second;
     if (_textures.size() >= kMaxCachedTextures) _textures.clear();
     const QImage straight(texture.rgba().data(), static_cast<int>(texture.width()),
-                          static_cast<int>(texture.height()), static_cast<qsizetype>(texture.width()) * 4,
-                          QImage::Format_RGBA8888);
+                          static_cast<int>(texture.height()),
+                          static_cast<qsizetype>(texture.width()) * 4, QImage::Format_RGBA8888);
     // The conversion copies: the cached image owns its texels.
     QImage converted = straight.convertToFormat(QImage::Format_ARGB32_Premultiplied);
     if (converted.isNull()) return nullptr;
     return &_textures.emplace(texture.textureID(), std::move(converted)).first->second;
 }
 
-void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad, const HXDRenderingContext& context) {
+void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad,
+                                           const HXDRenderingContext& context) {
     if (!prepare(quad) || !mappingFor(context).isValid() || !quad.texture()) return;
     const QImage* image = textureImage(*quad.texture());
     if (!image) return;
@@ -435,15 +458,18 @@ void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad, const HXD
     if (!target.isValid()) return;
     // An image shown texel for pixel (keypoints, handles) lands on whole pixels: it stays
     // crisp, and the painter blits it instead of resampling. The shift is under half a pixel.
-    if (std::abs(target.width() - image->width()) < 0.01 && std::abs(target.height() - image->height()) < 0.01)
-        target = QRectF(QPointF(std::round(target.left()), std::round(target.top())), QSizeF(image->size()));
+    if (std::abs(target.width() - image->width()) < 0.01 &&
+        std::abs(target.height() - image->height()) < 0.01)
+        target = QRectF(QPointF(std::round(target.left()), std::round(target.top())),
+                        QSizeF(image->size()));
     _painter.setOpacity(std::min(1.0f, attenuation));
     _painter.setRenderHint(QPainter::SmoothPixmapTransform, true);
     _painter.drawImage(target, *image, QRectF(image->rect()));
     _painter.setOpacity(1.0);
 }
 
-void TQQtPainterEncoder::encodeScreenspaceQuad(const HXDScreenspaceQuad& quad, const HXDRenderingContext& context) {
+void TQQtPainterEncoder::encodeScreenspaceQuad(const HXDScreenspaceQuad& quad,
+                                               const HXDRenderingContext& context) {
     if (!prepare(quad) || !mappingFor(context).isValid()) return;
     const QRectF target = toDevice(_mapping.worldRectToPixels(quad.frame()));
     if (!target.isValid()) return;
@@ -457,7 +483,8 @@ void TQQtPainterEncoder::encodeMesh(const HXDMesh& mesh, const HXDRenderingConte
     const QColor color = qColor(mesh.brush().color);
     _painter.setRenderHint(QPainter::Antialiasing, true);
     if (mesh.wireframe()) {
-        _painter.setPen(QPen(QBrush(color), context.backingScale(), Qt::SolidLine, Qt::FlatCap, Qt::MiterJoin));
+        _painter.setPen(
+            QPen(QBrush(color), context.backingScale(), Qt::SolidLine, Qt::FlatCap, Qt::MiterJoin));
         _painter.setBrush(Qt::NoBrush);
     } else {
         _painter.setPen(Qt::NoPen);

@@ -65,15 +65,19 @@ public:
     const QImage& image() const { return _target.image(); }
     int framesPresented() const { return _framesPresented; }
     // Called at endEncoding with the finished frame: a widget asks for a repaint here.
-    void setPresentHandler(std::function<void(const QImage&)> handler) { _present = std::move(handler); }
+    void setPresentHandler(std::function<void(const QImage&)> handler) {
+        _present = std::move(handler);
+    }
 
     HXDTexture* nextDrawable() override;
     void beginEncoding(HXDTexture& target, const HXDColor& clearColor) override;
     void endEncoding() override;
 
-    void encodeMultiline(const HXDMultiline& multiline, const HXDRenderingContext& context) override;
+    void encodeMultiline(const HXDMultiline& multiline,
+                         const HXDRenderingContext& context) override;
     void encodeQuadTexture(const HXDQuadTexture& quad, const HXDRenderingContext& context) override;
-    void encodeScreenspaceQuad(const HXDScreenspaceQuad& quad, const HXDRenderingContext& context) override;
+    void encodeScreenspaceQuad(const HXDScreenspaceQuad& quad,
+                               const HXDRenderingContext& context) override;
     void encodeMesh(const HXDMesh& mesh, const HXDRenderingContext& context) override;
     void encodeText(const HXDText& text, const HXDRenderingContext& context) override;
 
@@ -99,25 +103,28 @@ private:
 
     // Multilines: one run of vertices [first, end) stroked with `painter`; stipple phase
     // carries over from run to run.
-    void strokeMultiline(QPainter& painter, const HXDMultiline& multiline, double widthPixels, double step);
+    void strokeMultiline(QPainter& painter, const HXDMultiline& multiline, double widthPixels,
+                         double step);
     struct StipplePhase {
         uint32_t bit = 0;        // the pattern's bit of the present step
         double remaining = 0.0;  // pixels left of that step
     };
-    void strokeRun(QPainter& painter, double widthPixels, double step, uint32_t pattern, Qt::PenJoinStyle join,
-                   StipplePhase& phase);
+    void strokeRun(QPainter& painter, double widthPixels, double step, uint32_t pattern,
+                   Qt::PenJoinStyle join, StipplePhase& phase);
     // One colour, every point near the drawable: the run is drawn as one polyline. False
     // (nothing drawn) otherwise.
-    bool drawWholeRun(QPainter& painter, const QRectF& guard, double widthPixels, Qt::PenJoinStyle join);
+    bool drawWholeRun(QPainter& painter, const QRectF& guard, double widthPixels,
+                      Qt::PenJoinStyle join);
     // Moves the phase on by a distance in pixels without drawing.
     static void advancePhase(StipplePhase& phase, double distance, double step);
-    void drawSegment(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& ca, const HXDColor& cb,
-                     double widthPixels, Qt::PenJoinStyle join);
-    void appendToPolyline(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& color,
-                          double widthPixels, Qt::PenJoinStyle join);
+    void drawSegment(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& ca,
+                     const HXDColor& cb, double widthPixels, Qt::PenJoinStyle join);
+    void appendToPolyline(QPainter& painter, const QPointF& a, const QPointF& b,
+                          const HXDColor& color, double widthPixels, Qt::PenJoinStyle join);
     void flushPolyline(QPainter& painter, double widthPixels, Qt::PenJoinStyle join);
     // Gamma other than 1: the multiline goes through a layer whose coverage is reshaped.
-    void strokeWithGamma(const HXDMultiline& multiline, double widthPixels, double step, float gamma);
+    void strokeWithGamma(const HXDMultiline& multiline, double widthPixels, double step,
+                         float gamma);
 
     TQQtImageTarget _target;
     QSize _drawableSize;

@@ -4,8 +4,8 @@
 #include <QPainter>
 #include <QPixmap>
 #include <QTimer>
-#include <QtMath>
 #include <QWindow>
+#include <QtMath>
 
 #include <chrono>
 
@@ -24,7 +24,8 @@ TQQtTimerService::~TQQtTimerService() { delete _context; }
 void TQQtTimerService::dispatchAfter(uint64_t nanoseconds, std::function<void()> block) {
     if (!block) return;
     // Rounded up: "at least the given time from now".
-    const auto delay = std::chrono::ceil<std::chrono::milliseconds>(std::chrono::nanoseconds(nanoseconds));
+    const auto delay =
+        std::chrono::ceil<std::chrono::milliseconds>(std::chrono::nanoseconds(nanoseconds));
     QTimer::singleShot(delay, Qt::PreciseTimer, _context, [b = std::move(block)]() { b(); });
 }
 

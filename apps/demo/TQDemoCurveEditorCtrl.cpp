@@ -86,7 +86,8 @@ void TQDemoCurveEditorCtrl::notify(TQNotificationWord word) {
     TQCurveEditorViewBase* view = getView();
     if (word & (kTQNotifyObjectSelectionChanged | kTQNotifySceneChanged | kTQNotifySceneReset))
         followSceneSelection();
-    if (view && (word & (kTQNotifyViewVolumeChanged | kTQNotifyCurvesInvalidated))) view->setAllOriginalCurveDirty(1);
+    if (view && (word & (kTQNotifyViewVolumeChanged | kTQNotifyCurvesInvalidated)))
+        view->setAllOriginalCurveDirty(1);
     if (view && (word & (kTQNotifyChannelsChanging | kTQNotifyChannelsChanged))) {
         if (_restoring) {
             // A restored channel may be a new object behind the same reference, and the
@@ -98,10 +99,11 @@ void TQDemoCurveEditorCtrl::notify(TQNotificationWord word) {
         }
     }
     constexpr TQNotificationWord kRedrawWords =
-        kTQNotifyHostTimeChanged | kTQNotifyTimeChanged | kTQNotifyChannelsChanging | kTQNotifyChannelsChanged |
-        kTQNotifySceneChanged | kTQNotifySceneReset | kTQNotifyDisplayChanged | kTQNotifyPreviewChanged |
-        kTQNotifyPlayRangeChanged | kTQNotifyViewVolumeChanged | kTQNotifyCurvesInvalidated |
-        kTQNotifyCurveSetContentChanged | kTQNotifyObjectSelectionChanged | kTQNotifyToolChanged;
+        kTQNotifyHostTimeChanged | kTQNotifyTimeChanged | kTQNotifyChannelsChanging |
+        kTQNotifyChannelsChanged | kTQNotifySceneChanged | kTQNotifySceneReset |
+        kTQNotifyDisplayChanged | kTQNotifyPreviewChanged | kTQNotifyPlayRangeChanged |
+        kTQNotifyViewVolumeChanged | kTQNotifyCurvesInvalidated | kTQNotifyCurveSetContentChanged |
+        kTQNotifyObjectSelectionChanged | kTQNotifyToolChanged;
     if (word & kRedrawWords) redrawView();
     // Last, always, also for a word with no known bit.
     _host.resetModifiedChannels();

@@ -32,7 +32,8 @@ TQDemoWindow::TQDemoWindow() {
     _view.setController(&_controller);
     _controller.setView(&_view);
     _view.setGridSpacingY(kGridSpacingY);
-    const CGRect volume = CGRectMake(0.0, -kInitialHalfHeight, kInitialSeconds, 2.0 * kInitialHalfHeight);
+    const CGRect volume =
+        CGRectMake(0.0, -kInitialHalfHeight, kInitialSeconds, 2.0 * kInitialHalfHeight);
     _view.setCurrentViewVolume(volume);
     _view.setOriginalViewVolume(volume);
 
@@ -55,8 +56,9 @@ TQDemoWindow::TQDemoWindow() {
     connect(_objectList, &QListWidget::itemSelectionChanged, this, [this] { objectChosen(); });
 
     buildMenus();
-    statusBar()->showMessage(tr("Click a keypoint to select it, drag to move it (Shift: one axis). "
-                                "Drag on empty space for a rubber band. Ctrl+Z undoes."));
+    statusBar()->showMessage(
+        tr("Click a keypoint to select it, drag to move it (Shift: one axis). "
+           "Drag on empty space for a rubber band. Ctrl+Z undoes."));
 
     _curveWidget->setView(&_view);
     resize(1000, 560);
@@ -127,8 +129,10 @@ void TQDemoWindow::refreshObjectList() {
     // selection signal when the user picks a row, and its rows must not vanish under it.
     bool same = _objectList->count() == static_cast<int>(objects.size());
     for (int i = 0; same && i < _objectList->count(); ++i)
-        same = _objectList->item(i)->data(kObjectIdRole).toULongLong() == objects[static_cast<size_t>(i)]->getChannelId() &&
-               _objectList->item(i)->text() == QString::fromStdString(objects[static_cast<size_t>(i)]->getName());
+        same = _objectList->item(i)->data(kObjectIdRole).toULongLong() ==
+                   objects[static_cast<size_t>(i)]->getChannelId() &&
+               _objectList->item(i)->text() ==
+                   QString::fromStdString(objects[static_cast<size_t>(i)]->getName());
     if (!same) {
         _objectList->clear();
         for (TQChannelObjectRootBase* object : objects) {
@@ -137,8 +141,9 @@ void TQDemoWindow::refreshObjectList() {
         }
     }
     const TQChannelObjectRootBase* shown = _controller.shownObject();
-    setWindowTitle(shown ? tr("VantaCurveEditor Demo - %1").arg(QString::fromStdString(shown->getName()))
-                         : tr("VantaCurveEditor Demo"));
+    setWindowTitle(
+        shown ? tr("VantaCurveEditor Demo - %1").arg(QString::fromStdString(shown->getName()))
+              : tr("VantaCurveEditor Demo"));
     for (int i = 0; i < _objectList->count(); ++i) {
         const bool isShown = shown && objects[static_cast<size_t>(i)] == shown;
         _objectList->item(i)->setSelected(isShown);
@@ -153,7 +158,8 @@ void TQDemoWindow::objectChosen() {
     if (rows.isEmpty()) return;  // the view keeps the last object rather than going blank
     const auto id = static_cast<TQChannelId>(rows.front()->data(kObjectIdRole).toULongLong());
     // The scene's selection decides what the view shows: the controller follows its word.
-    if (TQChannelObjectRootBase* object = _host.scene().objectWithId(id)) _host.selectObject(object);
+    if (TQChannelObjectRootBase* object = _host.scene().objectWithId(id))
+        _host.selectObject(object);
 }
 
 void TQDemoWindow::notify(TQNotificationWord word) {

@@ -18,7 +18,9 @@
 class QListWidget;
 class TQQtCurveViewWidget;
 
-class TQDemoWindow final : public QMainWindow, public TQNotificationReceiver, public TQQtUndoHistory {
+class TQDemoWindow final : public QMainWindow,
+                           public TQNotificationReceiver,
+                           public TQQtUndoHistory {
 public:
     TQDemoWindow();
     ~TQDemoWindow() override;

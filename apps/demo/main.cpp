@@ -23,7 +23,8 @@ constexpr int kSettleMilliseconds = 250;
 void settle(int milliseconds) {
     QElapsedTimer elapsed;
     elapsed.start();
-    while (elapsed.elapsed() < milliseconds) QCoreApplication::processEvents(QEventLoop::AllEvents, 10);
+    while (elapsed.elapsed() < milliseconds)
+        QCoreApplication::processEvents(QEventLoop::AllEvents, 10);
 }
 
 int usage(const char* program) {
@@ -64,7 +65,8 @@ int main(int argc, char** argv) {
     settle(kSettleMilliseconds);
     const QPixmap image = window.grab();
     if (image.isNull() || !image.save(screenshot, "PNG")) {
-        std::fprintf(stderr, "vce_demo: could not write %s\n", screenshot.toLocal8Bit().constData());
+        std::fprintf(stderr, "vce_demo: could not write %s\n",
+                     screenshot.toLocal8Bit().constData());
         return 1;
     }
     return 0;

@@ -10,7 +10,8 @@ namespace {
 
 // Logs every word with its own tag, and runs an action on the first word it hears.
 struct Receiver : TQNotificationReceiver {
-    Receiver(std::vector<std::pair<char, TQNotificationWord>>& log, char tag) : log(log), tag(tag) {}
+    Receiver(std::vector<std::pair<char, TQNotificationWord>>& log, char tag)
+        : log(log), tag(tag) {}
     void notify(TQNotificationWord word) override {
         log.emplace_back(tag, word);
         if (onFirst) {

@@ -9,10 +9,10 @@
 
 namespace {
 
-constexpr TQHostProperty kAllProperties[] = {
-    TQHostProperty::Position, TQHostProperty::Scale,   TQHostProperty::Rotation,
-    TQHostProperty::Shear,    TQHostProperty::Pivot,   TQHostProperty::Opacity,
-    TQHostProperty::Retiming};
+constexpr TQHostProperty kAllProperties[] = {TQHostProperty::Position, TQHostProperty::Scale,
+                                             TQHostProperty::Rotation, TQHostProperty::Shear,
+                                             TQHostProperty::Pivot,    TQHostProperty::Opacity,
+                                             TQHostProperty::Retiming};
 
 class SceneFamilies : public ::testing::TestWithParam<TQHostObjectFamily> {};
 
@@ -78,7 +78,8 @@ TEST_P(SceneFamilies, sampleScene__holdsAFewHundredKeyframesPerObjectOfEveryKind
         EXPECT_GE(keys, 250u) << object->getName();
         EXPECT_LE(keys, 600u) << object->getName();
         for (unsigned kind : {0u, 1u, 4u, 6u, 13u, 14u, 15u, 16u, 17u})
-            EXPECT_TRUE(kinds.contains(kind)) << object->getName() << " lacks interpolation " << kind;
+            EXPECT_TRUE(kinds.contains(kind))
+                << object->getName() << " lacks interpolation " << kind;
     }
     EXPECT_EQ(behaviours, 2u) << "only the behaviour object carries behaviours";
     TQChannelObjectRootBase* late = scene.objectNamed(kTQHostSampleOffsetObject);
@@ -94,7 +95,8 @@ protected:
     void SetUp() override {
         TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel, {3, 3, 0.2});
         objects = host.scene().objects();
-        const auto& positions = TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
+        const auto& positions =
+            TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
         x = TQChannelRef(positions[0]).getChannel(objects[0]);
         z = TQChannelRef(positions[2]).getChannel(objects[0]);
         otherX = TQChannelRef(positions[0]).getChannel(objects[1]);

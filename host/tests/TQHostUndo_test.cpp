@@ -18,10 +18,12 @@ protected:
     void SetUp() override {
         TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel, {2, 7, 0.25});
         object = host.scene().objects().front();
-        const auto& positions = TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
+        const auto& positions =
+            TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
         x = channel(positions[0]);
         y = channel(positions[1]);
-        opacity = channel(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Opacity)[0]);
+        opacity =
+            channel(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Opacity)[0]);
         ASSERT_TRUE(x && y && opacity) << "the sample object lacks its position or opacity";
     }
 
@@ -177,7 +179,8 @@ TEST_F(HostUndo, replacedChannel__isFoundByItsReference) {
     host.scene().removeObject(object);
     object = host.scene().adoptObject(std::move(copy));
     ASSERT_EQ(object->getChannelId(), id);
-    TQChannel* newX = channel(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position)[0]);
+    TQChannel* newX =
+        channel(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position)[0]);
     ASSERT_NE(newX, nullptr);
 
     ASSERT_TRUE(host.undo());

@@ -17,29 +17,27 @@ namespace {
 
 bool isInterpolationCode(unsigned code) {
     switch (code) {
-    case kTQInterpolationConstant:
-    case kTQInterpolationLinear:
-    case kTQInterpolationBezier:
-    case kTQInterpolationCatmullRom:
-    case kTQInterpolationExp:
-    case kTQInterpolationLog:
-    case kTQInterpolationEaseBoth:
-    case kTQInterpolationEaseOut:
-    case kTQInterpolationEaseIn:
-        return true;
-    default:
-        return false;
+        case kTQInterpolationConstant:
+        case kTQInterpolationLinear:
+        case kTQInterpolationBezier:
+        case kTQInterpolationCatmullRom:
+        case kTQInterpolationExp:
+        case kTQInterpolationLog:
+        case kTQInterpolationEaseBoth:
+        case kTQInterpolationEaseOut:
+        case kTQInterpolationEaseIn: return true;
+        default: return false;
     }
 }
 
 // The code of a segment run backwards in time: the eased end and the exponential shapes swap.
 unsigned mirroredInterpolation(unsigned code) {
     switch (code) {
-    case kTQInterpolationExp: return kTQInterpolationLog;
-    case kTQInterpolationLog: return kTQInterpolationExp;
-    case kTQInterpolationEaseOut: return kTQInterpolationEaseIn;
-    case kTQInterpolationEaseIn: return kTQInterpolationEaseOut;
-    default: return code;
+        case kTQInterpolationExp: return kTQInterpolationLog;
+        case kTQInterpolationLog: return kTQInterpolationExp;
+        case kTQInterpolationEaseOut: return kTQInterpolationEaseIn;
+        case kTQInterpolationEaseIn: return kTQInterpolationEaseOut;
+        default: return code;
     }
 }
 
@@ -265,9 +263,8 @@ unsigned TQChannel::numberOfKeyframes() const { return unsigned(_d->keys.size())
 
 // ---- Values ----------------------------------------------------------------------------------
 
-void TQChannel::getSamples(const TQSampleContext* context, const CMTime& start,
-                           const CMTime& step, unsigned& count, CMTime** times,
-                           double** values) const {
+void TQChannel::getSamples(const TQSampleContext* context, const CMTime& start, const CMTime& step,
+                           unsigned& count, CMTime** times, double** values) const {
     const unsigned asked = count;
     count = 0;
     if (!CMTIME_IS_NUMERIC(start) || !CMTIME_IS_NUMERIC(step) || step.value <= 0) return;
@@ -324,8 +321,8 @@ void TQChannel::getSamples(const TQSampleContext* context, const CMTime& start,
     }
 }
 
-void TQChannel::getSamples(const CMTime& start, const CMTime& step, unsigned& count,
-                           CMTime** times, double** values) const {
+void TQChannel::getSamples(const CMTime& start, const CMTime& step, unsigned& count, CMTime** times,
+                           double** values) const {
     const TQSampleContext processed;
     getSamples(&processed, start, step, count, times, values);
 }
@@ -386,9 +383,8 @@ unsigned TQChannel::getInterpolation() const {
 }
 
 bool TQChannel::hasInterpolation(unsigned interpolation) const {
-    return std::any_of(_d->keys.begin(), _d->keys.end(), [&](const TQKeyframeRecord& k) {
-        return k.interpolation == interpolation;
-    });
+    return std::any_of(_d->keys.begin(), _d->keys.end(),
+                       [&](const TQKeyframeRecord& k) { return k.interpolation == interpolation; });
 }
 
 unsigned TQChannel::getExtrapolation(unsigned direction) const {
@@ -534,8 +530,8 @@ void TQChannel::moveKeyframe(const CMTime* from, const CMTime* to, bool keepBoth
     _d->orderChanged();
 }
 
-void TQChannel::setKeyframeTime(TQKeyframeHandle handle, const CMTime* time,
-                                const double* newValue, bool* collided) {
+void TQChannel::setKeyframeTime(TQKeyframeHandle handle, const CMTime* time, const double* newValue,
+                                bool* collided) {
     if (collided) *collided = false;
     const long i = _d->indexOf(handle);
     if (i < 0 || !time || !CMTIME_IS_NUMERIC(*time)) return;
@@ -647,16 +643,17 @@ void writeHandle(TQKeyframeRecord& k, bool output, double u, double v, bool rela
     const double newLength = std::hypot(u, v);
     if (newLength == 0.0) return;  // no direction to follow
     const double otherLength = std::hypot(ou, ov);
-    const double length =
-        k.scaled ? otherLength : (oldLength > 0.0 ? otherLength * newLength / oldLength : newLength);
+    const double length = k.scaled
+                              ? otherLength
+                              : (oldLength > 0.0 ? otherLength * newLength / oldLength : newLength);
     ou = -u / newLength * length;
     ov = -v / newLength * length;
 }
 
 }  // namespace
 
-void TQChannel::setKeyframeInputTangents(TQKeyframeHandle handle, double u, double v,
-                                         bool relative, bool keepAligned) {
+void TQChannel::setKeyframeInputTangents(TQKeyframeHandle handle, double u, double v, bool relative,
+                                         bool keepAligned) {
     TQKeyframeRecord* k = _d->find(handle);
     if (!k) return;
     writeHandle(*k, false, u, v, relative, keepAligned);
@@ -809,9 +806,8 @@ bool TQChannel::equalState(const TQChannelBase& other) const {
     const TQChannelData& b = *o->_d;
     if (a.initialValue != b.initialValue || a.defaultInterpolation != b.defaultInterpolation ||
         a.extrapolationBefore != b.extrapolationBefore ||
-        a.extrapolationAfter != b.extrapolationAfter ||
-        a.animationEnabled != b.animationEnabled || a.keys.size() != b.keys.size() ||
-        a.behaviors.size() != b.behaviors.size()) {
+        a.extrapolationAfter != b.extrapolationAfter || a.animationEnabled != b.animationEnabled ||
+        a.keys.size() != b.keys.size() || a.behaviors.size() != b.behaviors.size()) {
         return false;
     }
     for (size_t i = 0; i < a.keys.size(); ++i) {

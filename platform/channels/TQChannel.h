@@ -141,9 +141,8 @@ public:
     // Cost: O(log n) to find the first segment, then a galloping walk proportional to the
     // segments crossed plus the samples; nothing is allocated once the curve's evaluation
     // cache is built (an edit invalidates the cache, the next read rebuilds it in O(n)).
-    virtual void getSamples(const TQSampleContext* context, const CMTime& start,
-                            const CMTime& step, unsigned& count, CMTime** times,
-                            double** values) const;
+    virtual void getSamples(const TQSampleContext* context, const CMTime& start, const CMTime& step,
+                            unsigned& count, CMTime** times, double** values) const;
     // The processed curve: keyframed curve plus every enabled behaviour.
     virtual void getSamples(const CMTime& start, const CMTime& step, unsigned& count,
                             CMTime** times, double** values) const;

@@ -52,9 +52,16 @@ class TQChannelRange {
 public:
     TQChannelRange() = default;
     TQChannelRange(double minimum, double maximum) : _min(minimum), _max(maximum) {}
-    void getRangeMin(double* out) const { if (out) *out = _min; }
-    void getRangeMax(double* out) const { if (out) *out = _max; }
-    void setRange(double minimum, double maximum) { _min = minimum; _max = maximum; }
+    void getRangeMin(double* out) const {
+        if (out) *out = _min;
+    }
+    void getRangeMax(double* out) const {
+        if (out) *out = _max;
+    }
+    void setRange(double minimum, double maximum) {
+        _min = minimum;
+        _max = maximum;
+    }
 
     friend bool operator==(const TQChannelRange&, const TQChannelRange&) = default;
 

@@ -168,9 +168,8 @@ TQChannelBase* TQChannelFolder::cloneChannel() const {
 
 bool TQChannelFolder::isAnimated(bool checkChildren) const {
     if (!checkChildren || !_children) return false;
-    return std::any_of(_children->begin(), _children->end(), [](const TQChannelBase* child) {
-        return child && child->isAnimated(true);
-    });
+    return std::any_of(_children->begin(), _children->end(),
+                       [](const TQChannelBase* child) { return child && child->isAnimated(true); });
 }
 
 void TQChannelFolder::reset(bool notify) {

@@ -77,8 +77,7 @@ public:
     // `stopAtObjectRoots`, object roots below this folder (other objects' trees) are not
     // entered.
     virtual void getAllDescendantsFlattened(std::vector<TQChannelBase*>& out,
-                                            uint32_t excludedFlags,
-                                            bool stopAtObjectRoots) const;
+                                            uint32_t excludedFlags, bool stopAtObjectRoots) const;
 
     // True for a compound; a downcast to TQCompoundChannel then succeeds.
     virtual bool isCompoundChannel() const { return false; }

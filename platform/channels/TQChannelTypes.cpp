@@ -82,8 +82,7 @@ TQChannelBase* TQChannelBlindData::cloneChannel() const {
 
 // ---- TQChannelAngle -----------------------------------------------------------------------
 
-TQChannelAngle::TQChannelAngle(const BNString& name, TQChannelId channelId,
-                               double defaultRadians)
+TQChannelAngle::TQChannelAngle(const BNString& name, TQChannelId channelId, double defaultRadians)
     : TQChannel(name, channelId, defaultRadians) {
     getInfo()->displayScale = 180.0 / std::numbers::pi;
     // A nudge moves one degree.

@@ -52,8 +52,8 @@ public:
     void setInterpolation(unsigned interpolation) override;
 
 protected:
-    TQChannelFixedInterpolation(const BNString& name, TQChannelId channelId,
-                                unsigned interpolation, double defaultValue);
+    TQChannelFixedInterpolation(const BNString& name, TQChannelId channelId, unsigned interpolation,
+                                double defaultValue);
 };
 
 class TQChannelCurve : public TQChannelFixedInterpolation {

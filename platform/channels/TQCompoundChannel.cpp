@@ -130,7 +130,6 @@ void TQCompoundChannel::setLinkedCurveInterpolation(unsigned interpolation) {
 bool TQCompoundChannel::isAnimated(bool /*checkChildren*/) const {
     const auto* children = getChildren();
     if (!children) return false;
-    return std::any_of(children->begin(), children->end(), [](const TQChannelBase* child) {
-        return child && child->isAnimated(true);
-    });
+    return std::any_of(children->begin(), children->end(),
+                       [](const TQChannelBase* child) { return child && child->isAnimated(true); });
 }

@@ -25,8 +25,10 @@ public:
     bool isCompoundChannel() const override { return true; }
     bool isLinked() const { return testFoldFlag(kTQFoldFlagLinked); }
     void setLinked(bool linked) {
-        if (linked) setFoldFlag(kTQFoldFlagLinked);
-        else resetFoldFlag(kTQFoldFlagLinked);
+        if (linked)
+            setFoldFlag(kTQFoldFlagLinked);
+        else
+            resetFoldFlag(kTQFoldFlagLinked);
     }
 
     // The components: the TQChannel children in child order (other children and null slots

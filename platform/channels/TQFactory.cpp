@@ -39,9 +39,9 @@ constexpr TQFactory kRotation3DFactory{kTQChannelRotation3DFactoryId, "TQChannel
                                        createChannel<TQChannelRotation3D>};
 
 constexpr std::array<const TQFactory*, 13> kFactories{
-    &kChannelFactory,   &kFolderFactory,      &kObjectRootFactory,     &kCompoundFactory,
-    &kBoolFactory,      &kCurveFactory,       &kBlindDataFactory,      &kAngleFactory,
-    &kDecibelFactory,   &k2DFactory,          &k2DOverRangeFactory,    &kScaleOverRangeFactory,
+    &kChannelFactory,   &kFolderFactory, &kObjectRootFactory,  &kCompoundFactory,
+    &kBoolFactory,      &kCurveFactory,  &kBlindDataFactory,   &kAngleFactory,
+    &kDecibelFactory,   &k2DFactory,     &k2DOverRangeFactory, &kScaleOverRangeFactory,
     &kRotation3DFactory};
 }  // namespace
 

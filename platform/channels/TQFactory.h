@@ -22,21 +22,16 @@ inline constexpr TQFactoryId kTQChannelFactoryId{0x229211d70b00de81, 0x9389b702a
 inline constexpr TQFactoryId kTQChannelFolderFactoryId{0x229211d70b00de81, 0x9389b702ac3d0002};
 inline constexpr TQFactoryId kTQChannelBoolFactoryId{0x229211d70b00de81, 0x9389b702ac3d0003};
 inline constexpr TQFactoryId kTQChannelCurveFactoryId{0x229211d70b00de81, 0x9389b702ac3d0004};
-inline constexpr TQFactoryId kTQChannelBlindDataFactoryId{0x229211d70b00de81,
-                                                          0x9389b702ac3d0005};
+inline constexpr TQFactoryId kTQChannelBlindDataFactoryId{0x229211d70b00de81, 0x9389b702ac3d0005};
 inline constexpr TQFactoryId kTQChannelAngleFactoryId{0x229211d70b00de81, 0x9389b702ac3d0006};
 inline constexpr TQFactoryId kTQChannelDecibelFactoryId{0x229211d70b00de81, 0x9389b702ac3d0007};
-inline constexpr TQFactoryId kTQCompoundChannelFactoryId{0x229211d70b00de81,
-                                                         0x9389b702ac3d0008};
+inline constexpr TQFactoryId kTQCompoundChannelFactoryId{0x229211d70b00de81, 0x9389b702ac3d0008};
 inline constexpr TQFactoryId kTQChannel2DFactoryId{0x229211d70b00de81, 0x9389b702ac3d0009};
-inline constexpr TQFactoryId kTQChannel2DOverRangeFactoryId{0x229211d70b00de81,
-                                                            0x9389b702ac3d000a};
+inline constexpr TQFactoryId kTQChannel2DOverRangeFactoryId{0x229211d70b00de81, 0x9389b702ac3d000a};
 inline constexpr TQFactoryId kTQChannelScaleOverRangeFactoryId{0x229211d70b00de81,
                                                                0x9389b702ac3d000b};
-inline constexpr TQFactoryId kTQChannelRotation3DFactoryId{0x229211d70b00de81,
-                                                           0x9389b702ac3d000c};
-inline constexpr TQFactoryId kTQChannelObjectRootFactoryId{0x229211d70b00de81,
-                                                           0x9389b702ac3d000d};
+inline constexpr TQFactoryId kTQChannelRotation3DFactoryId{0x229211d70b00de81, 0x9389b702ac3d000c};
+inline constexpr TQFactoryId kTQChannelObjectRootFactoryId{0x229211d70b00de81, 0x9389b702ac3d000d};
 
 class TQFactory {
 public:

@@ -26,7 +26,8 @@ public:
     HXDDrawPrimitive& operator=(const HXDDrawPrimitive&) = delete;
 
     // Hands the primitive to the encoder's operation for its kind.
-    virtual void encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const = 0;
+    virtual void encodeWithEncoder(HXDEncoder& encoder,
+                                   const HXDRenderingContext& context) const = 0;
 
     HXDHitInfo& hitInfo() { return _hitInfo; }
     const HXDHitInfo& hitInfo() const { return _hitInfo; }
@@ -53,7 +54,9 @@ public:
 
     // Counts changes to the hit geometry (width, loop, wireframe) of primitives that an index
     // has read: an index built before the count moved is rebuilt at its next test.
-    static uint64_t hitGeometryRevision() { return sHitGeometryRevision.load(std::memory_order_relaxed); }
+    static uint64_t hitGeometryRevision() {
+        return sHitGeometryRevision.load(std::memory_order_relaxed);
+    }
     // Called by the index as it reads the primitive's bounds.
     void markHitIndexed() const { _hitIndexed = true; }
 

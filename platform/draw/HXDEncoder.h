@@ -35,11 +35,14 @@ public:
     // Ends the frame and presents it.
     virtual void endEncoding() = 0;
 
-    virtual void encodeMultiline(const HXDMultiline& multiline, const HXDRenderingContext& context) = 0;
+    virtual void encodeMultiline(const HXDMultiline& multiline,
+                                 const HXDRenderingContext& context) = 0;
     // A line is a two-vertex multiline; encoders without a faster path keep this default.
     virtual void encodeLine(const HXDLine& line, const HXDRenderingContext& context);
-    virtual void encodeQuadTexture(const HXDQuadTexture& quad, const HXDRenderingContext& context) = 0;
-    virtual void encodeScreenspaceQuad(const HXDScreenspaceQuad& quad, const HXDRenderingContext& context) = 0;
+    virtual void encodeQuadTexture(const HXDQuadTexture& quad,
+                                   const HXDRenderingContext& context) = 0;
+    virtual void encodeScreenspaceQuad(const HXDScreenspaceQuad& quad,
+                                       const HXDRenderingContext& context) = 0;
     virtual void encodeMesh(const HXDMesh& mesh, const HXDRenderingContext& context) = 0;
     virtual void encodeText(const HXDText& text, const HXDRenderingContext& context) = 0;
 };

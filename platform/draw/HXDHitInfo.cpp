@@ -30,8 +30,10 @@ namespace {
 template <class I>
 I saturate(double d) {
     if (std::isnan(d)) return 0;
-    if (d <= static_cast<double>(std::numeric_limits<I>::min())) return std::numeric_limits<I>::min();
-    if (d >= static_cast<double>(std::numeric_limits<I>::max())) return std::numeric_limits<I>::max();
+    if (d <= static_cast<double>(std::numeric_limits<I>::min()))
+        return std::numeric_limits<I>::min();
+    if (d >= static_cast<double>(std::numeric_limits<I>::max()))
+        return std::numeric_limits<I>::max();
     return static_cast<I>(d);
 }
 }  // namespace
@@ -51,7 +53,8 @@ uint64_t HXDNumber::unsignedLongLongValue() const {
         case Kind::Unsigned: return _v.u;
         case Kind::Floating:
             // Negative doubles follow the signed path, so that -1.0 reads as -1 does.
-            return _v.d < 0.0 ? static_cast<uint64_t>(saturate<int64_t>(_v.d)) : saturate<uint64_t>(_v.d);
+            return _v.d < 0.0 ? static_cast<uint64_t>(saturate<int64_t>(_v.d))
+                              : saturate<uint64_t>(_v.d);
     }
     return 0;
 }
@@ -67,7 +70,8 @@ double HXDNumber::doubleValue() const {
 
 bool operator==(const HXDNumber& a, const HXDNumber& b) {
     using Kind = HXDNumber::Kind;
-    if (a._kind == Kind::Floating || b._kind == Kind::Floating) return a.doubleValue() == b.doubleValue();
+    if (a._kind == Kind::Floating || b._kind == Kind::Floating)
+        return a.doubleValue() == b.doubleValue();
     if (a._kind == b._kind) return a._v.u == b._v.u;
     // One signed, one unsigned: equal only when the signed one is not negative.
     const int64_t s = a._kind == Kind::Signed ? a._v.s : b._v.s;

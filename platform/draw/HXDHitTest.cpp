@@ -21,7 +21,9 @@ HXDScreenMapping::HXDScreenMapping(const BNMatrix44f& projection, const CGSize& 
     _e = projection.at(1, 1) * hh;
     _f = (projection.at(1, 3) + 1.0) * hh;
     const double det = _a * _e - _b * _d;
-    if (!(drawableSize.width > 0.0 && drawableSize.height > 0.0) || !std::isfinite(det) || det == 0.0) return;
+    if (!(drawableSize.width > 0.0 && drawableSize.height > 0.0) || !std::isfinite(det) ||
+        det == 0.0)
+        return;
     _ia = _e / det;
     _ib = -_b / det;
     _id = -_d / det;
@@ -56,7 +58,8 @@ CGRect HXDScreenMapping::pixelRectToWorld(const CGRect& pixels) const {
 
 // ---- HXDHitTestContext -----------------------------------------------------------------------
 
-HXDHitTestContext HXDHitTestContext::atPoint(const HXDScreenMapping& mapping, float backingScale, HXDFloat2 point) {
+HXDHitTestContext HXDHitTestContext::atPoint(const HXDScreenMapping& mapping, float backingScale,
+                                             HXDFloat2 point) {
     HXDHitTestContext c;
     if (!mapping.isValid() || !std::isfinite(point.x) || !std::isfinite(point.y)) return c;
     c._kind = Kind::Point;
@@ -68,7 +71,8 @@ HXDHitTestContext HXDHitTestContext::atPoint(const HXDScreenMapping& mapping, fl
     return c;
 }
 
-HXDHitTestContext HXDHitTestContext::inRect(const HXDScreenMapping& mapping, float backingScale, const CGRect& rect) {
+HXDHitTestContext HXDHitTestContext::inRect(const HXDScreenMapping& mapping, float backingScale,
+                                            const CGRect& rect) {
     HXDHitTestContext c;
     const CGRect s = CGRectStandardize(rect);
     if (!mapping.isValid() || !std::isfinite(s.origin.x) || !std::isfinite(s.origin.y) ||
@@ -97,8 +101,8 @@ void HXDHitTestContext::prepareWorldQuery() {
 CGRect HXDHitTestContext::worldQueryRect(double reach) const {
     const double gx = reach * _worldPerPixelX;
     const double gy = reach * _worldPerPixelY;
-    return CGRectMake(_worldRect.origin.x - gx, _worldRect.origin.y - gy, _worldRect.size.width + 2.0 * gx,
-                      _worldRect.size.height + 2.0 * gy);
+    return CGRectMake(_worldRect.origin.x - gx, _worldRect.origin.y - gy,
+                      _worldRect.size.width + 2.0 * gx, _worldRect.size.height + 2.0 * gy);
 }
 
 // ---- HXDHitBounds ----------------------------------------------------------------------------
@@ -107,7 +111,8 @@ HXDHitBounds HXDHitBounds::box(const CGRect& world, double reach) {
     // The standardized rectangle, without a call per quad of a frame.
     const double xa = world.origin.x, xb = xa + world.size.width;
     const double ya = world.origin.y, yb = ya + world.size.height;
-    if (!(std::isfinite(xa) && std::isfinite(xb) && std::isfinite(ya) && std::isfinite(yb))) return anywhere();
+    if (!(std::isfinite(xa) && std::isfinite(xb) && std::isfinite(ya) && std::isfinite(yb)))
+        return anywhere();
     HXDHitBounds b;
     b.kind = Kind::Box;
     b.minX = std::min(xa, xb), b.maxX = std::max(xa, xb);
@@ -133,17 +138,19 @@ HXDScreenMapping mappingOf(const HXDRenderingContext* context) {
 
 HXDHitTestContext HXDRenderController::renderingContextForHitTestAtCoords(HXDFloat2 coords) const {
     const HXDRenderingContext* context = _context.get();
-    return HXDHitTestContext::atPoint(mappingOf(context), context ? context->backingScale() : _backingScale, coords);
+    return HXDHitTestContext::atPoint(mappingOf(context),
+                                      context ? context->backingScale() : _backingScale, coords);
 }
 
 HXDHitTestContext HXDRenderController::renderingContextForHitTestInRect(const CGRect& rect) const {
     const HXDRenderingContext* context = _context.get();
-    return HXDHitTestContext::inRect(mappingOf(context), context ? context->backingScale() : _backingScale, rect);
+    return HXDHitTestContext::inRect(mappingOf(context),
+                                     context ? context->backingScale() : _backingScale, rect);
 }
 
-std::vector<HXDHitRecord> HXDRenderController::newHitTestResultForPrimitives(const HXDPrimitiveArray& primitives,
-                                                                             const HXDHitTestContext& context,
-                                                                             bool returnClosestHit) const {
+std::vector<HXDHitRecord> HXDRenderController::newHitTestResultForPrimitives(
+    const HXDPrimitiveArray& primitives, const HXDHitTestContext& context,
+    bool returnClosestHit) const {
     std::vector<HXDHitRecord> result;
     if (!context.isValid()) return result;
     const bool isPoint = context.kind() == HXDHitTestContext::Kind::Point;
@@ -166,7 +173,8 @@ std::vector<HXDHitRecord> HXDRenderController::newHitTestResultForPrimitives(con
             return;
         }
         const int priority = primitive->hitPriority();
-        if (!best || distance < bestDistance || (distance == bestDistance && priority >= bestPriority)) {
+        if (!best || distance < bestDistance ||
+            (distance == bestDistance && priority >= bestPriority)) {
             best = &primitive;
             bestDistance = distance;
             bestPriority = priority;
@@ -175,7 +183,8 @@ std::vector<HXDHitRecord> HXDRenderController::newHitTestResultForPrimitives(con
 
     // The index serves axis-aligned mappings, where a world box bounds a pixel box; the
     // candidates come in list order, so the ranking above sees what a walk would.
-    if (primitives.size() >= hxd_internal::PrimitiveIndex::kMinPrimitives && context.mapping().isAxisAligned()) {
+    if (primitives.size() >= hxd_internal::PrimitiveIndex::kMinPrimitives &&
+        context.mapping().isAxisAligned()) {
         if (!_hitIndex) _hitIndex = std::make_unique<hxd_internal::PrimitiveIndex>();
         if (!_hitIndex->describes(primitives, context.backingScale()))
             _hitIndex->build(primitives, context.backingScale());

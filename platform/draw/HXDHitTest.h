@@ -79,8 +79,10 @@ public:
     enum class Kind : uint8_t { Invalid, Point, Rect };
 
     HXDHitTestContext() = default;
-    static HXDHitTestContext atPoint(const HXDScreenMapping& mapping, float backingScale, HXDFloat2 point);
-    static HXDHitTestContext inRect(const HXDScreenMapping& mapping, float backingScale, const CGRect& rect);
+    static HXDHitTestContext atPoint(const HXDScreenMapping& mapping, float backingScale,
+                                     HXDFloat2 point);
+    static HXDHitTestContext inRect(const HXDScreenMapping& mapping, float backingScale,
+                                    const CGRect& rect);
 
     Kind kind() const { return _kind; }
     bool isValid() const { return _kind != Kind::Invalid; }
@@ -91,7 +93,9 @@ public:
     const HXDScreenMapping& mapping() const { return _mapping; }
     float backingScale() const { return _backingScale; }
     // The line tolerance of this test in drawable pixels.
-    double lineTolerance() const { return static_cast<double>(kHXDLineHitTolerancePoints) * _backingScale; }
+    double lineTolerance() const {
+        return static_cast<double>(kHXDLineHitTolerancePoints) * _backingScale;
+    }
 
     // The region of world space that a primitive must reach to be hit, grown by `reach`
     // pixels on every side: primitives with cached world bounds reject on it first.

@@ -36,7 +36,8 @@ HXDHitBounds HXDMesh::hitBounds(float backingScale) const {
         }
     }
     if (!(minX <= maxX)) return HXDHitBounds::nowhere();
-    const double reach = _wireframe ? 0.5 + static_cast<double>(kHXDLineHitTolerancePoints) * backingScale : 0.0;
+    const double reach =
+        _wireframe ? 0.5 + static_cast<double>(kHXDLineHitTolerancePoints) * backingScale : 0.0;
     return HXDHitBounds::box(CGRectMake(minX, minY, maxX - minX, maxY - minY), reach);
 }
 

@@ -19,8 +19,8 @@ void grow(float& minX, float& minY, float& maxX, float& maxY, const HXDLineVerte
 }
 }  // namespace
 
-void PolylineIndex::build(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
-                          bool loop, bool monotoneX) {
+void PolylineIndex::build(const std::vector<HXDLineVertex>& vertices,
+                          const std::vector<uint32_t>& runStarts, bool loop, bool monotoneX) {
     *this = PolylineIndex();
     built = true;
     if (vertices.size() < 2) return;  // no segment: nothing can be hit
@@ -83,15 +83,17 @@ uint32_t firstTrueNear(uint32_t n, uint32_t guess, Pred&& pred) {
     }
     while (lo < hi) {
         const uint32_t mid = lo + (hi - lo) / 2;
-        if (pred(mid)) hi = mid;
-        else lo = mid + 1;
+        if (pred(mid))
+            hi = mid;
+        else
+            lo = mid + 1;
     }
     return lo;
 }
 }  // namespace
 
-bool monotoneYExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo,
-                          double& hi) {
+bool monotoneYExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1,
+                          double& lo, double& hi) {
     if (vertices.size() < 2 || !(x0 <= x1)) return false;
     const uint32_t segments = static_cast<uint32_t>(vertices.size() - 1);
     const double head = vertices.front().start.x;
@@ -103,9 +105,10 @@ bool monotoneYExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0,
         return static_cast<uint32_t>(std::min(f, 1.0) * segments);
     };
     // Segment i meets [x0, x1] when x[i + 1] >= x0 and x[i] <= x1.
-    const uint32_t first =
-        firstTrueNear(segments, guess(x0), [&](uint32_t i) { return vertices[i + 1].start.x >= x0; });
-    const uint32_t end = firstTrueNear(segments, guess(x1), [&](uint32_t i) { return vertices[i].start.x > x1; });
+    const uint32_t first = firstTrueNear(segments, guess(x0),
+                                         [&](uint32_t i) { return vertices[i + 1].start.x >= x0; });
+    const uint32_t end =
+        firstTrueNear(segments, guess(x1), [&](uint32_t i) { return vertices[i].start.x > x1; });
     if (first >= end) return false;
     float minY = vertices[first].start.y, maxY = minY;
     for (uint32_t v = first + 1; v <= end; ++v) {
@@ -124,11 +127,11 @@ void PolylineIndex::fillBin(const std::vector<HXDLineVertex>& vertices, uint32_t
     const uint64_t count = bins.size();
     const auto guess = [&](uint64_t bin) { return static_cast<uint32_t>(bin * segments / count); };
     // first: the least segment whose end reaches bin k.
-    const uint32_t first =
-        firstTrueNear(segments, guess(k), [&](uint32_t i) { return binOf(vertices[i + 1].start.x) >= k; });
+    const uint32_t first = firstTrueNear(
+        segments, guess(k), [&](uint32_t i) { return binOf(vertices[i + 1].start.x) >= k; });
     // lo: one past the last segment whose start lies at or before bin k.
-    const uint32_t lo =
-        firstTrueNear(segments, guess(k + 1), [&](uint32_t i) { return binOf(vertices[i].start.x) > k; });
+    const uint32_t lo = firstTrueNear(segments, guess(k + 1),
+                                      [&](uint32_t i) { return binOf(vertices[i].start.x) > k; });
     Bin& bin = bins[k];
     if (first >= lo) {
         bin.first = kNone;
@@ -143,8 +146,8 @@ void PolylineIndex::fillBin(const std::vector<HXDLineVertex>& vertices, uint32_t
     }
 }
 
-void PolylineIndex::buildChunks(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
-                                bool loop) {
+void PolylineIndex::buildChunks(const std::vector<HXDLineVertex>& vertices,
+                                const std::vector<uint32_t>& runStarts, bool loop) {
     const size_t n = vertices.size();
     const size_t runs = runStarts.size() + 1;
     for (size_t r = 0; r < runs; ++r) {
@@ -188,8 +191,8 @@ uint32_t PolylineIndex::binOf(double x) const {
     return static_cast<uint32_t>(std::min(k, last));
 }
 
-bool PolylineIndex::yExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo,
-                                 double& hi) {
+bool PolylineIndex::yExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1,
+                                 double& lo, double& hi) {
     if (!hasBounds || x1 < minX || x0 > maxX) return false;
     bool found = false;
     auto take = [&](float a, float b) {
@@ -222,7 +225,8 @@ bool PolylineIndex::yExtentOverX(const std::vector<HXDLineVertex>& vertices, dou
 }
 
 template <class Visit>
-void PolylineIndex::forEachCandidate(const std::vector<HXDLineVertex>& vertices, const CGRect& q, Visit&& visit) {
+void PolylineIndex::forEachCandidate(const std::vector<HXDLineVertex>& vertices, const CGRect& q,
+                                     Visit&& visit) {
     const double qx0 = q.origin.x, qy0 = q.origin.y;
     const double qx1 = qx0 + q.size.width, qy1 = qy0 + q.size.height;
     if (!hasBounds || qx1 < minX || qx0 > maxX || qy1 < minY || qy0 > maxY) return;
@@ -266,7 +270,8 @@ namespace {
 bool isMonotoneInX(const std::vector<HXDLineVertex>& vertices) {
     float previous = -std::numeric_limits<float>::infinity();
     for (const HXDLineVertex& v : vertices) {
-        if (!(std::isfinite(v.start.y) && v.start.x >= previous && std::isfinite(v.start.x))) return false;
+        if (!(std::isfinite(v.start.y) && v.start.x >= previous && std::isfinite(v.start.x)))
+            return false;
         previous = v.start.x;
     }
     return true;
@@ -274,7 +279,9 @@ bool isMonotoneInX(const std::vector<HXDLineVertex>& vertices) {
 }  // namespace
 
 HXDMultiline::HXDMultiline(std::span<const HXDLineVertex> lines)
-    : HXDDrawPrimitive(0), _vertices(lines.begin(), lines.end()), _monotoneX(isMonotoneInX(_vertices)) {}
+    : HXDDrawPrimitive(0),
+      _vertices(lines.begin(), lines.end()),
+      _monotoneX(isMonotoneInX(_vertices)) {}
 
 HXDMultiline::HXDMultiline(std::vector<HXDLineVertex>&& lines)
     : HXDDrawPrimitive(0), _vertices(std::move(lines)), _monotoneX(isMonotoneInX(_vertices)) {}
@@ -320,7 +327,9 @@ void HXDMultiline::setWidth(float width) {
 }
 
 void HXDMultiline::setLineJoin(int join) {
-    _lineJoin = join == 1 ? HXDLineJoin::Round : join == 2 ? HXDLineJoin::Bevel : HXDLineJoin::Miter;
+    _lineJoin = join == 1   ? HXDLineJoin::Round
+                : join == 2 ? HXDLineJoin::Bevel
+                            : HXDLineJoin::Miter;
 }
 
 hxd_internal::PolylineIndex& HXDMultiline::index() const {
@@ -335,14 +344,16 @@ double HXDMultiline::halfWidthInPixels(float backingScale) const {
     return w > 0.5 ? w : 0.5;  // NaN and hairlines alike cover half a pixel on each side
 }
 
-void HXDMultiline::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const {
+void HXDMultiline::encodeWithEncoder(HXDEncoder& encoder,
+                                     const HXDRenderingContext& context) const {
     encoder.encodeMultiline(*this, context);
 }
 
 HXDHitBounds HXDMultiline::hitBounds(float backingScale) const {
     HXDHitBounds b;
     b.kind = HXDHitBounds::Kind::XSpan;
-    b.reach = halfWidthInPixels(backingScale) + static_cast<double>(kHXDLineHitTolerancePoints) * backingScale;
+    b.reach = halfWidthInPixels(backingScale) +
+              static_cast<double>(kHXDLineHitTolerancePoints) * backingScale;
     if (_monotoneX && !_loop && _vertices.size() >= 2) {
         // A curve's x extent is its ends': no need to build its index before a test comes near.
         b.minX = _vertices.front().start.x;
@@ -360,7 +371,8 @@ bool HXDMultiline::hitYExtentOverX(double x0, double x1, double& minY, double& m
     // A curve answers from its vertices, without building its bins: a frame's index asks
     // every curve crossing the columns a pick reaches, and only the few near the point are
     // then tested (and indexed) themselves.
-    if (_monotoneX && !_loop) return hxd_internal::monotoneYExtentOverX(_vertices, x0, x1, minY, maxY);
+    if (_monotoneX && !_loop)
+        return hxd_internal::monotoneYExtentOverX(_vertices, x0, x1, minY, maxY);
     return index().yExtentOverX(_vertices, x0, x1, minY, maxY);
 }
 
@@ -411,8 +423,8 @@ HXDLine::HXDLine(HXDFloat3 start, HXDFloat3 end, float width, HXDColor color, bo
     setAntialiased(antialiased);
 }
 
-std::shared_ptr<HXDLine> HXDLine::lineFromStart(HXDFloat3 start, HXDFloat3 end, float width, HXDColor color,
-                                                bool antialiased) {
+std::shared_ptr<HXDLine> HXDLine::lineFromStart(HXDFloat3 start, HXDFloat3 end, float width,
+                                                HXDColor color, bool antialiased) {
     return std::make_shared<HXDLine>(start, end, width, color, antialiased);
 }
 

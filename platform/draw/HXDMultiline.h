@@ -33,7 +33,9 @@ struct HXDLineVertex {
 
     HXDLineVertex() = default;
     HXDLineVertex(HXDFloat3 position, HXDColor vertexColor) : start(position), color(vertexColor) {}
-    static HXDLineVertex initWithStart(HXDFloat3 position, HXDColor vertexColor) { return {position, vertexColor}; }
+    static HXDLineVertex initWithStart(HXDFloat3 position, HXDColor vertexColor) {
+        return {position, vertexColor};
+    }
 };
 
 struct HXDLineSegment {
@@ -42,7 +44,8 @@ struct HXDLineSegment {
     HXDColor color;
 
     HXDLineSegment() = default;
-    HXDLineSegment(HXDFloat3 from, HXDFloat3 to, HXDColor segmentColor) : start(from), end(to), color(segmentColor) {}
+    HXDLineSegment(HXDFloat3 from, HXDFloat3 to, HXDColor segmentColor)
+        : start(from), end(to), color(segmentColor) {}
     static HXDLineSegment initWithStart(HXDFloat3 from, HXDFloat3 to, HXDColor segmentColor) {
         return {from, to, segmentColor};
     }
@@ -124,8 +127,8 @@ private:
 class HXDLine : public HXDMultiline {
 public:
     HXDLine(HXDFloat3 start, HXDFloat3 end, float width, HXDColor color, bool antialiased);
-    static std::shared_ptr<HXDLine> lineFromStart(HXDFloat3 start, HXDFloat3 end, float width, HXDColor color,
-                                                  bool antialiased);
+    static std::shared_ptr<HXDLine> lineFromStart(HXDFloat3 start, HXDFloat3 end, float width,
+                                                  HXDColor color, bool antialiased);
 
     HXDFloat3 start() const { return vertices()[0].start; }
     HXDFloat3 end() const { return vertices()[1].start; }

@@ -9,8 +9,13 @@ uint64_t nextTextureID() {
 }
 }  // namespace
 
-HXDPixelTexture::HXDPixelTexture(uint32_t width, uint32_t height, float scale, std::vector<uint8_t> rgba)
-    : _width(width), _height(height), _scale(scale), _textureID(nextTextureID()), _rgba(std::move(rgba)) {
+HXDPixelTexture::HXDPixelTexture(uint32_t width, uint32_t height, float scale,
+                                 std::vector<uint8_t> rgba)
+    : _width(width),
+      _height(height),
+      _scale(scale),
+      _textureID(nextTextureID()),
+      _rgba(std::move(rgba)) {
     // A buffer that does not match the size would be read past its end: keep nothing.
     if (_rgba.size() != static_cast<size_t>(_width) * _height * 4u) {
         _width = 0;
@@ -19,9 +24,8 @@ HXDPixelTexture::HXDPixelTexture(uint32_t width, uint32_t height, float scale, s
     }
 }
 
-std::shared_ptr<const HXDPixelTexture> HXDPixelTexture::textureWithRGBA(uint32_t width, uint32_t height, float scale,
-                                                                        std::vector<uint8_t> rgba,
-                                                                        bool premultiplied) {
+std::shared_ptr<const HXDPixelTexture> HXDPixelTexture::textureWithRGBA(
+    uint32_t width, uint32_t height, float scale, std::vector<uint8_t> rgba, bool premultiplied) {
     if (premultiplied && rgba.size() == static_cast<size_t>(width) * height * 4u) {
         for (size_t i = 0; i + 3 < rgba.size(); i += 4) {
             const unsigned a = rgba[i + 3];
@@ -36,7 +40,8 @@ std::shared_ptr<const HXDPixelTexture> HXDPixelTexture::textureWithRGBA(uint32_t
 }
 
 float HXDPixelTexture::alphaAt(int64_t column, int64_t row) const {
-    if (column < 0 || row < 0 || column >= static_cast<int64_t>(_width) || row >= static_cast<int64_t>(_height))
+    if (column < 0 || row < 0 || column >= static_cast<int64_t>(_width) ||
+        row >= static_cast<int64_t>(_height))
         return 0.0f;
     const size_t i = (static_cast<size_t>(row) * _width + static_cast<size_t>(column)) * 4u + 3u;
     return static_cast<float>(_rgba[i]) / 255.0f;

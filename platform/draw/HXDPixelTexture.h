@@ -19,7 +19,8 @@ public:
     // rgba holds width * height * 4 bytes; a buffer of another size gives an empty texture
     // (0 x 0), never a read past the end. premultiplied tells what the bytes hold: they are
     // stored straight, premultiplied input being divided out.
-    static std::shared_ptr<const HXDPixelTexture> textureWithRGBA(uint32_t width, uint32_t height, float scale,
+    static std::shared_ptr<const HXDPixelTexture> textureWithRGBA(uint32_t width, uint32_t height,
+                                                                  float scale,
                                                                   std::vector<uint8_t> rgba,
                                                                   bool premultiplied = false);
 
@@ -28,7 +29,9 @@ public:
     float scale() const { return _scale; }
     // Size in points: texels over scale.
     float pointWidth() const { return _scale > 0.0f ? static_cast<float>(_width) / _scale : 0.0f; }
-    float pointHeight() const { return _scale > 0.0f ? static_cast<float>(_height) / _scale : 0.0f; }
+    float pointHeight() const {
+        return _scale > 0.0f ? static_cast<float>(_height) / _scale : 0.0f;
+    }
     uint64_t textureID() const { return _textureID; }
 
     // Straight RGBA8, row 0 at the top, width * 4 bytes per row.

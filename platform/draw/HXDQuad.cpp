@@ -10,10 +10,13 @@
 
 HXDQuadTexture::HXDQuadTexture(uint32_t hitID, std::shared_ptr<const HXDPixelTexture> texture,
                                const CGRect& destinationRect, float attenuation)
-    : HXDDrawPrimitive(hitID), _texture(std::move(texture)), _destinationRect(destinationRect),
+    : HXDDrawPrimitive(hitID),
+      _texture(std::move(texture)),
+      _destinationRect(destinationRect),
       _attenuation(attenuation) {}
 
-void HXDQuadTexture::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const {
+void HXDQuadTexture::encodeWithEncoder(HXDEncoder& encoder,
+                                       const HXDRenderingContext& context) const {
     encoder.encodeQuadTexture(*this, context);
 }
 
@@ -50,7 +53,8 @@ bool HXDQuadTexture::opaqueAt(const CGRect& pixels, double px, double py) const 
     const HXDPixelTexture& t = *_texture;
     const int64_t column = texelIndex(px - pixels.origin.x, pixels.size.width, t.width());
     // Row 0 is the top of the image, drawn at the top (greatest y) of the rectangle.
-    const int64_t row = texelIndex(pixels.origin.y + pixels.size.height - py, pixels.size.height, t.height());
+    const int64_t row =
+        texelIndex(pixels.origin.y + pixels.size.height - py, pixels.size.height, t.height());
     return t.alphaAt(column, row) * _attenuation >= kHXDTextureAlphaHitThreshold;
 }
 
@@ -89,9 +93,11 @@ bool HXDQuadTexture::intersectsRect(const HXDHitTestContext& context) const {
 
 // ---- HXDScreenspaceQuad ------------------------------------------------------------------------
 
-HXDScreenspaceQuad::HXDScreenspaceQuad(const CGRect& frame, uint32_t hitID) : HXDDrawPrimitive(hitID), _frame(frame) {}
+HXDScreenspaceQuad::HXDScreenspaceQuad(const CGRect& frame, uint32_t hitID)
+    : HXDDrawPrimitive(hitID), _frame(frame) {}
 
-void HXDScreenspaceQuad::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const {
+void HXDScreenspaceQuad::encodeWithEncoder(HXDEncoder& encoder,
+                                           const HXDRenderingContext& context) const {
     encoder.encodeScreenspaceQuad(*this, context);
 }
 

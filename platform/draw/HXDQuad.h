@@ -15,8 +15,8 @@ class HXDQuadTexture : public HXDDrawPrimitive {
 public:
     // attenuation multiplies the image's alpha (1 draws it as it is). A null texture draws
     // nothing and is hit as its rectangle.
-    HXDQuadTexture(uint32_t hitID, std::shared_ptr<const HXDPixelTexture> texture, const CGRect& destinationRect,
-                   float attenuation);
+    HXDQuadTexture(uint32_t hitID, std::shared_ptr<const HXDPixelTexture> texture,
+                   const CGRect& destinationRect, float attenuation);
 
     const std::shared_ptr<const HXDPixelTexture>& texture() const { return _texture; }
     const CGRect& destinationRect() const { return _destinationRect; }
@@ -30,7 +30,9 @@ public:
     void encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& context) const override;
     float hitDistanceAtPoint(const HXDHitTestContext& context) const override;
     bool intersectsRect(const HXDHitTestContext& context) const override;
-    HXDHitBounds hitBounds(float) const override { return HXDHitBounds::box(_destinationRect, 0.0); }
+    HXDHitBounds hitBounds(float) const override {
+        return HXDHitBounds::box(_destinationRect, 0.0);
+    }
 
 private:
     // Whether the texel drawn at the pixel point (inside `pixels`, the drawn rectangle) is

@@ -14,7 +14,8 @@ public:
         size_t characters = 0;
         for (unsigned char c : text) characters += (c & 0xC0u) != 0x80u ? 1 : 0;
         const double em = attributes.fontSize > 0.0f ? attributes.fontSize : 0.0;
-        return CGSizeMake(std::ceil(0.55 * em * static_cast<double>(characters)), std::ceil(1.2 * em));
+        return CGSizeMake(std::ceil(0.55 * em * static_cast<double>(characters)),
+                          std::ceil(1.2 * em));
     }
 };
 
@@ -22,7 +23,9 @@ const EstimatedTextMetrics gEstimatedMetrics;
 const HXDTextMetrics* gInstalledMetrics = nullptr;
 }  // namespace
 
-const HXDTextMetrics& HXDTextMetrics::shared() { return gInstalledMetrics ? *gInstalledMetrics : gEstimatedMetrics; }
+const HXDTextMetrics& HXDTextMetrics::shared() {
+    return gInstalledMetrics ? *gInstalledMetrics : gEstimatedMetrics;
+}
 
 void HXDTextMetrics::setShared(const HXDTextMetrics* metrics) { gInstalledMetrics = metrics; }
 
@@ -30,9 +33,13 @@ CGSize HXDSizeWithAttributes(const std::string& text, const HXDTextAttributes& a
     return HXDTextMetrics::shared().sizeOfText(text, attributes);
 }
 
-HXDText::HXDText(HXDAttributedString attributedString, HXDTextLayoutAnchor layoutAnchor, CGPoint position)
-    : HXDDrawPrimitive(0), _attributedString(std::move(attributedString)), _layoutAnchor(layoutAnchor),
-      _position(position), _size(HXDSizeWithAttributes(_attributedString.string, _attributedString.attributes)) {}
+HXDText::HXDText(HXDAttributedString attributedString, HXDTextLayoutAnchor layoutAnchor,
+                 CGPoint position)
+    : HXDDrawPrimitive(0),
+      _attributedString(std::move(attributedString)),
+      _layoutAnchor(layoutAnchor),
+      _position(position),
+      _size(HXDSizeWithAttributes(_attributedString.string, _attributedString.attributes)) {}
 
 CGRect HXDText::pixelRect(const HXDScreenMapping& mapping, float backingScale) const {
     const CGPoint anchor = mapping.worldToPixel(_position.x, _position.y);
@@ -51,9 +58,13 @@ void HXDText::encodeWithEncoder(HXDEncoder& encoder, const HXDRenderingContext& 
 
 float HXDText::hitDistanceAtPoint(const HXDHitTestContext& context) const {
     const CGPoint p = context.point();
-    return hxd_internal::rectContains(pixelRect(context.mapping(), context.backingScale()), p.x, p.y) ? 0.0f : -1.0f;
+    return hxd_internal::rectContains(pixelRect(context.mapping(), context.backingScale()), p.x,
+                                      p.y)
+               ? 0.0f
+               : -1.0f;
 }
 
 bool HXDText::intersectsRect(const HXDHitTestContext& context) const {
-    return hxd_internal::rectsMeet(pixelRect(context.mapping(), context.backingScale()), context.rect());
+    return hxd_internal::rectsMeet(pixelRect(context.mapping(), context.backingScale()),
+                                   context.rect());
 }

@@ -44,7 +44,8 @@ class HXDTextMetrics {
 public:
     virtual ~HXDTextMetrics() = default;
     // The size of the text's box in points (line height by advance width).
-    virtual CGSize sizeOfText(const std::string& text, const HXDTextAttributes& attributes) const = 0;
+    virtual CGSize sizeOfText(const std::string& text,
+                              const HXDTextAttributes& attributes) const = 0;
 
     // The installed service; the estimate when none is.
     static const HXDTextMetrics& shared();
@@ -60,7 +61,8 @@ class HXDText : public HXDDrawPrimitive {
 public:
     // initWithAttributedString:layoutAnchor:position:. The size is measured now, with the
     // shared metrics, so that drawing and hit tests agree on the box.
-    HXDText(HXDAttributedString attributedString, HXDTextLayoutAnchor layoutAnchor, CGPoint position);
+    HXDText(HXDAttributedString attributedString, HXDTextLayoutAnchor layoutAnchor,
+            CGPoint position);
 
     const std::string& string() const { return _attributedString.string; }
     const HXDTextAttributes& attributes() const { return _attributedString.attributes; }

@@ -105,7 +105,9 @@ public:
     constexpr const std::array<T, 16>& elements() const { return _m; }
 
     BNMatrix44Tmpl multiply(const BNMatrix44Tmpl& rhs) const;
-    friend BNMatrix44Tmpl operator*(const BNMatrix44Tmpl& a, const BNMatrix44Tmpl& b) { return a.multiply(b); }
+    friend BNMatrix44Tmpl operator*(const BNMatrix44Tmpl& a, const BNMatrix44Tmpl& b) {
+        return a.multiply(b);
+    }
 
     constexpr void transpose() {
         for (int row = 0; row < 4; ++row)
@@ -132,7 +134,8 @@ public:
     template <class U>
     constexpr BNVector4Tmpl<std::common_type_t<T, U>> transform(const BNVector4Tmpl<U>& v) const {
         using R = std::common_type_t<T, U>;
-        const R in[4] = {static_cast<R>(v.x), static_cast<R>(v.y), static_cast<R>(v.z), static_cast<R>(v.w)};
+        const R in[4] = {static_cast<R>(v.x), static_cast<R>(v.y), static_cast<R>(v.z),
+                         static_cast<R>(v.w)};
         R out[4];
         for (int row = 0; row < 4; ++row) {
             R sum = R(0);
@@ -170,7 +173,9 @@ public:
     friend constexpr bool operator==(const BNMatrix44Tmpl&, const BNMatrix44Tmpl&) = default;
 
 private:
-    static constexpr bool inRange(int row, int col) { return row >= 0 && row < 4 && col >= 0 && col < 4; }
+    static constexpr bool inRange(int row, int col) {
+        return row >= 0 && row < 4 && col >= 0 && col < 4;
+    }
 
     std::array<T, 16> _m{};
 };

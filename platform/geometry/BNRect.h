@@ -21,15 +21,16 @@ struct BNRect {
     T height{};
 
     constexpr BNRect() = default;
-    constexpr BNRect(T x_, T y_, T width_, T height_) : x(x_), y(y_), width(width_), height(height_) {}
+    constexpr BNRect(T x_, T y_, T width_, T height_)
+        : x(x_), y(y_), width(width_), height(height_) {}
 
     static constexpr BNRect fromCGRect(const CGRect& r) {
         return BNRect(static_cast<T>(r.origin.x), static_cast<T>(r.origin.y),
                       static_cast<T>(r.size.width), static_cast<T>(r.size.height));
     }
     constexpr CGRect toCGRect() const {
-        return CGRectMake(static_cast<CGFloat>(x), static_cast<CGFloat>(y), static_cast<CGFloat>(width),
-                          static_cast<CGFloat>(height));
+        return CGRectMake(static_cast<CGFloat>(x), static_cast<CGFloat>(y),
+                          static_cast<CGFloat>(width), static_cast<CGFloat>(height));
     }
 
     // Origin at the least corner, size not negative.
@@ -52,7 +53,9 @@ struct BNRect {
     constexpr T maxY() const { return std::max(y, static_cast<T>(y + height)); }
 
     // No area: a zero width or height (a NaN extent counts too).
-    constexpr bool isEmpty() const { return !(width != T{} && height != T{}) || width != width || height != height; }
+    constexpr bool isEmpty() const {
+        return !(width != T{} && height != T{}) || width != width || height != height;
+    }
 
     // Half-open like CGRectContainsPoint: the maximum edges are outside.
     constexpr bool contains(T px, T py) const {

@@ -25,13 +25,15 @@ CGPoint BNProjectionScreenToWorld(const BNMatrix44f& projection, const CGSize& d
                                   const CGPoint& screen) {
     // A singular matrix inverts to zero, and 0/0 below gives the documented NaN.
     const BNMatrix44f inverse = projection.inverted();
-    const auto v = inverse.transform(BNVector4Tmpl<double>{2.0 * screen.x / drawableSize.width - 1.0,
-                                                           2.0 * screen.y / drawableSize.height - 1.0, -1.0, 1.0});
+    const auto v = inverse.transform(
+        BNVector4Tmpl<double>{2.0 * screen.x / drawableSize.width - 1.0,
+                              2.0 * screen.y / drawableSize.height - 1.0, -1.0, 1.0});
     return CGPointMake(v.x / v.w, v.y / v.w);
 }
 
 CGPoint BNProjectionWorldToScreen(const BNMatrix44f& projection, const CGSize& drawableSize,
                                   const CGPoint& world) {
     const auto v = projection.transform(BNVector4Tmpl<double>{world.x, world.y, 0.0, 1.0});
-    return CGPointMake((v.x / v.w * 0.5 + 0.5) * drawableSize.width, (v.y / v.w * 0.5 + 0.5) * drawableSize.height);
+    return CGPointMake((v.x / v.w * 0.5 + 0.5) * drawableSize.width,
+                       (v.y / v.w * 0.5 + 0.5) * drawableSize.height);
 }

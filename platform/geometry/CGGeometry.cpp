@@ -145,7 +145,8 @@ CGRect CGRectOffset(const CGRect& rect, CGFloat dx, CGFloat dy) {
 CGRect CGRectIntegral(const CGRect& rect) {
     if (CGRectIsNull(rect)) return CGRectNull;
     const Edges e = edgesOf(rect);
-    return rectFromEdges(std::floor(e.minX), std::floor(e.minY), std::ceil(e.maxX), std::ceil(e.maxY));
+    return rectFromEdges(std::floor(e.minX), std::floor(e.minY), std::ceil(e.maxX),
+                         std::ceil(e.maxY));
 }
 
 void CGRectDivide(const CGRect& rect, CGRect* slice, CGRect* remainder, CGFloat amount,
@@ -159,26 +160,26 @@ void CGRectDivide(const CGRect& rect, CGRect* slice, CGRect* remainder, CGFloat 
         s = whole;
         r = whole;
         switch (edge) {
-        case CGRectMinXEdge:
-            s.size.width = cut;
-            r.origin.x += cut;
-            r.size.width -= cut;
-            break;
-        case CGRectMaxXEdge:
-            s.origin.x += extent - cut;
-            s.size.width = cut;
-            r.size.width -= cut;
-            break;
-        case CGRectMinYEdge:
-            s.size.height = cut;
-            r.origin.y += cut;
-            r.size.height -= cut;
-            break;
-        case CGRectMaxYEdge:
-            s.origin.y += extent - cut;
-            s.size.height = cut;
-            r.size.height -= cut;
-            break;
+            case CGRectMinXEdge:
+                s.size.width = cut;
+                r.origin.x += cut;
+                r.size.width -= cut;
+                break;
+            case CGRectMaxXEdge:
+                s.origin.x += extent - cut;
+                s.size.width = cut;
+                r.size.width -= cut;
+                break;
+            case CGRectMinYEdge:
+                s.size.height = cut;
+                r.origin.y += cut;
+                r.size.height -= cut;
+                break;
+            case CGRectMaxYEdge:
+                s.origin.y += extent - cut;
+                s.size.height = cut;
+                r.size.height -= cut;
+                break;
         }
     }
     if (slice) *slice = s;

@@ -64,7 +64,9 @@ inline constexpr CGRect CGRectMake(CGFloat x, CGFloat y, CGFloat width, CGFloat 
     return CGRect{{x, y}, {width, height}};
 }
 
-inline bool CGPointEqualToPoint(const CGPoint& a, const CGPoint& b) { return a.x == b.x && a.y == b.y; }
+inline bool CGPointEqualToPoint(const CGPoint& a, const CGPoint& b) {
+    return a.x == b.x && a.y == b.y;
+}
 inline bool CGSizeEqualToSize(const CGSize& a, const CGSize& b) {
     return a.width == b.width && a.height == b.height;
 }
@@ -114,5 +116,9 @@ void CGRectDivide(const CGRect& rect, CGRect* slice, CGRect* remainder, CGFloat 
                   CGRectEdge edge);
 
 // Plain point and size arithmetic, used by the view's offset and size conversions.
-inline constexpr CGPoint operator+(const CGPoint& a, const CGPoint& b) { return {a.x + b.x, a.y + b.y}; }
-inline constexpr CGPoint operator-(const CGPoint& a, const CGPoint& b) { return {a.x - b.x, a.y - b.y}; }
+inline constexpr CGPoint operator+(const CGPoint& a, const CGPoint& b) {
+    return {a.x + b.x, a.y + b.y};
+}
+inline constexpr CGPoint operator-(const CGPoint& a, const CGPoint& b) {
+    return {a.x - b.x, a.y - b.y};
+}

@@ -50,7 +50,8 @@ CMTime fromWide(i128 value, CMTimeScale timescale, bool rounded) {
 CMTime fromRational(i128 n, i128 d) {
     if (d <= std::numeric_limits<CMTimeScale>::max()) {
         // Reduce when the value is too wide for 64 bits at this timescale.
-        if (n <= kMaxValue && n >= kMinValue) return fromWide(n, static_cast<CMTimeScale>(d), false);
+        if (n <= kMaxValue && n >= kMinValue)
+            return fromWide(n, static_cast<CMTimeScale>(d), false);
     }
     const i128 g = gcd128(n, d);
     if (g > 1) {
@@ -60,7 +61,8 @@ CMTime fromRational(i128 n, i128 d) {
             return fromWide(n, static_cast<CMTimeScale>(d), false);
     }
     // Still too wide: round into the largest timescale that fits.
-    const CMTimeScale scale = d > kCMTimeMaxTimescale ? kCMTimeMaxTimescale : static_cast<CMTimeScale>(d);
+    const CMTimeScale scale =
+        d > kCMTimeMaxTimescale ? kCMTimeMaxTimescale : static_cast<CMTimeScale>(d);
     return fromWide(divRound(n * scale, d), scale, true);
 }
 
@@ -201,10 +203,13 @@ CMTimeRange CMTimeRangeMake(const CMTime& start, const CMTime& duration) {
     return CMTimeRange{start, duration};
 }
 
-CMTime CMTimeRangeGetEnd(const CMTimeRange& range) { return CMTimeAdd(range.start, range.duration); }
+CMTime CMTimeRangeGetEnd(const CMTimeRange& range) {
+    return CMTimeAdd(range.start, range.duration);
+}
 
 bool CMTimeRangeContainsTime(const CMTimeRange& range, const CMTime& time) {
-    return CMTimeCompare(range.start, time) <= 0 && CMTimeCompare(time, CMTimeRangeGetEnd(range)) < 0;
+    return CMTimeCompare(range.start, time) <= 0 &&
+           CMTimeCompare(time, CMTimeRangeGetEnd(range)) < 0;
 }
 
 CMTime BN_CMTimeSaferAdd(const CMTime& lhs, const CMTime& rhs) {
@@ -243,7 +248,9 @@ double BN_UIAmplitudeToDecibels(double amplitude) {
     return 20.0 * std::log10(magnitude);
 }
 
-CMTime operator*(const CMTime& time, double factor) { return CMTimeMultiplyByFloat64(time, factor); }
+CMTime operator*(const CMTime& time, double factor) {
+    return CMTimeMultiplyByFloat64(time, factor);
+}
 
 CMTime operator*(const CMTime& time, unsigned factor) {
     if (factor <= static_cast<unsigned>(std::numeric_limits<int32_t>::max()))
@@ -261,7 +268,8 @@ CMTime operator/(const CMTime& time, double divisor) {
     if (divisor == 0.0 || std::isnan(divisor)) return kCMTimeInvalid;
     if (CMTIME_IS_NUMERIC(time)) {
         const long double q = static_cast<long double>(time.value) / divisor;
-        if (!std::isfinite(q) || q >= 9.2233720368547758e18L) return q > 0 ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
+        if (!std::isfinite(q) || q >= 9.2233720368547758e18L)
+            return q > 0 ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
         if (q <= -9.2233720368547758e18L) return kCMTimeNegativeInfinity;
         const long double rounded = std::round(q);
         CMTime r = CMTimeMake(static_cast<CMTimeValue>(rounded), time.timescale);

@@ -59,7 +59,9 @@ inline constexpr CMTime kCMTimeNegativeInfinity{
 inline constexpr CMTimeRange kCMTimeRangeZero{kCMTimeZero, kCMTimeZero};
 inline constexpr CMTimeRange kCMTimeRangeInvalid{kCMTimeInvalid, kCMTimeInvalid};
 
-inline constexpr bool CMTIME_IS_VALID(const CMTime& t) { return (t.flags & kCMTimeFlags_Valid) != 0; }
+inline constexpr bool CMTIME_IS_VALID(const CMTime& t) {
+    return (t.flags & kCMTimeFlags_Valid) != 0;
+}
 inline constexpr bool CMTIME_IS_INVALID(const CMTime& t) { return !CMTIME_IS_VALID(t); }
 inline constexpr bool CMTIME_IS_POSITIVE_INFINITY(const CMTime& t) {
     return CMTIME_IS_VALID(t) && (t.flags & kCMTimeFlags_PositiveInfinity) != 0;

@@ -1,7 +1,7 @@
 #include "platform/ui/RWEvent.h"
 
-RWEvent RWEvent::mouseEvent(RWEventType type, const CGPoint& locationInWindow, uint64_t modifierFlags,
-                            int64_t clickCount, double timestamp) {
+RWEvent RWEvent::mouseEvent(RWEventType type, const CGPoint& locationInWindow,
+                            uint64_t modifierFlags, int64_t clickCount, double timestamp) {
     RWEvent e;
     e._type = type;
     e._locationInWindow = locationInWindow;
@@ -48,20 +48,18 @@ RWEvent RWEvent::flagsChangedEvent(uint64_t modifierFlags, double timestamp) {
 
 bool RWEvent::isMouseEvent() const {
     switch (_type) {
-    case RWEventType::LeftMouseDown:
-    case RWEventType::LeftMouseUp:
-    case RWEventType::RightMouseDown:
-    case RWEventType::RightMouseUp:
-    case RWEventType::MouseMoved:
-    case RWEventType::LeftMouseDragged:
-    case RWEventType::RightMouseDragged:
-    case RWEventType::MouseEntered:
-    case RWEventType::MouseExited:
-    case RWEventType::OtherMouseDown:
-    case RWEventType::OtherMouseUp:
-    case RWEventType::OtherMouseDragged:
-        return true;
-    default:
-        return false;
+        case RWEventType::LeftMouseDown:
+        case RWEventType::LeftMouseUp:
+        case RWEventType::RightMouseDown:
+        case RWEventType::RightMouseUp:
+        case RWEventType::MouseMoved:
+        case RWEventType::LeftMouseDragged:
+        case RWEventType::RightMouseDragged:
+        case RWEventType::MouseEntered:
+        case RWEventType::MouseExited:
+        case RWEventType::OtherMouseDown:
+        case RWEventType::OtherMouseUp:
+        case RWEventType::OtherMouseDragged: return true;
+        default: return false;
     }
 }

@@ -44,7 +44,8 @@ using RWEventMask = uint64_t;
 inline constexpr RWEventMask RWEventMaskFromType(RWEventType type) {
     return RWEventMask{1} << static_cast<uint32_t>(type);
 }
-inline constexpr RWEventMask RWEventMaskScrollWheel = RWEventMaskFromType(RWEventType::ScrollWheel);  // 0x400000
+inline constexpr RWEventMask RWEventMaskScrollWheel =
+    RWEventMaskFromType(RWEventType::ScrollWheel);  // 0x400000
 inline constexpr RWEventMask RWEventMaskAny = ~RWEventMask{0};
 
 // Bits of modifierFlags. The low 16 bits are device dependent and carry nothing here.
@@ -70,7 +71,8 @@ public:
                               double timestamp = 0.0);
     // A key event. With an empty charactersIgnoringModifiers the characters serve for both.
     static RWEvent keyEvent(RWEventType type, const std::string& characters,
-                            uint64_t modifierFlags = 0, uint16_t keyCode = 0, bool isARepeat = false,
+                            uint64_t modifierFlags = 0, uint16_t keyCode = 0,
+                            bool isARepeat = false,
                             const std::string& charactersIgnoringModifiers = {},
                             double timestamp = 0.0);
     // A wheel event; deltas in lines (or points, for precise deltas), positive y scrolls up.

@@ -64,7 +64,9 @@ RWMenuItemPtr RWMenu::itemAtIndex(int64_t index) const {
     return _items[static_cast<size_t>(index)];
 }
 
-RWMenuItemPtr RWMenu::itemWithTag(int64_t tag) const { return itemAtIndex(indexOfItemWithTag(tag)); }
+RWMenuItemPtr RWMenu::itemWithTag(int64_t tag) const {
+    return itemAtIndex(indexOfItemWithTag(tag));
+}
 
 RWMenuItemPtr RWMenu::itemWithTitle(const std::string& title) const {
     return itemAtIndex(indexOfItemWithTitle(title));

@@ -35,7 +35,9 @@ class RWMenuItem {
 public:
     RWMenuItem() = default;
     RWMenuItem(std::string title, std::string action, std::string keyEquivalent = {})
-        : _title(std::move(title)), _action(std::move(action)), _keyEquivalent(std::move(keyEquivalent)) {}
+        : _title(std::move(title)),
+          _action(std::move(action)),
+          _keyEquivalent(std::move(keyEquivalent)) {}
     static std::shared_ptr<RWMenuItem> separatorItem();
 
     const std::string& title() const { return _title; }

@@ -31,7 +31,8 @@ int64_t RWMemoryPasteboard::clearContents() {
 }
 
 bool RWMemoryPasteboard::setData(const std::vector<uint8_t>& data, const std::string& type) {
-    auto it = std::find_if(_items.begin(), _items.end(), [&](const auto& p) { return p.first == type; });
+    auto it =
+        std::find_if(_items.begin(), _items.end(), [&](const auto& p) { return p.first == type; });
     if (it != _items.end())
         it->second = data;
     else
@@ -40,7 +41,8 @@ bool RWMemoryPasteboard::setData(const std::vector<uint8_t>& data, const std::st
 }
 
 std::optional<std::vector<uint8_t>> RWMemoryPasteboard::dataForType(const std::string& type) const {
-    auto it = std::find_if(_items.begin(), _items.end(), [&](const auto& p) { return p.first == type; });
+    auto it =
+        std::find_if(_items.begin(), _items.end(), [&](const auto& p) { return p.first == type; });
     if (it == _items.end()) return std::nullopt;
     return it->second;
 }
@@ -122,7 +124,8 @@ void RWMemoryUserDefaults::setObject(const RWDefaultsValue& value, const std::st
 
 void RWMemoryUserDefaults::removeObjectForKey(const std::string& key) { _values.erase(key); }
 
-void RWMemoryUserDefaults::registerDefaults(const std::map<std::string, RWDefaultsValue>& defaults) {
+void RWMemoryUserDefaults::registerDefaults(
+    const std::map<std::string, RWDefaultsValue>& defaults) {
     for (const auto& [key, value] : defaults) _registered[key] = value;
 }
 
@@ -135,8 +138,8 @@ double RWSteadyClock::now() const {
 
 void RWQueuedTimer::dispatchAfter(uint64_t nanoseconds, std::function<void()> block) {
     if (!block) return;
-    _pending.push_back({_clock.now() + static_cast<double>(nanoseconds) * 1e-9, _nextOrder++,
-                        std::move(block)});
+    _pending.push_back(
+        {_clock.now() + static_cast<double>(nanoseconds) * 1e-9, _nextOrder++, std::move(block)});
 }
 
 size_t RWQueuedTimer::runDueBlocks() {

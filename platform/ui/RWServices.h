@@ -38,13 +38,13 @@ enum class RWCursor : uint32_t {
     ResizeLeftRight,
     ResizeUpDown,
     OperationNotAllowed,
-    Move,               // drag of keypoints
-    EditPoints,         // pointer over a keypoint
-    CrossHairs,         // rubber band
-    Sketch,             // the sketch tool
-    PenAddControlPoint, // a click adds a keypoint
-    ZoomIn,             // a space-bar zoom that magnifies
-    ZoomOut             // a space-bar zoom that shrinks
+    Move,                // drag of keypoints
+    EditPoints,          // pointer over a keypoint
+    CrossHairs,          // rubber band
+    Sketch,              // the sketch tool
+    PenAddControlPoint,  // a click adds a keypoint
+    ZoomIn,              // a space-bar zoom that magnifies
+    ZoomOut              // a space-bar zoom that shrinks
 };
 
 // What a view knows of the widget that shows it. One host per view, not owned by the view;
@@ -158,7 +158,9 @@ public:
     double doubleForKey(const std::string& key) const;
     std::string stringForKey(const std::string& key) const;
     void setBool(bool value, const std::string& key) { setObject(RWDefaultsValue{value}, key); }
-    void setInteger(int64_t value, const std::string& key) { setObject(RWDefaultsValue{value}, key); }
+    void setInteger(int64_t value, const std::string& key) {
+        setObject(RWDefaultsValue{value}, key);
+    }
     void setDouble(double value, const std::string& key) { setObject(RWDefaultsValue{value}, key); }
     void setString(const std::string& value, const std::string& key) {
         setObject(RWDefaultsValue{value}, key);

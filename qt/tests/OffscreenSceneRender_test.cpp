@@ -58,7 +58,8 @@ double distanceToSegment(const CGPoint& p, const CGPoint& a, const CGPoint& b) {
 
 double distanceToPolyline(const CGPoint& p, const std::vector<CGPoint>& line) {
     double best = INFINITY;
-    for (size_t i = 0; i + 1 < line.size(); ++i) best = std::min(best, distanceToSegment(p, line[i], line[i + 1]));
+    for (size_t i = 0; i + 1 < line.size(); ++i)
+        best = std::min(best, distanceToSegment(p, line[i], line[i + 1]));
     return best;
 }
 
@@ -143,14 +144,15 @@ protected:
             curve.color = TQCurveEditorViewBase::getColorForIndex(item->colorIndex());
             const double off = CMTimeGetSeconds(channel->timeOffset());
             const auto toScreen = [&](double channelSeconds, double value) {
-                return view.getPointScreen(
-                    CGPointMake(channelSeconds + off, controller.convertFromChannelCoords(item, value)));
+                return view.getPointScreen(CGPointMake(
+                    channelSeconds + off, controller.convertFromChannelCoords(item, value)));
             };
             const double start = CMTimeGetSeconds(range.start);
             const double duration = CMTimeGetSeconds(range.duration);
             for (int c = 0; c <= static_cast<int>(columns); ++c) {
                 const double t = start + duration * c / columns - off;
-                curve.points.push_back(toScreen(t, channel->getCurveValue(CMTimeMakeWithSeconds(t, kTimescale))));
+                curve.points.push_back(
+                    toScreen(t, channel->getCurveValue(CMTimeMakeWithSeconds(t, kTimescale))));
             }
             CMTime first{}, last{};
             channel->getFirstKeyframe(&first, nullptr);
@@ -158,13 +160,15 @@ protected:
             for (TQKeyframeHandle h : channel->getKeyframes(false)) {
                 CMTime t{};
                 double v = 0.0;
-                if (channel->getKeyframe(h, &t, &v)) curve.keypoints.push_back(toScreen(CMTimeGetSeconds(t), v));
+                if (channel->getKeyframe(h, &t, &v))
+                    curve.keypoints.push_back(toScreen(CMTimeGetSeconds(t), v));
             }
             // Probes between the first and last keypoints, where the curve has its full colour.
             for (int k = 1; k < kProbes; ++k) {
-                const double t =
-                    CMTimeGetSeconds(first) + (CMTimeGetSeconds(last) - CMTimeGetSeconds(first)) * k / kProbes;
-                curve.probes.push_back(toScreen(t, channel->getCurveValue(CMTimeMakeWithSeconds(t, kTimescale))));
+                const double t = CMTimeGetSeconds(first) +
+                                 (CMTimeGetSeconds(last) - CMTimeGetSeconds(first)) * k / kProbes;
+                curve.probes.push_back(
+                    toScreen(t, channel->getCurveValue(CMTimeMakeWithSeconds(t, kTimescale))));
             }
             out.push_back(std::move(curve));
         }
@@ -203,22 +207,26 @@ protected:
             if (nearKeypoint(curves, p)) continue;
             bool crowded = false;
             for (size_t other = 0; other < curves.size() && !crowded; ++other)
-                crowded = other != index && distanceToPolyline(p, curves[other].points) < kCurveClearance;
+                crowded =
+                    other != index && distanceToPolyline(p, curves[other].points) < kCurveClearance;
             if (crowded) continue;
             ++checked;
             double best = -1.0;
             for (int dy = -2; dy <= 2; ++dy)
                 for (int dx = -2; dx <= 2; ++dx)
-                    best = std::max(best, coverage(pixel(static_cast<int>(p.x) + dx, static_cast<int>(p.y) + dy),
+                    best = std::max(best, coverage(pixel(static_cast<int>(p.x) + dx,
+                                                         static_cast<int>(p.y) + dy),
                                                    background, want));
             if (best < kMinCoverage)
-                ADD_FAILURE() << "curve " << index << " (" << curve.item->simpleName() << ") missing at pixel ("
-                              << p.x << ", " << p.y << ")";
+                ADD_FAILURE() << "curve " << index << " (" << curve.item->simpleName()
+                              << ") missing at pixel (" << p.x << ", " << p.y << ")";
         }
         return checked;
     }
 
-    static QColor qColour(const GDColor& c) { return TQQtPainterEncoder::qColor(HXDColor{c.red, c.green, c.blue, 1.0f}); }
+    static QColor qColour(const GDColor& c) {
+        return TQQtPainterEncoder::qColor(HXDColor{c.red, c.green, c.blue, 1.0f});
+    }
 
     QColor pixel(int x, int yUp) const {
         const QImage& image = encoder.image();
@@ -228,9 +236,11 @@ protected:
     // The share of `want` over `background` the pixel shows (its projection on the line
     // between the two), or -1 if the pixel is off that line.
     static double coverage(const QColor& got, const QColor& background, const QColor& want) {
-        const double d[3] = {want.red() - background.red() + 0.0, want.green() - background.green() + 0.0,
+        const double d[3] = {want.red() - background.red() + 0.0,
+                             want.green() - background.green() + 0.0,
                              want.blue() - background.blue() + 0.0};
-        const double g[3] = {got.red() - background.red() + 0.0, got.green() - background.green() + 0.0,
+        const double g[3] = {got.red() - background.red() + 0.0,
+                             got.green() - background.green() + 0.0,
                              got.blue() - background.blue() + 0.0};
         const double len2 = d[0] * d[0] + d[1] * d[1] + d[2] * d[2];
         if (len2 < 1.0) return -1.0;
@@ -255,7 +265,8 @@ protected:
 TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_elsewhere) {
     renderFramed();
     const QImage& image = encoder.image();
-    const QString path = QDir(QCoreApplication::applicationDirPath()).filePath("offscreen_sample_scene.png");
+    const QString path =
+        QDir(QCoreApplication::applicationDirPath()).filePath("offscreen_sample_scene.png");
     EXPECT_TRUE(image.save(path, "PNG")) << "could not write " << path.toStdString();
 
     const QColor background = backgroundColour();
@@ -286,7 +297,8 @@ TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_e
             if (nearCurve) continue;
             ++clear;
             const QColor got = pixel(x, y);
-            EXPECT_TRUE(std::abs(got.red() - background.red()) <= 2 && std::abs(got.green() - background.green()) <= 2 &&
+            EXPECT_TRUE(std::abs(got.red() - background.red()) <= 2 &&
+                        std::abs(got.green() - background.green()) <= 2 &&
                         std::abs(got.blue() - background.blue()) <= 2)
                 << "pixel (" << x << ", " << y << ") away from all curves is not the background";
         }

@@ -86,7 +86,8 @@ protected:
         double v = 0.0;
         if (!channel->getKeyframe(handle, &t, &v)) return QPoint(-1, -1);
         const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
-        const CGPoint screen = view.getPointScreen(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
+        const CGPoint screen =
+            view.getPointScreen(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
         const double ratio = widget.devicePixelRatioF();
         return QPoint(static_cast<int>(std::lround(screen.x / ratio)),
                       static_cast<int>(std::lround(widget.height() - screen.y / ratio)));
@@ -103,7 +104,8 @@ protected:
     TQCurveEditorItemPtr item;
 };
 
-TEST_F(CurveViewWidgetMouseTest, drag_on_a_keypoint__changes_the_channel_and_undo_restores_it_exactly) {
+TEST_F(CurveViewWidgetMouseTest,
+       drag_on_a_keypoint__changes_the_channel_and_undo_restores_it_exactly) {
     const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
     const TQKeyframeHandle key = keys[keys.size() / 2];
     const QPoint start = widgetPointOf(key);
@@ -120,7 +122,8 @@ TEST_F(CurveViewWidgetMouseTest, drag_on_a_keypoint__changes_the_channel_and_und
     QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, end);
 
     EXPECT_FALSE(*channel == *before) << "the drag did not change the channel";
-    ASSERT_TRUE(channel->getKeyframe(key, nullptr, nullptr)) << "the dragged keyframe's handle went stale";
+    ASSERT_TRUE(channel->getKeyframe(key, nullptr, nullptr))
+        << "the dragged keyframe's handle went stale";
     const QPoint moved = widgetPointOf(key);
     EXPECT_LT(moved.y(), start.y() - kMovedPixels) << "the keypoint should have gone up on screen";
     ASSERT_TRUE(host.canUndo()) << "the drag left no undo step";
@@ -133,7 +136,8 @@ TEST_F(CurveViewWidgetMouseTest, drag_on_a_keypoint__changes_the_channel_and_und
     EXPECT_TRUE(*restored == *before) << "undo must give back the channel exactly";
 }
 
-TEST_F(CurveViewWidgetMouseTest, drag_that_stops_after_a_dropped_move__still_ends_under_the_pointer) {
+TEST_F(CurveViewWidgetMouseTest,
+       drag_that_stops_after_a_dropped_move__still_ends_under_the_pointer) {
     const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
     const TQKeyframeHandle key = keys[keys.size() / 2];
     const QPoint start = widgetPointOf(key);
@@ -147,7 +151,8 @@ TEST_F(CurveViewWidgetMouseTest, drag_that_stops_after_a_dropped_move__still_end
     QTest::qWait(100);  // the widget hands the last move over again
     QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, rest);
     drawFrame();
-    EXPECT_NEAR(widgetPointOf(key).y(), rest.y(), kPointerPixels) << "the keypoint stopped short of the pointer";
+    EXPECT_NEAR(widgetPointOf(key).y(), rest.y(), kPointerPixels)
+        << "the keypoint stopped short of the pointer";
 }
 
 TEST_F(CurveViewWidgetMouseTest, press_while_a_gesture_is_open__ends_it_first) {
@@ -160,10 +165,11 @@ TEST_F(CurveViewWidgetMouseTest, press_while_a_gesture_is_open__ends_it_first) {
     QTest::mouseMove(&widget, start + QPoint(0, -20));
     ASSERT_TRUE(host.undoStack().isStepOpen()) << "the drag should have opened its step";
 
-    QMouseEvent press(QEvent::MouseButtonPress, QPointF(start), widget.mapToGlobal(QPointF(start)), Qt::LeftButton,
-                      Qt::LeftButton, Qt::NoModifier);
+    QMouseEvent press(QEvent::MouseButtonPress, QPointF(start), widget.mapToGlobal(QPointF(start)),
+                      Qt::LeftButton, Qt::LeftButton, Qt::NoModifier);
     QCoreApplication::sendEvent(&widget, &press);
-    EXPECT_FALSE(host.undoStack().isStepOpen()) << "the lost release must be made up before the new press";
+    EXPECT_FALSE(host.undoStack().isStepOpen())
+        << "the lost release must be made up before the new press";
     EXPECT_EQ(host.undoStack().undoCount(), 1u) << "the first drag is one step";
     QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, start);
 }
@@ -171,7 +177,8 @@ TEST_F(CurveViewWidgetMouseTest, press_while_a_gesture_is_open__ends_it_first) {
 TEST_F(CurveViewWidgetMouseTest, space_bar__arms_on_the_first_press_and_ends_on_release) {
     // Shortcut overrides go to the focus object of the active window.
     widget.activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(&widget)) << "the offscreen window did not become active";
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&widget))
+        << "the offscreen window did not become active";
     widget.setFocus();
     QTest::keyPress(&widget, Qt::Key_Space);
     EXPECT_EQ(view.space(), 1) << "the first space press must reach the view as a key equivalent";

@@ -65,13 +65,14 @@ TEST_F(CurveViewWidgetTest, repaints_inside_the_gate__one_frame_and_one_delayed_
 TEST_F(CurveViewWidgetTest, wheel__a_burst_is_folded_into_one_delivery) {
     const QPointF at(100.0, 80.0);
     for (int i = 0; i < 3; ++i) {
-        QWheelEvent e(at, widget.mapToGlobal(at), QPoint(), QPoint(120, 0), Qt::NoButton, Qt::NoModifier,
-                      Qt::NoScrollPhase, false);
+        QWheelEvent e(at, widget.mapToGlobal(at), QPoint(), QPoint(120, 0), Qt::NoButton,
+                      Qt::NoModifier, Qt::NoScrollPhase, false);
         QCoreApplication::sendEvent(&widget, &e);
     }
     EXPECT_EQ(widget.viewHost().pendingEventCount(), 3u) << "wheel events wait for one delivery";
     settle();
-    EXPECT_EQ(widget.viewHost().pendingEventCount(), 0u) << "the view's scrollWheel takes the waiting ones";
+    EXPECT_EQ(widget.viewHost().pendingEventCount(), 0u)
+        << "the view's scrollWheel takes the waiting ones";
 }
 
 }  // namespace

@@ -39,7 +39,8 @@ TEST_F(QtModalTest, value_panel__ok_hands_back_the_typed_number) {
     const RWModalResponse response = runWith([](QDialog& dialog) {
         auto* line = dialog.findChild<QLineEdit*>("value");
         ASSERT_NE(line, nullptr);
-        EXPECT_EQ(line->text().toStdString(), "2.5") << "the panel starts from the keypoint's value";
+        EXPECT_EQ(line->text().toStdString(), "2.5")
+            << "the panel starts from the keypoint's value";
         line->setText("-7.25");
         press(dialog, QDialogButtonBox::Ok);
     });
@@ -51,17 +52,19 @@ TEST_F(QtModalTest, value_panel__text_that_is_no_number_keeps_it_open_and_cancel
     const RWModalResponse response = runWith([](QDialog& dialog) {
         dialog.findChild<QLineEdit*>("value")->setText("1e999");  // not finite
         press(dialog, QDialogButtonBox::Ok);
-        EXPECT_TRUE(dialog.isVisible()) << "OK on a text that is no finite number must not end the run";
+        EXPECT_TRUE(dialog.isVisible())
+            << "OK on a text that is no finite number must not end the run";
         press(dialog, QDialogButtonBox::Cancel);
     });
     EXPECT_EQ(response, RWModalResponseCancel);
-    EXPECT_NEAR(window.value, 2.5, kValueTolerance) << "a cancelled panel must not change the value";
+    EXPECT_NEAR(window.value, 2.5, kValueTolerance)
+        << "a cancelled panel must not change the value";
 }
 
 TEST_F(QtModalTest, stop_and_unknown_windows__end_or_refuse_the_run) {
     EXPECT_EQ(runWith([this](QDialog&) { service.stopModalWithCode(42); }), 42);
     service.stopModal();  // outside a run: nothing to stop, no failure
-    RWWindow wrongKind;  // the value panel's title on a window that carries no value
+    RWWindow wrongKind;   // the value panel's title on a window that carries no value
     wrongKind.setTitle("TQCurveEditorValueView");
     EXPECT_EQ(service.runModalForWindow(wrongKind), RWModalResponseAbort);
 }

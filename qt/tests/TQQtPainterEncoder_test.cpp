@@ -32,10 +32,12 @@ protected:
 
     // One frame at backing scale `scale` (the drawable grows with it).
     void render(const Primitives& primitives, float scale = 1.0f) {
-        encoder.setDrawableSize(QSize(static_cast<int>(kWidth * scale), static_cast<int>(kHeight * scale)));
+        encoder.setDrawableSize(
+            QSize(static_cast<int>(kWidth * scale), static_cast<int>(kHeight * scale)));
         HXDTexture* target = encoder.nextDrawable();
         ASSERT_NE(target, nullptr);
-        const HXDRenderingContext context(target, scale, BNViewVolumeProjection(CGRectMake(0, 0, kWidth, kHeight)),
+        const HXDRenderingContext context(target, scale,
+                                          BNViewVolumeProjection(CGRectMake(0, 0, kWidth, kHeight)),
                                           HXDFloat2{1.0f / scale, 1.0f / scale});
         encoder.beginEncoding(*target, kBackground);
         for (const auto& p : primitives) p->encodeWithEncoder(encoder, context);
@@ -43,21 +45,27 @@ protected:
     }
 
     // The pixel whose centre is (x + 0.5, y + 0.5) in drawable pixels, y up.
-    QColor pixel(int x, int yUp) const { return encoder.image().pixelColor(x, encoder.image().height() - 1 - yUp); }
+    QColor pixel(int x, int yUp) const {
+        return encoder.image().pixelColor(x, encoder.image().height() - 1 - yUp);
+    }
 
-    static ::testing::AssertionResult near(const QColor& got, const HXDColor& want, int tolerance = kChannelTolerance) {
+    static ::testing::AssertionResult near(const QColor& got, const HXDColor& want,
+                                           int tolerance = kChannelTolerance) {
         const QColor w = TQQtPainterEncoder::qColor(want);
-        if (std::abs(got.red() - w.red()) <= tolerance && std::abs(got.green() - w.green()) <= tolerance &&
+        if (std::abs(got.red() - w.red()) <= tolerance &&
+            std::abs(got.green() - w.green()) <= tolerance &&
             std::abs(got.blue() - w.blue()) <= tolerance)
             return ::testing::AssertionSuccess();
-        return ::testing::AssertionFailure() << "got rgb(" << got.red() << "," << got.green() << "," << got.blue()
-                                             << "), want rgb(" << w.red() << "," << w.green() << "," << w.blue() << ")";
+        return ::testing::AssertionFailure()
+               << "got rgb(" << got.red() << "," << got.green() << "," << got.blue()
+               << "), want rgb(" << w.red() << "," << w.green() << "," << w.blue() << ")";
     }
 
     static std::shared_ptr<HXDMultiline> line(std::vector<HXDLineVertex> v) {
         return std::make_shared<HXDMultiline>(std::span<const HXDLineVertex>(v));
     }
-    static std::shared_ptr<HXDMultiline> horizontal(float y, HXDColor from, HXDColor to, float x0 = 10.0f) {
+    static std::shared_ptr<HXDMultiline> horizontal(float y, HXDColor from, HXDColor to,
+                                                    float x0 = 10.0f) {
         return line({{{x0, y, 0.0f}, from}, {{190.0f, y, 0.0f}, to}});
     }
     static std::shared_ptr<HXDMultiline> stippled(std::shared_ptr<HXDMultiline> m) {
@@ -90,7 +98,9 @@ TEST_F(PainterEncoderTest, multiline__stipple_phase_runs_on_across_vertices_and_
     // Checked in the middle of each 4-pixel step: aliased lines may round by one pixel.
     // A corner at x = 16 lies inside a gap: dashes 10..13, 18..21; restarting there would
     // ink 16..19.
-    render({stippled(line({{{10.0f, 20.5f, 0.0f}, kRed}, {{16.0f, 20.5f, 0.0f}, kRed}, {{60.0f, 20.5f, 0.0f}, kRed}}))});
+    render({stippled(line({{{10.0f, 20.5f, 0.0f}, kRed},
+                           {{16.0f, 20.5f, 0.0f}, kRed},
+                           {{60.0f, 20.5f, 0.0f}, kRed}}))});
     EXPECT_TRUE(near(pixel(12, 20), kRed));
     EXPECT_TRUE(near(pixel(16, 20), kBackground)) << "the gap must run on past the vertex";
     EXPECT_TRUE(near(pixel(20, 20), kRed));
@@ -128,7 +138,9 @@ TEST_F(PainterEncoderTest, multiline__gamma_raises_partial_coverage) {
 
 TEST_F(PainterEncoderTest, multiline__join_and_loop) {
     // A V of width 8 with its corner at (100, 80): a mitre reaches about 6 pixels past it.
-    auto corner = line({{{50.0f, 20.0f, 0.0f}, kRed}, {{100.0f, 80.0f, 0.0f}, kRed}, {{150.0f, 20.0f, 0.0f}, kRed}});
+    auto corner = line({{{50.0f, 20.0f, 0.0f}, kRed},
+                        {{100.0f, 80.0f, 0.0f}, kRed},
+                        {{150.0f, 20.0f, 0.0f}, kRed}});
     corner->setWidth(8.0f);
     corner->setLineJoin(0);
     render({corner});
@@ -139,7 +151,8 @@ TEST_F(PainterEncoderTest, multiline__join_and_loop) {
     corner->setLoop(true);
     corner->setWidth(1.0f);
     render({corner});
-    EXPECT_GT(std::max(pixel(100, 19).red(), pixel(100, 20).red()), 200) << "the loop closes the run along the bottom";
+    EXPECT_GT(std::max(pixel(100, 19).red(), pixel(100, 20).red()), 200)
+        << "the loop closes the run along the bottom";
 }
 
 TEST_F(PainterEncoderTest, quadTexture__alpha_kept_and_texel_for_pixel_on_whole_pixels) {
@@ -165,10 +178,12 @@ TEST_F(PainterEncoderTest, screenspaceQuad_and_mesh__blend_and_fill) {
     under->setColor(kRed);
     auto band = std::make_shared<HXDScreenspaceQuad>(CGRectMake(50, 0, 100, 100), 0);
     band->setColor(HXDColor{0.0f, 0.0f, 1.0f, 0.25f});
-    auto mesh = std::make_shared<HXDMesh>(9, HXDBrush{0, kBlue},
-                                          std::vector<HXDSubmesh>{HXDSubmesh({{160, 20}, {190, 20}, {190, 80}})});
+    auto mesh = std::make_shared<HXDMesh>(
+        9, HXDBrush{0, kBlue},
+        std::vector<HXDSubmesh>{HXDSubmesh({{160, 20}, {190, 20}, {190, 80}})});
     render({under, band, mesh});
-    EXPECT_TRUE(near(pixel(75, 50), HXDColor{0.75f, 0.0f, 0.25f, 1.0f})) << "a quarter of blue over red";
+    EXPECT_TRUE(near(pixel(75, 50), HXDColor{0.75f, 0.0f, 0.25f, 1.0f}))
+        << "a quarter of blue over red";
     EXPECT_TRUE(near(pixel(185, 30), kBlue)) << "inside the triangle";
     EXPECT_TRUE(near(pixel(145, 70), HXDColor{0.0f, 0.0f, 0.25f, 1.0f})) << "the band over black";
     band->setBlendingInfo(HXDDataType::additiveBlendingInfo());
@@ -189,7 +204,8 @@ TEST_F(PainterEncoderTest, text__paints_inside_its_measured_box_in_its_colour) {
     for (int y = 0; y < kHeight; ++y)
         for (int x = 0; x < kWidth; ++x)
             if (pixel(x, y).red() >= 60)
-                ++(x >= 39 && x <= 41 + size.width && y >= 39 && y <= 41 + size.height ? inked : outside);
+                ++(x >= 39 && x <= 41 + size.width && y >= 39 && y <= 41 + size.height ? inked
+                                                                                       : outside);
     EXPECT_GT(inked, 10) << "the text left no red pixels";
     EXPECT_EQ(outside, 0) << "text pixels outside the measured box";
 }

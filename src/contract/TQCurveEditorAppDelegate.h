@@ -95,7 +95,8 @@ public:
     virtual void willSetChannelValue(const TQChannelBase* channel) = 0;
     virtual void didSetChannelValue(const TQChannelBase* channel) = 0;
     // Records one channel, in its present state, as one undoable step with no bracket.
-    virtual void addChannelToUndo(const TQChannelBase* channel, const BNString& undoDescription) = 0;
+    virtual void addChannelToUndo(const TQChannelBase* channel,
+                                  const BNString& undoDescription) = 0;
     // Records a step that is not a channel's. `object` is the framework object that owns what
     // changes (a controller, a view); the host restores the step through that owner.
     virtual void addToUndo(void* object, uint32_t type, uint32_t action,

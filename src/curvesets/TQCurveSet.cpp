@@ -301,7 +301,8 @@ bool TQCurveSet::removeItemWithIdentifier(uint32_t identifier) {
 
 void TQCurveSet::filterList() {
     if (!_relative) {
-        std::erase_if(_roots, [](const TQCurveEditorFolderItemPtr& r) { return !r || !r->hasChildren(); });
+        std::erase_if(_roots,
+                      [](const TQCurveEditorFolderItemPtr& r) { return !r || !r->hasChildren(); });
         return;
     }
     std::vector<TQCurveEditorItemPtr> dropped;  // runs across all roots
@@ -333,7 +334,8 @@ void TQCurveSet::refresh(uint32_t numberOfSamples, bool snapshot) {
         for (const TQCurveEditorItemPtr& item : gone) removeItem(item);
     } else {
         const std::vector<TQChannelBase*> objects =
-            _pAppDelegate ? _pAppDelegate->selectedObjectsRootChannels() : std::vector<TQChannelBase*>{};
+            _pAppDelegate ? _pAppDelegate->selectedObjectsRootChannels()
+                          : std::vector<TQChannelBase*>{};
         reset();
         for (TQChannelBase* object : objects) {
             TQCurveEditorItem::resetColorIndex();  // colours restart for each object

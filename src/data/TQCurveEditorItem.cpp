@@ -128,7 +128,8 @@ void TQCurveEditorFolderItem::initWithChannel(TQChannelBase* channel, double num
     if (!folderChannel) return;
     // Deliberately the reverse of what the name suggests: a folder hidden in curve editors is
     // left empty only when hidden channels are not ignored.
-    if (!_ignoreHiddenChannels && folderChannel->testFlag(kTQChannelFlagHiddenInCurveEditor)) return;
+    if (!_ignoreHiddenChannels && folderChannel->testFlag(kTQChannelFlagHiddenInCurveEditor))
+        return;
 
     const uint32_t excluded = _ignoreHiddenChannels ? 0x2u : 0x10002u;
     const bool flattenAll = folderChannel->testFlag(kTQChannelFlagShowFlattened);
@@ -165,10 +166,9 @@ void TQCurveEditorFolderItem::addChild(const TQCurveEditorItemPtr& child) {
     // here yet; merged roots have always relied on it.
     for (const TQCurveEditorItemPtr& grandChild : folderChild->_children) {
         if (!grandChild || !grandChild->isValid()) continue;
-        const bool present = std::any_of(_children.begin(), _children.end(),
-                                         [&](const TQCurveEditorItemPtr& c) {
-                                             return c && c->isEqual(*grandChild);
-                                         });
+        const bool present = std::any_of(
+            _children.begin(), _children.end(),
+            [&](const TQCurveEditorItemPtr& c) { return c && c->isEqual(*grandChild); });
         if (!present) _children.push_back(child);
     }
 }
@@ -203,8 +203,10 @@ int32_t TQCurveEditorFolderItem::isEnabledItem() const {
     std::optional<int32_t> common;
     for (const TQCurveEditorItemPtr& c : _children) {
         const int32_t state = c ? c->isEnabledItem() : 0;
-        if (!common) common = state;
-        else if (*common != state) return -1;
+        if (!common)
+            common = state;
+        else if (*common != state)
+            return -1;
     }
     return *common;
 }
@@ -256,10 +258,10 @@ void TQCurveEditorChannelItem::initWithChannel(TQChannelBase* channel, double nu
     _processedSamplesU.reset();
     _processedSamplesV.reset();
     // Truncated to unsigned; a negative or non-finite count means none.
-    const uint32_t count = (std::isfinite(numberOfSamples) && numberOfSamples > 0 &&
-                            numberOfSamples < 4294967296.0)
-                               ? static_cast<uint32_t>(numberOfSamples)
-                               : 0u;
+    const uint32_t count =
+        (std::isfinite(numberOfSamples) && numberOfSamples > 0 && numberOfSamples < 4294967296.0)
+            ? static_cast<uint32_t>(numberOfSamples)
+            : 0u;
     _numberOfSamples = count;
     _numberOfProcessedSamples = count;
     _numberOfSamplesSnapshot = 0;
@@ -363,7 +365,8 @@ void TQCurveEditorChannelItem::refreshOriginalCurve(const CMTime& start, const C
     _originalCurveDirty = 0;
 }
 
-void TQCurveEditorChannelItem::refreshProcessedCurve(const CMTime& start, const CMTime& resolution) {
+void TQCurveEditorChannelItem::refreshProcessedCurve(const CMTime& start,
+                                                     const CMTime& resolution) {
     TQChannel* c = channel();
     if (!c) {
         _processedSamplesU.reset();
@@ -412,8 +415,9 @@ double TQCurveEditorChannelItem::extreme(double& cached, int sign) {
         const CMTime frame = _appDelegate ? _appDelegate->getFrameDuration() : CMTime{};
         const double frames = CMTimeGetSeconds(range.duration) / CMTimeGetSeconds(frame);
         // No usable frame rate (a missing host gives zero times): measure nothing.
-        _numberOfProcessedSamples =
-            (std::isfinite(frames) && frames > 0 && frames < 4294967296.0) ? static_cast<uint32_t>(frames) : 0u;
+        _numberOfProcessedSamples = (std::isfinite(frames) && frames > 0 && frames < 4294967296.0)
+                                        ? static_cast<uint32_t>(frames)
+                                        : 0u;
         refreshProcessedCurve(range.start, frame);
         if (!_processedSamplesV) {
             _processedCurveDirty = 1;

@@ -75,7 +75,9 @@ public:
     // A new item of the same class for the same channel (new identifier, no samples).
     virtual TQCurveEditorItemPtr copy() const;
     // Same channel pointer (two items whose channels are both gone are equal too).
-    bool isEqual(const TQCurveEditorItem& other) const { return channelBase() == other.channelBase(); }
+    bool isEqual(const TQCurveEditorItem& other) const {
+        return channelBase() == other.channelBase();
+    }
 
     virtual void takeCurveSnapshot(char) {}
 

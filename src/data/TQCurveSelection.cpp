@@ -60,8 +60,9 @@ bool TQCurveSelectionList::isKeypointSelected(TQKeyframeHandle handle) const {
 }
 
 bool TQCurveSelectionList::isCurveSelected(uint32_t curveId) const {
-    return std::any_of(_selection.begin(), _selection.end(),
-                       [&](const TQCurveSelectionPtr& e) { return e && e->getCurveId() == curveId; });
+    return std::any_of(_selection.begin(), _selection.end(), [&](const TQCurveSelectionPtr& e) {
+        return e && e->getCurveId() == curveId;
+    });
 }
 
 void TQCurveSelectionList::purge(uint32_t curveId) {
@@ -74,6 +75,7 @@ void TQCurveSelectionList::purge(uint32_t curveId) {
 std::shared_ptr<TQCurveSelectionList> TQCurveSelectionList::copy() const {
     auto list = std::make_shared<TQCurveSelectionList>();
     list->_selection.reserve(_selection.size());
-    for (const TQCurveSelectionPtr& e : _selection) list->_selection.push_back(e ? e->copy() : nullptr);
+    for (const TQCurveSelectionPtr& e : _selection)
+        list->_selection.push_back(e ? e->copy() : nullptr);
     return list;
 }

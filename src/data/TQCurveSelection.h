@@ -32,7 +32,9 @@ public:
     void setCurveId(uint32_t curveId) { _curveId = curveId; }
 
     bool isCurve() const { return _flag == TQSelectionCurve; }
-    bool isTangent() const { return _flag == TQSelectionOutTangent || _flag == TQSelectionInTangent; }
+    bool isTangent() const {
+        return _flag == TQSelectionOutTangent || _flag == TQSelectionInTangent;
+    }
     // Deliberately excludes the three other kinds instead of testing for TQSelectionKeypoint:
     // an entry with a handle and no flag counts as a keypoint.
     bool isKeypoint() const {
@@ -52,7 +54,9 @@ public:
         return _handle == other._handle && _flag == other._flag;
     }
 
-    std::shared_ptr<TQCurveSelection> copy() const { return std::make_shared<TQCurveSelection>(*this); }
+    std::shared_ptr<TQCurveSelection> copy() const {
+        return std::make_shared<TQCurveSelection>(*this);
+    }
 
     // Three-way comparisons of the stored times (not the channel's live ones).
     int compareKeypointAscending(const TQCurveSelection& other) const;

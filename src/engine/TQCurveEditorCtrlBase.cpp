@@ -68,7 +68,8 @@ TQCurveEditorChannelItem* TQCurveEditorCtrlBase::itemForEntry(const TQCurveSelec
     return dynamic_cast<TQCurveEditorChannelItem*>(item.get());
 }
 
-TQCurveEditorChannelItem* TQCurveEditorCtrlBase::itemForChannel(const TQChannelBase* channel) const {
+TQCurveEditorChannelItem* TQCurveEditorCtrlBase::itemForChannel(
+    const TQChannelBase* channel) const {
     if (!_selectedCurveSet || !channel) return nullptr;
     TQCurveEditorItemPtr item = _selectedCurveSet->itemWithChannel(channel);
     return dynamic_cast<TQCurveEditorChannelItem*>(item.get());
@@ -110,17 +111,20 @@ void TQCurveEditorCtrlBase::postNotification(TQNotificationWord word) const {
 
 TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHChannelToSelectedCurveSet(
     const CHChannelObject* channel) {
-    return appendChannelToCurveSet(channel ? dynamic_cast<TQChannel*>(channel->tqChannel()) : nullptr);
+    return appendChannelToCurveSet(channel ? dynamic_cast<TQChannel*>(channel->tqChannel())
+                                           : nullptr);
 }
 
 TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHFolderToSelectedCurveSet(
     const CHChannelObject* folder) {
-    return appendFolderToCurveSet(folder ? dynamic_cast<TQChannelFolder*>(folder->tqChannel()) : nullptr);
+    return appendFolderToCurveSet(folder ? dynamic_cast<TQChannelFolder*>(folder->tqChannel())
+                                         : nullptr);
 }
 
 TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHChannel(const CHChannelObject* channel,
                                                             const TQCurveSetPtr& toCurveSet) {
-    return appendChannel(channel ? dynamic_cast<TQChannel*>(channel->tqChannel()) : nullptr, toCurveSet);
+    return appendChannel(channel ? dynamic_cast<TQChannel*>(channel->tqChannel()) : nullptr,
+                         toCurveSet);
 }
 
 TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendCHFolder(const CHChannelObject* folder,
@@ -243,7 +247,8 @@ uint32_t TQCurveEditorCtrlBase::numberOfSelectedRootItems() const {
 }
 
 std::vector<TQCurveEditorItemPtr> TQCurveEditorCtrlBase::selectedChannels() const {
-    return _selectedCurveSet ? _selectedCurveSet->selectedItems() : std::vector<TQCurveEditorItemPtr>{};
+    return _selectedCurveSet ? _selectedCurveSet->selectedItems()
+                             : std::vector<TQCurveEditorItemPtr>{};
 }
 
 std::vector<TQCurveEditorFolderItemPtr> TQCurveEditorCtrlBase::selectedRoots() const {
@@ -324,7 +329,8 @@ void TQCurveEditorCtrlBase::getSamples(TQCurveEditorItem* item, char flag, CMTim
 }
 
 std::vector<TQKeyframeHandle> TQCurveEditorCtrlBase::getKeypoints(uint32_t identifier) {
-    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(channelItemWithIdentifier(identifier).get());
+    auto* item =
+        dynamic_cast<TQCurveEditorChannelItem*>(channelItemWithIdentifier(identifier).get());
     if (!item) return {};
     return *item->keypoints();
 }
@@ -392,7 +398,8 @@ void TQCurveEditorCtrlBase::setCurveInterpolation(const TQCurveSelection* entry,
 
 // ---- Unit conversion --------------------------------------------------------------------
 
-double TQCurveEditorCtrlBase::convertToChannelCoords(const TQCurveEditorItem* item, double value) const {
+double TQCurveEditorCtrlBase::convertToChannelCoords(const TQCurveEditorItem* item,
+                                                     double value) const {
     const auto* c = dynamic_cast<const TQCurveEditorChannelItem*>(item);
     if (!c) return value;
     return (value * c->scaleY() + c->offsetY()) / c->conversionFactor();
@@ -413,7 +420,8 @@ namespace {
 // item or channel is gone are passed over. Small lists: a linear membership test is cheaper
 // than hashing, and a drag announces at most a few dozen channels.
 template <class Lookup>
-std::vector<const TQChannelBase*> gatherChannels(const TQCurveSelectionList& list, Lookup&& lookup) {
+std::vector<const TQChannelBase*> gatherChannels(const TQCurveSelectionList& list,
+                                                 Lookup&& lookup) {
     std::vector<const TQChannelBase*> channels;
     for (const TQCurveSelectionPtr& entry : list.getSelectionArray()) {
         if (!entry) continue;
@@ -430,20 +438,23 @@ std::vector<const TQChannelBase*> gatherChannels(const TQCurveSelectionList& lis
 void TQCurveEditorCtrlBase::willModify(TQCurveSelectionList* list) {
     if (!list || !_pAppDelegate) return;
     const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
-    for (const TQChannelBase* c : gatherChannels(*list, lookup)) _pAppDelegate->willChangeChannel(c);
+    for (const TQChannelBase* c : gatherChannels(*list, lookup))
+        _pAppDelegate->willChangeChannel(c);
 }
 
 void TQCurveEditorCtrlBase::didModify(TQCurveSelectionList* list) {
     if (!list || !_pAppDelegate) return;
     const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
     const auto channels = gatherChannels(*list, lookup);
-    for (auto it = channels.rbegin(); it != channels.rend(); ++it) _pAppDelegate->didChangeChannel(*it);
+    for (auto it = channels.rbegin(); it != channels.rend(); ++it)
+        _pAppDelegate->didChangeChannel(*it);
 }
 
 void TQCurveEditorCtrlBase::willModifyValue(TQCurveSelectionList* list) {
     if (!list || !_pAppDelegate) return;
     const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
-    for (const TQChannelBase* c : gatherChannels(*list, lookup)) _pAppDelegate->willSetChannelValue(c);
+    for (const TQChannelBase* c : gatherChannels(*list, lookup))
+        _pAppDelegate->willSetChannelValue(c);
 }
 
 void TQCurveEditorCtrlBase::didModifyValue(TQCurveSelectionList* list) {
@@ -533,7 +544,8 @@ void TQCurveEditorCtrlBase::showValueAtPoint(const CGPoint& point, RWWindow* inW
     if (!channel) return;
     // Deliberately outside any bracket and without a dirty mark, as this has always been.
     channel->noteWillChange(true);
-    channel->setKeyframeValue(handle, displayScale != 0.0 ? window.value / displayScale : window.value);
+    channel->setKeyframeValue(handle,
+                              displayScale != 0.0 ? window.value / displayScale : window.value);
 }
 
 // ---- Menus ------------------------------------------------------------------------------
@@ -569,7 +581,8 @@ void addInterpolationSubmenu(RWMenu& menu, const char* action, RWActionTarget* t
         item->setTarget(target);
         item->setTag(e.tag);
     }
-    RWMenuItemPtr holder = menu.addItemWithTitle(TQLocalizedString("Anim Menu Interpolation"), "", "");
+    RWMenuItemPtr holder =
+        menu.addItemWithTitle(TQLocalizedString("Anim Menu Interpolation"), "", "");
     holder->setTag(0);
     menu.setSubmenuForItem(submenu, *holder);
 }
@@ -614,19 +627,31 @@ void TQCurveEditorCtrlBase::buildDefaultMenu() { _defaultMenu = std::make_shared
 
 bool TQCurveEditorCtrlBase::performAction(const std::string& action, RWMenuItem& sender) {
     void* from = &sender;
-    if (action == "menuDelete:") menuDelete(from);
-    else if (action == "menuDuplicate:") menuDuplicate(from);
-    else if (action == "menuReverse:") menuReverse(from);
-    else if (action == "menuEaseIn:") menuEaseIn(from);
-    else if (action == "menuEaseOut:") menuEaseOut(from);
-    else if (action == "menuEaseBoth:") menuEaseBoth(from);
-    else if (action == "menuLockSelected:") menuLockSelected(from);
-    else if (action == "menuDisableSelected:") menuDisableSelected(from);
-    else if (action == "menuAddKeyframe:") menuAddKeyframe(from);
+    if (action == "menuDelete:")
+        menuDelete(from);
+    else if (action == "menuDuplicate:")
+        menuDuplicate(from);
+    else if (action == "menuReverse:")
+        menuReverse(from);
+    else if (action == "menuEaseIn:")
+        menuEaseIn(from);
+    else if (action == "menuEaseOut:")
+        menuEaseOut(from);
+    else if (action == "menuEaseBoth:")
+        menuEaseBoth(from);
+    else if (action == "menuLockSelected:")
+        menuLockSelected(from);
+    else if (action == "menuDisableSelected:")
+        menuDisableSelected(from);
+    else if (action == "menuAddKeyframe:")
+        menuAddKeyframe(from);
     else if (action == "menuBreakTangent:")
-        performWithBracket("Undo Break Tangents", [this](TQCurveSelectionList* l) { breakTangentsSelected(l); });
+        performWithBracket("Undo Break Tangents",
+                           [this](TQCurveSelectionList* l) { breakTangentsSelected(l); });
     else if (action == "menuAlignTangent:")
-        performWithBracket("Undo Align Tangents", [this](TQCurveSelectionList* l) { alignTangentsSelected(l); });
-    else return false;
+        performWithBracket("Undo Align Tangents",
+                           [this](TQCurveSelectionList* l) { alignTangentsSelected(l); });
+    else
+        return false;
     return true;
 }

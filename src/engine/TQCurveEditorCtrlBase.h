@@ -124,8 +124,10 @@ public:
 
     TQCurveEditorItemPtr appendCHChannelToSelectedCurveSet(const CHChannelObject* channel);
     TQCurveEditorItemPtr appendCHFolderToSelectedCurveSet(const CHChannelObject* folder);
-    TQCurveEditorItemPtr appendCHChannel(const CHChannelObject* channel, const TQCurveSetPtr& toCurveSet);
-    TQCurveEditorItemPtr appendCHFolder(const CHChannelObject* folder, const TQCurveSetPtr& toCurveSet);
+    TQCurveEditorItemPtr appendCHChannel(const CHChannelObject* channel,
+                                         const TQCurveSetPtr& toCurveSet);
+    TQCurveEditorItemPtr appendCHFolder(const CHChannelObject* folder,
+                                        const TQCurveSetPtr& toCurveSet);
     // The two-argument forms with `_selectedCurveSet`.
     virtual TQCurveEditorItemPtr appendChannelToCurveSet(TQChannel* channel);
     virtual TQCurveEditorItemPtr appendFolderToCurveSet(TQChannelFolder* folder);
@@ -135,8 +137,10 @@ public:
     virtual TQCurveEditorItemPtr appendChannel(TQChannel* channel, const TQCurveSetPtr& toCurveSet);
     // Each child channel in order, sub-folders by recursion; posts and updates the UI once per
     // level. Answers the last item made.
-    virtual TQCurveEditorItemPtr appendFolder(TQChannelFolder* folder, const TQCurveSetPtr& toCurveSet);
-    virtual bool removeChannelWithIdentifier(uint32_t identifier, const TQCurveSetPtr& fromCurveSet);
+    virtual TQCurveEditorItemPtr appendFolder(TQChannelFolder* folder,
+                                              const TQCurveSetPtr& toCurveSet);
+    virtual bool removeChannelWithIdentifier(uint32_t identifier,
+                                             const TQCurveSetPtr& fromCurveSet);
     // Records the removal with the host's undo (type 2, action 0) first.
     virtual bool removeSelectedChannelFromSelectedCurveSet();
     // Rebuilds the set at the view's width, forgets the view's selection and box.
@@ -159,7 +163,9 @@ public:
     TQCurveEditorItemPtr selectedChannel() const;
     void deselectAllChannels();
     virtual uint32_t numberOfDisplayedChannels() const { return numberOfChannelItems(); }
-    virtual std::vector<TQCurveEditorItemPtr> sketchedChannels() const { return selectedChannels(); }
+    virtual std::vector<TQCurveEditorItemPtr> sketchedChannels() const {
+        return selectedChannels();
+    }
     virtual uint32_t numberOfSketchedChannels() const { return numberOfSelectedChannels(); }
     // The first channel item that is selected and enabled, or null.
     TQCurveEditorItemPtr getFirstChannel() const;
@@ -365,7 +371,7 @@ protected:
     bool _snapshotChannels = false;
     bool _ignoreHiddenChannels = false;
     bool _negativeRangeAllowed = false;
-    int32_t _iLastDragDirection = 0;   // box deformation only
+    int32_t _iLastDragDirection = 0;     // box deformation only
     bool _bSelectionWasFlipped = false;  // box deformation only
-    std::vector<TQKeyframePtr> _keys;  // box deformation only; owned
+    std::vector<TQKeyframePtr> _keys;    // box deformation only; owned
 };

@@ -113,7 +113,8 @@ void TQCurveEditorCtrlBase::deleteKeypoints(void* sender) {
     if (!list) return;
     validateSelection(list);
     if (!shouldDeleteKeypoints()) return;
-    performWithBracket("Undo Delete Keypoint", [this](TQCurveSelectionList* l) { deleteSelected(l); });
+    performWithBracket("Undo Delete Keypoint",
+                       [this](TQCurveSelectionList* l) { deleteSelected(l); });
 }
 
 void TQCurveEditorCtrlBase::deleteSelected(TQCurveSelectionList* list) {
@@ -139,8 +140,8 @@ void TQCurveEditorCtrlBase::deleteSelected(TQCurveSelectionList* list) {
                 component->noteWillChange(true);
                 if (contains(settled, component)) continue;
                 settled.push_back(component);
-                component->setInitialValue(component->getCurveValue(rootCurrentTime(*component), true),
-                                           false);
+                component->setInitialValue(
+                    component->getCurveValue(rootCurrentTime(*component), true), false);
             }
             compound->deleteKeyframe(channel, time, compoundLinkArgument(*compound, _linked));
             markComponentsDirty(*compound);
@@ -148,7 +149,8 @@ void TQCurveEditorCtrlBase::deleteSelected(TQCurveSelectionList* list) {
             // This path announces nothing to the channel: the old behaviour, kept.
             if (!contains(settled, channel)) {
                 settled.push_back(channel);
-                channel->setInitialValue(channel->getCurveValue(item->getCurrentTime(), true), false);
+                channel->setInitialValue(channel->getCurveValue(item->getCurrentTime(), true),
+                                         false);
             }
             const CMTime axisTime = BN_CMTimeSaferAdd(time, channel->timeOffset());
             channel->deleteKeyframeAtAxisTime(&axisTime, true);
@@ -165,9 +167,9 @@ void TQCurveEditorCtrlBase::duplicateSelected(TQCurveSelectionList* list) {
     // Without a positive frame there is no free frame to find.
     if (!CMTIME_IS_NUMERIC(frame) || frame.value <= 0) return;
     // A thousandth of a frame, exactly: in the frame's own timescale it would round to zero.
-    const CMTime fine = CMTimeConvertScale(
-        frame, static_cast<CMTimeScale>(std::min<int64_t>(int64_t{frame.timescale} * 1000,
-                                                          kCMTimeMaxTimescale)));
+    const CMTime fine =
+        CMTimeConvertScale(frame, static_cast<CMTimeScale>(std::min<int64_t>(
+                                      int64_t{frame.timescale} * 1000, kCMTimeMaxTimescale)));
     CMTime smallStep = CMTimeMultiplyByFloat64(fine, 0.001);
     if (CMTimeCompare(smallStep, kCMTimeZero) <= 0) smallStep = CMTimeMake(1, fine.timescale);
 
@@ -322,8 +324,9 @@ void TQCurveEditorCtrlBase::easeInSelected(TQCurveSelectionList* list) {
         channel->noteWillChange(true);
         const unsigned k = channel->getKeyframeInterpolation(previous);
         if (k != kTQInterpolationEaseBoth)
-            channel->setKeyframeInterpolation(
-                previous, k == kTQInterpolationEaseOut ? kTQInterpolationEaseBoth : kTQInterpolationEaseIn);
+            channel->setKeyframeInterpolation(previous, k == kTQInterpolationEaseOut
+                                                            ? kTQInterpolationEaseBoth
+                                                            : kTQInterpolationEaseIn);
         markDirty(item);
     }
 }
@@ -337,9 +340,9 @@ void TQCurveEditorCtrlBase::easeOutSelected(TQCurveSelectionList* list) {
         channel->noteWillChange(true);
         const unsigned k = channel->getKeyframeInterpolation(entry->getHandle());
         if (k != kTQInterpolationEaseBoth)
-            channel->setKeyframeInterpolation(
-                entry->getHandle(),
-                k == kTQInterpolationEaseIn ? kTQInterpolationEaseBoth : kTQInterpolationEaseOut);
+            channel->setKeyframeInterpolation(entry->getHandle(), k == kTQInterpolationEaseIn
+                                                                      ? kTQInterpolationEaseBoth
+                                                                      : kTQInterpolationEaseOut);
         // No dirty mark here, unlike ease-in: the old behaviour, kept (the bracket's
         // notification redraws through the host's modified set).
     }
@@ -433,7 +436,8 @@ void TQCurveEditorCtrlBase::menuLockSelected(void*) {
 }
 
 void TQCurveEditorCtrlBase::menuDisableSelected(void*) {
-    performWithBracket("Undo Disable Keypoint", [this](TQCurveSelectionList* l) { disableSelected(l); });
+    performWithBracket("Undo Disable Keypoint",
+                       [this](TQCurveSelectionList* l) { disableSelected(l); });
 }
 
 void TQCurveEditorCtrlBase::menuAddKeyframe(void*) {

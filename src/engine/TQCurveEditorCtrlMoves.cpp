@@ -46,9 +46,10 @@ static std::vector<OrderedEntry> buildOrderedList(
         }
         ordered.push_back(o);
     }
-    std::stable_sort(ordered.begin(), ordered.end(), [](const OrderedEntry& a, const OrderedEntry& b) {
-        return CMTimeCompare(a.time, b.time) < 0;
-    });
+    std::stable_sort(ordered.begin(), ordered.end(),
+                     [](const OrderedEntry& a, const OrderedEntry& b) {
+                         return CMTimeCompare(a.time, b.time) < 0;
+                     });
     return ordered;
 }
 
@@ -80,8 +81,7 @@ void TQCurveEditorCtrlBase::moveSelected(TQCurveSelectionList* list, CMTime x, d
     // A vertical constraint holds the time and so puts no rounding on it; a free move puts
     // the anchor on the grid.
     const CMTime target = isConstraining ? x : convertToCurveEditorAxis(x);
-    const CMTime dt =
-        BN_CMTimeSaferSubtract(target, BN_CMTimeSaferAdd(anchorTime, anchorOffset));
+    const CMTime dt = BN_CMTimeSaferSubtract(target, BN_CMTimeSaferAdd(anchorTime, anchorOffset));
     const double anchorV = convertFromChannelCoords(anchorItem, anchorValue);
 
     // With useSelectionOrder clear the anchor itself is not moved: the one caller passes true,
@@ -89,7 +89,8 @@ void TQCurveEditorCtrlBase::moveSelected(TQCurveSelectionList* list, CMTime x, d
     std::vector<TQCurveSelection*> entries;
     entries.reserve(list->size());
     const auto& array = list->getSelectionArray();
-    for (size_t i = useSelectionOrder ? 0 : 1; i < array.size(); ++i) entries.push_back(array[i].get());
+    for (size_t i = useSelectionOrder ? 0 : 1; i < array.size(); ++i)
+        entries.push_back(array[i].get());
     std::vector<OrderedEntry> ordered =
         buildOrderedList(entries, [this](const TQCurveSelection& e) { return channelForEntry(e); });
     if (ordered.empty()) return;

@@ -38,8 +38,10 @@ bool readHandle(const TQChannel& channel, TQKeyframeHandle h, Side side, double&
 }
 
 void writeHandle(TQChannel& channel, TQKeyframeHandle h, Side side, double u, double v) {
-    if (side == Side::Output) channel.setKeyframeOutputTangents(h, u, v, true);
-    else channel.setKeyframeInputTangents(h, u, v, true);
+    if (side == Side::Output)
+        channel.setKeyframeOutputTangents(h, u, v, true);
+    else
+        channel.setKeyframeInputTangents(h, u, v, true);
 }
 
 Side opposite(Side side) { return side == Side::Output ? Side::Input : Side::Output; }
@@ -217,7 +219,8 @@ void TQCurveEditorCtrlBase::setTangents45(TQCurveSelection* entry, double u, dou
         reference = CGPointMake(refU + keySeconds, convertFromChannelCoords(item, refV + keyValue));
     }
 
-    const CGPoint p = toScreen(_view, CGPointMake(keySeconds, convertFromChannelCoords(item, keyValue)));
+    const CGPoint p =
+        toScreen(_view, CGPointMake(keySeconds, convertFromChannelCoords(item, keyValue)));
     const CGPoint t = toScreen(_view, reference) - p;
     const CGPoint m = toScreen(_view, CGPointMake(u, v)) - p;
     const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection({m.x, m.y}, {t.x, t.y}, 0.0);
@@ -393,7 +396,8 @@ void TQCurveEditorCtrlBase::flattenSelected(TQCurveSelectionList* list) {
         // The incoming segment is the predecessor's: it turns Linear too.
         if (channel->getKeyframe(h, &time, nullptr) &&
             channel->getPreviousKeyframe(time, &previous, nullptr)) {
-            channel->setKeyframeInterpolation(channel->getKeyframe(previous), kTQInterpolationLinear);
+            channel->setKeyframeInterpolation(channel->getKeyframe(previous),
+                                              kTQInterpolationLinear);
         }
         markDirty(item);
     }

@@ -28,8 +28,8 @@ BNImage::RGBA8 BNImage::pixelAt(int x, int y) const {
     return {p[0], p[1], p[2], p[3]};
 }
 
-std::shared_ptr<const BNImage> BNImageFromPNGData(std::span<const std::uint8_t> bytes,
-                                                  double scale, BNString* error) {
+std::shared_ptr<const BNImage> BNImageFromPNGData(std::span<const std::uint8_t> bytes, double scale,
+                                                  BNString* error) {
     auto fail = [error](const char* what) -> std::shared_ptr<const BNImage> {
         if (error) *error = what;
         return nullptr;

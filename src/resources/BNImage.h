@@ -60,5 +60,5 @@ std::vector<BNString> BNImageResourceNames();
 
 // Decodes a PNG held in memory into straight RGBA8 with the given scale (pixels per point).
 // Null for bytes that are not a PNG libpng can read; `error`, when given, then says why.
-std::shared_ptr<const BNImage> BNImageFromPNGData(std::span<const std::uint8_t> bytes,
-                                                  double scale, BNString* error = nullptr);
+std::shared_ptr<const BNImage> BNImageFromPNGData(std::span<const std::uint8_t> bytes, double scale,
+                                                  BNString* error = nullptr);

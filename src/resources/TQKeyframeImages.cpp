@@ -15,7 +15,8 @@ BNString imageName(std::size_t colorIndex, std::size_t state, bool selected) {
     if (selected) return BNString("K_KeyframeEditor_Keyframe_Selected_") + kStateWords[state];
     // The inactive image carries no colour: one image serves every row.
     if (state == kInactive) return "K_KeyframeEditor_Keyframe_Inactive";
-    return BNString("K_KeyframeEditor_Keyframe-") + colorWord(colorIndex) + "_" + kStateWords[state];
+    return BNString("K_KeyframeEditor_Keyframe-") + colorWord(colorIndex) + "_" +
+           kStateWords[state];
 }
 
 BNString tangentHandleImageName() { return "K_KeyframeEditor_KeyframeTangentHandle_Normal"; }

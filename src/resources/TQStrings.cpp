@@ -103,13 +103,11 @@ private:
             if (c == '\\') {
                 advance();
                 switch (peek()) {
-                case '"': c = '"'; break;
-                case '\\': c = '\\'; break;
-                case 'n': c = '\n'; break;
-                case 't': c = '\t'; break;
-                default:
-                    error(_line, BNString("unknown escape in ") + what);
-                    return false;
+                    case '"': c = '"'; break;
+                    case '\\': c = '\\'; break;
+                    case 'n': c = '\n'; break;
+                    case 't': c = '\t'; break;
+                    default: error(_line, BNString("unknown escape in ") + what); return false;
                 }
             }
             out.push_back(c);

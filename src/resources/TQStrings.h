@@ -28,7 +28,7 @@ struct Entry {
 };
 
 struct ParseResult {
-    std::vector<Entry> entries;  // in the order of the source; duplicates left out
+    std::vector<Entry> entries;    // in the order of the source; duplicates left out
     std::vector<BNString> errors;  // "line N: what is wrong"; empty for a good table
 };
 

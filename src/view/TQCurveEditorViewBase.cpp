@@ -47,7 +47,9 @@ RWTimerService& TQCurveEditorViewBase::timer() const {
     return _timer ? *_timer : *RWApplicationServices().timer;
 }
 
-CGRect TQCurveEditorViewBase::bounds() const { return _viewHost ? _viewHost->bounds() : CGRectZero; }
+CGRect TQCurveEditorViewBase::bounds() const {
+    return _viewHost ? _viewHost->bounds() : CGRectZero;
+}
 
 void TQCurveEditorViewBase::setFrameSize(const CGSize&) {
     // The host has already resized its widget; only the backing follows.
@@ -76,7 +78,8 @@ BNMatrix44f lastProjection(const HXDRenderController* controller) {
 }  // namespace
 
 CGPoint TQCurveEditorViewBase::getPointWorld(const CGPoint& screen) const {
-    return BNProjectionScreenToWorld(lastProjection(_renderController.get()), _drawableSize, screen);
+    return BNProjectionScreenToWorld(lastProjection(_renderController.get()), _drawableSize,
+                                     screen);
 }
 
 CGPoint TQCurveEditorViewBase::getPointScreen(const CGPoint& world) const {
@@ -115,7 +118,8 @@ CGPoint TQCurveEditorViewBase::getOffsetFromOriginWorld(double dx, double deltaY
 
 void TQCurveEditorViewBase::postNotification(TQNotificationWord word) const {
     if (!_controller) return;
-    if (TQCurveEditorAppDelegate* delegate = _controller->appDelegate()) delegate->postNotification(word);
+    if (TQCurveEditorAppDelegate* delegate = _controller->appDelegate())
+        delegate->postNotification(word);
 }
 
 void TQCurveEditorViewBase::volumeChanged(bool markCurvesDirty) {
@@ -186,7 +190,8 @@ void TQCurveEditorViewBase::zoomWithFactor(double fx, double y) {
     double fy = y;
     if (std::fabs(fx - 1.0) >= kEpsilon) {
         const double duration = _originalViewVolume.size.width / fx;
-        const double origin = _originalViewVolume.origin.x + _originalViewVolume.size.width * 0.5 - duration * 0.5;
+        const double origin =
+            _originalViewVolume.origin.x + _originalViewVolume.size.width * 0.5 - duration * 0.5;
         if (_controller) _controller->didSetViewContentsHorizontalOrigin(origin, duration);
         takeHorizontalFromDisplayRange();
         _zoomFactorX = _originalViewVolume.size.width / _currentViewVolume.size.width;
@@ -245,7 +250,8 @@ void TQCurveEditorViewBase::scrollWheel(const RWEvent& event) {
     double sumX = event.deltaX();
     double sumY = event.deltaY();
     if (_viewHost) {
-        while (std::optional<RWEvent> next = _viewHost->nextEventMatchingMask(RWEventMaskScrollWheel)) {
+        while (std::optional<RWEvent> next =
+                   _viewHost->nextEventMatchingMask(RWEventMaskScrollWheel)) {
             sumX += next->deltaX();
             sumY += next->deltaY();
         }
@@ -269,8 +275,10 @@ void TQCurveEditorViewBase::performAutoZoom(bool force) {
             for (const TQCurveEditorItemPtr& item : set->allItems()) {
                 auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
                 if (!channelItem) continue;
-                const double lo = _controller->convertFromChannelCoords(channelItem, channelItem->minY());
-                const double hi = _controller->convertFromChannelCoords(channelItem, channelItem->maxY());
+                const double lo =
+                    _controller->convertFromChannelCoords(channelItem, channelItem->minY());
+                const double hi =
+                    _controller->convertFromChannelCoords(channelItem, channelItem->maxY());
                 bottom = std::fmin(bottom, lo);
                 top = std::fmax(top, hi);
             }
@@ -347,8 +355,8 @@ void TQCurveEditorViewBase::frameAll(char includeTime) {
             const CMTime pad = TQTarnTimeForChannelSeconds(span * 0.05, kChannelTimescale);
             maxT = BN_CMTimeSaferAdd(maxT, pad);
             minT = BN_CMTimeSaferSubtract(minT, pad);
-            const double ratio =
-                _currentViewVolume.size.width / CMTimeGetSeconds(BN_CMTimeSaferSubtract(maxT, minT));
+            const double ratio = _currentViewVolume.size.width /
+                                 CMTimeGetSeconds(BN_CMTimeSaferSubtract(maxT, minT));
             if (std::fabs(ratio - 1.0) >= kEpsilon) {
                 _currentViewVolume.size.width /= ratio;
                 _zoomFactorX = _originalViewVolume.size.width / _currentViewVolume.size.width;
@@ -446,7 +454,8 @@ void TQCurveEditorViewBase::prepareSelectedHandles() {
         CMTime time{};
         double value = 0.0;
         // A stale handle leaves the stored time and value for the repair by time.
-        if (channel->getKeyframe(entry->getHandle(), &time, &value)) entry->setKeypointUV(time, value);
+        if (channel->getKeyframe(entry->getHandle(), &time, &value))
+            entry->setKeypointUV(time, value);
     }
 }
 
@@ -473,7 +482,8 @@ void forEachChannelItem(TQCurveEditorCtrlBase* controller, Fn fn) {
     auto set = controller->selectedCurveSet();
     if (!set) return;
     for (const TQCurveEditorItemPtr& item : set->allItems())
-        if (auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get())) fn(*channelItem);
+        if (auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get()))
+            fn(*channelItem);
 }
 }  // namespace
 
@@ -487,11 +497,13 @@ void TQCurveEditorViewBase::setVisibleOriginalCurveDirty(char dirty) {
 }
 
 void TQCurveEditorViewBase::setAllOriginalCurveDirty(char dirty) {
-    forEachChannelItem(_controller, [&](TQCurveEditorChannelItem& item) { item.setOriginalCurveDirty(dirty); });
+    forEachChannelItem(_controller,
+                       [&](TQCurveEditorChannelItem& item) { item.setOriginalCurveDirty(dirty); });
 }
 
 void TQCurveEditorViewBase::setAllOriginalCurveScaleDirty(char dirty) {
-    forEachChannelItem(_controller, [&](TQCurveEditorChannelItem& item) { item.setUpdateScale(dirty); });
+    forEachChannelItem(_controller,
+                       [&](TQCurveEditorChannelItem& item) { item.setUpdateScale(dirty); });
 }
 
 // ---- Tools ---------------------------------------------------------------------------------

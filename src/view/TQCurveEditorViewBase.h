@@ -36,8 +36,8 @@
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/geometry/CGGeometry.h"
 #include "platform/media/CMTime.h"
-#include "platform/ui/RWEvent.h"
 #include "platform/support/BNString.h"
+#include "platform/ui/RWEvent.h"
 #include "platform/ui/RWServices.h"
 #include "src/contract/TQNotificationWords.h"
 #include "src/data/TQCurveSelection.h"
@@ -327,7 +327,8 @@ public:
     KeyframeAsset keyframeAssetWithImageName(const BNString& name) const;
     // [colorIndex 0..7][state 0 normal, 1 pressed, 2 inactive, 3 disabled][selected 0/1];
     // out-of-range indices answer an empty asset.
-    const KeyframeAsset& keyframeAsset(uint32_t colorIndex, uint32_t state, uint32_t selected) const;
+    const KeyframeAsset& keyframeAsset(uint32_t colorIndex, uint32_t state,
+                                       uint32_t selected) const;
     const KeyframeAsset& tangentAsset() const { return _tangentAsset; }
 
     // Steps of a frame, in the order displayLayer runs them. drawBackground, drawGrid and
@@ -376,7 +377,8 @@ public:
     std::optional<BNString> getScale(const TQCurveEditorItem* item, double value) const;
     // Text of a keypoint label from the localised time and coordinates formats; time is on
     // the editor's axis.
-    virtual BNString getCoordinates(const TQCurveEditorItem* item, const CMTime& time, double value) const;
+    virtual BNString getCoordinates(const TQCurveEditorItem* item, const CMTime& time,
+                                    double value) const;
     // Places a text at a world point, nudged by _minDeltaU pixels' worth of zoom and snapped
     // to a whole drawable pixel (metalPrint:atPos:).
     void metalPrint(const BNString& text, const CGPoint& worldPosition);
@@ -399,17 +401,19 @@ public:
     virtual void drawPoints(TQCurveEditorItem* item, char drawTangents);
     // One keypoint image (slot chosen from the six assets by its state), its value label for
     // the primary selected keypoint; rasterSize receives the image's size in world units.
-    virtual void drawKeypoint(TQKeyframeHandle handle, const CMTime* u, double v, bool selected, bool enabled,
-                              bool locked, TQCurveEditorItem* item, const KeyframeAsset assets[6],
-                              CGPoint* rasterSize);
+    virtual void drawKeypoint(TQKeyframeHandle handle, const CMTime* u, double v, bool selected,
+                              bool enabled, bool locked, TQCurveEditorItem* item,
+                              const KeyframeAsset assets[6], CGPoint* rasterSize);
     // Turns a relative tangent (seconds, channel units) into absolute world coordinates, and
     // gives the offset from the keypoint to where the handle line meets the ellipse inscribed
     // in half the keypoint image.
-    void calculateDrawTangentU(double* tangentU, double* tangentV, double* deltaU, double* deltaV, const CMTime* u,
-                               double v, const CGPoint& rasterSize, const TQCurveEditorItem* item) const;
+    void calculateDrawTangentU(double* tangentU, double* tangentV, double* deltaU, double* deltaV,
+                               const CMTime* u, double v, const CGPoint& rasterSize,
+                               const TQCurveEditorItem* item) const;
     // One tangent handle (line and image), unless it lies on its keypoint.
-    virtual void drawTangent(TQKeyframeHandle handle, double tangentU, double tangentV, const CMTime* u, double v,
-                             uint32_t whichTangent, TQCurveEditorItem* item, const CGPoint& rasterSize);
+    virtual void drawTangent(TQKeyframeHandle handle, double tangentU, double tangentV,
+                             const CMTime* u, double v, uint32_t whichTangent,
+                             TQCurveEditorItem* item, const CGPoint& rasterSize);
     // Three pixels in world units, as the last drawPoints set it.
     CGPoint pointSize() const { return _pointSize; }
 
@@ -450,7 +454,8 @@ protected:
     // The edit tool's drag of the primary entry, by kind; W is the pointer's world point.
     void dragTangentStep(TQCurveSelection& primary, CGPoint world, uint64_t modifierFlags);
     // Answers the point after the Shift axis constraint, the time limits and the snap.
-    CGPoint dragKeypointStep(TQCurveSelection& primary, CGPoint world, double dx, uint64_t modifierFlags);
+    CGPoint dragKeypointStep(TQCurveSelection& primary, CGPoint world, double dx,
+                             uint64_t modifierFlags);
     void dragCurveStep(CGPoint world, uint64_t modifierFlags);
     // Opens the drag's one undo step at its first step.
     void openDragCapture(const char* undoKey);
@@ -490,22 +495,22 @@ protected:
     CMTime _lastTime = kCMTimeInvalid;
 
     // ---- Gesture state (the mouse code sets it) ----
-    CGPoint _mouseOrigin;   // where the gesture began, drawable pixels
-    CGPoint _lastMousePos;  // running pointer position of the gesture, drawable pixels;
-                            // after a constrained step, where the constrained point lies
-    CGPoint _lastPoint;     // last raw pointer position in backing pixels (window), for deltas
-    char _space = 0;        // the space bar is held
-    char _startDrag = 0;    // no drag step has run yet in this gesture
+    CGPoint _mouseOrigin;        // where the gesture began, drawable pixels
+    CGPoint _lastMousePos;       // running pointer position of the gesture, drawable pixels;
+                                 // after a constrained step, where the constrained point lies
+    CGPoint _lastPoint;          // last raw pointer position in backing pixels (window), for deltas
+    char _space = 0;             // the space bar is held
+    char _startDrag = 0;         // no drag step has run yet in this gesture
     char _useOriginalAngle = 0;  // a Shift-constrained tangent drag keeps its stored angle
-    char _printText = 0;    // show the value label of the primary keypoint
+    char _printText = 0;         // show the value label of the primary keypoint
     uint32_t _constrainMove = 0;  // 0 not decided, 1 horizontal, 2 vertical
     char _shiftWasPressed = 0;    // Shift has been seen during this drag
     char _cursorHidden = 0;       // the drag has hidden the pointer
     char _capturing = 0;          // a capture of modified channels is open
-    char _mouseIsDown = 0;  // a gesture is under way
+    char _mouseIsDown = 0;        // a gesture is under way
     char _snapCursor = 0;
-    char _lockInU = 0;      // keypoints keep their time in a drag unless Shift is down
-    char _didAddPoint = 0;  // the mouse down added a keypoint
+    char _lockInU = 0;                   // keypoints keep their time in a drag unless Shift is down
+    char _didAddPoint = 0;               // the mouse down added a keypoint
     char _shouldDrawProcessedCurve = 1;  // restore the processed curve at mouse up
     // Clock time of the last drag step that ran; -infinity lets the first one through.
     double _lastMouseDraggedEvent = -std::numeric_limits<double>::infinity();
@@ -526,7 +531,7 @@ protected:
     char _fourCornerBoxInitialized = 0;
 
     // ---- Backing and frame ----
-    RWViewHost* _viewHost = nullptr;  // not owned
+    RWViewHost* _viewHost = nullptr;   // not owned
     RWClock* _clock = nullptr;         // not owned; null: the process-wide clock
     RWTimerService* _timer = nullptr;  // not owned; null: the process-wide timer
     CGSize _drawableSize = CGSizeZero;
@@ -537,15 +542,15 @@ protected:
     HXDTextAttributes _textAttribs = defaultTextAttributes();
     KeyframeAsset _keyframeAssets[8][4][2];
     KeyframeAsset _tangentAsset;
-    double _lastDrawTime = 0.0;           // clock time of the last frame
-    char _firedFutureDisplayEvent = 0;    // a delayed redraw is scheduled
-    char _metalRenderReady = 0;           // setupMetalRender has run
-    HXDTexture* _currentTexture = nullptr;  // the drawable during a frame, not owned
-    HXDEncoder* _encoder = nullptr;         // set only during a frame, not owned
+    double _lastDrawTime = 0.0;               // clock time of the last frame
+    char _firedFutureDisplayEvent = 0;        // a delayed redraw is scheduled
+    char _metalRenderReady = 0;               // setupMetalRender has run
+    HXDTexture* _currentTexture = nullptr;    // the drawable during a frame, not owned
+    HXDEncoder* _encoder = nullptr;           // set only during a frame, not owned
     HXDPrimitiveArray _primitives;            // this frame's primitives, in drawing order
     HXDPrimitiveArray _backgroundPrimitives;  // drawn before the projection is set
     TQKeypointPrimitives _keypointsPrimitives;
-    HXDPrimitiveArray _selectionPrimitives;   // everything pickable, in drawing order
+    HXDPrimitiveArray _selectionPrimitives;  // everything pickable, in drawing order
     CGPoint _pointSize = CGPointZero;
     CGPoint _worldPerPixel = CGPointZero;  // getSizeWorld of one pixel, set with the projection
 

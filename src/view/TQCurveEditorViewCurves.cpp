@@ -83,13 +83,14 @@ HXDExtraInfo curveInfo(uint32_t channelId) {
 
 HXDExtraInfo keyframeInfo(uint32_t channelId, TQKeyframeHandle handle) {
     HXDExtraInfo info = curveInfo(channelId);
-    info.setObject("Handle", HXDNumber::numberWithUnsignedLongLong(reinterpret_cast<uintptr_t>(handle)));
+    info.setObject("Handle",
+                   HXDNumber::numberWithUnsignedLongLong(reinterpret_cast<uintptr_t>(handle)));
     return info;
 }
 
 // Vertices [begin, end) of the samples in one colour, appended.
-void appendVertices(std::vector<HXDLineVertex>& out, const CMTime* u, const double* v, size_t begin, size_t end,
-                    double offsetSeconds, const WorldY& worldY, const HXDColor& color) {
+void appendVertices(std::vector<HXDLineVertex>& out, const CMTime* u, const double* v, size_t begin,
+                    size_t end, double offsetSeconds, const WorldY& worldY, const HXDColor& color) {
     SampleSeconds secondsOfSample;
     // V = (value * conversion - offset) / scale, with the division taken out of the loop.
     const double a = worldY.conversion / worldY.scale;
@@ -108,8 +109,9 @@ struct SampleRequest {
 };
 
 SampleRequest sampleRequest(const CMTimeRange& display, const CMTime& offset, uint32_t count) {
-    return {BN_CMTimeSaferSubtract(display.start, offset),
-            TQTarnTimeForChannelSeconds(CMTimeGetSeconds(display.duration) / count, kChannelTimescale)};
+    return {
+        BN_CMTimeSaferSubtract(display.start, offset),
+        TQTarnTimeForChannelSeconds(CMTimeGetSeconds(display.duration) / count, kChannelTimescale)};
 }
 
 }  // namespace
@@ -134,7 +136,8 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
     if (!channel || !_controller) return;
 
     // A selected curve loses its own colour.
-    const GDColor color = channelItem->isSelected() ? selectionColor() : getColorForIndex(channelItem->colorIndex());
+    const GDColor color =
+        channelItem->isSelected() ? selectionColor() : getColorForIndex(channelItem->colorIndex());
     const HXDColor bright = toHXD(color);
     const HXDColor dim = toHXD(color.scaled(kDimFactor));
     const float w = thinLineWidth();
@@ -149,7 +152,8 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
     const CMTime* samplesU = nullptr;
     const double* samplesV = nullptr;
     unsigned count = n;
-    _controller->getSamples(channelItem, 0, request.minU, request.resolution, &samplesU, &samplesV, &count);
+    _controller->getSamples(channelItem, 0, request.minU, request.resolution, &samplesU, &samplesV,
+                            &count);
 
     // A channel that answers with another count than asked samples off the keyframe grid: the
     // selected keypoints are merged in, so that each lies exactly on the line.
@@ -173,7 +177,8 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
                 if (i + 1 == count) break;
                 // Keypoints at or before this sample either coincide with it or lie before
                 // the whole line: neither is inserted.
-                while (k < _selectedKeyScratch.size() && CMTimeCompare(_selectedKeyScratch[k].first, samplesU[i]) <= 0)
+                while (k < _selectedKeyScratch.size() &&
+                       CMTimeCompare(_selectedKeyScratch[k].first, samplesU[i]) <= 0)
                     ++k;
                 while (k < _selectedKeyScratch.size() &&
                        CMTimeCompare(_selectedKeyScratch[k].first, samplesU[i + 1]) < 0) {
@@ -194,7 +199,8 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
         // has no middle piece: it is all extrapolation.
         CMTime first = kCMTimePositiveInfinity;
         CMTime last = kCMTimePositiveInfinity;
-        if (!channel->getFirstKeyframe(&first, nullptr) || !channel->getLastKeyframe(&last, nullptr)) {
+        if (!channel->getFirstKeyframe(&first, nullptr) ||
+            !channel->getLastKeyframe(&last, nullptr)) {
             first = kCMTimePositiveInfinity;
             last = kCMTimePositiveInfinity;
         }
@@ -202,9 +208,12 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
         const CMTime* begin = samplesU;
         const CMTime* end = samplesU + count;
         const size_t i1 = static_cast<size_t>(
-            std::partition_point(begin, end, [&](const CMTime& t) { return CMTimeCompare(t, first) < 0; }) - begin);
+            std::partition_point(begin, end,
+                                 [&](const CMTime& t) { return CMTimeCompare(t, first) < 0; }) -
+            begin);
         const size_t i2 = static_cast<size_t>(
-            std::partition_point(begin + i1, end, [&](const CMTime& t) { return CMTimeCompare(t, last) <= 0; }) -
+            std::partition_point(begin + i1, end,
+                                 [&](const CMTime& t) { return CMTimeCompare(t, last) <= 0; }) -
             begin);
         const WorldY worldY(*channelItem);
         const uint32_t id = channelItem->channelId();
@@ -229,12 +238,14 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
         const size_t c = count;
         std::vector<HXDLineVertex> vertices;
         vertices.reserve(i1 + 1);
-        appendVertices(vertices, samplesU, samplesV, 0, std::min(i1 + 1, c), offSeconds, worldY, dim);
+        appendVertices(vertices, samplesU, samplesV, 0, std::min(i1 + 1, c), offSeconds, worldY,
+                       dim);
         emit(std::move(vertices), true);
 
         vertices = {};
         vertices.reserve(i2 - i1 + 1);
-        appendVertices(vertices, samplesU, samplesV, i1, std::min(i2 + 1, c), offSeconds, worldY, bright);
+        appendVertices(vertices, samplesU, samplesV, i1, std::min(i2 + 1, c), offSeconds, worldY,
+                       bright);
         emit(std::move(vertices), false);
 
         vertices = {};
@@ -251,8 +262,9 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
         const GDColor own = getColorForIndex(channelItem->colorIndex());
         std::vector<HXDLineVertex> vertices;
         vertices.reserve(ghostCount);
-        appendVertices(vertices, channelItem->samplesUSnapshot(), channelItem->samplesVSnapshot(), 0, ghostCount,
-                       offSeconds, WorldY(*channelItem), toHXD(own.withAlpha(own.alpha * kTranslucentFactor)));
+        appendVertices(vertices, channelItem->samplesUSnapshot(), channelItem->samplesVSnapshot(),
+                       0, ghostCount, offSeconds, WorldY(*channelItem),
+                       toHXD(own.withAlpha(own.alpha * kTranslucentFactor)));
         auto ghost = std::make_shared<HXDMultiline>(std::move(vertices));
         ghost->setGamma(1.0f);
         ghost->setAntialiased(true);
@@ -274,7 +286,8 @@ void TQCurveEditorViewBase::drawProcessedCurve(TQCurveEditorItem* item) {
     const CMTime* samplesU = nullptr;
     const double* samplesV = nullptr;
     unsigned count = n;
-    _controller->getSamples(channelItem, 1, request.minU, request.resolution, &samplesU, &samplesV, &count);
+    _controller->getSamples(channelItem, 1, request.minU, request.resolution, &samplesU, &samplesV,
+                            &count);
     if (!samplesU || !samplesV) return;
 
     const GDColor own = getColorForIndex(channelItem->colorIndex());
@@ -308,7 +321,8 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
     // The six images this item can show, by slot (see drawKeypoint). The selected rows are the
     // same in every colour; [0][1] and [1][0] are loaded but never shown.
     const auto& row = _keyframeAssets[channelItem->colorIndex() & 7u];
-    const KeyframeAsset assets[6] = {row[3][1], row[3][0], row[2][1], row[2][0], row[1][1], row[0][0]};
+    const KeyframeAsset assets[6] = {row[3][1], row[3][0], row[2][1],
+                                     row[2][0], row[1][1], row[0][0]};
 
     // A large selection is bisected instead of walked for every keypoint.
     const auto& entries = _selection->getSelectionArray();
@@ -320,7 +334,8 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
         std::sort(_selectedHandleScratch.begin(), _selectedHandleScratch.end());
     }
     auto isSelected = [&](TQKeyframeHandle h) {
-        return bisect ? std::binary_search(_selectedHandleScratch.begin(), _selectedHandleScratch.end(), h)
+        return bisect ? std::binary_search(_selectedHandleScratch.begin(),
+                                           _selectedHandleScratch.end(), h)
                       : _selection->isKeypointSelected(h);
     };
 
@@ -363,13 +378,15 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
     }
 }
 
-void TQCurveEditorViewBase::drawKeypoint(TQKeyframeHandle handle, const CMTime* u, double v, bool selected,
-                                         bool enabled, bool locked, TQCurveEditorItem* item,
-                                         const KeyframeAsset assets[6], CGPoint* rasterSize) {
+void TQCurveEditorViewBase::drawKeypoint(TQKeyframeHandle handle, const CMTime* u, double v,
+                                         bool selected, bool enabled, bool locked,
+                                         TQCurveEditorItem* item, const KeyframeAsset assets[6],
+                                         CGPoint* rasterSize) {
     auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item);
     if (!u || !assets || !channelItem) return;
     // Selected, enabled, unlocked keypoints always show the pressed selected image.
-    const int slot = !enabled ? (selected ? 0 : 1) : (!locked ? (selected ? 4 : 5) : (selected ? 2 : 3));
+    const int slot =
+        !enabled ? (selected ? 0 : 1) : (!locked ? (selected ? 4 : 5) : (selected ? 2 : 3));
     const double x = CMTimeGetSeconds(*u);
 
     // The value label of the primary keypoint while it is being edited.
@@ -381,7 +398,8 @@ void TQCurveEditorViewBase::drawKeypoint(TQKeyframeHandle handle, const CMTime* 
         const CGSize size = HXDSizeWithAttributes(text, _textAttribs);
         const double scale = windowBackingScale();
         const CGRect b = bounds();
-        const CGRect backing = CGRectMake(b.origin.x, b.origin.y, b.size.width * scale, b.size.height * scale);
+        const CGRect backing =
+            CGRectMake(b.origin.x, b.origin.y, b.size.width * scale, b.size.height * scale);
         CGRect r = CGRectMake(p.x + kLabelOffset, p.y + kLabelOffset, size.width, size.height);
         if (!CGRectContainsRect(backing, r)) {
             if (CGRectGetMaxX(r) > CGRectGetMaxX(backing))
@@ -413,9 +431,10 @@ void TQCurveEditorViewBase::drawKeypoint(TQKeyframeHandle handle, const CMTime* 
     _keypointsPrimitives[channelItem->channelId()].push_back(std::move(quad));
 }
 
-void TQCurveEditorViewBase::calculateDrawTangentU(double* tangentU, double* tangentV, double* deltaU,
-                                                  double* deltaV, const CMTime* u, double v,
-                                                  const CGPoint& rasterSize, const TQCurveEditorItem* item) const {
+void TQCurveEditorViewBase::calculateDrawTangentU(double* tangentU, double* tangentV,
+                                                  double* deltaU, double* deltaV, const CMTime* u,
+                                                  double v, const CGPoint& rasterSize,
+                                                  const TQCurveEditorItem* item) const {
     const auto* channelItem = dynamic_cast<const TQCurveEditorChannelItem*>(item);
     if (!tangentU || !tangentV || !deltaU || !deltaV || !u || !channelItem) return;
     // A difference of values: the scale applies, the offset does not.
@@ -439,9 +458,9 @@ void TQCurveEditorViewBase::calculateDrawTangentU(double* tangentU, double* tang
     *tangentV = v + tv;
 }
 
-void TQCurveEditorViewBase::drawTangent(TQKeyframeHandle handle, double tangentU, double tangentV, const CMTime* u,
-                                        double v, uint32_t whichTangent, TQCurveEditorItem* item,
-                                        const CGPoint& rasterSize) {
+void TQCurveEditorViewBase::drawTangent(TQKeyframeHandle handle, double tangentU, double tangentV,
+                                        const CMTime* u, double v, uint32_t whichTangent,
+                                        TQCurveEditorItem* item, const CGPoint& rasterSize) {
     auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item);
     if (!u || !channelItem) return;
     double du = 0.0;
@@ -449,7 +468,8 @@ void TQCurveEditorViewBase::drawTangent(TQKeyframeHandle handle, double tangentU
     calculateDrawTangentU(&tangentU, &tangentV, &du, &dv, u, v, rasterSize, item);
 
     const double s = static_cast<float>(windowBackingScale());
-    const CGPoint size = worldSizeOfPixels(_tangentAsset.size.width * s, _tangentAsset.size.height * s);
+    const CGPoint size =
+        worldSizeOfPixels(_tangentAsset.size.width * s, _tangentAsset.size.height * s);
     const double hw = size.x * 0.5;
     const double hh = size.y * 0.5;
     const double x = CMTimeGetSeconds(*u);
@@ -464,8 +484,8 @@ void TQCurveEditorViewBase::drawTangent(TQKeyframeHandle handle, double tangentU
         HXDFloat3{static_cast<float>(x + du), static_cast<float>(v + dv), 0.0f}, 1.0f,
         HXD_sRGBA(c.red, c.green, c.blue, c.blue), true));
 
-    auto quad = std::make_shared<HXDQuadTexture>(0, _tangentAsset.texture,
-                                                 CGRectMake(tangentU - hw, tangentV - hh, size.x, size.y), 1.0f);
+    auto quad = std::make_shared<HXDQuadTexture>(
+        0, _tangentAsset.texture, CGRectMake(tangentU - hw, tangentV - hh, size.x, size.y), 1.0f);
     quad->hitInfo().setHitID(whichTangent);
     quad->hitInfo().setExtraInfo(keyframeInfo(channelItem->channelId(), handle));
     _primitives.push_back(quad);

@@ -46,7 +46,8 @@ std::string conversionsOf(std::string_view format) {
     for (size_t i = 0; i < format.size(); ++i) {
         if (format[i] != '%') continue;
         ++i;
-        while (i < format.size() && std::string_view("-+ #0123456789.*lhLqjzt").find(format[i]) != std::string_view::npos)
+        while (i < format.size() && std::string_view("-+ #0123456789.*lhLqjzt").find(format[i]) !=
+                                        std::string_view::npos)
             ++i;
         if (i < format.size() && format[i] != '%') out += format[i];
     }
@@ -57,9 +58,11 @@ std::string conversionsOf(std::string_view format) {
 // asks for other arguments than the call passes would read garbage: such a text is replaced
 // by the built-in form.
 template <class... Args>
-BNString formatLocalized(const char* key, const char* expectedConversions, const char* builtIn, Args... args) {
+BNString formatLocalized(const char* key, const char* expectedConversions, const char* builtIn,
+                         Args... args) {
     const BNString localized = TQLocalizedString(key);
-    const char* format = conversionsOf(localized) == expectedConversions ? localized.c_str() : builtIn;
+    const char* format =
+        conversionsOf(localized) == expectedConversions ? localized.c_str() : builtIn;
     char buffer[256];
 #pragma GCC diagnostic push
 #pragma GCC diagnostic ignored "-Wformat-nonliteral"
@@ -102,7 +105,8 @@ bool TQCurveEditorViewBase::displayLayer(HXDEncoder* encoder) {
     // the last frame's projection (identity before the first) on this frame's target.
     const float scale = static_cast<float>(_contentsScale);
     // A subclass's set-up may leave the controller to us.
-    if (!_renderController) _renderController = std::make_unique<HXDRenderController>(nullptr, scale);
+    if (!_renderController)
+        _renderController = std::make_unique<HXDRenderController>(nullptr, scale);
     {
         const HXDRenderingContext* last = _renderController->renderingContext();
         const BNMatrix44f projection = last ? last->projection() : BNMatrix44f::identity();
@@ -112,7 +116,8 @@ bool TQCurveEditorViewBase::displayLayer(HXDEncoder* encoder) {
     _backgroundPrimitives.clear();
     drawBackground();
     for (const auto& primitive : _backgroundPrimitives)
-        if (primitive) primitive->encodeWithEncoder(*encoder, *_renderController->renderingContext());
+        if (primitive)
+            primitive->encodeWithEncoder(*encoder, *_renderController->renderingContext());
 
     _primitives.clear();
     _keypointsPrimitives.clear();
@@ -132,7 +137,8 @@ bool TQCurveEditorViewBase::displayLayer(HXDEncoder* encoder) {
 void TQCurveEditorViewBase::setupMetalRender() {
     if (_metalRenderReady) return;
     if (!_renderController)
-        _renderController = std::make_unique<HXDRenderController>(nullptr, static_cast<float>(_contentsScale));
+        _renderController =
+            std::make_unique<HXDRenderController>(nullptr, static_cast<float>(_contentsScale));
     loadAssets();
     _primitives.clear();
     _backgroundPrimitives.clear();
@@ -143,7 +149,8 @@ void TQCurveEditorViewBase::setupMetalRender() {
 
 void TQCurveEditorViewBase::drawProjection() {
     if (!_renderController)
-        _renderController = std::make_unique<HXDRenderController>(nullptr, static_cast<float>(_contentsScale));
+        _renderController =
+            std::make_unique<HXDRenderController>(nullptr, static_cast<float>(_contentsScale));
     const CGRect& v = _currentViewVolume;
     const CGSize b = bounds().size;
     const HXDFloat2 pixelScale{static_cast<float>(v.size.width / b.width),
@@ -169,7 +176,8 @@ void TQCurveEditorViewBase::loadAssets() {
     for (uint32_t c = 0; c < TQKeyframeImages::kColorCount; ++c)
         for (uint32_t state = 0; state < TQKeyframeImages::kStateCount; ++state)
             for (uint32_t selected = 0; selected < 2; ++selected)
-                _keyframeAssets[c][state][selected] = load(TQKeyframeImages::imageName(c, state, selected != 0));
+                _keyframeAssets[c][state][selected] =
+                    load(TQKeyframeImages::imageName(c, state, selected != 0));
     _tangentAsset = load(TQKeyframeImages::tangentHandleImageName());
 }
 
@@ -179,9 +187,9 @@ KeyframeAsset TQCurveEditorViewBase::keyframeAssetWithImageName(const BNString& 
     if (!image) return {};
     KeyframeAsset asset;
     asset.size = image->size();
-    asset.texture = HXDPixelTexture::textureWithRGBA(static_cast<uint32_t>(image->pixelsWide()),
-                                                     static_cast<uint32_t>(image->pixelsHigh()),
-                                                     static_cast<float>(image->scale()), image->pixels());
+    asset.texture = HXDPixelTexture::textureWithRGBA(
+        static_cast<uint32_t>(image->pixelsWide()), static_cast<uint32_t>(image->pixelsHigh()),
+        static_cast<float>(image->scale()), image->pixels());
     return asset;
 }
 
@@ -265,7 +273,9 @@ GDColor TQCurveEditorViewBase::gridColor() const { return GDColor::gridColor(); 
 GDColor TQCurveEditorViewBase::endpointsColor() const { return GDColor::endpointsColor(); }
 GDColor TQCurveEditorViewBase::textColor() const { return GDColor::curveEditorTextColor0(); }
 GDColor TQCurveEditorViewBase::selectionColor() const { return GDColor::selectedCurveColor0(); }
-GDColor TQCurveEditorViewBase::backgroundColor() const { return GDColor::curveEditorBackgroundColor0(); }
+GDColor TQCurveEditorViewBase::backgroundColor() const {
+    return GDColor::curveEditorBackgroundColor0();
+}
 GDColor TQCurveEditorViewBase::lockedColor() const { return GDColor::lockedCurveColor0(); }
 
 std::optional<GDColor> TQCurveEditorViewBase::curveColor(uint32_t index) const {
@@ -273,15 +283,17 @@ std::optional<GDColor> TQCurveEditorViewBase::curveColor(uint32_t index) const {
 }
 
 GDColor TQCurveEditorViewBase::getColorForIndex(uint32_t index) {
-    static const GDColor table[8] = {GDColor::curveColor0(), GDColor::curveColor1(), GDColor::curveColor2(),
-                                     GDColor::curveColor3(), GDColor::curveColor4(), GDColor::curveColor5(),
+    static const GDColor table[8] = {GDColor::curveColor0(), GDColor::curveColor1(),
+                                     GDColor::curveColor2(), GDColor::curveColor3(),
+                                     GDColor::curveColor4(), GDColor::curveColor5(),
                                      GDColor::curveColor6(), GDColor::curveColor7()};
     return table[index & 7u];
 }
 
 // ---- Text ----------------------------------------------------------------------------------
 
-std::optional<BNString> TQCurveEditorViewBase::getScale(const TQCurveEditorItem* item, double value) const {
+std::optional<BNString> TQCurveEditorViewBase::getScale(const TQCurveEditorItem* item,
+                                                        double value) const {
     TQChannel* channel = item ? item->channel() : nullptr;
     if (!channel) return std::nullopt;
     char buffer[64];
@@ -292,13 +304,17 @@ std::optional<BNString> TQCurveEditorViewBase::getScale(const TQCurveEditorItem*
     return BNString(buffer);
 }
 
-BNString TQCurveEditorViewBase::getCoordinates(const TQCurveEditorItem*, const CMTime& time, double value) const {
-    const BNString timeText = formatLocalized("Curve Editor Time Format", "f", "%.3f s", CMTimeGetSeconds(time));
-    return formatLocalized("Curve Editor Coordinates Format", "sf", "(%s, %.3f)", timeText.c_str(), value);
+BNString TQCurveEditorViewBase::getCoordinates(const TQCurveEditorItem*, const CMTime& time,
+                                               double value) const {
+    const BNString timeText =
+        formatLocalized("Curve Editor Time Format", "f", "%.3f s", CMTimeGetSeconds(time));
+    return formatLocalized("Curve Editor Coordinates Format", "sf", "(%s, %.3f)", timeText.c_str(),
+                           value);
 }
 
 void TQCurveEditorViewBase::metalPrint(const BNString& text, const CGPoint& worldPosition) {
-    const CGPoint q = worldPosition + CGPointMake(_minDeltaU / _zoomFactorX, _minDeltaU / _zoomFactorY);
+    const CGPoint q =
+        worldPosition + CGPointMake(_minDeltaU / _zoomFactorX, _minDeltaU / _zoomFactorY);
     const CGPoint s = adjustWorldPointToScreen(q);
     auto primitive = std::make_shared<HXDText>(HXDAttributedString{text, _textAttribs},
                                                HXDTextLayoutAnchor::BottomLeft, s);

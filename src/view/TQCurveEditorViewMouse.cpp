@@ -27,8 +27,12 @@ constexpr uint64_t kNoTangentPullFlag = 0x800000;
 
 bool hasShift(uint64_t flags) { return (flags & RWEventModifierFlagShift) != 0; }
 bool hasControl(uint64_t flags) { return (flags & RWEventModifierFlagControl) != 0; }
-bool optionAlone(uint64_t flags) { return (flags & kOptionCommandMask) == RWEventModifierFlagOption; }
-bool commandAlone(uint64_t flags) { return (flags & kOptionCommandMask) == RWEventModifierFlagCommand; }
+bool optionAlone(uint64_t flags) {
+    return (flags & kOptionCommandMask) == RWEventModifierFlagOption;
+}
+bool commandAlone(uint64_t flags) {
+    return (flags & kOptionCommandMask) == RWEventModifierFlagCommand;
+}
 bool optionAndCommand(uint64_t flags) { return (flags & kOptionCommandMask) == kOptionCommandMask; }
 
 CMTime timeOfWorldX(double x) { return TQTarnTimeForChannelSeconds(x, kChannelTimescale); }
@@ -60,7 +64,8 @@ private:
 
 CGPoint TQCurveEditorViewBase::drawablePointOfEvent(const RWEvent& event) const {
     const double scale = windowBackingScale();
-    if (!_viewHost) return CGPointMake(event.locationInWindow().x * scale, event.locationInWindow().y * scale);
+    if (!_viewHost)
+        return CGPointMake(event.locationInWindow().x * scale, event.locationInWindow().y * scale);
     const CGPoint inView = _viewHost->convertPointFromWindow(event.locationInWindow());
     const CGPoint origin = _viewHost->bounds().origin;
     return CGPointMake((inView.x - origin.x) * scale, (inView.y - origin.y) * scale);
@@ -81,7 +86,9 @@ void TQCurveEditorViewBase::hideCursorForDrag() {
     _cursorHidden = 1;
 }
 
-void TQCurveEditorViewBase::notifyChannelChangeDone() const { postNotification(kTQNotifyChannelsChanged); }
+void TQCurveEditorViewBase::notifyChannelChangeDone() const {
+    postNotification(kTQNotifyChannelsChanged);
+}
 
 // ---- Dispatch ------------------------------------------------------------------------------
 
@@ -264,11 +271,14 @@ void TQCurveEditorViewBase::mouseDownEdit(const RWEvent& event) {
                 // The value panel runs to its end here, so the typed value lies inside the step.
                 clickStep("Undo Move Keypoint", selection, [&] {
                     CGRect inWindow = bounds();
-                    if (_viewHost) inWindow.origin = inWindow.origin - _viewHost->convertPointFromWindow(CGPointZero);
+                    if (_viewHost)
+                        inWindow.origin =
+                            inWindow.origin - _viewHost->convertPointFromWindow(CGPointZero);
                     _controller->showValueAtPoint(event.locationInWindow(), nullptr, inWindow);
                 });
             } else if (commandAlone(mods)) {
-                clickStep("Undo Flatten Keypoint", selection, [&] { _controller->flattenSelected(selection); });
+                clickStep("Undo Flatten Keypoint", selection,
+                          [&] { _controller->flattenSelected(selection); });
             }
         } else if (selection->isSelection(*e)) {
             selection->delSelection(*e);
@@ -280,7 +290,8 @@ void TQCurveEditorViewBase::mouseDownEdit(const RWEvent& event) {
         if (selection->isSelection(*e)) selection->delSelection(*e);
         selection->addSelectionFront(e);
         if (mods & RWEventModifierFlagOption)
-            clickStep("Undo Break Tangents", selection, [&] { _controller->breakTangentsSelected(selection); });
+            clickStep("Undo Break Tangents", selection,
+                      [&] { _controller->breakTangentsSelected(selection); });
         if (hasShift(mods)) {
             // Shift snaps the handle onto its nearest 45-degree direction at once.
             const CGPoint w = getPointWorld(_mouseOrigin);
@@ -291,7 +302,8 @@ void TQCurveEditorViewBase::mouseDownEdit(const RWEvent& event) {
         }
     } else if (e->isCurve()) {
         if (optionAlone(mods) || event.clickCount() >= 2) {
-            const TQCurveEditorItemPtr item = _controller->channelItemWithIdentifier(e->getCurveId());
+            const TQCurveEditorItemPtr item =
+                _controller->channelItemWithIdentifier(e->getCurveId());
             TQChannel* channel = item ? item->channel() : nullptr;
             if (channel && channel->canKeyframe()) {
                 // The curve's own entry announces its channel: the selection may not hold it.
@@ -375,7 +387,8 @@ void TQCurveEditorViewBase::mouseDraggedEdit(const RWEvent& event) {
     // padded top or bottom, and past the unpadded left or right edge.
     const CGRect b = bounds();
     const double scale = windowBackingScale();
-    const CGRect band = CGRectMake(b.origin.x * scale, b.origin.y * scale, b.size.width * scale, b.size.height * scale);
+    const CGRect band = CGRectMake(b.origin.x * scale, b.origin.y * scale, b.size.width * scale,
+                                   b.size.height * scale);
     CGPoint lo = _lastMousePos;
     CGPoint hi = _lastMousePos;
     double minX = 0.0, maxX = 0.0, minY = 0.0, maxY = 0.0;
@@ -430,7 +443,8 @@ void TQCurveEditorViewBase::mouseDraggedEdit(const RWEvent& event) {
     _startDrag = 0;
 }
 
-void TQCurveEditorViewBase::dragTangentStep(TQCurveSelection& primary, CGPoint world, uint64_t mods) {
+void TQCurveEditorViewBase::dragTangentStep(TQCurveSelection& primary, CGPoint world,
+                                            uint64_t mods) {
     TQCurveSelectionList* selection = _selection.get();
     setCursorShape(RWCursor::Move);
     openDragCapture("Undo Set Tangents");
@@ -454,14 +468,16 @@ void TQCurveEditorViewBase::dragTangentStep(TQCurveSelection& primary, CGPoint w
     _controller->didModifyValue(selection);
 }
 
-CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoint world, double dx, uint64_t mods) {
+CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoint world, double dx,
+                                                uint64_t mods) {
     TQCurveSelectionList* selection = _selection.get();
     setCursorShape(RWCursor::Move);
     hideCursorForDrag();
 
     if (commandAlone(mods) && !_didAddPoint) {
         // Command pulls tangents out of the keypoint, on the side the pointer moves to.
-        const TQCurveEditorItemPtr item = _controller->channelItemWithIdentifier(primary.getCurveId());
+        const TQCurveEditorItemPtr item =
+            _controller->channelItemWithIdentifier(primary.getCurveId());
         const TQChannel* channel = item ? item->channel() : nullptr;
         if (channel && channel->testFlag(kNoTangentPullFlag)) return world;
         openDragCapture("Undo Set Tangents");
@@ -509,7 +525,8 @@ CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoi
             _controller->moveSelected(selection, timeOfWorldX(w.x), w.y, 1, isConstraining);
     } else {
         // Locked in time: only the value follows the pointer.
-        _controller->moveSelected(selection, timeOfWorldX(getPointWorld(_mouseOrigin).x), w.y, 1, isConstraining);
+        _controller->moveSelected(selection, timeOfWorldX(getPointWorld(_mouseOrigin).x), w.y, 1,
+                                  isConstraining);
     }
     _controller->didModifyValue(selection);
     return w;
@@ -582,7 +599,8 @@ bool TQCurveEditorViewBase::keyUp(const RWEvent&) {
 }
 
 bool TQCurveEditorViewBase::customKeyEquivalent(const RWEvent& event) {
-    if (event.type() == RWEventType::KeyDown && !event.characters().empty() && event.characters()[0] == ' ') {
+    if (event.type() == RWEventType::KeyDown && !event.characters().empty() &&
+        event.characters()[0] == ' ') {
         _space = 1;
         return true;
     }

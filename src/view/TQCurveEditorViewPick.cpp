@@ -22,7 +22,8 @@ uint32_t recordCurveId(const HXDHitRecord& record) {
 
 TQKeyframeHandle recordHandle(const HXDHitRecord& record) {
     const HXDNumber* handle = record.extraInfo().objectForKey("Handle");
-    return handle ? reinterpret_cast<TQKeyframeHandle>(static_cast<uintptr_t>(handle->unsignedLongLongValue()))
+    return handle ? reinterpret_cast<TQKeyframeHandle>(
+                        static_cast<uintptr_t>(handle->unsignedLongLongValue()))
                   : nullptr;
 }
 
@@ -50,14 +51,16 @@ void TQCurveEditorViewBase::select() {
     const double y1 = band.origin.y + band.size.height;
     const CGPoint lo = getPointScreen(CGPointMake(std::fmin(x0, x1), std::fmin(y0, y1)));
     const CGPoint hi = getPointScreen(CGPointMake(std::fmax(x0, x1), std::fmax(y0, y1)));
-    const HXDHitTestContext context =
-        _renderController->renderingContextForHitTestInRect(CGRectMake(lo.x, lo.y, hi.x - lo.x, hi.y - lo.y));
+    const HXDHitTestContext context = _renderController->renderingContextForHitTestInRect(
+        CGRectMake(lo.x, lo.y, hi.x - lo.x, hi.y - lo.y));
 
     std::vector<HXDHitRecord>& hits = _bandHitScratch;
     hits.clear();
     for (const auto& [channelId, quads] : _keypointsPrimitives) {
-        std::vector<HXDHitRecord> part = _renderController->newHitTestResultForPrimitives(quads, context, false);
-        hits.insert(hits.end(), std::make_move_iterator(part.begin()), std::make_move_iterator(part.end()));
+        std::vector<HXDHitRecord> part =
+            _renderController->newHitTestResultForPrimitives(quads, context, false);
+        hits.insert(hits.end(), std::make_move_iterator(part.begin()),
+                    std::make_move_iterator(part.end()));
     }
     if (!hits.empty()) processHits(hits, 1);
     // The records keep their primitives alive: they are not held past the test.
@@ -157,7 +160,9 @@ void TQCurveEditorViewBase::invertBandMembership(bool joinAtFront) {
     // band over thousands of keypoints costs a sort per step, not a walk per keypoint.
     // What isEqual compares; the handle as an integer, which orders totally.
     using Key = std::pair<uintptr_t, uint64_t>;
-    auto keyOf = [](const TQCurveSelection& e) { return Key{reinterpret_cast<uintptr_t>(e.getHandle()), e.getFlags()}; };
+    auto keyOf = [](const TQCurveSelection& e) {
+        return Key{reinterpret_cast<uintptr_t>(e.getHandle()), e.getFlags()};
+    };
     std::vector<Key>& before = _bandKeyScratch;
     before.clear();
     for (const TQCurveSelectionPtr& entry : _previousSelection->getSelectionArray())
@@ -181,7 +186,8 @@ void TQCurveEditorViewBase::invertBandMembership(bool joinAtFront) {
     out.reserve(_previousSelection->size() + joining.size());
     if (joinAtFront) out.insert(out.end(), joining.rbegin(), joining.rend());
     for (const TQCurveSelectionPtr& entry : _previousSelection->getSelectionArray())
-        if (!entry || !std::binary_search(leaving.begin(), leaving.end(), keyOf(*entry))) out.push_back(entry);
+        if (!entry || !std::binary_search(leaving.begin(), leaving.end(), keyOf(*entry)))
+            out.push_back(entry);
     if (!joinAtFront) out.insert(out.end(), joining.begin(), joining.end());
     joining.clear();  // holds no entry past the step
 }

@@ -79,14 +79,17 @@ void TQCurveEditorViewBase::computeVerticalTickMarks() {
             const std::vector<TQChannelBase*> components = channelItem->compoundChannelComponents();
             double f = conv;
             if (!components.empty()) {
-                if (auto* first = dynamic_cast<TQCurveEditorChannelItem*>(set->itemWithChannel(components[0]).get()))
+                if (auto* first = dynamic_cast<TQCurveEditorChannelItem*>(
+                        set->itemWithChannel(components[0]).get()))
                     f = first->conversionFactor();
-                if (auto* firstChannel = dynamic_cast<TQChannel*>(components[0])) rangeChannel = firstChannel;
+                if (auto* firstChannel = dynamic_cast<TQChannel*>(components[0]))
+                    rangeChannel = firstChannel;
             }
             hi = -HUGE_VAL;
             lo = HUGE_VAL;
             for (TQChannelBase* component : components) {
-                auto* componentItem = dynamic_cast<TQCurveEditorChannelItem*>(set->itemWithChannel(component).get());
+                auto* componentItem =
+                    dynamic_cast<TQCurveEditorChannelItem*>(set->itemWithChannel(component).get());
                 if (!componentItem) continue;
                 componentItems.push_back(componentItem);
                 hi = std::fmax(hi, f * componentItem->maxY());

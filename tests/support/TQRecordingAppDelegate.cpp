@@ -6,10 +6,15 @@
 
 namespace {
 
-constexpr std::array<std::string_view, 9> kBracketOperations = {
-    "startCaptureModifiedChannels", "endCaptureModifiedChannels", "willChangeChannel",
-    "didChangeChannel", "willSetChannelValue", "didSetChannelValue", "addChannelToUndo",
-    "addToUndo", "postNotification"};
+constexpr std::array<std::string_view, 9> kBracketOperations = {"startCaptureModifiedChannels",
+                                                                "endCaptureModifiedChannels",
+                                                                "willChangeChannel",
+                                                                "didChangeChannel",
+                                                                "willSetChannelValue",
+                                                                "didSetChannelValue",
+                                                                "addChannelToUndo",
+                                                                "addToUndo",
+                                                                "postNotification"};
 
 bool isBracketOperation(std::string_view operation) {
     return std::find(kBracketOperations.begin(), kBracketOperations.end(), operation) !=
@@ -67,8 +72,8 @@ std::vector<std::string> TQRecordingAppDelegate::bracketSequence() const {
 }
 
 size_t TQRecordingAppDelegate::count(std::string_view operation) const {
-    return static_cast<size_t>(std::count_if(_calls.begin(), _calls.end(),
-                                             [&](const auto& c) { return c.operation == operation; }));
+    return static_cast<size_t>(std::count_if(
+        _calls.begin(), _calls.end(), [&](const auto& c) { return c.operation == operation; }));
 }
 
 int TQRecordingAppDelegate::captureBalance() const {

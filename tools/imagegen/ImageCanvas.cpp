@@ -29,7 +29,9 @@ Rgba desaturated(const Rgba& c, double amount) {
     const double luma = 0.2126 * c.r + 0.7152 * c.g + 0.0722 * c.b;
     return mix(c, grey(luma, c.a), amount);
 }
-Rgba darker(const Rgba& c, double factor) { return {c.r * factor, c.g * factor, c.b * factor, c.a}; }
+Rgba darker(const Rgba& c, double factor) {
+    return {c.r * factor, c.g * factor, c.b * factor, c.a};
+}
 
 Coverage disc(Point centre, double radius) {
     return [=](Point p) { return distance(p, centre) <= radius ? 1.0 : 0.0; };
@@ -47,7 +49,8 @@ Coverage capsule(Point a, Point b, double halfWidth) {
     return [=](Point p) {
         const double dx = b.x - a.x, dy = b.y - a.y;
         const double lengthSquared = dx * dx + dy * dy;
-        double t = lengthSquared > 0.0 ? ((p.x - a.x) * dx + (p.y - a.y) * dy) / lengthSquared : 0.0;
+        double t =
+            lengthSquared > 0.0 ? ((p.x - a.x) * dx + (p.y - a.y) * dy) / lengthSquared : 0.0;
         t = clamp01(t);
         return distance(p, {a.x + t * dx, a.y + t * dy}) <= halfWidth ? 1.0 : 0.0;
     };
@@ -113,7 +116,9 @@ void ImageCanvas::draw(const Coverage& coverage, const Paint& paint) {
 
 std::vector<unsigned char> ImageCanvas::rgba8() const {
     std::vector<unsigned char> out(_premultiplied.size());
-    auto byte = [](double v) { return static_cast<unsigned char>(std::lround(clamp01(v) * 255.0)); };
+    auto byte = [](double v) {
+        return static_cast<unsigned char>(std::lround(clamp01(v) * 255.0));
+    };
     for (std::size_t i = 0; i < _premultiplied.size(); i += 4) {
         const double a = _premultiplied[i + 3];
         const unsigned char alpha = byte(a);

@@ -49,12 +49,15 @@ void drawKeypoint(ImageCanvas& canvas, const KeypointLook& look) {
     // The shadow lifts the point off a curve of the same colour running through it.
     canvas.draw(softDisc(c, kKeypointRadius - 0.25, kKeypointRadius + 1.5),
                 solid(withAlpha(kBlack, look.shadowAlpha)));
-    if (look.glow) canvas.draw(softDisc(c, kKeypointRadius, kKeypointRadius + 2.75), solid(*look.glow));
+    if (look.glow)
+        canvas.draw(softDisc(c, kKeypointRadius, kKeypointRadius + 2.75), solid(*look.glow));
     if (look.selectionRing)
-        canvas.draw(ring(c, kKeypointRadius + 0.6, kKeypointRadius + 1.35), solid(*look.selectionRing));
+        canvas.draw(ring(c, kKeypointRadius + 0.6, kKeypointRadius + 1.35),
+                    solid(*look.selectionRing));
     canvas.draw(disc(c, kKeypointRadius), solid(look.rim));
     const double inner = kKeypointRadius - kRimWidth;
-    canvas.draw(disc(c, inner), verticalGradient(look.fillTop, look.fillBottom, c.y - inner, c.y + inner));
+    canvas.draw(disc(c, inner),
+                verticalGradient(look.fillTop, look.fillBottom, c.y - inner, c.y + inner));
     // A faint highlight towards the top left, as from a light above the screen.
     canvas.draw(softDisc({c.x - 0.9, c.y - 1.2}, 0.4, 2.0), solid(withAlpha(kWhite, 0.22)));
 }
@@ -63,7 +66,8 @@ KeypointLook normalLook(const Rgba& c) {
     return {mix(c, kWhite, 0.18), darker(c, 0.86), darker(c, 0.42), std::nullopt, std::nullopt};
 }
 KeypointLook pressedLook(const Rgba& c) {
-    return {mix(c, kWhite, 0.55), mix(c, kWhite, 0.2), darker(c, 0.6), withAlpha(c, 0.55), std::nullopt};
+    return {mix(c, kWhite, 0.55), mix(c, kWhite, 0.2), darker(c, 0.6), withAlpha(c, 0.55),
+            std::nullopt};
 }
 KeypointLook disabledLook(const Rgba& c) {
     const Rgba dull = desaturated(c, 0.75);
@@ -83,7 +87,8 @@ KeypointLook selectedLook(TQKeyframeImages::State state) {
             return {mix(selection, kWhite, 0.5), darker(selection, 0.86), grey(0.12), std::nullopt,
                     std::nullopt};
         case TQKeyframeImages::kPressed:
-            return {kWhite, darker(selection, 0.92), grey(0.12), withAlpha(selection, 0.5), std::nullopt};
+            return {kWhite, darker(selection, 0.92), grey(0.12), withAlpha(selection, 0.5),
+                    std::nullopt};
         case TQKeyframeImages::kInactive:
             return {grey(0.8), grey(0.66), grey(0.14), withAlpha(selection, 0.22), std::nullopt};
         case TQKeyframeImages::kDisabled:
@@ -101,7 +106,8 @@ void drawTangentHandle(ImageCanvas& canvas) {
     const Rgba selection = fromGD(GDColor::selectedCurveColor0());
     canvas.draw(softDisc(c, 2.4, 3.9), solid(withAlpha(kBlack, 0.4)));
     canvas.draw(disc(c, 2.75), solid(grey(0.1)));
-    canvas.draw(disc(c, 2.0), verticalGradient(kWhite, darker(selection, 0.85), c.y - 2.0, c.y + 2.0));
+    canvas.draw(disc(c, 2.0),
+                verticalGradient(kWhite, darker(selection, 0.85), c.y - 2.0, c.y + 2.0));
 }
 
 // Tool icons: light glyphs for the dark theme, on a 20-point square.
@@ -132,8 +138,9 @@ void drawSketchTool(ImageCanvas& canvas) {
         const double y1 = 16.0 - 1.8 * std::sin((x + 0.5) * 0.9);
         canvas.draw(capsule({x, y0}, {x + 0.5, y1}, 0.7), solid(kGlyph));
     }
-    canvas.draw(polygon({{10.6, 14.6}, {11.4, 11.6}, {13.4, 13.6}}), solid(kGlyph));        // tip
-    canvas.draw(polygon({{11.4, 11.6}, {16.6, 6.4}, {18.6, 8.4}, {13.4, 13.6}}), solid(kGlyph));  // body
+    canvas.draw(polygon({{10.6, 14.6}, {11.4, 11.6}, {13.4, 13.6}}), solid(kGlyph));  // tip
+    canvas.draw(polygon({{11.4, 11.6}, {16.6, 6.4}, {18.6, 8.4}, {13.4, 13.6}}),
+                solid(kGlyph));  // body
     canvas.draw(polygon({{16.6, 6.4}, {17.6, 5.4}, {19.6, 7.4}, {18.6, 8.4}}),
                 solid(withAlpha(kGlyph, 0.6)));  // eraser
 }
@@ -190,14 +197,17 @@ void drawReset(ImageCanvas& canvas) {
         },
         solid(kGlyph));
     const Point end{c.x + radius * std::cos(-1.75), c.y + radius * std::sin(-1.75)};
-    canvas.draw(polygon({{end.x + 3.0, end.y}, {end.x - 0.5, end.y - 3.0}, {end.x - 0.5, end.y + 3.0}}),
-                solid(kGlyph));
+    canvas.draw(
+        polygon({{end.x + 3.0, end.y}, {end.x - 0.5, end.y - 3.0}, {end.x - 0.5, end.y + 3.0}}),
+        solid(kGlyph));
 }
 
 void drawGradientBorder(ImageCanvas& canvas) {
     const double s = kBorderSize;
-    canvas.draw(rectangle(0.0, 0.0, s, 4.0), verticalGradient(grey(0.0, 0.45), grey(0.0, 0.0), 0.0, 4.0));
-    canvas.draw(rectangle(0.0, s - 3.0, s, 3.0), verticalGradient(grey(1.0, 0.0), grey(1.0, 0.08), s - 3.0, s));
+    canvas.draw(rectangle(0.0, 0.0, s, 4.0),
+                verticalGradient(grey(0.0, 0.45), grey(0.0, 0.0), 0.0, 4.0));
+    canvas.draw(rectangle(0.0, s - 3.0, s, 3.0),
+                verticalGradient(grey(1.0, 0.0), grey(1.0, 0.08), s - 3.0, s));
     const Rgba line = grey(0.36);
     canvas.draw(rectangle(0.0, 0.0, s, 1.0), solid(line));
     canvas.draw(rectangle(0.0, s - 1.0, s, 1.0), solid(line));
@@ -213,7 +223,8 @@ bool writeBothScales(const std::string& folder, const std::string& name, double 
         const std::string path = folder + "/" + name + (scale > 1.0 ? "@2x" : "") + ".png";
         std::string error;
         if (!canvas.writePNG(path, error)) {
-            std::fprintf(stderr, "vce_imagegen: cannot write %s: %s\n", path.c_str(), error.c_str());
+            std::fprintf(stderr, "vce_imagegen: cannot write %s: %s\n", path.c_str(),
+                         error.c_str());
             return false;
         }
     }
@@ -243,14 +254,17 @@ int main(int argc, char** argv) {
     ok &= writeBothScales(folder, imageName(0, kInactive, false), kKeypointSize,
                           [](ImageCanvas& canvas) { drawKeypoint(canvas, inactiveLook()); });
     for (const State state : {kNormal, kPressed, kInactive, kDisabled}) {
-        ok &= writeBothScales(folder, imageName(0, state, true), kKeypointSize,
-                              [state](ImageCanvas& canvas) { drawKeypoint(canvas, selectedLook(state)); });
+        ok &= writeBothScales(
+            folder, imageName(0, state, true), kKeypointSize,
+            [state](ImageCanvas& canvas) { drawKeypoint(canvas, selectedLook(state)); });
     }
     ok &= writeBothScales(folder, tangentHandleImageName(), kTangentHandleSize, drawTangentHandle);
 
     ok &= writeBothScales(folder, "K_KeyframeEditor_EditKeyframes", kToolIconSize, drawEditTool);
-    ok &= writeBothScales(folder, "K_KeyframeEditor_SketchKeyframes", kToolIconSize, drawSketchTool);
-    ok &= writeBothScales(folder, "K_KeyframeEditor_TransformKeyframes", kToolIconSize, drawTransformTool);
+    ok &=
+        writeBothScales(folder, "K_KeyframeEditor_SketchKeyframes", kToolIconSize, drawSketchTool);
+    ok &= writeBothScales(folder, "K_KeyframeEditor_TransformKeyframes", kToolIconSize,
+                          drawTransformTool);
     ok &= writeBothScales(folder, "K_General_Add", kSmallIconSize, drawAdd);
     ok &= writeBothScales(folder, "K_General_Remove", kSmallIconSize, drawRemove);
     // Files named by this project; the embedding step lists them under the resource names

@@ -7,8 +7,8 @@
 #include <QLineEdit>
 #include <QListWidget>
 #include <QPushButton>
-#include <QTimer>
 #include <QTest>
+#include <QTimer>
 
 #include <cmath>
 #include <memory>
@@ -55,7 +55,8 @@ protected:
         std::vector<TQChannel*> out;
         TQDemoCurveEditorCtrl& controller = window.controller();
         for (uint32_t i = 0; i < controller.numberOfChannelItems(); ++i)
-            if (TQChannel* c = controller.selectedCurveSet()->channeItemAtIndex(i)->channel()) out.push_back(c);
+            if (TQChannel* c = controller.selectedCurveSet()->channeItemAtIndex(i)->channel())
+                out.push_back(c);
         return out;
     }
     // How many shown channels differ from the snapshot (a channel gone counts as different).
@@ -77,8 +78,8 @@ protected:
         double v = 0.0;
         channel->getKeyframe(keys[keys.size() / 2], &t, &v);
         const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
-        const CGPoint s =
-            window.curveView().getPointScreen(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
+        const CGPoint s = window.curveView().getPointScreen(
+            CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
         const double ratio = window.curveWidget()->devicePixelRatioF();
         return QPoint(static_cast<int>(std::lround(s.x / ratio)),
                       static_cast<int>(std::lround(window.curveWidget()->height() - s.y / ratio)));
@@ -92,18 +93,24 @@ protected:
 TEST_F(DemoWindowTest, choosing_an_object__selects_it_in_the_scene_and_shows_its_curves) {
     const std::vector<TQChannelObjectRootBase*> objects = window.host().scene().objects();
     ASSERT_GE(objects.size(), 2u);
-    ASSERT_EQ(window.objectList()->count(), static_cast<int>(objects.size())) << "one row per object";
-    EXPECT_EQ(window.controller().shownObject(), objects.front()) << "the sample scene selects its first object";
+    ASSERT_EQ(window.objectList()->count(), static_cast<int>(objects.size()))
+        << "one row per object";
+    EXPECT_EQ(window.controller().shownObject(), objects.front())
+        << "the sample scene selects its first object";
     window.objectList()->setCurrentRow(1);
-    EXPECT_TRUE(window.host().isObjectSelected(objects[1])) << "the list must select the object in the scene";
-    EXPECT_EQ(window.controller().shownObject(), objects[1]) << "the view must follow the scene's selection";
+    EXPECT_TRUE(window.host().isObjectSelected(objects[1]))
+        << "the list must select the object in the scene";
+    EXPECT_EQ(window.controller().shownObject(), objects[1])
+        << "the view must follow the scene's selection";
     for (TQChannel* channel : shownChannels())
-        EXPECT_EQ(window.host().scene().objectOf(channel), objects[1]) << "a curve of another object is shown";
+        EXPECT_EQ(window.host().scene().objectOf(channel), objects[1])
+            << "a curve of another object is shown";
 
     // And the other way: the scene selects, the list follows.
     window.host().selectObject(objects[0]);
     EXPECT_EQ(window.controller().shownObject(), objects[0]);
-    EXPECT_TRUE(window.objectList()->item(0)->isSelected()) << "the list must show the scene's selection";
+    EXPECT_TRUE(window.objectList()->item(0)->isSelected())
+        << "the list must show the scene's selection";
 }
 
 TEST_F(DemoWindowTest, shown_object_removed__the_view_empties_and_still_draws) {
@@ -115,14 +122,19 @@ TEST_F(DemoWindowTest, shown_object_removed__the_view_empties_and_still_draws) {
     QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
     ASSERT_TRUE(window.host().removeObject(shown));
 
-    EXPECT_EQ(window.controller().shownObject(), nullptr) << "nothing is selected in the scene any more";
-    EXPECT_EQ(window.controller().numberOfChannelItems(), 0u) << "curves of a removed object are still shown";
-    EXPECT_EQ(window.curveView().getSelection()->size(), 0u) << "the selection still names the removed channels";
-    EXPECT_EQ(window.objectList()->count(), rows - 1) << "the list must lose the removed object's row";
+    EXPECT_EQ(window.controller().shownObject(), nullptr)
+        << "nothing is selected in the scene any more";
+    EXPECT_EQ(window.controller().numberOfChannelItems(), 0u)
+        << "curves of a removed object are still shown";
+    EXPECT_EQ(window.curveView().getSelection()->size(), 0u)
+        << "the selection still names the removed channels";
+    EXPECT_EQ(window.objectList()->count(), rows - 1)
+        << "the list must lose the removed object's row";
     const int frames = window.curveWidget()->framesDrawn();
     drawFrame();
     EXPECT_GT(window.curveWidget()->framesDrawn(), frames) << "the empty view must still draw";
-    QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);  // on nothing: no effect
+    QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier,
+                      at);  // on nothing: no effect
     EXPECT_FALSE(window.host().canUndo());
 }
 
@@ -140,7 +152,8 @@ TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_c
 
     EXPECT_EQ(changedCount(before), 1u) << "the drag must change exactly the dragged channel";
     QAction* undo = window.editMenu()->undoAction();
-    EXPECT_TRUE(undo->isEnabled()) << "the Edit menu must follow the host's history without being opened";
+    EXPECT_TRUE(undo->isEnabled())
+        << "the Edit menu must follow the host's history without being opened";
     EXPECT_EQ(undo->text().toStdString(), "Undo Move Keypoint");
     EXPECT_EQ(window.host().undoStack().undoCount(), 1u) << "ten drag steps are one undo step";
 
@@ -150,14 +163,15 @@ TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_c
     size_t dragged = 0;
     while (dragged < shown.size() && *shown[dragged] == *before[dragged]) ++dragged;
     ASSERT_LT(dragged, shown.size());
-    const TQCurveEditorItemPtr item = window.controller().selectedCurveSet()->channeItemAtIndex(
-        static_cast<uint32_t>(dragged));
+    const TQCurveEditorItemPtr item =
+        window.controller().selectedCurveSet()->channeItemAtIndex(static_cast<uint32_t>(dragged));
 
     undo->trigger();
     EXPECT_EQ(changedCount(before), 0u) << "Undo must give back every channel exactly";
     auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
     ASSERT_NE(channelItem, nullptr);
-    EXPECT_TRUE(channelItem->originalCurveDirty()) << "the restored curve would be drawn from stale samples";
+    EXPECT_TRUE(channelItem->originalCurveDirty())
+        << "the restored curve would be drawn from stale samples";
     EXPECT_EQ(window.editMenu()->redoAction()->text().toStdString(), "Redo Move Keypoint");
     window.editMenu()->redoAction()->trigger();
     EXPECT_EQ(changedCount(before), 1u) << "Redo must apply the drag again";
@@ -181,13 +195,15 @@ TEST_F(DemoWindowTest, double_click_on_a_keypoint__types_its_value_in_the_panel_
     QTest::mouseRelease(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
 
     ASSERT_TRUE(panelShown) << "a double click on a keypoint must open the value panel";
-    ASSERT_EQ(changedCount(before), 1u) << "the typed value must change the clicked keypoint's channel";
+    ASSERT_EQ(changedCount(before), 1u)
+        << "the typed value must change the clicked keypoint's channel";
     bool found = false;
     for (TQChannel* channel : shownChannels()) {
         const double scale = channel->getInfo()->displayScale;
         for (TQKeyframeHandle h : channel->getKeyframes(false)) {
             double v = 0.0;
-            if (channel->getKeyframe(h, nullptr, &v) && std::fabs(v * scale - 12.5) < 1e-9) found = true;
+            if (channel->getKeyframe(h, nullptr, &v) && std::fabs(v * scale - 12.5) < 1e-9)
+                found = true;
         }
     }
     EXPECT_TRUE(found) << "no keypoint shows the typed value";

@@ -8,8 +8,8 @@ namespace tq_internal {
 bool sameState(const TQKeyframeRecord& a, const TQKeyframeRecord& b) {
     return CMTimeIdentical(a.time, b.time) && a.value == b.value && a.inU == b.inU &&
            a.inV == b.inV && a.outU == b.outU && a.outV == b.outV &&
-           a.interpolation == b.interpolation && a.locked == b.locked &&
-           a.enabled == b.enabled && a.broken == b.broken && a.scaled == b.scaled;
+           a.interpolation == b.interpolation && a.locked == b.locked && a.enabled == b.enabled &&
+           a.broken == b.broken && a.scaled == b.scaled;
 }
 
 uint64_t nextKeyframeSerial() {
@@ -117,7 +117,8 @@ size_t TQChannelData::retime(size_t position, const CMTime& time) {
         std::rotate(first, last - 1, last);
     }
     if (indexValid) {
-        for (size_t i = std::min(position, target), end = std::max(position, target); i <= end; ++i) {
+        for (size_t i = std::min(position, target), end = std::max(position, target); i <= end;
+             ++i) {
             index[keys[i].serial] = i;
         }
     }

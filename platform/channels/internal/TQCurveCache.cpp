@@ -89,15 +89,14 @@ double bezierTimeSlope(const CurveSegment& seg, double s) {
 
 double valueSlopeInS(const CurveSegment& seg, double s) {
     switch (seg.kind) {
-    case SegmentKind::Exp:
-        return seg.y[1] * kShapeCurvature * std::exp(kShapeCurvature * s) /
-               std::expm1(kShapeCurvature);
-    case SegmentKind::Log:
-        return seg.y[1] * kShapeCurvature * std::exp(kShapeCurvature * (1.0 - s)) /
-               std::expm1(kShapeCurvature);
-    case SegmentKind::Polynomial:
-    case SegmentKind::Bezier:
-        break;
+        case SegmentKind::Exp:
+            return seg.y[1] * kShapeCurvature * std::exp(kShapeCurvature * s) /
+                   std::expm1(kShapeCurvature);
+        case SegmentKind::Log:
+            return seg.y[1] * kShapeCurvature * std::exp(kShapeCurvature * (1.0 - s)) /
+                   std::expm1(kShapeCurvature);
+        case SegmentKind::Polynomial:
+        case SegmentKind::Bezier: break;
     }
     return seg.y[1] + s * (2.0 * seg.y[2] + 3.0 * seg.y[3] * s);
 }
@@ -293,36 +292,26 @@ void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
         const double rise = b.value - a.value;
         const unsigned code = discrete ? unsigned(kTQInterpolationConstant) : a.interpolation;
         switch (code) {
-        case kTQInterpolationConstant:
-            seg.y[0] = a.value;
-            break;
-        case kTQInterpolationBezier:
-            setBezier(seg, a, b);
-            break;
-        case kTQInterpolationCatmullRom:
-            setHermite(seg, a.value, b.value, catmullRomSlope(pts, i),
-                       catmullRomSlope(pts, i + 1));
-            break;
-        case kTQInterpolationExp:
-        case kTQInterpolationLog:
-            seg.kind = code == kTQInterpolationExp ? SegmentKind::Exp : SegmentKind::Log;
-            seg.y[0] = a.value;
-            seg.y[1] = rise;
-            break;
-        case kTQInterpolationEaseBoth:
-            setHermite(seg, a.value, b.value, 0.0, 0.0);
-            break;
-        case kTQInterpolationEaseOut:
-            setHermite(seg, a.value, b.value, 0.0, rise / dt);
-            break;
-        case kTQInterpolationEaseIn:
-            setHermite(seg, a.value, b.value, rise / dt, 0.0);
-            break;
-        case kTQInterpolationLinear:
-        default:
-            seg.y[0] = a.value;
-            seg.y[1] = rise;
-            break;
+            case kTQInterpolationConstant: seg.y[0] = a.value; break;
+            case kTQInterpolationBezier: setBezier(seg, a, b); break;
+            case kTQInterpolationCatmullRom:
+                setHermite(seg, a.value, b.value, catmullRomSlope(pts, i),
+                           catmullRomSlope(pts, i + 1));
+                break;
+            case kTQInterpolationExp:
+            case kTQInterpolationLog:
+                seg.kind = code == kTQInterpolationExp ? SegmentKind::Exp : SegmentKind::Log;
+                seg.y[0] = a.value;
+                seg.y[1] = rise;
+                break;
+            case kTQInterpolationEaseBoth: setHermite(seg, a.value, b.value, 0.0, 0.0); break;
+            case kTQInterpolationEaseOut: setHermite(seg, a.value, b.value, 0.0, rise / dt); break;
+            case kTQInterpolationEaseIn: setHermite(seg, a.value, b.value, rise / dt, 0.0); break;
+            case kTQInterpolationLinear:
+            default:
+                seg.y[0] = a.value;
+                seg.y[1] = rise;
+                break;
         }
         _segments.push_back(seg);
         _starts.push_back(seg.t0);
@@ -397,14 +386,10 @@ double CurveCache::evaluateInside(double seconds, CurveCursor& cursor) const {
     const CurveSegment& seg = _segments[i];
     const double s = (seconds - seg.t0) * seg.invDt;
     switch (seg.kind) {
-    case SegmentKind::Polynomial:
-        return polynomial(seg, s);
-    case SegmentKind::Exp:
-        return seg.y[0] + seg.y[1] * expShape(s);
-    case SegmentKind::Log:
-        return seg.y[0] + seg.y[1] * logShape(s);
-    case SegmentKind::Bezier:
-        break;
+        case SegmentKind::Polynomial: return polynomial(seg, s);
+        case SegmentKind::Exp: return seg.y[0] + seg.y[1] * expShape(s);
+        case SegmentKind::Log: return seg.y[0] + seg.y[1] * logShape(s);
+        case SegmentKind::Bezier: break;
     }
     double guess = s;  // the chord's parameter
     if (cursor.warm) {
@@ -425,22 +410,21 @@ double CurveCache::evaluateOutside(double seconds, bool before, CurveCursor& cur
     const double endV = before ? _firstV : _lastV;
     const double period = _lastT - _firstT;
     switch (code) {
-    case kTQExtrapolationLinear:
-        return endV + (before ? _slopeBefore : _slopeAfter) * (seconds - endT);
-    case kTQExtrapolationPingPong:
-    case kTQExtrapolationRepeat:
-    case kTQExtrapolationProgressive: {
-        if (!(period > 0.0)) return endV;
-        const double cycles = std::floor((seconds - _firstT) / period);
-        double u = std::clamp((seconds - _firstT) - cycles * period, 0.0, period);
-        if (code == kTQExtrapolationPingPong && std::fmod(cycles, 2.0) != 0.0) u = period - u;
-        const double v = evaluateInside(_firstT + u, cursor);
-        if (code == kTQExtrapolationProgressive) return v + cycles * (_lastV - _firstV);
-        return v;
-    }
-    case kTQExtrapolationConstant:
-    default:
-        return endV;
+        case kTQExtrapolationLinear:
+            return endV + (before ? _slopeBefore : _slopeAfter) * (seconds - endT);
+        case kTQExtrapolationPingPong:
+        case kTQExtrapolationRepeat:
+        case kTQExtrapolationProgressive: {
+            if (!(period > 0.0)) return endV;
+            const double cycles = std::floor((seconds - _firstT) / period);
+            double u = std::clamp((seconds - _firstT) - cycles * period, 0.0, period);
+            if (code == kTQExtrapolationPingPong && std::fmod(cycles, 2.0) != 0.0) u = period - u;
+            const double v = evaluateInside(_firstT + u, cursor);
+            if (code == kTQExtrapolationProgressive) return v + cycles * (_lastV - _firstV);
+            return v;
+        }
+        case kTQExtrapolationConstant:
+        default: return endV;
     }
 }
 
@@ -476,10 +460,10 @@ struct WarmBlock {
     alignas(64) double value[kBlock];  // out: the value at s
     alignas(64) double step[kBlock];   // out: the last step; 1 where the warm start failed
     // Between passes:
-    alignas(64) double tr[kBlock];     // sample time - t0
-    alignas(64) double rm[kBlock];     // 1 / slope at the warm start
-    alignas(64) double reach[kBlock];  // distance in s from the anchor
-    alignas(64) double sloped[kBlock]; // 1 where the slope at the warm start is positive
+    alignas(64) double tr[kBlock];      // sample time - t0
+    alignas(64) double rm[kBlock];      // 1 / slope at the warm start
+    alignas(64) double reach[kBlock];   // distance in s from the anchor
+    alignas(64) double sloped[kBlock];  // 1 where the slope at the warm start is positive
 };
 
 // Warm starts from the last solved sample (anchorT, anchorS): the inverse's Taylor series to

@@ -72,8 +72,8 @@ TEST_F(BehaviorProcessed, selection__gates_the_selected_question_and_context) {
     double* v = &value;
     unsigned n = 1;
     c->getSamples(&onlySelected, seconds(0.37), seconds(1.0), n, nullptr, &v);
-    const double expected =
-        c->getCurveValue(seconds(0.37)) + TQNoiseBehavior::noise(3.0 * CMTimeGetSeconds(seconds(0.37)), 42);
+    const double expected = c->getCurveValue(seconds(0.37)) +
+                            TQNoiseBehavior::noise(3.0 * CMTimeGetSeconds(seconds(0.37)), 42);
     EXPECT_NEAR(value, expected, kValueTolerance) << "only the selected noise applies";
 }
 

@@ -48,8 +48,10 @@ TEST_F(CurveExtrapolation, ping_pong__mirrors_alternate_cycles) {
     rising->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter);
     rising->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationBefore);
     for (double u = 0.05; u < 2.0; u += 0.15) {
-        EXPECT_NEAR(at(*rising, 2.0 + u), at(*rising, 2.0 - u), kValueTolerance) << "after, u=" << u;
-        EXPECT_NEAR(at(*rising, 4.0 + u), at(*rising, u), kValueTolerance) << "second cycle forward";
+        EXPECT_NEAR(at(*rising, 2.0 + u), at(*rising, 2.0 - u), kValueTolerance)
+            << "after, u=" << u;
+        EXPECT_NEAR(at(*rising, 4.0 + u), at(*rising, u), kValueTolerance)
+            << "second cycle forward";
         EXPECT_NEAR(at(*rising, -u), at(*rising, u), kValueTolerance) << "before mirrors at 0";
     }
 }
@@ -72,7 +74,7 @@ TEST_F(CurveExtrapolation, extrapolate_false__holds_end_values_whatever_the_code
 TEST_F(CurveExtrapolation, codes__are_read_back_per_direction_and_validated) {
     curve->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationBefore);
     curve->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter);
-    curve->setExtrapolation(9, kTQExtrapolationAfter);  // no such code: ignored
+    curve->setExtrapolation(9, kTQExtrapolationAfter);   // no such code: ignored
     curve->setExtrapolation(kTQExtrapolationLinear, 5);  // no such direction: ignored
     EXPECT_EQ(curve->getExtrapolation(kTQExtrapolationBefore), kTQExtrapolationRepeat);
     EXPECT_EQ(curve->getExtrapolation(kTQExtrapolationAfter), kTQExtrapolationPingPong);

@@ -111,7 +111,8 @@ TEST_F(CurveInterpolation, bezier__matches_an_independent_bisection_on_its_contr
         // still there (a vertical tangent), where no solver can pin the value in doubles.
         for (double f = 0.03; f < 1.0; f += 0.0625) {
             const CMTime time = CMTimeMakeWithSeconds(
-                CMTimeGetSeconds(ta) + f * (CMTimeGetSeconds(tb) - CMTimeGetSeconds(ta)), 1000000000);
+                CMTimeGetSeconds(ta) + f * (CMTimeGetSeconds(tb) - CMTimeGetSeconds(ta)),
+                1000000000);
             const double t = CMTimeGetSeconds(time);
             EXPECT_NEAR(c->getCurveValue(time), referenceBezier(*c, keys[k], keys[k + 1], t), 1e-7)
                 << "segment " << k << " at fraction " << f;
@@ -157,7 +158,11 @@ TEST_F(CurveInterpolation, catmull_rom__passes_through_interior_points_smoothly)
 }
 
 TEST_F(CurveInterpolation, eased_forms__are_flat_at_their_eased_end) {
-    struct Case { unsigned code; bool flatStart; bool flatEnd; };
+    struct Case {
+        unsigned code;
+        bool flatStart;
+        bool flatEnd;
+    };
     for (Case k : {Case{15, true, true}, Case{16, true, false}, Case{17, false, true}}) {
         auto c = segment(k.code);
         const double start = (at(*c, kProbe) - at(*c, 0.0)) / kProbe;

@@ -39,7 +39,8 @@ void expectOrder(const TQChannel& c, const ReferenceOrder& ref, int step) {
         ASSERT_EQ(handles[i], ref.entries[i].handle) << "step " << step << ", position " << i;
         CMTime t = kCMTimeInvalid;
         ASSERT_TRUE(c.getKeyframe(handles[i], &t, nullptr)) << "step " << step;
-        ASSERT_EQ(CMTimeCompare(t, ref.entries[i].time), 0) << "step " << step << ", position " << i;
+        ASSERT_EQ(CMTimeCompare(t, ref.entries[i].time), 0)
+            << "step " << step << ", position " << i;
     }
 }
 
@@ -106,7 +107,8 @@ TEST_F(KeyframeRetime, moveKeyframe_replacing__deletes_only_the_keyframes_at_the
     const CMTime from = ref.entries[2].time;
     channel->moveKeyframe(&from, &target, false);
     EXPECT_FALSE(channel->getKeyframe(stay, nullptr, nullptr)) << "the keyframe there is replaced";
-    EXPECT_FALSE(channel->getKeyframe(other, nullptr, nullptr)) << "every keyframe there is replaced";
+    EXPECT_FALSE(channel->getKeyframe(other, nullptr, nullptr))
+        << "every keyframe there is replaced";
     EXPECT_EQ(channel->getKeyframe(target), mover);
     EXPECT_EQ(channel->numberOfKeyframes(), 10u);
     const std::vector<TQKeyframeHandle> handles = channel->getKeyframes(false);

@@ -22,8 +22,8 @@ class TreeCompoundTest : public ::testing::Test {
 protected:
     void SetUp() override {
         for (TQChannelId id : {1u, 2u, 3u}) {
-            auto* c = static_cast<TQChannel*>(
-                compound.addChild(std::make_unique<TQChannel>("C", id)));
+            auto* c =
+                static_cast<TQChannel*>(compound.addChild(std::make_unique<TQChannel>("C", id)));
             c->setKeyframe(seconds(1), 10.0 * id);
             c->setKeyframe(seconds(2), 0.0);
             components.push_back(c);
@@ -53,8 +53,8 @@ TEST_F(TreeCompoundTest, foldFlag__linksWhateverTheCallerAsks) {
 TEST_F(TreeCompoundTest, addKeyframe__linkedAddsToAllUnlinkedToOne) {
     compound.addKeyframe(components[1], seconds(4), true);  // axis 4 s = channel 3 s
     for (TQChannel* c : components) EXPECT_TRUE(keyedAt(c, 3)) << "id " << c->getChannelId();
-    EXPECT_EQ(observer.told, (std::vector<TQChannelBase*>{components[0], components[1],
-                                                          components[2]}))
+    EXPECT_EQ(observer.told,
+              (std::vector<TQChannelBase*>{components[0], components[1], components[2]}))
         << "each component is announced, in child order";
 
     observer.told.clear();

@@ -125,7 +125,8 @@ TEST_F(TreeFolderTest, compare__shapeAndNullSlotsMatter) {
     TQChannel plain("Plain", 1);
     TQChannelBool flag("Plain", 1);
     EXPECT_FALSE(plain == flag) << "classes differ";
-    static_cast<TQChannelBase&>(plain) = object;  // a folder's state can't be poured into a channel: nothing breaks
+    static_cast<TQChannelBase&>(plain) =
+        object;  // a folder's state can't be poured into a channel: nothing breaks
     EXPECT_EQ(plain.numberOfKeyframes(), 0u);
 }
 

@@ -22,8 +22,8 @@ inline double distanceToSegment(double px, double py, double ax, double ay, doub
 
 // Whether the segment ab meets the closed rectangle [x0, x1] x [y0, y1] (Liang-Barsky
 // clipping of the segment's parameter range).
-inline bool segmentMeetsRect(double ax, double ay, double bx, double by, double x0, double y0, double x1,
-                             double y1) {
+inline bool segmentMeetsRect(double ax, double ay, double bx, double by, double x0, double y0,
+                             double x1, double y1) {
     double t0 = 0.0;
     double t1 = 1.0;
     const double dx = bx - ax;
@@ -40,7 +40,8 @@ inline bool segmentMeetsRect(double ax, double ay, double bx, double by, double 
         }
         return true;
     };
-    return clip(-dx, ax - x0) && clip(dx, x1 - ax) && clip(-dy, ay - y0) && clip(dy, y1 - ay) && t0 <= t1;
+    return clip(-dx, ax - x0) && clip(dx, x1 - ax) && clip(-dy, ay - y0) && clip(dy, y1 - ay) &&
+           t0 <= t1;
 }
 
 // Closed rectangles meet (touching edges count). Rectangles are standardized.
@@ -50,7 +51,8 @@ inline bool rectsMeet(const CGRect& a, const CGRect& b) {
 }
 
 inline bool rectContains(const CGRect& r, double x, double y) {
-    return x >= r.origin.x && x <= r.origin.x + r.size.width && y >= r.origin.y && y <= r.origin.y + r.size.height;
+    return x >= r.origin.x && x <= r.origin.x + r.size.width && y >= r.origin.y &&
+           y <= r.origin.y + r.size.height;
 }
 
 // Distance from a point outside a rectangle to it; 0 inside or on the edge.

@@ -23,7 +23,8 @@ namespace hxd_internal {
 // For one run of finite vertices whose x never decreases: the y extent of the segments that
 // meet world x in [x0, x1] (exact); false when none does. Reads the vertices near the range
 // only, found by a search from where even spacing would put them.
-bool monotoneYExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo, double& hi);
+bool monotoneYExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1,
+                          double& lo, double& hi);
 
 struct PolylineIndex {
     static constexpr uint32_t kNone = std::numeric_limits<uint32_t>::max();
@@ -62,29 +63,31 @@ struct PolylineIndex {
 
     // Indexes the vertices (replacing what was there). monotoneX: one run, every vertex
     // finite, x never decreasing, no loop.
-    void build(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts, bool loop,
-               bool monotoneX);
+    void build(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts,
+               bool loop, bool monotoneX);
 
     uint32_t binOf(double x) const;
 
     // The y extent of the segments that reach into world x in [x0, x1] (bins or chunks over
     // the range, so a bound, not the exact extent); false when no segment does.
-    bool yExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo, double& hi);
+    bool yExtentOverX(const std::vector<HXDLineVertex>& vertices, double x0, double x1, double& lo,
+                      double& hi);
 
 private:
     void buildBins(const std::vector<HXDLineVertex>& vertices);
-    void buildChunks(const std::vector<HXDLineVertex>& vertices, const std::vector<uint32_t>& runStarts, bool loop);
+    void buildChunks(const std::vector<HXDLineVertex>& vertices,
+                     const std::vector<uint32_t>& runStarts, bool loop);
     // Finds the segments and y extent of bin k; a segment i lies in the bins from
     // binOf(x[i]) to binOf(x[i + 1]), which is how the searches decide.
     void fillBin(const std::vector<HXDLineVertex>& vertices, uint32_t k);
 
 public:
-
     // Calls visit(i, j) for each segment (vertex i to vertex j) that may meet the world
     // rectangle q (standardized), until visit answers true.
     // Bins are filled here, on first use: the index is the multiline's lazily built cache.
     template <class Visit>
-    void forEachCandidate(const std::vector<HXDLineVertex>& vertices, const CGRect& q, Visit&& visit);
+    void forEachCandidate(const std::vector<HXDLineVertex>& vertices, const CGRect& q,
+                          Visit&& visit);
 };
 
 }  // namespace hxd_internal

@@ -23,17 +23,20 @@ constexpr size_t kPrefetchAhead = 8;
 bool fits(double v) { return std::fabs(v) < 1e37; }
 
 bool finiteBox(const HXDHitBounds& b) {
-    return fits(b.minX) && fits(b.maxX) && fits(b.minY) && fits(b.maxY) && b.minX <= b.maxX && b.minY <= b.maxY;
+    return fits(b.minX) && fits(b.maxX) && fits(b.minY) && fits(b.maxY) && b.minX <= b.maxX &&
+           b.minY <= b.maxY;
 }
 
 float down(double v) {
     const float f = static_cast<float>(v);
-    return static_cast<double>(f) > v ? std::nextafter(f, -std::numeric_limits<float>::infinity()) : f;
+    return static_cast<double>(f) > v ? std::nextafter(f, -std::numeric_limits<float>::infinity())
+                                      : f;
 }
 
 float up(double v) {
     const float f = static_cast<float>(v);
-    return static_cast<double>(f) < v ? std::nextafter(f, std::numeric_limits<float>::infinity()) : f;
+    return static_cast<double>(f) < v ? std::nextafter(f, std::numeric_limits<float>::infinity())
+                                      : f;
 }
 }  // namespace
 
@@ -53,7 +56,8 @@ bool PrimitiveIndex::describes(const HXDPrimitiveArray& primitives, float backin
     // bytes of an indexed one: equal bytes are the same list.
     return primitives.size() == _count && backingScale == _backingScale && _count > 0 &&
            _revision == HXDDrawPrimitive::hitGeometryRevision() &&
-           std::memcmp(static_cast<const void*>(primitives.data()), _listBytes.data(), _listBytes.size()) == 0;
+           std::memcmp(static_cast<const void*>(primitives.data()), _listBytes.data(),
+                       _listBytes.size()) == 0;
 }
 
 void PrimitiveIndex::clear() {
@@ -166,8 +170,9 @@ void PrimitiveIndex::fillSpans(const HXDPrimitiveArray& primitives, uint32_t col
     // clamps (nothing indexed lies beyond them).
     const double x0 = column == 0 ? -std::numeric_limits<double>::infinity()
                                   : _originX + column * _columnWidth - 1e-6 * _columnWidth;
-    const double x1 = column + 1 == _columns.size() ? std::numeric_limits<double>::infinity()
-                                                    : _originX + (column + 1) * _columnWidth + 1e-6 * _columnWidth;
+    const double x1 = column + 1 == _columns.size()
+                          ? std::numeric_limits<double>::infinity()
+                          : _originX + (column + 1) * _columnWidth + 1e-6 * _columnWidth;
     const double eps = 1e-12 * std::max(std::fabs(x0), std::fabs(x1));
     const double from = std::isfinite(eps) ? x0 - eps : x0;
     const double to = std::isfinite(eps) ? x1 + eps : x1;
@@ -186,15 +191,18 @@ void PrimitiveIndex::fillSpans(const HXDPrimitiveArray& primitives, uint32_t col
     // By their lower edge, so that a test starts near its own height: curves drawn in bands
     // are hundreds to a column, and a pick is near a few.
     const auto first = _columnSpans.begin() + col.spanBegin;
-    std::sort(first, _columnSpans.end(), [](const Entry& a, const Entry& b) { return a.minY < b.minY; });
+    std::sort(first, _columnSpans.end(),
+              [](const Entry& a, const Entry& b) { return a.minY < b.minY; });
     for (auto e = first; e != _columnSpans.end(); ++e)
-        col.tallestSpan = std::max(col.tallestSpan, static_cast<double>(e->maxY) - static_cast<double>(e->minY));
+        col.tallestSpan =
+            std::max(col.tallestSpan, static_cast<double>(e->maxY) - static_cast<double>(e->minY));
 }
 
 std::span<const uint32_t> PrimitiveIndex::walkEntries(const Query& q) {
     // Already in list order.
     for (const Entry& e : _entries) {
-        const bool near = e.kind == Kind::Anywhere || (e.kind == Kind::Box ? q.meets(e) : q.meetsAcross(e));
+        const bool near =
+            e.kind == Kind::Anywhere || (e.kind == Kind::Box ? q.meets(e) : q.meetsAcross(e));
         if (near) _candidates.push_back(e.index);
     }
     return _candidates;
@@ -210,8 +218,8 @@ std::span<const uint32_t> PrimitiveIndex::candidates(const HXDPrimitiveArray& pr
                   w.origin.y + w.size.height,
                   context.worldPerPixelX(),
                   context.worldPerPixelY()};
-    if (!(std::isfinite(q.x0) && std::isfinite(q.y0) && std::isfinite(q.x1) && std::isfinite(q.y1) &&
-          std::isfinite(q.perPixelX) && std::isfinite(q.perPixelY))) {
+    if (!(std::isfinite(q.x0) && std::isfinite(q.y0) && std::isfinite(q.x1) &&
+          std::isfinite(q.y1) && std::isfinite(q.perPixelX) && std::isfinite(q.perPixelY))) {
         // Nothing to bound the test by: every primitive that can be hit is a candidate.
         for (const Entry& e : _entries) _candidates.push_back(e.index);
         return _candidates;
@@ -237,7 +245,8 @@ std::span<const uint32_t> PrimitiveIndex::candidates(const HXDPrimitiveArray& pr
         // A span that meets the test reaches above y0 - gy, so its lower edge lies no lower
         // than that by the tallest span's height; and none starting above y1 + gy meets it.
         const Entry* const spans = _columnSpans.data();
-        const Entry* e = std::lower_bound(spans + col.spanBegin, spans + col.spanEnd, q.y0 - gy - col.tallestSpan,
+        const Entry* e = std::lower_bound(spans + col.spanBegin, spans + col.spanEnd,
+                                          q.y0 - gy - col.tallestSpan,
                                           [](const Entry& a, double y) { return a.minY < y; });
         for (; e != spans + col.spanEnd && e->minY <= q.y1 + gy; ++e)
             if (q.meets(*e)) _candidates.push_back(e->index);
@@ -245,7 +254,8 @@ std::span<const uint32_t> PrimitiveIndex::candidates(const HXDPrimitiveArray& pr
     // The exact tests run in list order, as a walk would; a primitive filed in several
     // columns is found once per column.
     std::sort(_candidates.begin(), _candidates.end());
-    if (c1 > c0) _candidates.erase(std::unique(_candidates.begin(), _candidates.end()), _candidates.end());
+    if (c1 > c0)
+        _candidates.erase(std::unique(_candidates.begin(), _candidates.end()), _candidates.end());
     return _candidates;
 }
 

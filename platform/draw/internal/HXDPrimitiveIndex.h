@@ -51,7 +51,8 @@ public:
     // one the index describes, and the context a valid one whose mapping is axis-aligned
     // (world and pixel rectangles map onto each other). The span stays valid until the next
     // call.
-    std::span<const uint32_t> candidates(const HXDPrimitiveArray& primitives, const HXDHitTestContext& context);
+    std::span<const uint32_t> candidates(const HXDPrimitiveArray& primitives,
+                                         const HXDHitTestContext& context);
 
     size_t size() const { return _count; }
     size_t columnCount() const { return _columns.size(); }

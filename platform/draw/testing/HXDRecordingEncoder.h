@@ -28,7 +28,8 @@ public:
     };
 
     // available = false makes nextDrawable answer null, as when no surface is free.
-    explicit HXDRecordingEncoder(uint32_t width = 640, uint32_t height = 480) : _target(width, height) {}
+    explicit HXDRecordingEncoder(uint32_t width = 640, uint32_t height = 480)
+        : _target(width, height) {}
 
     void setDrawableAvailable(bool available) { _available = available; }
 
@@ -43,9 +44,13 @@ public:
         encoding = false;
         ++framesEnded;
     }
-    void encodeMultiline(const HXDMultiline& m, const HXDRenderingContext&) override { add(Kind::Multiline, m); }
+    void encodeMultiline(const HXDMultiline& m, const HXDRenderingContext&) override {
+        add(Kind::Multiline, m);
+    }
     void encodeLine(const HXDLine& l, const HXDRenderingContext&) override { add(Kind::Line, l); }
-    void encodeQuadTexture(const HXDQuadTexture& q, const HXDRenderingContext&) override { add(Kind::QuadTexture, q); }
+    void encodeQuadTexture(const HXDQuadTexture& q, const HXDRenderingContext&) override {
+        add(Kind::QuadTexture, q);
+    }
     void encodeScreenspaceQuad(const HXDScreenspaceQuad& q, const HXDRenderingContext&) override {
         add(Kind::ScreenspaceQuad, q);
     }

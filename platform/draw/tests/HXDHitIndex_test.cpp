@@ -20,7 +20,8 @@ struct Found {
 };
 
 // The rules of HXDHitTest.h, applied to every primitive of the list in turn.
-std::vector<Found> walk(const HXDPrimitiveArray& list, const HXDHitTestContext& context, bool closest) {
+std::vector<Found> walk(const HXDPrimitiveArray& list, const HXDHitTestContext& context,
+                        bool closest) {
     std::vector<Found> all;
     for (const auto& p : list) {
         if (!p) continue;
@@ -35,7 +36,8 @@ std::vector<Found> walk(const HXDPrimitiveArray& list, const HXDHitTestContext& 
     Found best = all[0];
     for (const Found& f : all) {
         if (f.distance < best.distance ||
-            (f.distance == best.distance && f.primitive->hitPriority() >= best.primitive->hitPriority()))
+            (f.distance == best.distance &&
+             f.primitive->hitPriority() >= best.primitive->hitPriority()))
             best = f;
     }
     return {best};
@@ -49,19 +51,23 @@ protected:
     void installFrame(float backingScale, double shear = 0.0) {
         BNMatrix44f projection = BNViewVolumeProjection(CGRectMake(0, -5, 10, 10));
         projection.set(0, 1, static_cast<float>(shear));
-        controller.updateTexture(nullptr, backingScale, projection, HXDFloat2{0.05f, 0.1f}, CGSizeMake(200, 100));
+        controller.updateTexture(nullptr, backingScale, projection, HXDFloat2{0.05f, 0.1f},
+                                 CGSizeMake(200, 100));
     }
     CGPoint pixel(double x, double y) const {
-        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100)).worldToPixel(x, y);
+        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100))
+            .worldToPixel(x, y);
     }
     HXDHitTestContext at(CGPoint p) const {
         return controller.renderingContextForHitTestAtCoords(HXDFloat2{float(p.x), float(p.y)});
     }
-    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p, bool closest = true) const {
+    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p,
+                                   bool closest = true) const {
         return controller.newHitTestResultForPrimitives(list, at(p), closest);
     }
 
-    static std::shared_ptr<HXDMultiline> curve(double y, double amplitude, float width, int samples, double power = 1.0) {
+    static std::shared_ptr<HXDMultiline> curve(double y, double amplitude, float width, int samples,
+                                               double power = 1.0) {
         std::vector<HXDLineVertex> v;
         for (int i = 0; i < samples; ++i) {
             // power > 1 crowds the samples at the start: the bins' guesses are then far off.
@@ -87,25 +93,31 @@ protected:
             list.push_back(curve(y, 0.3, c % 3 == 0 ? 3.0f : 1.0f, 400, c % 4 == 1 ? 3.0 : 1.0));
             for (int k = 0; k < 10; ++k) {
                 const double x = 0.4 + k + 0.2 * u(rng);
-                auto key = std::make_shared<HXDQuadTexture>(k, image, CGRectMake(x - 0.2, y - 0.4, 0.4, 0.8), 1.0f);
+                auto key = std::make_shared<HXDQuadTexture>(
+                    k, image, CGRectMake(x - 0.2, y - 0.4, 0.4, 0.8), 1.0f);
                 key->setUseTextureAlphaForHitTest(true);
                 list.push_back(key);
                 if (k % 4 == 0)
-                    list.push_back(std::make_shared<HXDQuadTexture>(100 + k, nullptr,
-                                                                    CGRectMake(x + 0.3, y, -0.15, 0.3), 1.0f));
+                    list.push_back(std::make_shared<HXDQuadTexture>(
+                        100 + k, nullptr, CGRectMake(x + 0.3, y, -0.15, 0.3), 1.0f));
             }
         }
         std::vector<HXDLineVertex> ring;
-        for (int i = 0; i < 60; ++i) ring.push_back({{float(5 + 3 * std::cos(i * 0.1)), float(3 * std::sin(i * 0.1)), 0}, {}});
+        for (int i = 0; i < 60; ++i)
+            ring.push_back(
+                {{float(5 + 3 * std::cos(i * 0.1)), float(3 * std::sin(i * 0.1)), 0}, {}});
         auto loop = std::make_shared<HXDMultiline>(std::move(ring));
         loop->setLoop(true);  // its closing chord crosses columns its vertices do not reach
         list.push_back(loop);
         list.push_back(nullptr);
-        list.push_back(std::make_shared<HXDMesh>(7, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{1, 1}, {2, 1}, {1.5, 2}})}));
-        auto outline = std::make_shared<HXDMesh>(8, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{6, -2}, {8, -2}, {8, 0}})});
+        list.push_back(std::make_shared<HXDMesh>(
+            7, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{1, 1}, {2, 1}, {1.5, 2}})}));
+        auto outline = std::make_shared<HXDMesh>(
+            8, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{6, -2}, {8, -2}, {8, 0}})});
         outline->setWireframe(true);
         list.push_back(outline);
-        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(-1, -1, 12, 0.1), 9));  // across everything
+        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(-1, -1, 12, 0.1),
+                                                            9));  // across everything
         list.push_back(std::make_shared<HXDText>(HXDAttributedString{"1.25", HXDTextAttributes{}},
                                                  HXDTextLayoutAnchor::Center, CGPointMake(3, 3)));
         list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(NAN, 0, 1, 1), 10));
@@ -120,18 +132,22 @@ protected:
             const CGPoint p = pixel(ux(rng), uy(rng));
             // Small bands use the columns, wide ones the pass over every entry.
             const double w = trial % 5 == 4 ? 180.0 * band(rng) : 12.0 * band(rng);
-            const HXDHitTestContext contexts[] = {at(p), controller.renderingContextForHitTestInRect(
-                                                             CGRectMake(p.x, p.y, trial % 2 ? w : -w, 8.0 * band(rng)))};
+            const HXDHitTestContext contexts[] = {
+                at(p), controller.renderingContextForHitTestInRect(
+                           CGRectMake(p.x, p.y, trial % 2 ? w : -w, 8.0 * band(rng)))};
             for (const HXDHitTestContext& c : contexts) {
                 for (const bool closest : {true, false}) {
                     const auto got = controller.newHitTestResultForPrimitives(list, c, closest);
                     const auto expected = walk(list, c, closest);
                     ASSERT_EQ(got.size(), expected.size())
-                        << "trial " << trial << (c.kind() == HXDHitTestContext::Kind::Rect ? " band" : " point")
+                        << "trial " << trial
+                        << (c.kind() == HXDHitTestContext::Kind::Rect ? " band" : " point")
                         << " closest " << closest;
                     for (size_t i = 0; i < got.size(); ++i) {
-                        EXPECT_EQ(got[i].primitive().get(), expected[i].primitive) << "trial " << trial << " record " << i;
-                        EXPECT_NEAR(got[i].distance(), expected[i].distance, kPixelTolerance) << "trial " << trial;
+                        EXPECT_EQ(got[i].primitive().get(), expected[i].primitive)
+                            << "trial " << trial << " record " << i;
+                        EXPECT_NEAR(got[i].distance(), expected[i].distance, kPixelTolerance)
+                            << "trial " << trial;
                     }
                 }
             }
@@ -143,7 +159,8 @@ protected:
 
 TEST_F(HitIndexFixture, longList__answersAsAWalkDoesForPointsAndBands) {
     const HXDPrimitiveArray list = frame(1);
-    ASSERT_GE(list.size(), hxd_internal::PrimitiveIndex::kMinPrimitives) << "the list must be long enough to index";
+    ASSERT_GE(list.size(), hxd_internal::PrimitiveIndex::kMinPrimitives)
+        << "the list must be long enough to index";
     expectAgreesWithWalk(list, 11, 400);
     {
         // On a backing scale of 2 the lines reach twice as far: the index is rebuilt for it.
@@ -165,8 +182,10 @@ TEST_F(HitIndexFixture, index__columnsCutTheListAndFindOnlyWhatIsNear) {
     EXPECT_FALSE(index.describes(list, 2.0f)) << "the lines' reach follows the backing scale";
     EXPECT_GT(index.columnCount(), 1u);
     const auto candidates = index.candidates(list, at(pixel(5.0, -4.5)));
-    EXPECT_LT(candidates.size(), list.size() / 8) << "a pick reads the primitives near it, not the list";
-    EXPECT_TRUE(std::is_sorted(candidates.begin(), candidates.end())) << "candidates come in list order";
+    EXPECT_LT(candidates.size(), list.size() / 8)
+        << "a pick reads the primitives near it, not the list";
+    EXPECT_TRUE(std::is_sorted(candidates.begin(), candidates.end()))
+        << "candidates come in list order";
 }
 
 TEST_F(HitIndexFixture, list__aNewFrameInTheSameVectorIsSeen) {
@@ -178,7 +197,8 @@ TEST_F(HitIndexFixture, list__aNewFrameInTheSameVectorIsSeen) {
     const size_t size = list.size();
     list.clear();
     list.push_back(curve(4.8, 0.0, 1.0f, 50));
-    while (list.size() < size) list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, -5, 0.1, 0.1), 1));
+    while (list.size() < size)
+        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, -5, 0.1, 0.1), 1));
     const auto after = pick(list, high);
     ASSERT_EQ(after.size(), 1u) << "the new curve through the point is found";
     EXPECT_EQ(after[0].primitive(), list[0]);
@@ -187,7 +207,8 @@ TEST_F(HitIndexFixture, list__aNewFrameInTheSameVectorIsSeen) {
     list[size / 2] = std::make_shared<HXDScreenspaceQuad>(CGRectMake(4.9, 4.7, 0.2, 0.2), 42);
     const auto replaced = pick(list, high);
     ASSERT_EQ(replaced.size(), 1u);
-    EXPECT_EQ(replaced[0].hitID(), 42u) << "a filled shape on the curve wins, once the index sees it";
+    EXPECT_EQ(replaced[0].hitID(), 42u)
+        << "a filled shape on the curve wins, once the index sees it";
 }
 
 TEST_F(HitIndexFixture, primitive__geometryChangedAfterATestIsSeen) {
@@ -201,7 +222,9 @@ TEST_F(HitIndexFixture, primitive__geometryChangedAfterATestIsSeen) {
     EXPECT_EQ(pick(list, off).size(), 1u) << "a wider line reaches further";
 
     // Left of where the curves start, clear of everything else.
-    auto mesh = std::make_shared<HXDMesh>(5, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{-0.9f, 2}, {-0.5f, 2}, {-0.5f, 2.5f}})});
+    auto mesh = std::make_shared<HXDMesh>(
+        5, HXDBrush{},
+        std::vector<HXDSubmesh>{HXDSubmesh({{-0.9f, 2}, {-0.5f, 2}, {-0.5f, 2.5f}})});
     list.push_back(mesh);
     const CGPoint below = pixel(-0.6, 1.8);  // 2 px below the bottom edge
     EXPECT_TRUE(pick(list, below).empty()) << "outside a filled polygon";
@@ -212,7 +235,8 @@ TEST_F(HitIndexFixture, primitive__geometryChangedAfterATestIsSeen) {
 // Quads reject far tests in world space before mapping themselves: the edges must still
 // decide as the pixel test does.
 TEST_F(HitIndexFixture, quad__edgesDecideAsInPixels) {
-    const auto quad = std::make_shared<HXDScreenspaceQuad>(CGRectMake(6, 1, -2, 2), 1);  // negative width
+    const auto quad =
+        std::make_shared<HXDScreenspaceQuad>(CGRectMake(6, 1, -2, 2), 1);  // negative width
     const CGPoint lo = pixel(4, 1), hi = pixel(6, 3);
     // Points go through single precision on the way in: a thousandth of a pixel inside a
     // corner is on the quad, a hundredth outside is not.
@@ -220,15 +244,21 @@ TEST_F(HitIndexFixture, quad__edgesDecideAsInPixels) {
     for (const CGPoint edge : {lo, hi, CGPointMake(lo.x, hi.y), CGPointMake(hi.x, lo.y)}) {
         const CGPoint in = CGPointMake(edge.x + (edge.x == lo.x ? kJustIn : -kJustIn),
                                        edge.y + (edge.y == lo.y ? kJustIn : -kJustIn));
-        EXPECT_EQ(pick({quad}, in).size(), 1u) << "inside the corner at " << edge.x << ", " << edge.y;
+        EXPECT_EQ(pick({quad}, in).size(), 1u)
+            << "inside the corner at " << edge.x << ", " << edge.y;
         const CGPoint off = CGPointMake(edge.x + (edge.x == lo.x ? -kJustOff : kJustOff), edge.y);
-        EXPECT_TRUE(pick({quad}, off).empty()) << "just beside the corner at " << edge.x << ", " << edge.y;
+        EXPECT_TRUE(pick({quad}, off).empty())
+            << "just beside the corner at " << edge.x << ", " << edge.y;
         const CGRect band = CGRectMake(off.x, off.y, edge.x == lo.x ? -5.0 : 5.0, 1.0);
-        EXPECT_TRUE(controller.newHitTestResultForPrimitives({quad}, controller.renderingContextForHitTestInRect(band), false)
+        EXPECT_TRUE(controller
+                        .newHitTestResultForPrimitives(
+                            {quad}, controller.renderingContextForHitTestInRect(band), false)
                         .empty())
             << "a band just beside the edge";
         const CGRect touching = CGRectMake(edge.x, edge.y, edge.x == lo.x ? -5.0 : 5.0, 1.0);
-        EXPECT_EQ(controller.newHitTestResultForPrimitives({quad}, controller.renderingContextForHitTestInRect(touching), false)
+        EXPECT_EQ(controller
+                      .newHitTestResultForPrimitives(
+                          {quad}, controller.renderingContextForHitTestInRect(touching), false)
                       .size(),
                   1u)
             << "a band touching the edge";

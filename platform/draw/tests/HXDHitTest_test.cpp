@@ -23,16 +23,19 @@ protected:
     void SetUp() override { installFrame(1.0f); }
 
     void installFrame(float backingScale) {
-        controller.updateTexture(nullptr, backingScale, BNViewVolumeProjection(CGRectMake(0, -5, 10, 10)),
+        controller.updateTexture(nullptr, backingScale,
+                                 BNViewVolumeProjection(CGRectMake(0, -5, 10, 10)),
                                  HXDFloat2{0.05f, 0.1f}, CGSizeMake(200, 100));
     }
     CGPoint pixel(double x, double y) const {
-        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100)).worldToPixel(x, y);
+        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100))
+            .worldToPixel(x, y);
     }
     HXDHitTestContext at(CGPoint p) const {
         return controller.renderingContextForHitTestAtCoords(HXDFloat2{float(p.x), float(p.y)});
     }
-    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p, bool closest = true) const {
+    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p,
+                                   bool closest = true) const {
         return controller.newHitTestResultForPrimitives(list, at(p), closest);
     }
 
@@ -54,7 +57,8 @@ protected:
         quad->setUseTextureAlphaForHitTest(true);
         quad->hitInfo().setHitID(kKeypointID);
         quad->hitInfo().extraInfo().setObject("ID", HXDNumber::numberWithInteger(7));
-        quad->hitInfo().extraInfo().setObject("Handle", HXDNumber::numberWithUnsignedLongLong(handle));
+        quad->hitInfo().extraInfo().setObject("Handle",
+                                              HXDNumber::numberWithUnsignedLongLong(handle));
         return quad;
     }
     static std::shared_ptr<HXDMultiline> curve(std::vector<HXDLineVertex> vertices) {
@@ -85,10 +89,12 @@ TEST_F(HitTestFixture, context__beforeAnyFrameFindsNothing) {
     const HXDPrimitiveArray list{curve({{{0, 0, 0}, {}}, {{10, 0, 0}, {}}})};
     const HXDHitTestContext c = fresh.renderingContextForHitTestAtCoords(HXDFloat2{100, 50});
     EXPECT_FALSE(c.isValid());
-    EXPECT_TRUE(fresh.newHitTestResultForPrimitives(list, c, true).empty()) << "no frame: no projection to test with";
+    EXPECT_TRUE(fresh.newHitTestResultForPrimitives(list, c, true).empty())
+        << "no frame: no projection to test with";
 
     HXDPrimitiveArray withNull{nullptr, list[0]};
-    EXPECT_EQ(pick(withNull, pixel(5, 0)).size(), 1u) << "a null entry is skipped, not dereferenced";
+    EXPECT_EQ(pick(withNull, pixel(5, 0)).size(), 1u)
+        << "a null entry is skipped, not dereferenced";
 }
 
 TEST_F(HitTestFixture, multiline__hitOnTheLineAndWithinTheToleranceOnly) {
@@ -108,13 +114,15 @@ TEST_F(HitTestFixture, multiline__hitOnTheLineAndWithinTheToleranceOnly) {
     }
     {
         const CGPoint p = pixel(7.5, 2);
-        EXPECT_TRUE(pick(list, CGPointMake(p.x, p.y + 4)).empty()) << "4 px off a 1 px line is beyond the tolerance";
+        EXPECT_TRUE(pick(list, CGPointMake(p.x, p.y + 4)).empty())
+            << "4 px off a 1 px line is beyond the tolerance";
     }
     {
         // On a backing scale of 2, width 1 covers 2 px and the tolerance 6 px.
         installFrame(2.0f);
         const CGPoint p = pixel(7.5, 2);
-        EXPECT_EQ(pick(list, CGPointMake(p.x, p.y + 6.5)).size(), 1u) << "tolerance follows the backing scale";
+        EXPECT_EQ(pick(list, CGPointMake(p.x, p.y + 6.5)).size(), 1u)
+            << "tolerance follows the backing scale";
     }
 }
 
@@ -127,15 +135,20 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
     for (int i = 0; i < 2000; ++i) {
         const float x = static_cast<float>(i * 10.0 / 1999.0);
         monotone.push_back({{x, static_cast<float>(4.0 * std::sin(x * 3.0)), 0}, {}});
-        wandering.push_back({{static_cast<float>(5 + 4 * std::cos(i * 0.01)), static_cast<float>(4 * std::sin(i * 0.013)), 0}, {}});
+        wandering.push_back({{static_cast<float>(5 + 4 * std::cos(i * 0.01)),
+                              static_cast<float>(4 * std::sin(i * 0.013)), 0},
+                             {}});
     }
     // Jagged: few, long segments, so that each one decides some answers.
     std::vector<HXDLineVertex> jagged;
     std::uniform_real_distribution<double> jy(-4.5, 4.5);
-    for (int i = 0; i < 120; ++i) jagged.push_back({{static_cast<float>(i * 10.0 / 119.0), static_cast<float>(jy(rng)), 0}, {}});
+    for (int i = 0; i < 120; ++i)
+        jagged.push_back(
+            {{static_cast<float>(i * 10.0 / 119.0), static_cast<float>(jy(rng)), 0}, {}});
     auto looped = curve(wandering);
     looped->setLoop(true);
-    const HXDScreenMapping mapping(controller.renderingContext()->projection(), CGSizeMake(200, 100));
+    const HXDScreenMapping mapping(controller.renderingContext()->projection(),
+                                   CGSizeMake(200, 100));
     for (const auto& line : {curve(monotone), curve(jagged), looped}) {
         const auto& v = line->vertices();
         const size_t segments = v.size() - 1 + (line->loop() ? 1 : 0);
@@ -160,18 +173,21 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
                 const HXDLineVertex& b = v[(s + 1) % v.size()];
                 const CGPoint pa = mapping.worldToPixel(a.start.x, a.start.y);
                 const CGPoint pb = mapping.worldToPixel(b.start.x, b.start.y);
-                crossed = hxd_internal::segmentMeetsRect(pa.x, pa.y, pb.x, pb.y, band.origin.x - 0.5, band.origin.y - 0.5,
-                                                         band.origin.x + band.size.width + 0.5,
-                                                         band.origin.y + band.size.height + 0.5);
+                crossed = hxd_internal::segmentMeetsRect(
+                    pa.x, pa.y, pb.x, pb.y, band.origin.x - 0.5, band.origin.y - 0.5,
+                    band.origin.x + band.size.width + 0.5, band.origin.y + band.size.height + 0.5);
             }
-            EXPECT_EQ(controller.newHitTestResultForPrimitives({line}, controller.renderingContextForHitTestInRect(band), false)
+            EXPECT_EQ(controller
+                          .newHitTestResultForPrimitives(
+                              {line}, controller.renderingContextForHitTestInRect(band), false)
                           .size(),
                       crossed ? 1u : 0u)
                 << "band of trial " << trial << " loop " << line->loop();
 
             const auto hits = pick({line}, p);
             const bool expected = best <= 0.5 + 3.0;
-            ASSERT_EQ(!hits.empty(), expected) << "trial " << trial << " loop " << line->loop() << " brute " << best;
+            ASSERT_EQ(!hits.empty(), expected)
+                << "trial " << trial << " loop " << line->loop() << " brute " << best;
             if (expected) {
                 EXPECT_NEAR(hits[0].distance(), std::max(0.0, best - 0.5), kPixelTolerance);
             }
@@ -181,14 +197,16 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
 
 TEST_F(HitTestFixture, multiline__segmentsWithGapsMakeRunsAndLoopsClose) {
     const HXDColor c{1, 0, 0, 1};
-    const HXDLineSegment segs[] = {{{0, 0, 0}, {0, 2, 0}, c}, {{0, 2, 0}, {2, 2, 0}, c}, {{6, 0, 0}, {8, 0, 0}, c}};
+    const HXDLineSegment segs[] = {
+        {{0, 0, 0}, {0, 2, 0}, c}, {{0, 2, 0}, {2, 2, 0}, c}, {{6, 0, 0}, {8, 0, 0}, c}};
     auto line = std::make_shared<HXDMultiline>(std::span<const HXDLineSegment>(segs));
     EXPECT_EQ(line->numberOfRuns(), 2u);
     EXPECT_EQ(line->vertices().size(), 5u) << "chained segments share their vertex";
     EXPECT_TRUE(pick({line}, pixel(4, 1)).empty()) << "the gap between runs is not a segment";
     EXPECT_TRUE(pick({line}, pixel(1, 1)).empty()) << "open: the first run does not close";
     line->setLoop(true);
-    EXPECT_EQ(pick({line}, pixel(1, 1)).size(), 1u) << "loop closes (2,2) back to (0,0) through (1,1)";
+    EXPECT_EQ(pick({line}, pixel(1, 1)).size(), 1u)
+        << "loop closes (2,2) back to (0,0) through (1,1)";
 }
 
 TEST_F(HitTestFixture, keypointQuad__transparentCornerDoesNotHitButTheImageDoes) {
@@ -200,15 +218,18 @@ TEST_F(HitTestFixture, keypointQuad__transparentCornerDoesNotHitButTheImageDoes)
         EXPECT_EQ(hits[0].hitID(), kKeypointID);
         const HXDNumber* handle = hits[0].extraInfo().objectForKey("Handle");
         ASSERT_NE(handle, nullptr);
-        EXPECT_EQ(handle->unsignedLongLongValue(), 0xFFFFFFFF12345678ull) << "a 64-bit handle survives the record";
+        EXPECT_EQ(handle->unsignedLongLongValue(), 0xFFFFFFFF12345678ull)
+            << "a 64-bit handle survives the record";
         EXPECT_EQ(hits[0].extraInfo().objectForKey("ID")->unsignedLongValue(), 7u);
     }
     // The quad spans centre +- 8 px; its 2 x 2 texel corners are the outer 4 px.
     const CGPoint corner = CGPointMake(centre.x + 7, centre.y + 7);
     EXPECT_TRUE(pick({key}, corner).empty()) << "a transparent texel is not the keypoint";
-    EXPECT_EQ(pick({key}, CGPointMake(centre.x + 7, centre.y)).size(), 1u) << "an opaque edge texel is";
+    EXPECT_EQ(pick({key}, CGPointMake(centre.x + 7, centre.y)).size(), 1u)
+        << "an opaque edge texel is";
     key->setUseTextureAlphaForHitTest(false);
-    EXPECT_EQ(pick({key}, corner).size(), 1u) << "without the flag the whole rectangle hits, as tangent handles do";
+    EXPECT_EQ(pick({key}, corner).size(), 1u)
+        << "without the flag the whole rectangle hits, as tangent handles do";
 }
 
 TEST_F(HitTestFixture, closest__keypointOverCurveOverlapsToTheTopOneAndLinesByDistance) {
@@ -218,7 +239,8 @@ TEST_F(HitTestFixture, closest__keypointOverCurveOverlapsToTheTopOneAndLinesByDi
     {
         const auto hits = pick({first, line}, pixel(5, 0));
         ASSERT_EQ(hits.size(), 1u) << "closest answers at most one record";
-        EXPECT_EQ(hits[0].hitID(), kKeypointID) << "the keypoint wins over the curve through it, drawn later or not";
+        EXPECT_EQ(hits[0].hitID(), kKeypointID)
+            << "the keypoint wins over the curve through it, drawn later or not";
     }
     {
         const auto hits = pick({line, first, second}, pixel(5.1, 0));
@@ -231,7 +253,8 @@ TEST_F(HitTestFixture, closest__keypointOverCurveOverlapsToTheTopOneAndLinesByDi
     {
         // A tangent handle near a curve: on the handle it wins; 2 px off the curve and
         // outside the handle, the curve does.
-        auto handle = std::make_shared<HXDQuadTexture>(kOutTangentID, nullptr, CGRectMake(1, 0.5, 0.5, 1.0), 1.0f);
+        auto handle = std::make_shared<HXDQuadTexture>(kOutTangentID, nullptr,
+                                                       CGRectMake(1, 0.5, 0.5, 1.0), 1.0f);
         const auto on = pick({line, handle}, pixel(1.25, 1.0));
         ASSERT_EQ(on.size(), 1u);
         EXPECT_EQ(on[0].hitID(), kOutTangentID);
@@ -247,32 +270,38 @@ TEST_F(HitTestFixture, rectangle__findsKeypointsByTheirOpaqueTexelsAndCurvesThat
     auto c = keypoint(8, -2, 3);
     const CGPoint pa = pixel(2, 0), pb = pixel(5, 2);
     {
-        const CGRect band = CGRectMake(pb.x + 1, pb.y + 1, pa.x - pb.x - 2, pa.y - pb.y - 2);  // negative size
+        const CGRect band =
+            CGRectMake(pb.x + 1, pb.y + 1, pa.x - pb.x - 2, pa.y - pb.y - 2);  // negative size
         const auto hits = controller.newHitTestResultForPrimitives(
             {a, b, c}, controller.renderingContextForHitTestInRect(band), false);
         ASSERT_EQ(hits.size(), 2u) << "the band from b's centre to a's covers both, not c";
-        EXPECT_EQ(hits[0].extraInfo().objectForKey("Handle")->unsignedLongLongValue(), 1u) << "records keep array order";
+        EXPECT_EQ(hits[0].extraInfo().objectForKey("Handle")->unsignedLongLongValue(), 1u)
+            << "records keep array order";
     }
     {
         // A small band over a's transparent top-right corner only.
         const CGRect corner = CGRectMake(pa.x + 6.5, pa.y + 6.5, 1, 1);
         EXPECT_TRUE(controller
-                        .newHitTestResultForPrimitives({a}, controller.renderingContextForHitTestInRect(corner), false)
+                        .newHitTestResultForPrimitives(
+                            {a}, controller.renderingContextForHitTestInRect(corner), false)
                         .empty())
             << "a band over a transparent corner does not select the keypoint";
     }
     {
         auto line = curve({{{0, -4, 0}, {}}, {{10, 4, 0}, {}}});
         const CGPoint mid = pixel(5, 0);
-        const auto crossing = controller.renderingContextForHitTestInRect(CGRectMake(mid.x - 3, mid.y - 3, 6, 6));
+        const auto crossing =
+            controller.renderingContextForHitTestInRect(CGRectMake(mid.x - 3, mid.y - 3, 6, 6));
         EXPECT_EQ(controller.newHitTestResultForPrimitives({line}, crossing, false).size(), 1u);
-        const auto beside = controller.renderingContextForHitTestInRect(CGRectMake(mid.x + 20, mid.y - 3, 6, 6));
+        const auto beside =
+            controller.renderingContextForHitTestInRect(CGRectMake(mid.x + 20, mid.y - 3, 6, 6));
         EXPECT_TRUE(controller.newHitTestResultForPrimitives({line}, beside, false).empty());
     }
 }
 
 TEST_F(HitTestFixture, meshAndFlatQuad__insideHitsOutsideDoesNot) {
-    auto mesh = std::make_shared<HXDMesh>(9, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{2, -2}, {2, 2}, {8, 2}, {8, -2}})});
+    auto mesh = std::make_shared<HXDMesh>(
+        9, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{2, -2}, {2, 2}, {8, 2}, {8, -2}})});
     auto handle = std::make_shared<HXDScreenspaceQuad>(CGRectMake(7.9, 1.8, 0.2, 0.4), 3);
     {
         const auto hits = pick({mesh, handle}, pixel(5, 0));
@@ -291,14 +320,18 @@ TEST_F(HitTestFixture, meshAndFlatQuad__insideHitsOutsideDoesNot) {
 }
 
 TEST_F(HitTestFixture, text__boxFollowsTheAnchorAndTheBackingScale) {
-    HXDText text(HXDAttributedString{"0.50", HXDTextAttributes{}}, HXDTextLayoutAnchor::BottomLeft, CGPointMake(5, 0));
-    const HXDScreenMapping mapping(controller.renderingContext()->projection(), CGSizeMake(200, 100));
+    HXDText text(HXDAttributedString{"0.50", HXDTextAttributes{}}, HXDTextLayoutAnchor::BottomLeft,
+                 CGPointMake(5, 0));
+    const HXDScreenMapping mapping(controller.renderingContext()->projection(),
+                                   CGSizeMake(200, 100));
     const CGRect one = text.pixelRect(mapping, 1.0f);
     const CGRect two = text.pixelRect(mapping, 2.0f);
     EXPECT_NEAR(one.origin.x, 100, kPixelTolerance);
-    EXPECT_NEAR(one.origin.y, 50, kPixelTolerance) << "anchor 0 puts the box's bottom left at the position";
+    EXPECT_NEAR(one.origin.y, 50, kPixelTolerance)
+        << "anchor 0 puts the box's bottom left at the position";
     EXPECT_GT(one.size.width, 0.0);
-    EXPECT_NEAR(two.size.height, 2 * one.size.height, kPixelTolerance) << "a point is two pixels on a 2x backing";
+    EXPECT_NEAR(two.size.height, 2 * one.size.height, kPixelTolerance)
+        << "a point is two pixels on a 2x backing";
 }
 
 }  // namespace

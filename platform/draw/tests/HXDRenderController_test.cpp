@@ -11,10 +11,12 @@ public:
     uint32_t height() const override { return 480; }
 };
 
-TEST(HXDRenderControllerTest, renderingContext__isNullUntilTheFirstFrameThenKeepsTheLastProjection) {
+TEST(HXDRenderControllerTest,
+     renderingContext__isNullUntilTheFirstFrameThenKeepsTheLastProjection) {
     FixedTexture texture;
     HXDRenderController controller(nullptr, 2.0f);
-    EXPECT_EQ(controller.renderingContext(), nullptr) << "no frame yet: conversions must see no context";
+    EXPECT_EQ(controller.renderingContext(), nullptr)
+        << "no frame yet: conversions must see no context";
 
     const BNMatrix44f first = BNViewVolumeProjection(CGRectMake(0, -62.5, 100, 125));
     controller.updateTexture(&texture, 2.0f, first, HXDFloat2{0.125f, 0.25f});

@@ -24,14 +24,19 @@ struct FrameProjection {
     }
 
     BNMatrix44f rowMajor() const { return BNMatrix44f::fromColumnMajor(columnMajor); }
-    CGPoint screenOf(CGPoint world) const { return BNProjectionWorldToScreen(rowMajor(), drawable, world); }
-    CGPoint worldOf(CGPoint screen) const { return BNProjectionScreenToWorld(rowMajor(), drawable, screen); }
+    CGPoint screenOf(CGPoint world) const {
+        return BNProjectionWorldToScreen(rowMajor(), drawable, world);
+    }
+    CGPoint worldOf(CGPoint screen) const {
+        return BNProjectionScreenToWorld(rowMajor(), drawable, screen);
+    }
 };
 
 void expectMatrixNear(const BNMatrix44d& a, const BNMatrix44d& b, double tol, const char* what) {
     for (int r = 0; r < 4; ++r)
         for (int c = 0; c < 4; ++c)
-            EXPECT_NEAR(a.at(r, c), b.at(r, c), tol) << what << ": element (" << r << ", " << c << ")";
+            EXPECT_NEAR(a.at(r, c), b.at(r, c), tol)
+                << what << ": element (" << r << ", " << c << ")";
 }
 
 }  // namespace
@@ -40,11 +45,10 @@ class OrthoProjection : public ::testing::Test {};
 
 TEST_F(OrthoProjection, ortho__matchesConventionalMatrix) {
     const auto m = BNMatrix44d::ortho(-2.0, 6.0, 1.0, 5.0, 0.5, 10.5);
-    const BNMatrix44d expected(std::array<double, 16>{
-        0.25, 0, 0, -0.5,    //
-        0, 0.5, 0, -1.5,     //
-        0, 0, -0.2, -1.1,    //
-        0, 0, 0, 1});
+    const BNMatrix44d expected(std::array<double, 16>{0.25, 0, 0, -0.5,  //
+                                                      0, 0.5, 0, -1.5,   //
+                                                      0, 0, -0.2, -1.1,  //
+                                                      0, 0, 0, 1});
     expectMatrixNear(m, expected, kExact, "OpenGL-style ortho");
 
     const auto z01 = BNMatrix44f::orthoZeroToOne(0.0f, 100.0f, -62.5f, 62.5f, -1.0f, 1.0f);
@@ -71,7 +75,8 @@ TEST_F(OrthoProjection, viewVolumeProjection__matchesDepthZeroToOneOrtho) {
 
 TEST_F(OrthoProjection, ortho__degenerateExtentGivesZeroMatrix) {
     EXPECT_EQ(BNMatrix44d::ortho(1.0, 1.0, 0.0, 1.0, -1.0, 1.0), BNMatrix44d::zero());
-    EXPECT_EQ(BNMatrix44f::orthoZeroToOne(0.0f, 1.0f, 2.0f, 2.0f, -1.0f, 1.0f), BNMatrix44f::zero());
+    EXPECT_EQ(BNMatrix44f::orthoZeroToOne(0.0f, 1.0f, 2.0f, 2.0f, -1.0f, 1.0f),
+              BNMatrix44f::zero());
 }
 
 TEST_F(OrthoProjection, columnMajor__isTheTransposeOfStorage) {
@@ -101,8 +106,10 @@ TEST_F(OrthoProjection, roundTrip__worldToScreenToWorld) {
         const FrameProjection p = FrameProjection::forVolume(c.volume, w, h);
         // Single precision limits the answer to a few float ulps of the larger of the
         // volume's edges, expressed in world units.
-        const double tolX = 16.0 * kFloatUlp * std::fmax(std::fabs(c.volume.origin.x), c.volume.size.width);
-        const double tolY = 16.0 * kFloatUlp * std::fmax(std::fabs(c.volume.origin.y), c.volume.size.height);
+        const double tolX =
+            16.0 * kFloatUlp * std::fmax(std::fabs(c.volume.origin.x), c.volume.size.width);
+        const double tolY =
+            16.0 * kFloatUlp * std::fmax(std::fabs(c.volume.origin.y), c.volume.size.height);
         for (double fx : {0.0, 0.125, 0.5, 0.9}) {
             for (double fy : {0.0, 0.3, 1.0}) {
                 const CGPoint world{c.volume.origin.x + fx * c.volume.size.width,
@@ -122,19 +129,20 @@ TEST_F(OrthoProjection, roundTrip__zeroMatrixAnswersNaN) {
     // Before the first frame there is no projection: the mapping must say "no answer".
     FrameProjection p{{}, CGSizeMake(800.0, 600.0)};
     const CGPoint world = p.worldOf({10.0, 20.0});
-    EXPECT_TRUE(std::isnan(world.x) && std::isnan(world.y)) << "zero projection must give NaN world points";
+    EXPECT_TRUE(std::isnan(world.x) && std::isnan(world.y))
+        << "zero projection must give NaN world points";
     const CGPoint screen = p.screenOf({1.0, 2.0});
-    EXPECT_TRUE(std::isnan(screen.x) && std::isnan(screen.y)) << "zero projection must give NaN screen points";
+    EXPECT_TRUE(std::isnan(screen.x) && std::isnan(screen.y))
+        << "zero projection must give NaN screen points";
 }
 
 class MatrixInverse : public ::testing::Test {};
 
 TEST_F(MatrixInverse, invert__generalMatrixTimesInverseIsIdentity) {
-    const BNMatrix44d a(std::array<double, 16>{
-        2, -1, 0, 3,    //
-        1, 4, 2, -2,    //
-        0, 5, -3, 1,    //
-        7, 0, 1, 0.5});
+    const BNMatrix44d a(std::array<double, 16>{2, -1, 0, 3,  //
+                                               1, 4, 2, -2,  //
+                                               0, 5, -3, 1,  //
+                                               7, 0, 1, 0.5});
     bool ok = false;
     const BNMatrix44d inv = a.inverted(&ok);
     ASSERT_TRUE(ok) << "a well-conditioned matrix must invert";
@@ -143,7 +151,8 @@ TEST_F(MatrixInverse, invert__generalMatrixTimesInverseIsIdentity) {
     EXPECT_NEAR(a.determinant() * inv.determinant(), 1.0, 1e-12);
 
     // A zero on the leading diagonal forces a row swap.
-    const BNMatrix44f swapNeeded(std::array<float, 16>{0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 0, 1, 0, 0, 1, 0});
+    const BNMatrix44f swapNeeded(
+        std::array<float, 16>{0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 0, 1, 0, 0, 1, 0});
     bool okSwap = false;
     const BNMatrix44f invSwap = swapNeeded.inverted(&okSwap);
     ASSERT_TRUE(okSwap);
@@ -159,7 +168,8 @@ TEST_F(MatrixInverse, invert__singularBecomesZeroAndAnswersFalse) {
     }
     {
         // The same in single precision, where the dependent row only cancels up to rounding.
-        BNMatrix44f m(std::array<float, 16>{0.1f, 0.7f, 0.3f, 0, 0.2f, 0.9f, 0.4f, 0, 0.3f, 1.6f, 0.7f, 0, 0, 0, 0, 1});
+        BNMatrix44f m(std::array<float, 16>{0.1f, 0.7f, 0.3f, 0, 0.2f, 0.9f, 0.4f, 0, 0.3f, 1.6f,
+                                            0.7f, 0, 0, 0, 0, 1});
         bool ok = true;
         const BNMatrix44f inv = m.inverted(&ok);
         EXPECT_FALSE(ok) << "a float matrix singular up to rounding must be reported singular";
@@ -225,7 +235,9 @@ TEST_F(MatrixArithmetic, access__outOfRangeIndexIsHarmless) {
 TEST_F(MatrixArithmetic, determinant__knownValues) {
     EXPECT_NEAR(BNMatrix44d::scaling(2.0, 3.0, 4.0).determinant(), 24.0, kExact);
     EXPECT_NEAR(BNMatrix44d::translation(9.0, 8.0, 7.0).determinant(), 1.0, kExact);
-    const BNMatrix44d swapped(std::array<double, 16>{0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1});
+    const BNMatrix44d swapped(
+        std::array<double, 16>{0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1});
     EXPECT_NEAR(swapped.determinant(), -1.0, kExact) << "one row swap flips the sign";
-    EXPECT_EQ(BNMatrix44f(BNMatrix44d::scaling(0.5, 0.5, 0.5)), BNMatrix44f::scaling(0.5f, 0.5f, 0.5f));
+    EXPECT_EQ(BNMatrix44f(BNMatrix44d::scaling(0.5, 0.5, 0.5)),
+              BNMatrix44f::scaling(0.5f, 0.5f, 0.5f));
 }

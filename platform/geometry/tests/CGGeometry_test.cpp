@@ -1,5 +1,5 @@
-#include "platform/geometry/BNRect.h"
 #include "platform/geometry/CGGeometry.h"
+#include "platform/geometry/BNRect.h"
 
 #include <gtest/gtest.h>
 
@@ -31,11 +31,14 @@ TEST_F(RectQueries, edges__negativeSizesAnswerForStandardizedForm) {
 }
 
 TEST_F(RectQueries, containsPoint__halfOpenAndEmpty) {
-    EXPECT_TRUE(CGRectContainsPoint(negativeBoth, CGPointMake(1.0, 2.0))) << "minimum corner is inside";
-    EXPECT_FALSE(CGRectContainsPoint(negativeBoth, CGPointMake(5.0, 3.0))) << "right edge is outside";
+    EXPECT_TRUE(CGRectContainsPoint(negativeBoth, CGPointMake(1.0, 2.0)))
+        << "minimum corner is inside";
+    EXPECT_FALSE(CGRectContainsPoint(negativeBoth, CGPointMake(5.0, 3.0)))
+        << "right edge is outside";
     EXPECT_FALSE(CGRectContainsPoint(negativeBoth, CGPointMake(2.0, 8.0))) << "top edge is outside";
     EXPECT_TRUE(CGRectContainsPoint(negativeWidth, CGPointMake(4.999, 7.999)));
-    EXPECT_FALSE(CGRectContainsPoint(CGRectMake(0, 0, 0, 5), CGPointMake(0, 1))) << "zero width holds nothing";
+    EXPECT_FALSE(CGRectContainsPoint(CGRectMake(0, 0, 0, 5), CGPointMake(0, 1)))
+        << "zero width holds nothing";
     EXPECT_FALSE(CGRectContainsPoint(CGRectNull, CGPointMake(0, 0)));
     EXPECT_TRUE(CGRectContainsPoint(CGRectInfinite, CGPointMake(-1e300, 1e300)));
     EXPECT_FALSE(CGRectContainsPoint(positive, CGPointMake(std::nan(""), 3.0)));
@@ -51,7 +54,8 @@ TEST_F(RectQueries, nullAndEmpty__classification) {
     EXPECT_FALSE(CGRectIsEmpty(negativeBoth));
     EXPECT_TRUE(CGRectIsInfinite(CGRectInfinite));
     EXPECT_FALSE(CGRectIsInfinite(CGRectMake(-1e300, -1e300, 2e300, 2e300)));
-    EXPECT_TRUE(CGRectEqualToRect(CGRectNull, CGRectMake(HUGE_VAL, 0, 5, 5))) << "any null equals null";
+    EXPECT_TRUE(CGRectEqualToRect(CGRectNull, CGRectMake(HUGE_VAL, 0, 5, 5)))
+        << "any null equals null";
     EXPECT_FALSE(CGRectEqualToRect(CGRectNull, CGRectZero));
 }
 
@@ -66,10 +70,12 @@ TEST_F(RectOperations, intersection__disjointTouchingAndNull) {
     }
     {
         const CGRect touching = CGRectMake(10, 0, 5, 10);
-        EXPECT_EQ(CGRectIntersection(a, touching), CGRectMake(10, 0, 0, 10)) << "shared edge: zero width";
+        EXPECT_EQ(CGRectIntersection(a, touching), CGRectMake(10, 0, 0, 10))
+            << "shared edge: zero width";
         EXPECT_FALSE(CGRectIntersectsRect(a, touching)) << "a shared edge is not shared area";
     }
-    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(a, CGRectMake(20, 20, 1, 1)))) << "disjoint gives null";
+    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(a, CGRectMake(20, 20, 1, 1))))
+        << "disjoint gives null";
     EXPECT_TRUE(CGRectIsNull(CGRectIntersection(a, CGRectNull)));
     EXPECT_TRUE(CGRectIsNull(CGRectIntersection(CGRectNull, CGRectNull)));
     EXPECT_FALSE(CGRectIntersectsRect(CGRectNull, CGRectInfinite));
@@ -77,17 +83,20 @@ TEST_F(RectOperations, intersection__disjointTouchingAndNull) {
 
 TEST_F(RectOperations, union__nullIsIdentity) {
     const CGRect a = CGRectMake(4, 4, -2, -2);
-    EXPECT_EQ(CGRectUnion(a, CGRectNull), CGRectMake(2, 2, 2, 2)) << "null is ignored; result standardized";
+    EXPECT_EQ(CGRectUnion(a, CGRectNull), CGRectMake(2, 2, 2, 2))
+        << "null is ignored; result standardized";
     EXPECT_EQ(CGRectUnion(CGRectNull, a), CGRectMake(2, 2, 2, 2));
     EXPECT_TRUE(CGRectIsNull(CGRectUnion(CGRectNull, CGRectNull)));
-    EXPECT_EQ(CGRectUnion(a, CGRectMake(10, -1, 0, 0)), CGRectMake(2, -1, 8, 5)) << "an empty rect still counts";
+    EXPECT_EQ(CGRectUnion(a, CGRectMake(10, -1, 0, 0)), CGRectMake(2, -1, 8, 5))
+        << "an empty rect still counts";
 }
 
 TEST_F(RectOperations, insetOffsetIntegral__standardizeAndCollapse) {
     const CGRect r = CGRectMake(10, 10, -6, -4);  // 4..10 x 6..10
     EXPECT_EQ(CGRectInset(r, 1, 1), CGRectMake(5, 7, 4, 2));
     EXPECT_EQ(CGRectInset(r, -1, 0), CGRectMake(3, 6, 8, 4)) << "negative inset grows";
-    EXPECT_EQ(CGRectInset(r, 3, 2), CGRectMake(7, 8, 0, 0)) << "exactly used up is an empty rect, not null";
+    EXPECT_EQ(CGRectInset(r, 3, 2), CGRectMake(7, 8, 0, 0))
+        << "exactly used up is an empty rect, not null";
     EXPECT_TRUE(CGRectIsNull(CGRectInset(r, 3.5, 0))) << "inset past the centre gives null";
     EXPECT_TRUE(CGRectIsNull(CGRectInset(CGRectNull, -5, -5)));
     EXPECT_EQ(CGRectOffset(r, 1, -1), CGRectMake(5, 5, 6, 4));
@@ -123,7 +132,8 @@ TEST(BNRect, conversions__keepFieldsAndAnswerStandardized) {
     EXPECT_FALSE(r.contains(5.0, 2.0)) << "maximum edge is outside";
     EXPECT_TRUE(BNRect<double>(0, 0, 0, 3).isEmpty());
     EXPECT_EQ(r.intersected(BNRect<double>(4, 7, 10, 10)), BNRect<double>(4, 7, 1, 1));
-    EXPECT_EQ(r.intersected(BNRect<double>(20, 20, 1, 1)), BNRect<double>()) << "disjoint gives zero";
+    EXPECT_EQ(r.intersected(BNRect<double>(20, 20, 1, 1)), BNRect<double>())
+        << "disjoint gives zero";
     EXPECT_FALSE(r.intersects(BNRect<double>(5, 2, 1, 1))) << "touching is not intersecting";
     EXPECT_EQ(r.united(BNRect<double>(-1, 0, 1, 1)), BNRect<double>(-1, 0, 6, 8));
     EXPECT_EQ(BNRect<float>::fromCGRect(CGRectMake(0.5, 1, 2, 3)), BNRect<float>(0.5f, 1, 2, 3));

@@ -17,12 +17,14 @@ double angleBetween(const BNVec2d& a, const BNVec2d& b) {
 TEST(BNAlgorithmTest, findProjection__axisReferenceSnapsExactly) {
     const BNVec2d vertical{0.0, 3.0};
     {
-        const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection({10.0, 1.0}, vertical, 0.0);
+        const BNVec2d r =
+            BNAlgorithm::findProjectionOn45DegreesDirection({10.0, 1.0}, vertical, 0.0);
         EXPECT_EQ(r.x, 10.0) << "a nearly horizontal drag must snap to exactly horizontal";
         EXPECT_EQ(r.y, 0.0);
     }
     {
-        const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection({-0.5, -7.0}, vertical, 0.0);
+        const BNVec2d r =
+            BNAlgorithm::findProjectionOn45DegreesDirection({-0.5, -7.0}, vertical, 0.0);
         EXPECT_EQ(r.x, 0.0) << "a nearly downward drag must snap to exactly vertical";
         EXPECT_EQ(r.y, -7.0);
     }
@@ -47,17 +49,21 @@ TEST(BNAlgorithmTest, findProjection__familyFollowsAnArbitraryReference) {
 
 TEST(BNAlgorithmTest, findProjection__degenerateInputs) {
     {
-        const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection({3.0, 0.4}, {0.0, 0.0}, 0.0);
+        const BNVec2d r =
+            BNAlgorithm::findProjectionOn45DegreesDirection({3.0, 0.4}, {0.0, 0.0}, 0.0);
         EXPECT_EQ(r.x, 3.0) << "a zero reference uses the x axis family";
         EXPECT_EQ(r.y, 0.0);
     }
     {
-        const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection({0.0, 0.0}, {1.0, 2.0}, 0.0);
+        const BNVec2d r =
+            BNAlgorithm::findProjectionOn45DegreesDirection({0.0, 0.0}, {1.0, 2.0}, 0.0);
         EXPECT_EQ(r, (BNVec2d{0.0, 0.0}));
     }
     {
-        const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection({NAN, 1.0}, {1.0, 2.0}, 0.0);
-        EXPECT_TRUE(std::isnan(r.x) && std::isnan(r.y)) << "non-finite input must not pass as a value";
+        const BNVec2d r =
+            BNAlgorithm::findProjectionOn45DegreesDirection({NAN, 1.0}, {1.0, 2.0}, 0.0);
+        EXPECT_TRUE(std::isnan(r.x) && std::isnan(r.y))
+            << "non-finite input must not pass as a value";
     }
 }
 

@@ -47,7 +47,8 @@ TEST_F(RWMenuTest, submenu__knowsItsSupermenuUntilDetached) {
     EXPECT_TRUE(holder->hasSubmenu());
 
     top.removeItemAtIndex(0);
-    EXPECT_EQ(sub->supermenu(), nullptr) << "a removed item's submenu must not point at the old menu";
+    EXPECT_EQ(sub->supermenu(), nullptr)
+        << "a removed item's submenu must not point at the old menu";
     EXPECT_EQ(holder->menu(), nullptr);
 }
 

@@ -46,7 +46,8 @@ TEST(RWPasteboardTest, clearContents__dropsEveryTypeAndCountsChanges) {
     board.setString("c", "public.text");  // replaces, keeps the order of first writing
     EXPECT_EQ(board.types(), (std::vector<std::string>{"public.text", "TQCurveEditorPrivateDrag"}));
     EXPECT_EQ(board.stringForType("public.text"), "c");
-    EXPECT_EQ(board.availableTypeFromArray({"x", "TQCurveEditorPrivateDrag"}), "TQCurveEditorPrivateDrag");
+    EXPECT_EQ(board.availableTypeFromArray({"x", "TQCurveEditorPrivateDrag"}),
+              "TQCurveEditorPrivateDrag");
 
     EXPECT_EQ(board.clearContents(), before + 1);
     EXPECT_TRUE(board.types().empty());
@@ -79,7 +80,8 @@ TEST(RWModalTest, scriptedModal__answersWhatTheScriptEndsWithAndNests) {
     RWWindow inner;
     inner.setTitle("inner");
     modal.pushScript([&](RWWindow&, RWModalService& m) {
-        EXPECT_EQ(m.runModalForWindow(inner), RWModalResponseAbort) << "the inner run has no script left";
+        EXPECT_EQ(m.runModalForWindow(inner), RWModalResponseAbort)
+            << "the inner run has no script left";
         m.stopModalWithCode(RWModalResponseOK);
         m.abortModal();  // too late: the first end wins
     });

@@ -14,7 +14,8 @@ std::vector<TQChannelRef> refs(std::initializer_list<const char*> paths) {
 
 std::vector<BNString> names(const TQCurveSet& set) {
     std::vector<BNString> out;
-    for (const auto& item : set.allItems()) out.push_back(*item->rootName() + ":" + item->simpleName());
+    for (const auto& item : set.allItems())
+        out.push_back(*item->rootName() + ":" + item->simpleName());
     return out;
 }
 
@@ -115,8 +116,9 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoval) {
     set->insertItem(y, 987654);
     EXPECT_EQ(set->numberOfChannelItems(), 2u) << "no such child: nothing inserted";
     set->insertItem(y, z->channelId());
-    EXPECT_EQ(names(*set), (std::vector<BNString>{"Cube:Transform.Position.X", "Cube:Transform.Position.Y",
-                                             "Cube:Transform.Position.Z"}));
+    EXPECT_EQ(names(*set),
+              (std::vector<BNString>{"Cube:Transform.Position.X", "Cube:Transform.Position.Y",
+                                     "Cube:Transform.Position.Z"}));
     EXPECT_EQ(set->channeItemAtIndex(2), z);
     EXPECT_EQ(set->channeItemAtIndex(3), nullptr);
     EXPECT_EQ(set->itemWithIdentifier(y->channelId()), y);

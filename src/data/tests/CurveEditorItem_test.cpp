@@ -25,7 +25,8 @@ protected:
         scene = std::make_unique<TQChannelFolder>("Scene", 0);
         cube = static_cast<TQChannelObjectRootBase*>(
             scene->addChild(std::make_unique<TQChannelObjectRootBase>("Cube", 7)));
-        opacity = static_cast<TQChannel*>(cube->addChild(std::make_unique<TQChannel>("Opacity", 202)));
+        opacity =
+            static_cast<TQChannel*>(cube->addChild(std::make_unique<TQChannel>("Opacity", 202)));
         transform = static_cast<TQChannelFolder*>(
             cube->addChild(std::make_unique<TQChannelFolder>("Transform", 100)));
         position = static_cast<TQCompoundChannel*>(
@@ -60,7 +61,8 @@ protected:
 }  // namespace
 
 TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
-    EXPECT_EQ(channelItem(x)->simpleName(), "Position.X") << "a component reads compound dot component";
+    EXPECT_EQ(channelItem(x)->simpleName(), "Position.X")
+        << "a component reads compound dot component";
     EXPECT_EQ(channelItem(x)->rootName(), std::optional<BNString>("Cube"));
     EXPECT_EQ(channelItem(opacity)->simpleName(), "Opacity") << "naming stops at the object root";
     EXPECT_EQ(channelItem(deep)->simpleName(), "Extra.Deep") << "the parent folder is named";

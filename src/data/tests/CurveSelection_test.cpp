@@ -90,7 +90,8 @@ TEST(TQCurveSelectionList, copyVersusSetSelection__deepAndShared) {
     TQCurveSelectionList shared;
     shared.setSelection(list);
     shared.selectionAtIndex(0)->setFlags(TQSelectionCurve);
-    EXPECT_EQ(list.selectionAtIndex(0)->getFlags(), TQSelectionCurve) << "setSelection shares entries";
+    EXPECT_EQ(list.selectionAtIndex(0)->getFlags(), TQSelectionCurve)
+        << "setSelection shares entries";
 
     list.addSelectionFront(entry(9, TQSelectionKeypoint, 1));
     EXPECT_EQ(list.selectionAtIndex(0)->getHandle(), handle(9));

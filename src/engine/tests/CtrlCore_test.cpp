@@ -20,7 +20,8 @@ TEST_F(CtrlCore, brackets__drag_of_ten_steps_announces_each_channel_once_per_pha
     auto ib = addItem(b);
     ia->setScaleY(1.0);
     ib->setScaleY(1.0);
-    TQCurveSelectionList* list = selectInView({keypointEntry(ia, 1), keypointEntry(ia, 2), keypointEntry(ib, 1)});
+    TQCurveSelectionList* list =
+        selectInView({keypointEntry(ia, 1), keypointEntry(ia, 2), keypointEntry(ib, 1)});
 
     // The drag variant, as the view runs it: one capture, ten value steps, one close.
     ctrl().validateSelection(list);
@@ -36,7 +37,8 @@ TEST_F(CtrlCore, brackets__drag_of_ten_steps_announces_each_channel_once_per_pha
     recorder.endCaptureModifiedChannels();
     recorder.postNotification(kTQNotifyChannelsChanged);
 
-    Seq expected = {"startCaptureModifiedChannels(Move)", "willChangeChannel(A)", "willChangeChannel(B)"};
+    Seq expected = {"startCaptureModifiedChannels(Move)", "willChangeChannel(A)",
+                    "willChangeChannel(B)"};
     for (int step = 0; step < 10; ++step) {
         Seq one = {"willSetChannelValue(A)", "willSetChannelValue(B)", "didSetChannelValue(B)",
                    "didSetChannelValue(A)", "postNotification(0x4)"};
@@ -47,7 +49,8 @@ TEST_F(CtrlCore, brackets__drag_of_ten_steps_announces_each_channel_once_per_pha
     expected.insert(expected.end(), tail.begin(), tail.end());
     EXPECT_EQ(recorder.bracketSequence(), expected);
     EXPECT_EQ(recorder.captureBalance(), 0);
-    EXPECT_NEAR(keyValueAt(a, 1), 1.0, kValueTolerance) << "the drag lands where the last step put it";
+    EXPECT_NEAR(keyValueAt(a, 1), 1.0, kValueTolerance)
+        << "the drag lands where the last step put it";
     EXPECT_NEAR(keyValueAt(b, 1), 1.0, kValueTolerance);
     EXPECT_TRUE(host.canUndo()) << "the host should have recorded the step";
     host.undo();
@@ -69,11 +72,16 @@ TEST_F(CtrlCore, brackets__entry_of_a_removed_channel_is_not_announced) {
 
     const Seq expected = {"postNotification(0x20000)",  // the vanished curve leaves the set
                           "startCaptureModifiedChannels(Reverse Keypoints)",
-                          "willChangeChannel(A)", "willChangeChannel(B)",
-                          "willSetChannelValue(A)", "willSetChannelValue(B)",
-                          "didSetChannelValue(B)", "didSetChannelValue(A)",
-                          "didChangeChannel(B)", "didChangeChannel(A)",
-                          "endCaptureModifiedChannels()", "postNotification(0x8)"};
+                          "willChangeChannel(A)",
+                          "willChangeChannel(B)",
+                          "willSetChannelValue(A)",
+                          "willSetChannelValue(B)",
+                          "didSetChannelValue(B)",
+                          "didSetChannelValue(A)",
+                          "didChangeChannel(B)",
+                          "didChangeChannel(A)",
+                          "endCaptureModifiedChannels()",
+                          "postNotification(0x8)"};
     EXPECT_EQ(recorder.bracketSequence(), expected);
     EXPECT_EQ(ctrl().channelItemWithIdentifier(goneId), nullptr);
     EXPECT_EQ(view.getSelection()->size(), 2u);
@@ -106,7 +114,8 @@ TEST_F(CtrlCore, conversion__round_trip_through_channel_units) {
     item->setOffsetY(-0.75);
     for (double v : {-3.0, 0.0, 0.4, 1e6}) {
         const double channelValue = ctrl().convertToChannelCoords(item.get(), v);
-        EXPECT_NEAR(ctrl().convertFromChannelCoords(item.get(), channelValue), v, kValueTolerance * (1 + std::abs(v)));
+        EXPECT_NEAR(ctrl().convertFromChannelCoords(item.get(), channelValue), v,
+                    kValueTolerance * (1 + std::abs(v)));
     }
     EXPECT_EQ(ctrl().convertToChannelCoords(nullptr, 4.0), 4.0) << "no item: value unchanged";
 }
@@ -156,7 +165,8 @@ TEST_F(CtrlCore, sets__append_remove_and_first_channel) {
         recorder.clearCalls();
         EXPECT_FALSE(ctrl().removeSelectedChannelFromSelectedCurveSet());
         EXPECT_EQ(recorder.count("postNotification"), 0u) << "a set without removal posts nothing";
-        EXPECT_EQ(ctrl().appendChannel(static_cast<TQChannel*>(folder->getChild(0)), plain), nullptr);
+        EXPECT_EQ(ctrl().appendChannel(static_cast<TQChannel*>(folder->getChild(0)), plain),
+                  nullptr);
     }
 }
 
@@ -164,7 +174,8 @@ TEST_F(CtrlCore, linkedParent__ignores_the_controller_flag) {
     TQCompoundChannel* unlinked = addCompound("Free", 2, false, {});
     TQCompoundChannel* linked = addCompound("Tied", 2, true, {});
     ctrl()._linked = true;
-    EXPECT_EQ(ctrl().getChannelsLinkedParent(static_cast<TQChannel*>(unlinked->getChild(0))), nullptr);
+    EXPECT_EQ(ctrl().getChannelsLinkedParent(static_cast<TQChannel*>(unlinked->getChild(0))),
+              nullptr);
     EXPECT_EQ(ctrl().getChannelsLinkedParent(static_cast<TQChannel*>(linked->getChild(0))), linked);
     EXPECT_EQ(ctrl().getChannelsLinkedParent(nullptr), nullptr);
 }
@@ -230,7 +241,8 @@ TEST_F(CtrlValuePanel, showValue__writes_the_accepted_value_in_channel_units) {
 }
 
 TEST_F(CtrlValuePanel, showValue__boolean_channel_opens_no_panel) {
-    auto item = addItem(static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannelBool>("On", 77))));
+    auto item = addItem(
+        static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannelBool>("On", 77))));
     item->channel()->setKeyframe(seconds(1), 1.0);
     selectInView({keypointEntry(item, 1)});
     ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);

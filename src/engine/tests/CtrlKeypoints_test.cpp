@@ -84,11 +84,16 @@ TEST_F(CtrlKeypoints, duplicate__on_two_channels_brackets_and_lands_on_free_fram
     ctrl().menuDuplicate();
 
     const Seq expected = {"startCaptureModifiedChannels(Duplicate Keypoints)",
-                          "willChangeChannel(A)", "willChangeChannel(B)",
-                          "willSetChannelValue(A)", "willSetChannelValue(B)",
-                          "didSetChannelValue(B)", "didSetChannelValue(A)",
-                          "didChangeChannel(B)", "didChangeChannel(A)",
-                          "endCaptureModifiedChannels()", "postNotification(0x8)"};
+                          "willChangeChannel(A)",
+                          "willChangeChannel(B)",
+                          "willSetChannelValue(A)",
+                          "willSetChannelValue(B)",
+                          "didSetChannelValue(B)",
+                          "didSetChannelValue(A)",
+                          "didChangeChannel(B)",
+                          "didChangeChannel(A)",
+                          "endCaptureModifiedChannels()",
+                          "postNotification(0x8)"};
     EXPECT_EQ(recorder.bracketSequence(), expected);
     {
         // The next frame is taken: the copy goes to the first free one after it.
@@ -146,15 +151,19 @@ TEST_F(CtrlKeypoints, lock__mixed_selection_takes_the_opposite_of_the_first) {
 TEST_F(CtrlKeypoints, ease__in_out_and_both_on_their_segments) {
     TQChannel* a = addChannel("A", {{1, 0}, {2, 1}, {3, 0}});
     auto item = addItem(a);
-    for (TQKeyframeHandle h : a->getKeyframes(false)) a->setKeyframeInterpolation(h, kTQInterpolationBezier);
-    const auto interp = [&](double t) { return a->getKeyframeInterpolation(a->getKeyframe(seconds(t))); };
+    for (TQKeyframeHandle h : a->getKeyframes(false))
+        a->setKeyframeInterpolation(h, kTQInterpolationBezier);
+    const auto interp = [&](double t) {
+        return a->getKeyframeInterpolation(a->getKeyframe(seconds(t)));
+    };
     TQCurveSelectionList first;
     first.addSelection(keypointEntry(item, 1));
     TQCurveSelectionList middle;
     middle.addSelection(keypointEntry(item, 2));
     {
         ctrl().easeInSelected(&first);
-        EXPECT_EQ(interp(1), kTQInterpolationBezier) << "the first keypoint has no arriving segment";
+        EXPECT_EQ(interp(1), kTQInterpolationBezier)
+            << "the first keypoint has no arriving segment";
     }
     {
         ctrl().easeBothSelected(&middle);
@@ -187,7 +196,8 @@ TEST_F(CtrlKeypointsOnGrid, addVertex__on_the_grid_and_through_linked_compounds)
         EXPECT_EQ(result, entry);
         EXPECT_TRUE(entry->isKeypoint());
         for (TQChannel* c : pos->getComponents())
-            EXPECT_NE(c->getKeyframe(seconds(2.0)), nullptr) << c->getName() << ": on the frame grid";
+            EXPECT_NE(c->getKeyframe(seconds(2.0)), nullptr)
+                << c->getName() << ": on the frame grid";
         EXPECT_EQ(entry->getHandle(), pos->getComponents()[0]->getKeyframe(seconds(2.0)));
     }
     {
@@ -209,9 +219,12 @@ TEST_F(CtrlKeypoints, menuAddKeyframe__records_one_channel_without_a_capture) {
     auto item = addItem(a);
     selectInView({EngineFixture::curveEntry(item)});
     ctrl().menuAddKeyframe();
-    const Seq expected = {"addChannelToUndo(A,Add Keypoint)", "willChangeChannel(A)",
-                          "willSetChannelValue(A)", "didSetChannelValue(A)",
-                          "didChangeChannel(A)", "postNotification(0x8)"};
+    const Seq expected = {"addChannelToUndo(A,Add Keypoint)",
+                          "willChangeChannel(A)",
+                          "willSetChannelValue(A)",
+                          "didSetChannelValue(A)",
+                          "didChangeChannel(A)",
+                          "postNotification(0x8)"};
     EXPECT_EQ(recorder.bracketSequence(), expected);
     EXPECT_EQ(a->numberOfKeyframes(), 2u);
     ASSERT_EQ(view.getSelection()->size(), 1u);

@@ -32,7 +32,8 @@ private:
 
 class CtrlMovesTest : public EngineFixture {
 protected:
-    TQChannel* addLoggingChannel(const char* name, std::initializer_list<std::pair<double, double>> keys) {
+    TQChannel* addLoggingChannel(const char* name,
+                                 std::initializer_list<std::pair<double, double>> keys) {
         auto* c = static_cast<TQChannel*>(object->addChild(
             std::make_unique<MoveLoggingChannel>(name, nextChannelId++, &moveLog)));
         for (const auto& [t, v] : keys) c->setKeyframe(seconds(t), v);
@@ -48,19 +49,20 @@ TEST_F(CtrlMovesTest, moveSelected__leadingKeypointMovesFirst) {
     {
         SCOPED_TRACE("moved right by 1");
         // The anchor is listed first, the others out of time order on purpose.
-        TQCurveSelectionList* list =
-            selectInView({keypointEntry(item, 2.0), keypointEntry(item, 3.0), keypointEntry(item, 1.0)});
+        TQCurveSelectionList* list = selectInView(
+            {keypointEntry(item, 2.0), keypointEntry(item, 3.0), keypointEntry(item, 1.0)});
         ctrl().moveSelected(list, seconds(3.0), 0.0, 1, 0);
         EXPECT_EQ(moveLog, (std::vector<std::string>{"A@3", "A@2", "A@1"}))
             << "moving forward must start with the latest keypoint";
         EXPECT_EQ(keyTimes(c), (std::vector<double>{2.0, 3.0, 4.0}));
-        EXPECT_NEAR(keyValueAt(c, 4.0), 0.0, kValueTolerance) << "a move in time alone keeps values";
+        EXPECT_NEAR(keyValueAt(c, 4.0), 0.0, kValueTolerance)
+            << "a move in time alone keeps values";
     }
     moveLog.clear();
     {
         SCOPED_TRACE("moved left by 1");
-        TQCurveSelectionList* list =
-            selectInView({keypointEntry(item, 3.0), keypointEntry(item, 4.0), keypointEntry(item, 2.0)});
+        TQCurveSelectionList* list = selectInView(
+            {keypointEntry(item, 3.0), keypointEntry(item, 4.0), keypointEntry(item, 2.0)});
         ctrl().moveSelected(list, seconds(2.0), 0.0, 1, 0);
         EXPECT_EQ(moveLog, (std::vector<std::string>{"A@2", "A@3", "A@4"}))
             << "moving backward must start with the earliest keypoint";
@@ -73,7 +75,8 @@ TEST_F(CtrlMovesTest, moveSelected__groupClampsAtZeroUnlessNegativeAllowed) {
         SCOPED_TRACE("clamped");
         TQChannel* c = addChannel("A", {{0.5, 0.0}, {1.5, 0.0}, {4.0, 0.0}});
         auto item = addItem(c);
-        TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.5), keypointEntry(item, 0.5)});
+        TQCurveSelectionList* list =
+            selectInView({keypointEntry(item, 1.5), keypointEntry(item, 0.5)});
         ctrl().moveSelected(list, seconds(0.5), 0.0, 1, 0);
         EXPECT_EQ(keyTimes(c), (std::vector<double>{0.0, 0.5, 4.0}))
             << "the earliest keypoint must stop at 0 while the other keeps moving";
@@ -83,7 +86,8 @@ TEST_F(CtrlMovesTest, moveSelected__groupClampsAtZeroUnlessNegativeAllowed) {
         ctrl().allowNegativeRange(true);
         TQChannel* c = addChannel("B", {{0.5, 0.0}, {1.5, 0.0}});
         auto item = addItem(c);
-        TQCurveSelectionList* list = selectInView({keypointEntry(item, 1.5), keypointEntry(item, 0.5)});
+        TQCurveSelectionList* list =
+            selectInView({keypointEntry(item, 1.5), keypointEntry(item, 0.5)});
         ctrl().moveSelected(list, seconds(0.5), 0.0, 1, 0);
         EXPECT_EQ(keyTimes(c), (std::vector<double>{-0.5, 0.5}));
     }
@@ -103,7 +107,8 @@ TEST_F(CtrlMovesTest, moveSelected__valueMovesBySameScreenDistanceOnEveryCurve) 
     ctrl().moveSelected(list, seconds(1.0), 6.0, 1, 1);
     EXPECT_NEAR(keyValueAt(a, 1.0), 12.0, kValueTolerance);
     EXPECT_NEAR(keyValueAt(b, 2.0), 150.0, kValueTolerance) << "each curve through its own scale";
-    EXPECT_EQ(keyTimes(b), (std::vector<double>{2.0})) << "a constrained move at the present time keeps it";
+    EXPECT_EQ(keyTimes(b), (std::vector<double>{2.0}))
+        << "a constrained move at the present time keeps it";
 }
 
 // Two selected components of a linked compound of three: the first entry moves the compound,
@@ -134,7 +139,8 @@ TEST_F(CtrlMovesTest, moveSelected__linkedComponentsMoveOnceAlsoUnderOffset) {
         TQCurveSelectionList* list = selectInView({keypointEntry(ix, 1.5), keypointEntry(iy, 1.5)});
         ctrl().moveSelected(list, seconds(3.5), 0.5, 1, 1);
         for (TQChannel* component : components)
-            EXPECT_EQ(keyTimes(component).size(), 2u) << "a move to the same time must not add keyframes";
+            EXPECT_EQ(keyTimes(component).size(), 2u)
+                << "a move to the same time must not add keyframes";
         EXPECT_NEAR(keyValueAt(components[1], 1.5), 0.5, kValueTolerance);
         EXPECT_NEAR(keyValueAt(components[2], 1.5), 0.0, kValueTolerance) << "values are per entry";
     }
@@ -165,7 +171,8 @@ TEST_F(CtrlMovesTest, moves__emptyOrVanishedSelectionDoesNothing) {
     ASSERT_TRUE(set->removeItemWithIdentifier(item->channelId()));
     TQCurveSelectionList* list = selectInView({entry});
     ctrl().moveSelected(list, seconds(2.0), 1.0, 1, 0);
-    EXPECT_EQ(keyTimes(c), (std::vector<double>{1.0})) << "an entry of a removed item must not move";
+    EXPECT_EQ(keyTimes(c), (std::vector<double>{1.0}))
+        << "an entry of a removed item must not move";
     EXPECT_TRUE(list->empty()) << "validateSelection takes the entry out";
 }
 
@@ -243,9 +250,9 @@ TEST_F(CtrlMovesTest, moveSelected__dragOfTenStepsIsOneBracketAndOneUndoStep) {
     recorder.endCaptureModifiedChannels();
     recorder.postNotification(kTQNotifyChannelsChanged);
 
-    std::vector<std::string> expected{"startCaptureModifiedChannels(" +
-                                          TQLocalizedString("Undo Move Keypoint") + ")",
-                                      "willChangeChannel(A)", "willChangeChannel(B)"};
+    std::vector<std::string> expected{
+        "startCaptureModifiedChannels(" + TQLocalizedString("Undo Move Keypoint") + ")",
+        "willChangeChannel(A)", "willChangeChannel(B)"};
     for (int step = 0; step < 10; ++step) {
         expected.insert(expected.end(), {"willSetChannelValue(A)", "willSetChannelValue(B)",
                                          "didSetChannelValue(B)", "didSetChannelValue(A)",

@@ -10,9 +10,9 @@
 namespace engine_test {
 namespace {
 
-constexpr double kPixelTolerance = 1e-2;    // the projection is single precision
-constexpr double kAngleTolerance = 1e-4;    // radians
-constexpr double kOffsetTolerance = 1e-5;   // handle offsets after a screen round trip
+constexpr double kPixelTolerance = 1e-2;   // the projection is single precision
+constexpr double kAngleTolerance = 1e-4;   // radians
+constexpr double kOffsetTolerance = 1e-5;  // handle offsets after a screen round trip
 
 double angleOf(const CGPoint& p) { return std::atan2(p.y, p.x); }
 double lengthOf(const CGPoint& p) { return std::hypot(p.x, p.y); }
@@ -53,8 +53,10 @@ protected:
     CGPoint handleOffset(const Key& k, bool output) const {
         double u = 0.0;
         double v = 0.0;
-        if (output) k.channel->getKeyframeOutputTangents(k.handle, &u, &v, true);
-        else k.channel->getKeyframeInputTangents(k.handle, &u, &v, true);
+        if (output)
+            k.channel->getKeyframeOutputTangents(k.handle, &u, &v, true);
+        else
+            k.channel->getKeyframeInputTangents(k.handle, &u, &v, true);
         return CGPointMake(u, v);
     }
 
@@ -68,7 +70,8 @@ protected:
         double value = 0.0;
         k.channel->getKeyframe(k.handle, nullptr, &value);
         const CGPoint o = handleOffset(k, output);
-        return CGPointMake(k.time + o.x, ctrl().convertFromChannelCoords(k.item.get(), value + o.y));
+        return CGPointMake(k.time + o.x,
+                           ctrl().convertFromChannelCoords(k.item.get(), value + o.y));
     }
 
     // The handle as the user sees it: pixels from its keypoint.
@@ -91,7 +94,8 @@ TEST_F(CtrlTangentsTest, setTangents__brokenPairMovesAlone) {
     const CGPoint inAfter = handleOffset(k, false);
     EXPECT_EQ(inAfter.x, inBefore.x) << "the opposite handle of a broken pair must not change";
     EXPECT_EQ(inAfter.y, inBefore.y);
-    EXPECT_NEAR(screenVector(k, true).y, 90.0, kPixelTolerance) << "the dragged handle follows the pointer";
+    EXPECT_NEAR(screenVector(k, true).y, 90.0, kPixelTolerance)
+        << "the dragged handle follows the pointer";
     EXPECT_EQ(k.item->originalCurveDirty(), 1);
 }
 
@@ -127,7 +131,8 @@ TEST_F(CtrlTangentsTest, setTangents__zeroLengthHandlePulledOutMirrorsInChannelU
     const CGPoint in = handleOffset(k, false);
     EXPECT_NEAR(out.x, 0.4, kOffsetTolerance);
     EXPECT_NEAR(out.y, 0.3, kOffsetTolerance);
-    EXPECT_NEAR(in.x, -0.4, kOffsetTolerance) << "the opposite must be the negation, not a screen copy";
+    EXPECT_NEAR(in.x, -0.4, kOffsetTolerance)
+        << "the opposite must be the negation, not a screen copy";
     EXPECT_NEAR(in.y, -0.3, kOffsetTolerance);
 }
 
@@ -139,12 +144,15 @@ TEST_F(CtrlTangentsTest, setTangents45__snapsToScreenMultiplesOf45) {
         double pointerDegrees;
         double snappedDegrees;
     };
-    for (const Case c : {Case{40.0, 45.0}, Case{80.0, 90.0}, Case{-10.0, 0.0}, Case{150.0, 135.0}}) {
+    for (const Case c :
+         {Case{40.0, 45.0}, Case{80.0, 90.0}, Case{-10.0, 0.0}, Case{150.0, 135.0}}) {
         SCOPED_TRACE(c.pointerDegrees);
         const double a = c.pointerDegrees * std::numbers::pi / 180.0;
-        const CGPoint pointer = view.getPointWorld(key + CGPointMake(100.0 * std::cos(a), 100.0 * std::sin(a)));
+        const CGPoint pointer =
+            view.getPointWorld(key + CGPointMake(100.0 * std::cos(a), 100.0 * std::sin(a)));
         ctrl().setTangents45(entry.get(), pointer.x, pointer.y, 0);
-        EXPECT_NEAR(angleOf(screenVector(k, true)) * 180.0 / std::numbers::pi, c.snappedDegrees, 1e-3)
+        EXPECT_NEAR(angleOf(screenVector(k, true)) * 180.0 / std::numbers::pi, c.snappedDegrees,
+                    1e-3)
             << "with flag clear the steps are absolute screen directions";
     }
 }
@@ -153,8 +161,8 @@ TEST_F(CtrlTangentsTest, setTangents45Selected__sameScreenHandleOnCurvesOfDiffer
     Key a = makeKey("A", 2.0, 0.2, {-0.5, -0.1}, {0.5, 0.1}, false, false, 1.0);
     Key b = makeKey("B", 4.0, 0.5, {-0.2, -0.3}, {0.2, 0.3}, false, false, 2.0);
     Key c = makeKey("C", 6.0, -0.1, {-0.4, 0.0}, {0.4, 0.0}, false, false, 0.5);
-    TQCurveSelectionList* list =
-        selectInView({tangentEntry(a.item, 2.0, true), keypointEntry(b.item, 4.0), keypointEntry(c.item, 6.0)});
+    TQCurveSelectionList* list = selectInView(
+        {tangentEntry(a.item, 2.0, true), keypointEntry(b.item, 4.0), keypointEntry(c.item, 6.0)});
     const CGPoint key = view.getPointScreen(keyWorld(a));
     const CGPoint pointer = view.getPointWorld(key + CGPointMake(60.0, 57.0));
     ctrl().setTangents45Selected(list, pointer.x, pointer.y, 0);
@@ -163,16 +171,19 @@ TEST_F(CtrlTangentsTest, setTangents45Selected__sameScreenHandleOnCurvesOfDiffer
     for (const Key* k : {&b, &c}) {
         SCOPED_TRACE(k->channel->getName());
         const CGPoint got = screenVector(*k, true);
-        EXPECT_NEAR(got.x, expected.x, kPixelTolerance) << "every keypoint gets the same on-screen handle";
+        EXPECT_NEAR(got.x, expected.x, kPixelTolerance)
+            << "every keypoint gets the same on-screen handle";
         EXPECT_NEAR(got.y, expected.y, kPixelTolerance);
     }
-    EXPECT_EQ(list->selectionAtIndex(1)->getFlags(), TQSelectionKeypoint) << "the entry's word is restored";
+    EXPECT_EQ(list->selectionAtIndex(1)->getFlags(), TQSelectionKeypoint)
+        << "the entry's word is restored";
 }
 
 TEST_F(CtrlTangentsTest, breakTangentsSelected__allTakeOppositeOfFirst) {
     Key a = makeKey("A", 2.0, 0.0, {-0.5, 0.0}, {0.5, 0.0}, /*broken*/ true);
     Key b = makeKey("B", 4.0, 0.0, {-0.5, 0.0}, {0.5, 0.0}, /*broken*/ false);
-    TQCurveSelectionList* list = selectInView({keypointEntry(a.item, 2.0), tangentEntry(b.item, 4.0, true)});
+    TQCurveSelectionList* list =
+        selectInView({keypointEntry(a.item, 2.0), tangentEntry(b.item, 4.0, true)});
     ctrl().breakTangentsSelected(list);
     EXPECT_FALSE(a.channel->getKeyframeTangentsBroken(a.handle));
     EXPECT_FALSE(b.channel->getKeyframeTangentsBroken(b.handle)) << "not toggled one by one";

@@ -95,8 +95,8 @@ protected:
 
     // The channel's item, appended to the set through the controller.
     TQCurveEditorChannelItemPtr addItem(TQChannel* channel) {
-        auto item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(
-            ctrl().appendChannel(channel, set));
+        auto item =
+            std::dynamic_pointer_cast<TQCurveEditorChannelItem>(ctrl().appendChannel(channel, set));
         recorder.clearCalls();
         return item;
     }

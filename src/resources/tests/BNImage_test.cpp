@@ -50,7 +50,8 @@ TEST_F(BNImageResources, BNImageForResource__everyKeypointImageAtBothScales) {
         ASSERT_TRUE(plain && retina) << "missing resource";
         EXPECT_EQ(plain->scale(), 1.0);
         EXPECT_EQ(retina->scale(), 2.0);
-        EXPECT_EQ(retina->pixelsWide(), plain->pixelsWide() * 2) << "the 2x file has twice the pixels";
+        EXPECT_EQ(retina->pixelsWide(), plain->pixelsWide() * 2)
+            << "the 2x file has twice the pixels";
         EXPECT_EQ(retina->pixelsHigh(), plain->pixelsHigh() * 2);
         EXPECT_NEAR(retina->size().width, plain->size().width, kSizeTolerance)
             << "both files answer one size in points";
@@ -62,9 +63,9 @@ TEST_F(BNImageResources, BNImageForResource__everyOtherImageInUse) {
     // Tool segments of both editors, the curve set add/remove control, the channel row menu
     // button, and the mini editor strip's reset button and border.
     for (const char* name : {"K_KeyframeEditor_EditKeyframes", "K_KeyframeEditor_SketchKeyframes",
-                             "K_KeyframeEditor_TransformKeyframes", "K_General_Add", "K_General_Remove",
-                             "S_Inspector_ParameterMenu_Normal", "Shared_Inspector_Reset",
-                             "K_Inspector_Gradient-Border"}) {
+                             "K_KeyframeEditor_TransformKeyframes", "K_General_Add",
+                             "K_General_Remove", "S_Inspector_ParameterMenu_Normal",
+                             "Shared_Inspector_Reset", "K_Inspector_Gradient-Border"}) {
         EXPECT_NE(BNImageForResource(name, 1.0), nullptr) << name << " is missing";
         EXPECT_NE(BNImageForResource(name, 2.0), nullptr) << name << "@2x is missing";
     }
@@ -80,9 +81,14 @@ TEST_F(BNImageResources, keypointImages__transparentCornersAndOpaqueCentre) {
             ASSERT_TRUE(image);
             const int w = image->pixelsWide(), h = image->pixelsHigh();
             const int inset = static_cast<int>(scale);  // one point in from each corner
-            for (const auto& [x, y] : {std::pair{0, 0}, {w - 1, 0}, {0, h - 1}, {w - 1, h - 1},
-                                      {inset, inset}, {w - 1 - inset, h - 1 - inset}}) {
-                EXPECT_EQ(image->alphaAt(x, y), 0) << "corner pixel (" << x << ", " << y << ") is not transparent";
+            for (const auto& [x, y] : {std::pair{0, 0},
+                                       {w - 1, 0},
+                                       {0, h - 1},
+                                       {w - 1, h - 1},
+                                       {inset, inset},
+                                       {w - 1 - inset, h - 1 - inset}}) {
+                EXPECT_EQ(image->alphaAt(x, y), 0)
+                    << "corner pixel (" << x << ", " << y << ") is not transparent";
             }
             EXPECT_EQ(image->alphaAt(w / 2, h / 2), 255) << "centre pixel is not opaque";
         }
@@ -105,7 +111,8 @@ TEST_F(BNImageResources, normalKeypoints__drawnInTheirCurveColour) {
                                         px.blue / 255.0 - curve.blue);
             if (d < best) best = d, nearest = k;
         }
-        EXPECT_EQ(nearest, c) << imageName(c, kNormal, false) << " looks like curve colour " << nearest;
+        EXPECT_EQ(nearest, c) << imageName(c, kNormal, false) << " looks like curve colour "
+                              << nearest;
     }
 }
 
@@ -143,7 +150,8 @@ TEST(BNImage, BNImageFromPNGData__rejectsWhatIsNotAPNG) {
     ASSERT_FALSE(files.empty());
     const std::span<const std::uint8_t> whole{files[0].bytes, files[0].size};
     error.clear();
-    EXPECT_EQ(BNImageFromPNGData(whole.first(std::min<std::size_t>(60, whole.size())), 1.0, &error), nullptr);
+    EXPECT_EQ(BNImageFromPNGData(whole.first(std::min<std::size_t>(60, whole.size())), 1.0, &error),
+              nullptr);
     EXPECT_FALSE(error.empty());
 
     // The same file with its compressed pixels damaged: an error, not a crash or a half image.

@@ -10,7 +10,9 @@ constexpr float kExact = 1e-6f;
 
 // WCAG relative luminance of an sRGB colour, and the contrast ratio of two of them.
 double luminance(const GDColor& c) {
-    auto linear = [](double v) { return v <= 0.04045 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4); };
+    auto linear = [](double v) {
+        return v <= 0.04045 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4);
+    };
     return 0.2126 * linear(c.red) + 0.7152 * linear(c.green) + 0.0722 * linear(c.blue);
 }
 double contrast(const GDColor& a, const GDColor& b) {
@@ -35,7 +37,8 @@ TEST(GDColor, curveColors__distinctAndReadableOnTheBackground) {
     for (std::size_t i = 0; i < GDColor::kCurveColorCount; ++i) {
         const GDColor c = *GDColor::curveColorAtIndex(i);
         EXPECT_EQ(c.alpha, 1.0f) << "curve " << i;
-        EXPECT_GT(contrast(c, background), 4.5) << "curve " << i << " is hard to read on the background";
+        EXPECT_GT(contrast(c, background), 4.5)
+            << "curve " << i << " is hard to read on the background";
         // The extrapolated ends are drawn at 0.3 of everything, alpha included: composited
         // over the background they must still differ from it.
         const GDColor dim = c.scaled(0.3f);
@@ -62,7 +65,8 @@ TEST(GDColor, fixedAndThemeColours) {
 
     EXPECT_LT(luminance(GDColor::curveEditorBackgroundColor0()), luminance(grid))
         << "the grid must show as lines on the background";
-    EXPECT_GT(contrast(GDColor::curveEditorTextColor0(), GDColor::curveEditorBackgroundColor0()), 7.0);
+    EXPECT_GT(contrast(GDColor::curveEditorTextColor0(), GDColor::curveEditorBackgroundColor0()),
+              7.0);
     // Tangent lines are drawn in the selection colour with its blue value as their alpha.
     EXPECT_GT(GDColor::selectedCurveColor0().blue, 0.8f) << "tangent lines would be faint";
     EXPECT_GT(contrast(GDColor::lockedCurveColor0(), GDColor::curveEditorBackgroundColor0()), 3.0);

@@ -14,7 +14,9 @@ protected:
             HXDFloat2{static_cast<float>(screen.x), static_cast<float>(screen.y)});
         return rc->newHitTestResultForPrimitives(view.selectionPrimitives(), context, true);
     }
-    std::vector<HXDHitRecord> pickWorld(double x, double y) const { return pickAt(view.getPointScreen(CGPointMake(x, y))); }
+    std::vector<HXDHitRecord> pickWorld(double x, double y) const {
+        return pickAt(view.getPointScreen(CGPointMake(x, y)));
+    }
 
     static uint64_t handleOf(const HXDHitRecord& r) {
         const HXDNumber* h = r.extraInfo().objectForKey("Handle");
@@ -31,21 +33,25 @@ TEST_F(ViewHitTest, pick__keypointCurveAndTransparentCorner) {
     const CGPoint centre = view.getPointScreen(CGPointMake(5.0, 0.0));
     auto hits = pickAt(centre);
     ASSERT_EQ(hits.size(), 1u);
-    EXPECT_EQ(hits[0].hitID(), TQSelectionKeypoint) << "the keypoint wins over the curve through it";
+    EXPECT_EQ(hits[0].hitID(), TQSelectionKeypoint)
+        << "the keypoint wins over the curve through it";
     EXPECT_EQ(handleOf(hits[0]), handleAt(item, 5.0));
 
     // Just inside the top right corner of the image: transparent, and farther from the flat
     // curve than a line takes clicks.
     const KeyframeAsset& asset = view.keyframeAsset(item->colorIndex(), 0, 0);
-    ASSERT_EQ(asset.texture->alphaAt(asset.texture->width() - 1, 0), 0.0f) << "the image needs a transparent corner";
+    ASSERT_EQ(asset.texture->alphaAt(asset.texture->width() - 1, 0), 0.0f)
+        << "the image needs a transparent corner";
     const double half = asset.size.width * 0.5;
-    EXPECT_TRUE(pickAt(centre + CGPointMake(half - 0.5, half - 0.5)).empty()) << "a transparent corner takes no click";
+    EXPECT_TRUE(pickAt(centre + CGPointMake(half - 0.5, half - 0.5)).empty())
+        << "a transparent corner takes no click";
 
     hits = pickAt(view.getPointScreen(CGPointMake(3.0, 0.0)) + CGPointMake(0.0, 2.0));
     ASSERT_EQ(hits.size(), 1u) << "two pixels from the line is on it";
     EXPECT_EQ(hits[0].hitID(), TQSelectionCurve);
     EXPECT_EQ(hits[0].extraInfo().objectForKey("ID")->unsignedLongValue(), item->channelId());
-    EXPECT_TRUE(pickAt(view.getPointScreen(CGPointMake(3.0, 0.0)) + CGPointMake(0.0, 10.0)).empty());
+    EXPECT_TRUE(
+        pickAt(view.getPointScreen(CGPointMake(3.0, 0.0)) + CGPointMake(0.0, 10.0)).empty());
 }
 
 TEST_F(ViewHitTest, pick__onATangentHandleAnswersTheTangentWithItsKeypoint) {
@@ -86,7 +92,8 @@ TEST_F(ViewHitTest, pick__closestOfOverlappingThingsIsTheOnlyRecord) {
         ASSERT_TRUE(frame());
         const auto hits = pickWorld(2.0, 0.5);
         ASSERT_EQ(hits.size(), 1u);
-        EXPECT_EQ(handleOf(hits[0]), handleAt(b, 2.0)) << "of two keypoints on one spot, the primary channel's (on top)";
+        EXPECT_EQ(handleOf(hits[0]), handleAt(b, 2.0))
+            << "of two keypoints on one spot, the primary channel's (on top)";
     }
 }
 
@@ -96,10 +103,12 @@ TEST_F(ViewHitTest, rectangle__findsTheKeypointsItCoversAndNothingElse) {
     const HXDRenderController* rc = view.renderController();
     const CGPoint p0 = view.getPointScreen(CGPointMake(0.5, -0.5));
     const CGPoint p1 = view.getPointScreen(CGPointMake(4.0, 0.5));
-    const auto context = rc->renderingContextForHitTestInRect(CGRectMake(p0.x, p0.y, p1.x - p0.x, p1.y - p0.y));
+    const auto context =
+        rc->renderingContextForHitTestInRect(CGRectMake(p0.x, p0.y, p1.x - p0.x, p1.y - p0.y));
     std::vector<uint64_t> found;
     for (const auto& [id, quads] : view.keypointsPrimitives())
-        for (const HXDHitRecord& r : rc->newHitTestResultForPrimitives(quads, context, false)) found.push_back(handleOf(r));
+        for (const HXDHitRecord& r : rc->newHitTestResultForPrimitives(quads, context, false))
+            found.push_back(handleOf(r));
     const std::vector<uint64_t> expected = {handleAt(item, 1.0), handleAt(item, 3.0)};
     EXPECT_EQ(found, expected);
 }

@@ -11,7 +11,8 @@ namespace {
 class ViewCurvesTest : public ViewDrawFixture {
 protected:
     HXDColor colourOf(const TQCurveEditorChannelItemPtr& item, float factor = 1.0f) const {
-        const GDColor c = TQCurveEditorViewBase::getColorForIndex(item->colorIndex()).scaled(factor);
+        const GDColor c =
+            TQCurveEditorViewBase::getColorForIndex(item->colorIndex()).scaled(factor);
         return HXD_sRGBA(c.red, c.green, c.blue, c.alpha);
     }
     size_t handles(uint32_t which) const { return pickable<HXDQuadTexture>(which).size(); }
@@ -29,18 +30,22 @@ TEST_F(ViewCurvesTest, drawOriginalCurve__dimsAndStipplesTheEndsAndJoinsThePiece
     EXPECT_EQ(before.back().start, middle.front().start) << "the pieces join";
     EXPECT_EQ(middle.back().start, after.front().start);
     EXPECT_FLOAT_EQ(middle.front().start.x, 2.0f) << "the keyed piece starts on the first keypoint";
-    EXPECT_EQ(before.size() + middle.size() + after.size(), 800u + 2u) << "one sample per point, two joins";
+    EXPECT_EQ(before.size() + middle.size() + after.size(), 800u + 2u)
+        << "one sample per point, two joins";
     for (size_t i = 1; i < after.size(); ++i) ASSERT_GT(after[i].start.x, 6.0f) << "vertex " << i;
 
-    EXPECT_EQ(before.front().color, colourOf(item, 0.3f)) << "ends are the curve colour times 0.3, alpha too";
+    EXPECT_EQ(before.front().color, colourOf(item, 0.3f))
+        << "ends are the curve colour times 0.3, alpha too";
     EXPECT_EQ(middle.front().color, colourOf(item));
     EXPECT_TRUE(pieces[0]->stippled() && pieces[2]->stippled() && !pieces[1]->stippled());
     EXPECT_EQ(pieces[2]->stipplePattern(), 0x33333333u);
 
     auto late = linearItem("Late", {{20.0, 0.0}, {30.0, 1.0}});
     ASSERT_TRUE(frame());
-    EXPECT_EQ(curvePieces(late)[0]->vertices().size(), 800u) << "samples before the first keypoint all go first";
-    EXPECT_TRUE(curvePieces(late)[1]->vertices().empty() && curvePieces(late)[2]->vertices().empty());
+    EXPECT_EQ(curvePieces(late)[0]->vertices().size(), 800u)
+        << "samples before the first keypoint all go first";
+    EXPECT_TRUE(curvePieces(late)[1]->vertices().empty() &&
+                curvePieces(late)[2]->vertices().empty());
 }
 
 TEST_F(ViewCurvesTest, drawOriginalCurve__mergesSelectedKeypointsIntoACoarserLine) {
@@ -62,7 +67,8 @@ TEST_F(ViewCurvesTest, drawOriginalCurve__mergesSelectedKeypointsIntoACoarserLin
 
     const auto& middle = curvePieces(item)[1]->vertices();
     ASSERT_EQ(middle.size(), 4u) << "0, the keypoint at 1, 2.5, and the join at 5";
-    EXPECT_EQ(middle[1].start, (HXDFloat3{1.0f, 1.0f, 0.0f})) << "the selected keypoint lies on the line";
+    EXPECT_EQ(middle[1].start, (HXDFloat3{1.0f, 1.0f, 0.0f}))
+        << "the selected keypoint lies on the line";
     EXPECT_FLOAT_EQ(middle[2].start.x, 2.5f) << "a keypoint on a sample is not inserted twice";
 }
 
@@ -74,7 +80,8 @@ TEST_F(ViewCurvesTest, drawOriginalCurve__ghostOnlyForASelectedItemDuringAGestur
     view.setMouseIsDown(1);
     auto ghosts = [&] {
         size_t n = 0;
-        for (const auto& p : view.primitives()) n += p->hitInfo().hitID() == 0 && dynamic_cast<const HXDMultiline*>(p.get());
+        for (const auto& p : view.primitives())
+            n += p->hitInfo().hitID() == 0 && dynamic_cast<const HXDMultiline*>(p.get());
         return n;
     };
     ASSERT_TRUE(frame());
@@ -85,7 +92,8 @@ TEST_F(ViewCurvesTest, drawOriginalCurve__ghostOnlyForASelectedItemDuringAGestur
 }
 
 TEST_F(ViewCurvesTest, drawKeypoint__eachStateShowsItsImageSlot) {
-    auto item = linearItem("States", {{1.0, 0.0}, {2.0, 0.0}, {3.0, 0.0}, {4.0, 0.0}, {5.0, 0.0}, {6.0, 0.0}});
+    auto item = linearItem(
+        "States", {{1.0, 0.0}, {2.0, 0.0}, {3.0, 0.0}, {4.0, 0.0}, {5.0, 0.0}, {6.0, 0.0}});
     TQChannel* c = item->channel();
     auto at = [&](double t) { return c->getKeyframe(seconds(t)); };
     c->setKeyframeEnabled(at(1.0), false);
@@ -97,11 +105,13 @@ TEST_F(ViewCurvesTest, drawKeypoint__eachStateShowsItsImageSlot) {
 
     // (state, selected) of the asset table that each keypoint must show, in time order.
     const uint32_t expected[6][2] = {{3, 1}, {3, 0}, {2, 1}, {2, 0}, {1, 1}, {0, 0}};
-    const char* what[6] = {"disabled, selected", "disabled", "locked, selected", "locked", "selected", "plain"};
+    const char* what[6] = {"disabled, selected", "disabled", "locked, selected", "locked",
+                           "selected",           "plain"};
     const auto quads = pickable<HXDQuadTexture>(TQSelectionKeypoint);
     ASSERT_EQ(quads.size(), 6u);
     for (size_t k = 0; k < 6; ++k) {
-        EXPECT_EQ(quads[k]->texture(), view.keyframeAsset(item->colorIndex(), expected[k][0], expected[k][1]).texture)
+        EXPECT_EQ(quads[k]->texture(),
+                  view.keyframeAsset(item->colorIndex(), expected[k][0], expected[k][1]).texture)
             << "keypoint " << k << " (" << what[k] << ") shows the wrong image";
         EXPECT_EQ(quads[k]->hitInfo().extraInfo().objectForKey("Handle")->unsignedLongLongValue(),
                   reinterpret_cast<uintptr_t>(c->getKeyframes(false)[k]));
@@ -133,11 +143,12 @@ TEST_F(ViewTangentHandlesTest, drawPoints__handlesOnlyOnSelectedEnabledUnlockedK
         size_t in, out;
         const char* what;
     };
-    const Case cases[] = {{{5.0}, false, false, 1, 1, "a middle keypoint shows both"},
-                          {{1.0, 9.0}, false, false, 1, 1, "no input on the first, no output on the last"},
-                          {{}, false, false, 0, 0, "unselected"},
-                          {{5.0}, true, false, 0, 0, "disabled"},
-                          {{1.0, 5.0, 9.0}, false, true, 0, 0, "a locked channel, whatever is selected"}};
+    const Case cases[] = {
+        {{5.0}, false, false, 1, 1, "a middle keypoint shows both"},
+        {{1.0, 9.0}, false, false, 1, 1, "no input on the first, no output on the last"},
+        {{}, false, false, 0, 0, "unselected"},
+        {{5.0}, true, false, 0, 0, "disabled"},
+        {{1.0, 5.0, 9.0}, false, true, 0, 0, "a locked channel, whatever is selected"}};
     for (const Case& k : cases) {
         TQCurveSelectionList* list = view.getSelection();
         list->reset();
@@ -164,9 +175,11 @@ TEST_F(ViewTangentHandlesTest, drawTangent__lineStopsAtTheEllipseAndShortHandles
         if (const auto* l = dynamic_cast<const HXDLine*>(p.get())) line = l;
     const double keypointWidth = view.keyframeAsset(0, 1, 1).size.width / 800.0 * 10.0;
     EXPECT_NEAR(line->start().x, 7.0, 1e-5) << "the line starts at the handle";
-    EXPECT_NEAR(line->end().x, 5.0 + keypointWidth * 0.25, 1e-5) << "and stops a quarter image from the keypoint";
+    EXPECT_NEAR(line->end().x, 5.0 + keypointWidth * 0.25, 1e-5)
+        << "and stops a quarter image from the keypoint";
     const GDColor s = view.selectionColor();
-    EXPECT_EQ(line->color(), HXD_sRGBA(s.red, s.green, s.blue, s.blue)) << "the fourth component is blue, kept so";
+    EXPECT_EQ(line->color(), HXD_sRGBA(s.red, s.green, s.blue, s.blue))
+        << "the fourth component is blue, kept so";
 }
 
 TEST_F(ViewCurvesTest, drawPoints__onABackingScaleOfTwoImagesCoverTwiceThePixels) {
@@ -191,7 +204,8 @@ TEST_F(ViewCurvesTest, drawKeypoint__valueLabelNearTheTopRightIsMovedBackInside)
     selectInView({keypointEntry(item, 9.95)});
     view.setPrintText(1);
     ASSERT_TRUE(frame());
-    ASSERT_EQ(encoder.count(HXDRecordingEncoder::Kind::Text), 1u) << "the primary selected keypoint is labelled";
+    ASSERT_EQ(encoder.count(HXDRecordingEncoder::Kind::Text), 1u)
+        << "the primary selected keypoint is labelled";
     const HXDText* label = nullptr;
     for (const auto& p : view.primitives())
         if (const auto* t = dynamic_cast<const HXDText*>(p.get())) label = t;

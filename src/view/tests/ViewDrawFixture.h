@@ -44,7 +44,8 @@ protected:
     }
 
     // A linear channel with its item, selected for nothing.
-    TQCurveEditorChannelItemPtr linearItem(const char* name, std::initializer_list<std::pair<double, double>> keys) {
+    TQCurveEditorChannelItemPtr linearItem(const char* name,
+                                           std::initializer_list<std::pair<double, double>> keys) {
         TQChannel* c = addChannel(name, keys);
         c->setInterpolation(kTQInterpolationLinear);
         return addItem(c);

@@ -23,11 +23,13 @@ TEST_F(ViewFrameTest, displayLayer__twoRequestsInsideTheGapCollapseIntoOneDelaye
     EXPECT_EQ(encoder.framesBegun, 1) << "nothing was encoded inside the gap";
 
     timer.advance(0.034);
-    EXPECT_EQ(viewHost.redrawRequests(), redrawsBefore + 1) << "the delayed request asks the host once";
+    EXPECT_EQ(viewHost.redrawRequests(), redrawsBefore + 1)
+        << "the delayed request asks the host once";
     EXPECT_TRUE(view.displayLayer(&encoder));
     clock.advance(0.001);
     EXPECT_FALSE(view.displayLayer(&encoder));
-    EXPECT_EQ(timer.requests().size(), 2u) << "after a frame the next early request schedules again";
+    EXPECT_EQ(timer.requests().size(), 2u)
+        << "after a frame the next early request schedules again";
 }
 
 TEST_F(ViewFrameTest, displayLayer__withoutADrawableSkipsTheFrameButRestartsTheGate) {
@@ -67,15 +69,18 @@ TEST_F(ViewFrameTest, drawCurveEditor__drawsFromLastToFirstWithThePrimaryChannel
         if (p->hitInfo().hitID() == TQSelectionCurve && (order.empty() || order.back() != idOf(*p)))
             order.push_back(idOf(*p));
     const std::vector<int64_t> expected = {c->channelId(), a->channelId(), b->channelId()};
-    EXPECT_EQ(order, expected) << "C and A in reverse order, B last; the disabled item is not drawn";
+    EXPECT_EQ(order, expected)
+        << "C and A in reverse order, B last; the disabled item is not drawn";
 
     ASSERT_EQ(encoder.entries.size(), view.primitives().size());
     for (size_t i = 0; i < encoder.entries.size(); ++i)
-        ASSERT_EQ(encoder.entries[i].primitive, view.primitives()[i].get()) << "primitive " << i << " out of order";
+        ASSERT_EQ(encoder.entries[i].primitive, view.primitives()[i].get())
+            << "primitive " << i << " out of order";
     const GDColor bg = view.backgroundColor();
     EXPECT_EQ(encoder.clearColor, HXD_sRGBA(bg.red, bg.green, bg.blue, bg.alpha));
     ASSERT_TRUE(frame());
-    EXPECT_EQ(view.keypointsPrimitives().at(a->channelId()).size(), 2u) << "each frame starts from empty lists";
+    EXPECT_EQ(view.keypointsPrimitives().at(a->channelId()).size(), 2u)
+        << "each frame starts from empty lists";
 }
 
 TEST_F(ViewFrameTest, drawCurveEditor__fitsAFlatCurveAtZeroToOffsetZero) {
@@ -97,9 +102,12 @@ TEST_F(ViewFrameTest, setupMetalRender__loadsEveryImageAtTheBackingScale) {
         for (uint32_t state = 0; state < 4; ++state)
             for (uint32_t selected = 0; selected < 2; ++selected) {
                 const KeyframeAsset& asset = view.keyframeAsset(c, state, selected);
-                auto image = BNImageForResource(TQKeyframeImages::imageName(c, state, selected != 0), 2.0);
-                ASSERT_TRUE(asset.texture && image) << "colour " << c << " state " << state << " selected " << selected;
-                EXPECT_EQ(asset.texture->width(), static_cast<uint32_t>(image->pixelsWide())) << "the @2x file";
+                auto image =
+                    BNImageForResource(TQKeyframeImages::imageName(c, state, selected != 0), 2.0);
+                ASSERT_TRUE(asset.texture && image)
+                    << "colour " << c << " state " << state << " selected " << selected;
+                EXPECT_EQ(asset.texture->width(), static_cast<uint32_t>(image->pixelsWide()))
+                    << "the @2x file";
                 EXPECT_EQ(asset.size, image->size()) << "sizes are in points";
             }
     EXPECT_EQ(view.keyframeAsset(0, 1, 1).texture, view.keyframeAsset(7, 1, 1).texture)
@@ -110,7 +118,8 @@ TEST_F(ViewFrameTest, setupMetalRender__loadsEveryImageAtTheBackingScale) {
 TEST_F(ViewFrameTest, getScaleAndCoordinates__formatValuesByChannelType) {
     auto plain = addItem(addChannel("Plain", {{0.0, 1.0}}));
     EXPECT_EQ(view.getScale(plain.get(), 3.14159), "3.14");
-    auto* gain = static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannelDecibel>("Gain", nextChannelId++)));
+    auto* gain = static_cast<TQChannel*>(
+        object->addChild(std::make_unique<TQChannelDecibel>("Gain", nextChannelId++)));
     auto decibels = addItem(gain);
     EXPECT_EQ(view.getScale(decibels.get(), 10.0), "20") << "amplitude 10 is 20 dB";
     object->removeChild(gain);
@@ -128,7 +137,8 @@ TEST_F(ViewFrameTest, setVisibleOriginalCurveDirty__marksOnlyWhatTheHostReportsC
     auto changed = linearItem("Changed", {{1.0, 0.0}, {5.0, 0.5}});
     auto still = linearItem("Still", {{1.0, 0.0}, {5.0, 0.5}});
     ASSERT_TRUE(frame());
-    ASSERT_FALSE(changed->originalCurveDirty() || still->originalCurveDirty()) << "a frame caches every curve";
+    ASSERT_FALSE(changed->originalCurveDirty() || still->originalCurveDirty())
+        << "a frame caches every curve";
     changed->channel()->noteWillChange(true);
     view.setVisibleOriginalCurveDirty(1);
     EXPECT_TRUE(changed->originalCurveDirty());

@@ -24,7 +24,8 @@ inline constexpr double kDragTolerance = 1e-3;
 
 class ViewMouseFixture : public ViewDrawFixture {
 protected:
-    RWEvent mouseAt(RWEventType type, const CGPoint& world, uint64_t mods, int64_t clicks = 1) const {
+    RWEvent mouseAt(RWEventType type, const CGPoint& world, uint64_t mods,
+                    int64_t clicks = 1) const {
         return RWEvent::mouseEvent(type, view.getPointScreen(world), mods, clicks);
     }
     void down(double t, double v, uint64_t mods = 0, int64_t clicks = 1) {
@@ -46,14 +47,16 @@ protected:
     // The keyframe handles of the view's selection, in order.
     std::vector<TQKeyframeHandle> selectedHandles() {
         std::vector<TQKeyframeHandle> out;
-        for (const auto& e : view.getSelection()->getSelectionArray()) out.push_back(e->getHandle());
+        for (const auto& e : view.getSelection()->getSelectionArray())
+            out.push_back(e->getHandle());
         return out;
     }
     static TQKeyframeHandle keyAt(const TQCurveEditorChannelItemPtr& item, double t) {
         return item->channel()->getKeyframe(seconds(t));
     }
     // The keyframe's time and value, or NaNs when the handle is stale.
-    static std::pair<double, double> keyOf(const TQCurveEditorChannelItemPtr& item, TQKeyframeHandle h) {
+    static std::pair<double, double> keyOf(const TQCurveEditorChannelItemPtr& item,
+                                           TQKeyframeHandle h) {
         CMTime t = kCMTimeInvalid;
         double v = 0.0;
         if (!item->channel()->getKeyframe(h, &t, &v)) return {NAN, NAN};

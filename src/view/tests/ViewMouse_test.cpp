@@ -20,7 +20,8 @@ TEST_F(ViewMouseEdit, drag__fromAnUnselectedKeypointMovesItAlone) {
     ASSERT_TRUE(frame());
 
     down(5.0, 0.0);
-    ASSERT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{k5}) << "the click replaces the selection";
+    ASSERT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{k5})
+        << "the click replaces the selection";
     dragTo(5.25, 0.2);
     dragTo(5.5, 0.5);
     up(5.5, 0.5);
@@ -135,7 +136,8 @@ TEST_F(ViewMouseEdit, mouseDragged__stepsAreGatedToThirtyASecondWithoutLosingMov
     dragTo(5.5, 0.0, 0, 0.01);  // inside the gap: dropped whole
     EXPECT_NEAR(keyOf(item, k).first, 5.25, kDragTolerance);
     dragTo(6.0, 0.0);
-    EXPECT_NEAR(keyOf(item, k).first, 6.0, kDragTolerance) << "the next step measures from the last that ran";
+    EXPECT_NEAR(keyOf(item, k).first, 6.0, kDragTolerance)
+        << "the next step measures from the last that ran";
     up(6.0, 0.0);
 }
 
@@ -187,7 +189,8 @@ TEST_F(ViewMouseEdit, click__commandFlattensOptionOnACurveAddsAKeypoint) {
         click(6.5, y, kOption);
         EXPECT_EQ(keyTimes(c).size(), 4u) << "a keypoint was added on the curve";
         ASSERT_EQ(view.getSelection()->size(), 1u);
-        EXPECT_TRUE(view.getSelection()->selectionAtIndex(0)->isKeypoint()) << "the new keypoint is selected";
+        EXPECT_TRUE(view.getSelection()->selectionAtIndex(0)->isKeypoint())
+            << "the new keypoint is selected";
         EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Add keypoint"));
     }
     {
@@ -218,7 +221,8 @@ TEST_F(ViewMouseEdit, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
     RWResetServices();
 
     EXPECT_EQ(modal.runs().size(), 1u) << "the second click of the pair opens the panel";
-    EXPECT_NEAR(keyValueAt(item->channel(), 5.0), 0.75, kValueTolerance) << "the typed value is set";
+    EXPECT_NEAR(keyValueAt(item->channel(), 5.0), 0.75, kValueTolerance)
+        << "the typed value is set";
     EXPECT_EQ(host.undoStack().undoCount(), 1u);
     EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Keypoint"));
     ASSERT_TRUE(host.undo());
@@ -250,7 +254,8 @@ TEST_F(ViewMouseEdit, tangent__optionClickBreaksAndShiftDragStepsBy45DegreesFrom
     double v = 0.0;
     c->getKeyframeOutputTangents(k, &u, &v);
     const double steps = (std::atan2(v * 200.0, u * 80.0) - original) / (M_PI / 4.0);
-    EXPECT_NEAR(steps, std::round(steps), 1e-3) << "the handle turned by whole 45-degree steps on screen";
+    EXPECT_NEAR(steps, std::round(steps), 1e-3)
+        << "the handle turned by whole 45-degree steps on screen";
     EXPECT_NE(std::round(steps), 0.0) << "and followed the pointer upward";
     double inU = 0.0;
     double inV = 0.0;
@@ -322,7 +327,8 @@ TEST_F(ViewMouseEdit, spaceDrag__pansOrWithCommandZoomsShowingWhichInTheCursor) 
     dragTo(3.0, 0.5);  // 80 px left
     EXPECT_EQ(lastCursor(), RWCursor::OpenHand);
     ASSERT_EQ(range().offsets.size(), 1u) << "a pan moves the display range";
-    EXPECT_NEAR(range().offsets[0], 1.0, kDragTolerance) << "by the pointer's movement, the other way";
+    EXPECT_NEAR(range().offsets[0], 1.0, kDragTolerance)
+        << "by the pointer's movement, the other way";
     EXPECT_EQ(range().panned.size(), 1u);
 
     // With Command, a drag to the right magnifies time about where the drag began.
@@ -337,7 +343,8 @@ TEST_F(ViewMouseEdit, spaceDrag__pansOrWithCommandZoomsShowingWhichInTheCursor) 
     up(2.0, 0.5, kCommand);
 
     EXPECT_TRUE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
-    EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " "))) << "the space bar is released";
+    EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")))
+        << "the space bar is released";
 }
 
 }  // namespace

@@ -28,11 +28,13 @@ TEST_F(ViewPick, rubberBand__selectsTheKeypointsItCoversAndNothingElse) {
     dragTo(3.0, 0.0);
     dragTo(6.0, -0.5);
     EXPECT_TRUE(view.selecting());
-    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k5})) << "the band replaces the selection";
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k5}))
+        << "the band replaces the selection";
     up(6.0, -0.5);
     EXPECT_FALSE(view.selecting());
     EXPECT_EQ(view.getSelectionViewVolume(), CGRectZero) << "the band is forgotten at mouse up";
-    EXPECT_EQ(countCalls("postNotification"), 0u) << "a plain band changes no channel and posts nothing";
+    EXPECT_EQ(countCalls("postNotification"), 0u)
+        << "a plain band changes no channel and posts nothing";
     EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 0u);
 
     // A band that covers only the curve between keypoints takes nothing.
@@ -52,7 +54,8 @@ TEST_F(ViewPick, rubberBand__withShiftInvertsMembership) {
     EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k8}))
         << "the covered selected keypoint leaves, the covered unselected one joins at the end";
     dragTo(9.5, -0.5, kShift);
-    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k8})) << "each step starts from mouse down's selection";
+    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k8}))
+        << "each step starts from mouse down's selection";
     up(9.5, -0.5, kShift);
 
     // Dragged leftward, new keypoints join at the front, each in front of the one before.
@@ -94,10 +97,12 @@ TEST_F(ViewPick, pick__otherToolsMakeNoEntry) {
         ctrl().setCurrentTool(2);
         view.pick(onKey);
         EXPECT_TRUE(view.getCurrentSelection()->empty()) << "box, no band";
-        EXPECT_EQ(view.getCurrentActivePart(), TQSelectionKeypoint) << "the box tool records the hit id";
+        EXPECT_EQ(view.getCurrentActivePart(), TQSelectionKeypoint)
+            << "the box tool records the hit id";
         view.setSelecting(1);
         view.pick(onKey);
-        EXPECT_EQ(view.getCurrentSelection()->size(), 1u) << "during a band the box tool takes keypoints";
+        EXPECT_EQ(view.getCurrentSelection()->size(), 1u)
+            << "during a band the box tool takes keypoints";
         view.setSelecting(0);
     }
 }
@@ -127,7 +132,8 @@ TEST_F(ViewPick, validateSelectedHandles__matchesByTimeAndDropsDeletedKeypoints)
 
     view.validateSelectedHandles(&saved);
     ASSERT_EQ(view.getSelection()->size(), 2u);
-    EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{keyAt(item, 8.0), keyAt(item, 2.0)}))
+    EXPECT_EQ(selectedHandles(),
+              (std::vector<TQKeyframeHandle>{keyAt(item, 8.0), keyAt(item, 2.0)}))
         << "order kept, value ignored";
 }
 
@@ -140,7 +146,8 @@ TEST_F(ViewPick, selectAll__skipsDisabledItemsAndTakesLockedKeypoints) {
 
     view.selectAll();
     EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k5, k8}));
-    for (const auto& e : view.getSelection()->getSelectionArray()) EXPECT_EQ(e->getFlags(), TQSelectionKeypoint);
+    for (const auto& e : view.getSelection()->getSelectionArray())
+        EXPECT_EQ(e->getFlags(), TQSelectionKeypoint);
     view.selectNone();
     EXPECT_TRUE(view.getSelection()->empty());
 }

@@ -23,7 +23,8 @@ TEST_F(ViewMappingTest, getPointScreen__mapsTheVolumeOntoDrawablePixels) {
     {
         // 5.0031 s lies at 400.248 px: it snaps back to the pixel at 400.
         const CGPoint snapped = view.adjustWorldPointToScreen(CGPointMake(5.0031, 0.0));
-        EXPECT_NEAR(snapped.x, 5.0, kWorldTolerance) << "the point must move onto the nearest pixel";
+        EXPECT_NEAR(snapped.x, 5.0, kWorldTolerance)
+            << "the point must move onto the nearest pixel";
     }
     {
         // Drawable pixels, not points: twice as many at a backing scale of 2.
@@ -68,14 +69,15 @@ TEST_F(ViewZoomTest, zoomWithFactor__clampsTheVerticalFactorAndLeavesFactorOneAl
         view.zoomWithFactor(1.0, 0.001);
         EXPECT_DOUBLE_EQ(view.zoomY(), 0.0078125);
         EXPECT_DOUBLE_EQ(view.gridZoomY(), 128.0);
-        EXPECT_NEAR(view.getCurrentViewVolume().origin.y + view.getCurrentViewVolume().size.height * 0.5, 0.0,
-                    kValueTolerance)
+        EXPECT_NEAR(
+            view.getCurrentViewVolume().origin.y + view.getCurrentViewVolume().size.height * 0.5,
+            0.0, kValueTolerance)
             << "the vertical zoom is about the centre";
     }
     {
         view.zoomWithFactor(2.0, 1.0);
-        expectRectNear(view.getCurrentViewVolume(), CGRectMake(2.5, -128.0, 5.0, 256.0), kWorldTolerance,
-                       "x zoom by 2 about the reference centre");
+        expectRectNear(view.getCurrentViewVolume(), CGRectMake(2.5, -128.0, 5.0, 256.0),
+                       kWorldTolerance, "x zoom by 2 about the reference centre");
         EXPECT_NEAR(view.zoomX(), 2.0, kWorldTolerance);
     }
     EXPECT_EQ(postedWords(), (std::vector<TQNotificationWord>(3, kTQNotifyViewVolumeChanged)));
@@ -94,7 +96,8 @@ TEST_F(ViewZoomTest, zoom__keepsTheAnchorUnderThePointerAndRoundTrips) {
     EXPECT_NEAR(view.zoomY(), 1.2, kWorldTolerance);
     EXPECT_DOUBLE_EQ(view.gridZoomY(), 1.0);
     const CGPoint anchorAfter = view.getPointScreen(anchor);
-    EXPECT_NEAR(anchorAfter.x, anchorPixel.x, kPixelTolerance) << "the anchor must stay under the pointer";
+    EXPECT_NEAR(anchorAfter.x, anchorPixel.x, kPixelTolerance)
+        << "the anchor must stay under the pointer";
     EXPECT_NEAR(anchorAfter.y, anchorPixel.y, kPixelTolerance);
     for (const CGPoint p : {CGPointMake(0, 0), CGPointMake(123.5, 377.25), CGPointMake(800, 400)}) {
         const CGPoint back = view.getPointScreen(view.getPointWorld(p));
@@ -134,7 +137,8 @@ protected:
 TEST_F(ViewPanTest, pan__roundTripsBetweenScreenAndWorld) {
     startAt(2.0);
     view.pan(-80.0, -40.0);  // content moves left and down: the view goes right and up
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(3.0, -1.2, 10.0, 2.0), kWorldTolerance, "first pan");
+    expectRectNear(view.getCurrentViewVolume(), CGRectMake(3.0, -1.2, 10.0, 2.0), kWorldTolerance,
+                   "first pan");
     view.drawProjection();
     view.pan(80.0, 40.0);
     expectRectNear(view.getCurrentViewVolume(), CGRectMake(2.0, -1.0, 10.0, 2.0), kWorldTolerance,
@@ -158,8 +162,10 @@ TEST_F(ViewPanTest, scrollWheel__foldsQueuedWheelEventsIntoOnePan) {
     view.scrollWheel(RWEvent::scrollWheelEvent(0.0, 1.0));
     // Four events of 1 line each, four pixels a line: 16 px of a 400 px, 2-unit view.
     EXPECT_NEAR(view.getCurrentViewVolume().origin.y, -1.0 + 0.08, kWorldTolerance);
-    EXPECT_EQ(range().panned, std::vector<double>{8.0}) << "one scroller update for the whole batch";
-    EXPECT_EQ(postedWords(), (std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged, kTQNotifyChannelsChanging}));
+    EXPECT_EQ(range().panned, std::vector<double>{8.0})
+        << "one scroller update for the whole batch";
+    EXPECT_EQ(postedWords(), (std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged,
+                                                              kTQNotifyChannelsChanging}));
     EXPECT_EQ(viewHost.queuedCount(), 1u) << "only wheel events are taken off the queue";
 }
 
@@ -252,7 +258,8 @@ TEST_F(ViewFramingTest, resets__restoreTheReferenceVolumeAndPostOnce) {
     recorder.clearCalls();
 
     view.resetZoom();
-    expectRectNear(view.getCurrentViewVolume(), view.getOriginalViewVolume(), kWorldTolerance, "reset zoom");
+    expectRectNear(view.getCurrentViewVolume(), view.getOriginalViewVolume(), kWorldTolerance,
+                   "reset zoom");
     EXPECT_DOUBLE_EQ(view.zoomX(), 1.0);
     EXPECT_DOUBLE_EQ(view.zoomY(), 1.0);
     EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged});

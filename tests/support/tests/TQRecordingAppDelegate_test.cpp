@@ -38,11 +38,17 @@ TEST(RecordingAppDelegate, forwarding__recordsTheBracketInOrderAndTheHostStillUn
     d.postNotification(kTQNotifyChannelsChanged);
     EXPECT_EQ(d.sceneChannelRoot(), host.sceneChannelRoot()) << "answers come from the host";
 
-    const std::vector<std::string> expected = {
-        "startCaptureModifiedChannels(Undo Duplicate)", "willChangeChannel(X)",
-        "willChangeChannel(Y)", "willSetChannelValue(X)", "willSetChannelValue(Y)",
-        "didSetChannelValue(Y)", "didSetChannelValue(X)", "didChangeChannel(Y)",
-        "didChangeChannel(X)", "endCaptureModifiedChannels()", "postNotification(0x8)"};
+    const std::vector<std::string> expected = {"startCaptureModifiedChannels(Undo Duplicate)",
+                                               "willChangeChannel(X)",
+                                               "willChangeChannel(Y)",
+                                               "willSetChannelValue(X)",
+                                               "willSetChannelValue(Y)",
+                                               "didSetChannelValue(Y)",
+                                               "didSetChannelValue(X)",
+                                               "didChangeChannel(Y)",
+                                               "didChangeChannel(X)",
+                                               "endCaptureModifiedChannels()",
+                                               "postNotification(0x8)"};
     EXPECT_EQ(recorder.bracketSequence(), expected);
     EXPECT_EQ(recorder.captureBalance(), 0);
     EXPECT_EQ(recorder.calls().back().operation, "sceneChannelRoot");
