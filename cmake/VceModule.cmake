@@ -1,10 +1,18 @@
 # One static library per module folder: its *.cpp and *.h at the top, its tests in tests/.
 # Includes are written from the repository root ("platform/media/CMTime.h").
 
+# Warnings are errors in our own targets, under both compilers. Each compiler gets the flags it
+# knows: GCC's -Wshadow=local has no Clang spelling, Clang's -Wshadow-uncaptured-local is close.
 function(vce_warnings target)
   target_compile_options(${target} PRIVATE
-    -Wall -Wextra -Wpedantic -Wshadow=local -Wnon-virtual-dtor -Woverloaded-virtual
-    -Wimplicit-fallthrough -Werror)
+    -Wall -Wextra -Wpedantic -Wnon-virtual-dtor -Woverloaded-virtual -Wimplicit-fallthrough
+    -Werror)
+  if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
+    target_compile_options(${target} PRIVATE -Wshadow=local)
+  elseif(CMAKE_CXX_COMPILER_ID MATCHES "Clang")
+    target_compile_options(${target} PRIVATE -Wshadow-uncaptured-local -Wunreachable-code
+      -Wno-gnu-zero-variadic-macro-arguments)
+  endif()
 endfunction()
 
 # vce_module(<target> [DIRS extra folders...] [DEPS libs...] [TEST_DEPS libs...])

@@ -91,7 +91,8 @@ TEST_F(TreeFolderTest, clone__deepCopyKeepsClassesAndIsIndependent) {
     rotation->setQuaternionMode(true, false);
     position->setLinked(false);
     std::unique_ptr<TQChannelBase> copy(object.cloneChannel());
-    ASSERT_EQ(typeid(*copy), typeid(TQChannelObjectRootBase));
+    const TQChannelBase& copied = *copy;
+    ASSERT_EQ(typeid(copied), typeid(TQChannelObjectRootBase));
     EXPECT_TRUE(*copy == object) << "a fresh clone compares equal";
     EXPECT_EQ(copy->getParent(), nullptr);
     EXPECT_EQ(copy->getName(), "Object");
@@ -218,7 +219,10 @@ TEST(TreeFactory, identifiersAndCreation) {
         std::unique_ptr<TQChannelBase> made = factory->create("Made", 42);
         EXPECT_EQ(TQChannelFactoryIdOf(made.get()), id) << factory->getClassName();
         std::unique_ptr<TQChannelBase> copy(made->cloneChannel());
-        EXPECT_EQ(typeid(*copy), typeid(*made)) << factory->getClassName() << " clones as itself";
+        const TQChannelBase& copied = *copy;
+        const TQChannelBase& original = *made;
+        EXPECT_EQ(typeid(copied), typeid(original))
+            << factory->getClassName() << " clones as itself";
         EXPECT_TRUE(*copy == *made) << factory->getClassName();
     }
     EXPECT_EQ(TQFactory::find(TQFactoryId{1, 2}), nullptr);
