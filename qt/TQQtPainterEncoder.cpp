@@ -46,6 +46,9 @@ QPen linePen(QBrush brush, double widthPixels, Qt::PenJoinStyle join) {
     return QPen(brush, widthPixels, Qt::SolidLine, penCap(join), join);
 }
 
+// A colour component as the painter takes it: 0 to 1, NaN as 0.
+float clamp01(float v) { return std::isfinite(v) ? std::clamp(v, 0.0f, 1.0f) : 0.0f; }
+
 bool nearlySame(const QPointF& a, const QPointF& b) {
     return std::abs(a.x() - b.x()) + std::abs(a.y() - b.y()) < 1e-6;
 }
@@ -138,9 +141,18 @@ void TQQtPainterEncoder::endEncoding() {
 }
 
 QColor TQQtPainterEncoder::qColor(const HXDColor& c) {
-    const auto clamp01 = [](float v) {
-        return std::isfinite(v) ? std::clamp(v, 0.0f, 1.0f) : 0.0f;
-    };
+    const float alpha = clamp01(c.alpha);
+    if (alpha <= 0.0f) return QColor::fromRgbF(0.0f, 0.0f, 0.0f, 0.0f);
+    // QColor is straight: divide the alpha out. A component above alpha (not a premultiplied
+    // colour) clamps to full.
+    return QColor::fromRgbF(clamp01(c.red / alpha), clamp01(c.green / alpha),
+                            clamp01(c.blue / alpha), alpha);
+}
+
+QColor TQQtPainterEncoder::paintColor(const HXDColor& c) const {
+    if (!_straightSource) return qColor(c);
+    // The blending multiplies the components by alpha once more: hand them over as straight,
+    // and the painter's own multiply does it.
     return QColor::fromRgbF(clamp01(c.red), clamp01(c.green), clamp01(c.blue), clamp01(c.alpha));
 }
 
@@ -154,8 +166,9 @@ QPainter::CompositionMode TQQtPainterEncoder::compositionModeFor(const HXDBlendi
         case HXDBlendOperation::ReverseSubtract: return QPainter::CompositionMode_Difference;
         case HXDBlendOperation::Add: break;
     }
-    // QPainter works on premultiplied colours, so a source factor of SourceAlpha (straight
-    // colour) and One (premultiplied colour) are the same mode here.
+    // A source factor of One (the colour as it is) and SourceAlpha (the colour multiplied by its
+    // alpha once more) are the same mode here: paintColor and textureImage hand the painter
+    // what either factor asks for.
     const bool srcOver = b.sourceRGB == F::SourceAlpha || b.sourceRGB == F::One;
     if (srcOver && b.destinationRGB == F::OneMinusSourceAlpha)
         return QPainter::CompositionMode_SourceOver;
@@ -198,6 +211,8 @@ bool TQQtPainterEncoder::prepare(const HXDDrawPrimitive& primitive) {
     if (!_encoding) return false;
     _painter.setCompositionMode(compositionModeFor(primitive.blendingInfo()));
     _painter.setOpacity(1.0);
+    _straightSource = primitive.blendingInfo().enabled &&
+                      primitive.blendingInfo().sourceRGB == HXDBlendFactor::SourceAlpha;
     return true;
 }
 
@@ -370,7 +385,7 @@ void TQQtPainterEncoder::appendToPolyline(QPainter& painter, const QPointF& a, c
 void TQQtPainterEncoder::flushPolyline(QPainter& painter, double widthPixels,
                                        Qt::PenJoinStyle join) {
     if (_polyline.size() >= 2) {
-        painter.setPen(linePen(QBrush(qColor(_polylineColor)), widthPixels, join));
+        painter.setPen(linePen(QBrush(paintColor(_polylineColor)), widthPixels, join));
         painter.drawPolyline(_polyline);
     }
     _polyline.clear();
@@ -381,8 +396,8 @@ void TQQtPainterEncoder::drawSegment(QPainter& painter, const QPointF& a, const 
                                      Qt::PenJoinStyle join) {
     if (nearlySame(a, b)) return;
     QLinearGradient gradient(a, b);
-    gradient.setColorAt(0.0, qColor(ca));
-    gradient.setColorAt(1.0, qColor(cb));
+    gradient.setColorAt(0.0, paintColor(ca));
+    gradient.setColorAt(1.0, paintColor(cb));
     painter.setPen(linePen(QBrush(gradient), widthPixels, join));
     painter.drawLine(a, b);
 }
@@ -435,16 +450,20 @@ void TQQtPainterEncoder::strokeWithGamma(const HXDMultiline& multiline, double w
 
 const QImage* TQQtPainterEncoder::textureImage(const HXDPixelTexture& texture) {
     if (texture.width() == 0 || texture.height() == 0) return nullptr;
-    const auto found = _textures.find(texture.textureID());
+    // Texels are premultiplied and go to the painter as they are. Under a SourceAlpha blending
+    // they are read as straight, so that the conversion multiplies them by alpha once more.
+    const uint64_t key = texture.textureID() * 2 + (_straightSource ? 1 : 0);
+    const auto found = _textures.find(key);
     if (found != _textures.end()) return &found->second;
     if (_textures.size() >= kMaxCachedTextures) _textures.clear();
-    const QImage straight(texture.rgba().data(), static_cast<int>(texture.width()),
-                          static_cast<int>(texture.height()),
-                          static_cast<qsizetype>(texture.width()) * 4, QImage::Format_RGBA8888);
+    const QImage texels(
+        texture.rgba().data(), static_cast<int>(texture.width()),
+        static_cast<int>(texture.height()), static_cast<qsizetype>(texture.width()) * 4,
+        _straightSource ? QImage::Format_RGBA8888 : QImage::Format_RGBA8888_Premultiplied);
     // The conversion copies: the cached image owns its texels.
-    QImage converted = straight.convertToFormat(QImage::Format_ARGB32_Premultiplied);
+    QImage converted = texels.convertToFormat(QImage::Format_ARGB32_Premultiplied);
     if (converted.isNull()) return nullptr;
-    return &_textures.emplace(texture.textureID(), std::move(converted)).first->second;
+    return &_textures.emplace(key, std::move(converted)).first->second;
 }
 
 void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad,
@@ -475,12 +494,12 @@ void TQQtPainterEncoder::encodeScreenspaceQuad(const HXDScreenspaceQuad& quad,
     if (!target.isValid()) return;
     // Flat fills keep crisp edges: a band or handle is an exact pixel rectangle.
     _painter.setRenderHint(QPainter::Antialiasing, false);
-    _painter.fillRect(target, qColor(quad.color()));
+    _painter.fillRect(target, paintColor(quad.color()));
 }
 
 void TQQtPainterEncoder::encodeMesh(const HXDMesh& mesh, const HXDRenderingContext& context) {
     if (!prepare(mesh) || !mappingFor(context).isValid()) return;
-    const QColor color = qColor(mesh.brush().color);
+    const QColor color = paintColor(mesh.brush().color);
     _painter.setRenderHint(QPainter::Antialiasing, true);
     if (mesh.wireframe()) {
         _painter.setPen(
@@ -511,7 +530,7 @@ void TQQtPainterEncoder::encodeText(const HXDText& text, const HXDRenderingConte
     _painter.translate(box.topLeft());
     _painter.scale(scale, scale);
     _painter.setFont(TQQtTextMetrics::fontFor(text.attributes()));
-    _painter.setPen(qColor(text.attributes().color));
+    _painter.setPen(paintColor(text.attributes().color));
     // The box was measured with the shared metrics at creation; the baseline sits at its
     // bottom less the descent, as the measuring font lays it out.
     _painter.drawText(QRectF(0.0, 0.0, box.width() / scale, box.height() / scale),

@@ -11,6 +11,11 @@
 // them), and the encoder flips y for QPainter. Widths, stipple lengths and font sizes are in
 // points and are multiplied by the context's backing scale.
 //
+// Colours. Primitives carry premultiplied colours and texels (HXDColor); QColor is straight,
+// so qColor divides the alpha out, and textures are read as premultiplied pixels: a colour
+// at 0.3 of everything over the background paints 30 % of that colour, as a GPU pipeline
+// blends it, and the antialiased edges of images keep no dark fringe.
+//
 // What QPainter cannot do as a fixed-function blender does: blendings map onto the nearest
 // composition mode (see compositionModeFor); gamma other than 1 reshapes coverage exactly only
 // for opaque colours, since the layer it is applied to holds colour and coverage multiplied.
@@ -83,9 +88,10 @@ public:
 
     // The composition mode that stands for a blending.
     static QPainter::CompositionMode compositionModeFor(const HXDBlendingInfo& blending);
+    // The straight QColor of a premultiplied colour.
     static QColor qColor(const HXDColor& color);
 
-    // Textures converted for painting, kept by textureID across frames.
+    // Textures converted for painting, kept by textureID (and blending source) across frames.
     size_t cachedTextureCount() const { return _textures.size(); }
 
 private:
@@ -99,6 +105,8 @@ private:
     QRectF toDevice(const CGRect& pixelsYUp) const;
     // Paints with the primitive's blending; false when no frame is open.
     bool prepare(const HXDDrawPrimitive& primitive);
+    // The colour to hand the painter under the present primitive's blending.
+    QColor paintColor(const HXDColor& color) const;
     const QImage* textureImage(const HXDPixelTexture& texture);
 
     // Multilines: one run of vertices [first, end) stroked with `painter`; stipple phase
@@ -130,6 +138,8 @@ private:
     QSize _drawableSize;
     QPainter _painter;
     bool _encoding = false;
+    // The present primitive's blending multiplies the source by its alpha (SourceAlpha).
+    bool _straightSource = false;
     int _framesPresented = 0;
     std::function<void(const QImage&)> _present;
 

@@ -14,7 +14,7 @@ HXDBlendingInfo HXDDataType::opaqueBlendingInfo() {
 
 HXDBlendingInfo HXDDataType::additiveBlendingInfo() {
     HXDBlendingInfo info;
-    info.sourceRGB = HXDBlendFactor::SourceAlpha;
+    info.sourceRGB = HXDBlendFactor::One;
     info.destinationRGB = HXDBlendFactor::One;
     info.sourceAlpha = HXDBlendFactor::One;
     info.destinationAlpha = HXDBlendFactor::One;

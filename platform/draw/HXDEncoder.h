@@ -11,6 +11,10 @@
 // primitive's world coordinates to normalised device coordinates, and HXDScreenMapping
 // (HXDHitTest.h) built from it and the drawable size gives drawable pixels (y up), exactly
 // as the hit test maps them. Sizes in points are multiplied by the context's backing scale.
+//
+// Colours and texels arrive premultiplied (HXDColor); an encoder blends them with each
+// primitive's blending as a GPU pipeline would, and converts them if its painter wants
+// straight colours.
 
 #include "platform/draw/HXDDataType.h"
 

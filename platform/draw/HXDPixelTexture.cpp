@@ -26,14 +26,12 @@ HXDPixelTexture::HXDPixelTexture(uint32_t width, uint32_t height, float scale,
 
 std::shared_ptr<const HXDPixelTexture> HXDPixelTexture::textureWithRGBA(
     uint32_t width, uint32_t height, float scale, std::vector<uint8_t> rgba, bool premultiplied) {
-    if (premultiplied && rgba.size() == static_cast<size_t>(width) * height * 4u) {
+    if (!premultiplied && rgba.size() == static_cast<size_t>(width) * height * 4u) {
         for (size_t i = 0; i + 3 < rgba.size(); i += 4) {
             const unsigned a = rgba[i + 3];
-            if (a == 0 || a == 255) continue;
-            for (size_t c = 0; c < 3; ++c) {
-                const unsigned v = (rgba[i + c] * 255u + a / 2) / a;
-                rgba[i + c] = static_cast<uint8_t>(v > 255u ? 255u : v);
-            }
+            if (a == 255) continue;
+            for (size_t c = 0; c < 3; ++c)
+                rgba[i + c] = static_cast<uint8_t>((rgba[i + c] * a + 127u) / 255u);
         }
     }
     return std::make_shared<const HXDPixelTexture>(width, height, scale, std::move(rgba));

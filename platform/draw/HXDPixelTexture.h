@@ -1,6 +1,8 @@
 #pragma once
-// An image in memory that primitives draw: RGBA8 texels with straight (not premultiplied)
-// alpha, rows from the top of the image down, and the scale it was made for (2 for an @2x
+// An image in memory that primitives draw: RGBA8 texels with PREMULTIPLIED alpha (each colour
+// component already multiplied by the texel's alpha, as colours are: see HXDColor), so that
+// filtering and blending it keep antialiased edges free of dark fringes. Rows run from the top
+// of the image down, and the scale it was made for (2 for an @2x
 // image: width() texels cover width() / 2 points).
 //
 // Textures are immutable once made and shared (std::shared_ptr<const HXDPixelTexture>) by the
@@ -17,8 +19,8 @@
 class HXDPixelTexture : public HXDTexture {
 public:
     // rgba holds width * height * 4 bytes; a buffer of another size gives an empty texture
-    // (0 x 0), never a read past the end. premultiplied tells what the bytes hold: they are
-    // stored straight, premultiplied input being divided out.
+    // (0 x 0), never a read past the end. premultiplied tells what the bytes hold: straight
+    // input (an image file's pixels) is multiplied by its alpha, premultiplied input is kept.
     static std::shared_ptr<const HXDPixelTexture> textureWithRGBA(uint32_t width, uint32_t height,
                                                                   float scale,
                                                                   std::vector<uint8_t> rgba,
@@ -34,7 +36,7 @@ public:
     }
     uint64_t textureID() const { return _textureID; }
 
-    // Straight RGBA8, row 0 at the top, width * 4 bytes per row.
+    // Premultiplied RGBA8, row 0 at the top, width * 4 bytes per row.
     const std::vector<uint8_t>& rgba() const { return _rgba; }
     // Alpha of one texel as 0 to 1; 0 outside the image.
     float alphaAt(int64_t column, int64_t row) const;

@@ -13,8 +13,8 @@
 
 class HXDQuadTexture : public HXDDrawPrimitive {
 public:
-    // attenuation multiplies the image's alpha (1 draws it as it is). A null texture draws
-    // nothing and is hit as its rectangle.
+    // attenuation scales the image's opacity: every component of its premultiplied texels (1
+    // draws it as it is). A null texture draws nothing and is hit as its rectangle.
     HXDQuadTexture(uint32_t hitID, std::shared_ptr<const HXDPixelTexture> texture,
                    const CGRect& destinationRect, float attenuation);
 

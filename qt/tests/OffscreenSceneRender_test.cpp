@@ -39,6 +39,12 @@ constexpr double kCurveClearance = 5.0;
 constexpr double kKeypointClearance = 12.0;
 // Probes per curve between its first and last keypoints.
 constexpr int kProbes = 200;
+// The dimmed ends: 0.3 of the curve colour over the background, give or take antialiasing
+// and 8-bit rounding.
+constexpr double kDimShare = 0.3;
+constexpr double kDimTolerance = 0.06;
+// The stipple repeats every 8 pixels at backing scale 1 (2 steps of 2 points on, 2 off).
+constexpr int kStipplePeriod = 8;
 
 struct ScreenCurve {
     TQCurveEditorChannelItem* item = nullptr;
@@ -46,6 +52,7 @@ struct ScreenCurve {
     std::vector<CGPoint> points;     // the curve at every drawable column, pixels (y up)
     std::vector<CGPoint> keypoints;  // pixels (y up)
     std::vector<CGPoint> probes;     // where the curve's colour is looked for
+    double lastKeySeconds = 0.0;     // on the editor's axis
 };
 
 double distanceToSegment(const CGPoint& p, const CGPoint& a, const CGPoint& b) {
@@ -157,6 +164,7 @@ protected:
             CMTime first{}, last{};
             channel->getFirstKeyframe(&first, nullptr);
             channel->getLastKeyframe(&last, nullptr);
+            curve.lastKeySeconds = CMTimeGetSeconds(last) + off;
             for (TQKeyframeHandle h : channel->getKeyframes(false)) {
                 CMTime t{};
                 double v = 0.0;
@@ -188,6 +196,15 @@ protected:
         return TQQtPainterEncoder::qColor(HXDColor{c.red, c.green, c.blue, 1.0f});
     }
 
+    // Whether another curve than curves[index], or any keypoint, comes near the point.
+    bool crowded(const std::vector<ScreenCurve>& curves, size_t index, const CGPoint& p) const {
+        if (nearKeypoint(curves, p)) return true;
+        for (size_t other = 0; other < curves.size(); ++other)
+            if (other != index && distanceToPolyline(p, curves[other].points) < kCurveClearance)
+                return true;
+        return false;
+    }
+
     bool nearKeypoint(const std::vector<ScreenCurve>& curves, const CGPoint& p) const {
         for (const ScreenCurve& c : curves)
             for (const CGPoint& k : c.keypoints)
@@ -204,12 +221,7 @@ protected:
         int checked = 0;
         for (const CGPoint& p : curve.probes) {
             if (p.x < 2 || p.y < 2 || p.x > image.width() - 3 || p.y > image.height() - 3) continue;
-            if (nearKeypoint(curves, p)) continue;
-            bool crowded = false;
-            for (size_t other = 0; other < curves.size() && !crowded; ++other)
-                crowded =
-                    other != index && distanceToPolyline(p, curves[other].points) < kCurveClearance;
-            if (crowded) continue;
+            if (crowded(curves, index, p)) continue;
             ++checked;
             double best = -1.0;
             for (int dy = -2; dy <= 2; ++dy)
@@ -304,6 +316,62 @@ TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_e
         }
     }
     EXPECT_GT(clear, 200) << "the curves cover nearly the whole view: the framing is wrong";
+}
+
+// The ends past the last keypoints are the curve colour at 0.3 opacity: over the background
+// they must show 30 % of the curve's colour, as a GPU pipeline blends them, not the 9 % that
+// an opacity applied twice leaves (as dark as the background to the eye).
+TEST_F(OffscreenSceneRenderTest, frame__dimmed_ends_show_30_percent_of_the_curve_colour) {
+    renderFramed();
+    // Four seconds past the last keyframes, so that the dimmed, stippled ends take room.
+    const CGRect framed = view.getCurrentViewVolume();
+    const CMTime start = CMTimeMake(0, kTimescale);
+    const CMTime duration = CMTimeMake(14 * kTimescale, kTimescale);
+    view.setDisplayRange(&start, &duration);
+    view.setCurrentViewVolume(CGRectMake(0.0, framed.origin.y, 14.0, framed.size.height));
+    view.setAllOriginalCurveDirty(1);
+    ASSERT_TRUE(renderFrame());
+    const QImage& image = encoder.image();
+    EXPECT_TRUE(image.save(
+        QDir(QCoreApplication::applicationDirPath()).filePath("offscreen_dimmed_ends.png"), "PNG"));
+
+    const QColor background = backgroundColour();
+    const std::vector<ScreenCurve> curves = screenCurves();
+    int judged = 0;
+    for (size_t ci = 0; ci < curves.size(); ++ci) {
+        const ScreenCurve& curve = curves[ci];
+        const QColor want = qColour(curve.color);
+        const double lastKeyColumn =
+            view.getPointScreen(CGPointMake(curve.lastKeySeconds, 0.0)).x + kKeypointClearance;
+        // One probe per stipple period along the flat stretches of the dimmed end: there a
+        // column of pixels across the line adds up to the line's whole share.
+        for (int x = static_cast<int>(lastKeyColumn); x + kStipplePeriod + 1 < image.width() - 2;
+             x += kStipplePeriod) {
+            const CGPoint& p = curve.points[static_cast<size_t>(x)];
+            const CGPoint& q = curve.points[static_cast<size_t>(x + kStipplePeriod)];
+            if (std::abs(q.y - p.y) > 0.5 || p.y < 3 || p.y > image.height() - 4) continue;
+            if (crowded(curves, ci, p) || crowded(curves, ci, q)) continue;
+            // The dash of the period: the column with the most of the curve's colour.
+            double best = 0.0;
+            bool foreign = false;
+            for (int dx = 0; dx < kStipplePeriod; ++dx) {
+                double column = 0.0;
+                for (int dy = -2; dy <= 2; ++dy) {
+                    const double c =
+                        coverage(pixel(x + dx, static_cast<int>(p.y) + dy), background, want);
+                    foreign = foreign || c < 0.0;
+                    column += std::max(c, 0.0);
+                }
+                best = std::max(best, column);
+            }
+            if (foreign) continue;
+            ++judged;
+            EXPECT_NEAR(best, kDimShare, kDimTolerance)
+                << "curve " << ci << " (" << curve.item->simpleName() << ") at pixel (" << x << ", "
+                << p.y << "): share of the curve colour over the background";
+        }
+    }
+    EXPECT_GE(judged, 20) << "too few flat, uncrowded stretches past the last keypoints";
 }
 
 }  // namespace

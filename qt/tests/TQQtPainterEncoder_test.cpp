@@ -156,16 +156,19 @@ TEST_F(PainterEncoderTest, multiline__join_and_loop) {
 }
 
 TEST_F(PainterEncoderTest, quadTexture__alpha_kept_and_texel_for_pixel_on_whole_pixels) {
-    // 4 x 4 texels: left half red, right half blue, the top-left texel transparent.
+    // 4 x 4 texels: left half red, right half blue, the top-left texel transparent and the
+    // bottom-right one half transparent (an antialiased edge).
     std::vector<uint8_t> rgba(4 * 4 * 4);
     for (size_t i = 0; i < 16; ++i) {
         rgba[i * 4 + (i % 4 < 2 ? 0 : 2)] = 255;
-        rgba[i * 4 + 3] = i == 0 ? 0 : 255;
+        rgba[i * 4 + 3] = i == 0 ? 0 : i == 15 ? 128 : 255;
     }
     auto texture = HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::move(rgba));
     render({std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100, 40, 40, 40), 1.0f)});
     EXPECT_TRUE(near(pixel(103, 77), kBackground)) << "the transparent top-left texel";
-    EXPECT_TRUE(near(pixel(137, 43), kBlue));
+    EXPECT_TRUE(near(pixel(137, 43), HXDColor{0.0f, 0.0f, 0.5f, 1.0f}))
+        << "half a blue texel over black: half blue, neither darker nor brighter";
+    EXPECT_TRUE(near(pixel(127, 65), kBlue));
     // Placed 0.3 pixels off the grid at its own size: not resampled.
     render({std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100.3, 40.2, 4, 4), 1.0f)});
     EXPECT_TRUE(near(pixel(101, 41), kRed, 0));
@@ -173,22 +176,32 @@ TEST_F(PainterEncoderTest, quadTexture__alpha_kept_and_texel_for_pixel_on_whole_
     EXPECT_EQ(encoder.cachedTextureCount(), 1u) << "a texture is converted once, not per frame";
 }
 
-TEST_F(PainterEncoderTest, screenspaceQuad_and_mesh__blend_and_fill) {
+TEST_F(PainterEncoderTest, translucent_colours__premultiplied_show_their_share_over_the_target) {
     auto under = std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, 0, 100, 100), 0);
     under->setColor(kRed);
     auto band = std::make_shared<HXDScreenspaceQuad>(CGRectMake(50, 0, 100, 100), 0);
-    band->setColor(HXDColor{0.0f, 0.0f, 1.0f, 0.25f});
+    band->setColor(kBlue.scaled(0.25f));
     auto mesh = std::make_shared<HXDMesh>(
         9, HXDBrush{0, kBlue},
         std::vector<HXDSubmesh>{HXDSubmesh({{160, 20}, {190, 20}, {190, 80}})});
-    render({under, band, mesh});
+    // A curve's dimmed end: everything times 0.3, stippled, one pixel wide.
+    auto dim = stippled(horizontal(90.5f, kRed.scaled(0.3f), kRed.scaled(0.3f)));
+    render({under, band, mesh, dim});
     EXPECT_TRUE(near(pixel(75, 50), HXDColor{0.75f, 0.0f, 0.25f, 1.0f}))
         << "a quarter of blue over red";
     EXPECT_TRUE(near(pixel(185, 30), kBlue)) << "inside the triangle";
     EXPECT_TRUE(near(pixel(145, 70), HXDColor{0.0f, 0.0f, 0.25f, 1.0f})) << "the band over black";
+    EXPECT_TRUE(near(pixel(155, 90), HXDColor{0.3f, 0.0f, 0.0f, 1.0f}))
+        << "a dimmed line shows 30 % of its colour, not 9 %";
     band->setBlendingInfo(HXDDataType::additiveBlendingInfo());
     render({under, band});
     EXPECT_TRUE(near(pixel(75, 50), HXDColor{1.0f, 0.0f, 0.25f, 1.0f})) << "additive keeps the red";
+    // A blending that multiplies by alpha once more takes the components as straight.
+    HXDBlendingInfo straight = HXDDataType::sourceOneMinusSourceBlendingInfo();
+    straight.sourceRGB = HXDBlendFactor::SourceAlpha;
+    band->setBlendingInfo(straight);
+    render({band});
+    EXPECT_TRUE(near(pixel(145, 70), HXDColor{0.0f, 0.0f, 0.0625f, 1.0f}));
 }
 
 TEST_F(PainterEncoderTest, text__paints_inside_its_measured_box_in_its_colour) {

@@ -2,7 +2,7 @@
 
 // A dark theme. The curve colours are bright enough to read on the background at the thin
 // line width of a high-density screen, and far enough apart in hue to tell eight curves
-// apart; at 0.3 (the dimmed extrapolated ends) they still stand off the background.
+// apart; at 0.3 opacity (the dimmed extrapolated ends) they still stand off the background.
 // The selection is near white with a high blue component: the tangent lines use its blue
 // value as their alpha, so a warm or dark selection colour would make them vanish.
 

@@ -3,8 +3,10 @@
 // locked curves, grid and end markers, in one dark theme.
 //
 // A GDColor is a plain value: sRGB components from 0 to 1 with straight (not premultiplied)
-// alpha. The named colours are fixed for the life of the process; callers that need a variant
-// (a dimmed curve, a translucent band) derive it with `scaled` or `withAlpha`.
+// alpha, as a colour table or a picker gives them. The named colours are fixed for the life
+// of the process. Drawing takes colours premultiplied: the view converts a GDColor once, and
+// derives a dimmed or translucent variant from the converted colour, where scaling all four
+// components keeps the hue and lowers the opacity.
 //
 // This file depends on nothing but the standard library, so that tools (the image generator)
 // can compile it alone and draw their images in exactly these colours.
@@ -23,10 +25,6 @@ struct GDColor {
 
     // The four components in the order red, green, blue, alpha.
     std::array<float, 4> components() const { return {red, green, blue, alpha}; }
-    // All four components multiplied by `factor` (alpha too), as a curve's dimmed ends are.
-    GDColor scaled(float factor) const {
-        return {red * factor, green * factor, blue * factor, alpha * factor};
-    }
     GDColor withAlpha(float newAlpha) const { return {red, green, blue, newAlpha}; }
 
     // The curve colours, in the order of an item's colour index: green, purple, orange,

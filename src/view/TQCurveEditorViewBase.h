@@ -368,6 +368,8 @@ public:
     // From a table built once per process. An index above 7 wraps (index & 7), as the colour
     // counter of new items does, instead of reading past the table.
     static GDColor getColorForIndex(uint32_t index);
+    // A named colour (straight alpha) as primitives take it: premultiplied.
+    static HXDColor drawingColor(const GDColor& color);
     const HXDTextAttributes& textAttribs() const { return _textAttribs; }
     // The system font at 8 points in curveEditorTextColor0.
     static HXDTextAttributes defaultTextAttributes();

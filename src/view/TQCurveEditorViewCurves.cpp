@@ -23,9 +23,10 @@ constexpr int kChannelTimescale = 0x40000;
 // Hit ids of what this file draws: the selection kinds of the entries a pick makes.
 constexpr uint32_t kCurveHitID = TQSelectionCurve;
 constexpr uint32_t kKeypointHitID = TQSelectionKeypoint;
-// Dimmed parts of a curve: every component, alpha included, times this.
+// Dimmed parts of a curve: every component of the premultiplied colour, alpha included,
+// times this; over the background they show this share of the curve's colour.
 constexpr float kDimFactor = 0.3f;
-// Ghost and processed curve: the curve colour with its alpha times this.
+// Ghost and processed curve: the curve colour at this share of its opacity.
 constexpr float kTranslucentFactor = 0.4f;
 // Stipple of the dimmed parts: two steps on, two off, each 2 points long.
 constexpr uint32_t kDimStipplePattern = 0x33333333u;
@@ -61,8 +62,6 @@ private:
     CMTimeScale _timescale = 0;
     double _reciprocal = 0.0;
 };
-
-HXDColor toHXD(const GDColor& c) { return HXD_sRGBA(c.red, c.green, c.blue, c.alpha); }
 
 // The mapping of channel values onto V (convertFromChannelCoords of the controller), with the
 // item's factors read once per curve instead of once per sample.
@@ -138,8 +137,8 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
     // A selected curve loses its own colour.
     const GDColor color =
         channelItem->isSelected() ? selectionColor() : getColorForIndex(channelItem->colorIndex());
-    const HXDColor bright = toHXD(color);
-    const HXDColor dim = toHXD(color.scaled(kDimFactor));
+    const HXDColor bright = drawingColor(color);
+    const HXDColor dim = bright.scaled(kDimFactor);
     const float w = thinLineWidth();
 
     // One sample per point of the view's width, whatever the zoom.
@@ -264,7 +263,7 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
         vertices.reserve(ghostCount);
         appendVertices(vertices, channelItem->samplesUSnapshot(), channelItem->samplesVSnapshot(),
                        0, ghostCount, offSeconds, WorldY(*channelItem),
-                       toHXD(own.withAlpha(own.alpha * kTranslucentFactor)));
+                       drawingColor(own).scaled(kTranslucentFactor));
         auto ghost = std::make_shared<HXDMultiline>(std::move(vertices));
         ghost->setGamma(1.0f);
         ghost->setAntialiased(true);
@@ -291,7 +290,7 @@ void TQCurveEditorViewBase::drawProcessedCurve(TQCurveEditorItem* item) {
     if (!samplesU || !samplesV) return;
 
     const GDColor own = getColorForIndex(channelItem->colorIndex());
-    const HXDColor color = toHXD(own.withAlpha(own.alpha * kTranslucentFactor));
+    const HXDColor color = drawingColor(own).scaled(kTranslucentFactor);
     const double offSeconds = CMTimeGetSeconds(off);
     const WorldY worldY(*channelItem);
     // Every second sample: the processed curve is a guide, half the density is enough.
@@ -476,13 +475,13 @@ void TQCurveEditorViewBase::drawTangent(TQKeyframeHandle handle, double tangentU
     // A handle lying on its keypoint is not drawn.
     if (std::fabs(tangentU - x) < hw && std::fabs(tangentV - v) < hh) return;
 
-    // The line stops at the ellipse around the keypoint. Its fourth component is the blue of
-    // the selection colour, not its alpha; kept so, as the handles have always looked.
+    // The line stops at the ellipse around the keypoint. Its alpha is the blue of the
+    // selection colour, not its alpha; kept so, as the handles have always looked.
     const GDColor c = selectionColor();
     _primitives.push_back(HXDLine::lineFromStart(
         HXDFloat3{static_cast<float>(tangentU), static_cast<float>(tangentV), 0.0f},
         HXDFloat3{static_cast<float>(x + du), static_cast<float>(v + dv), 0.0f}, 1.0f,
-        HXD_sRGBA(c.red, c.green, c.blue, c.blue), true));
+        drawingColor(c.withAlpha(c.blue)), true));
 
     auto quad = std::make_shared<HXDQuadTexture>(
         0, _tangentAsset.texture, CGRectMake(tangentU - hw, tangentV - hh, size.x, size.y), 1.0f);

@@ -21,8 +21,6 @@
 
 namespace {
 
-HXDColor toHXD(const GDColor& c) { return HXD_sRGBA(c.red, c.green, c.blue, c.alpha); }
-
 // Resets the per-frame encoder state on every way out of a frame.
 class FrameScope {
 public:
@@ -99,7 +97,7 @@ bool TQCurveEditorViewBase::displayLayer(HXDEncoder* encoder) {
     _currentTexture = drawable;
     setupMetalRender();
     _encoder = encoder;
-    encoder->beginEncoding(*drawable, toHXD(background));
+    encoder->beginEncoding(*drawable, drawingColor(background));
 
     // Background primitives are drawn before this frame's projection is installed: they get
     // the last frame's projection (identity before the first) on this frame's target.
@@ -187,9 +185,10 @@ KeyframeAsset TQCurveEditorViewBase::keyframeAssetWithImageName(const BNString& 
     if (!image) return {};
     KeyframeAsset asset;
     asset.size = image->size();
+    // The image's pixels are straight, as the file holds them; the texture premultiplies them.
     asset.texture = HXDPixelTexture::textureWithRGBA(
         static_cast<uint32_t>(image->pixelsWide()), static_cast<uint32_t>(image->pixelsHigh()),
-        static_cast<float>(image->scale()), image->pixels());
+        static_cast<float>(image->scale()), image->pixels(), false);
     return asset;
 }
 
@@ -244,14 +243,14 @@ void TQCurveEditorViewBase::drawSelectionRect() {
 
     auto fill = std::make_shared<HXDScreenspaceQuad>(r, 0);
     fill->setBlendingInfo(blending);
-    fill->setColor(HXD_sRGBA(c.red, c.green, c.blue, 0.25f));
+    fill->setColor(drawingColor(c.withAlpha(0.25f)));
     _primitives.push_back(fill);
 
     const float x = static_cast<float>(r.origin.x);
     const float y = static_cast<float>(r.origin.y);
     const float w = static_cast<float>(r.size.width);
     const float h = static_cast<float>(r.size.height);
-    const HXDColor edge = toHXD(c);
+    const HXDColor edge = drawingColor(c);
     const HXDLineSegment segments[4] = {
         {{x, y, 0.0f}, {x, y + h, 0.0f}, edge},
         {{x, y + h, 0.0f}, {x + w, y + h, 0.0f}, edge},
@@ -268,6 +267,12 @@ void TQCurveEditorViewBase::drawSelectionRect() {
 
 // ---- Colours -------------------------------------------------------------------------------
 // Colours are sRGB throughout, which is what every target here is: no conversion is needed.
+// The named colours are straight; primitives take them premultiplied (drawingColor), so that
+// every variant (dimmed, translucent) is made on the premultiplied form.
+
+HXDColor TQCurveEditorViewBase::drawingColor(const GDColor& c) {
+    return HXDColor::fromStraight(c.red, c.green, c.blue, c.alpha);
+}
 
 GDColor TQCurveEditorViewBase::gridColor() const { return GDColor::gridColor(); }
 GDColor TQCurveEditorViewBase::endpointsColor() const { return GDColor::endpointsColor(); }
@@ -324,6 +329,6 @@ void TQCurveEditorViewBase::metalPrint(const BNString& text, const CGPoint& worl
 HXDTextAttributes TQCurveEditorViewBase::defaultTextAttributes() {
     HXDTextAttributes attributes;
     attributes.fontSize = 8.0f;
-    attributes.color = toHXD(GDColor::curveEditorTextColor0());
+    attributes.color = drawingColor(GDColor::curveEditorTextColor0());
     return attributes;
 }

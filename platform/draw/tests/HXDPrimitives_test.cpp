@@ -67,8 +67,12 @@ TEST(HXDPrimitivesTest, defaults__lineJoinNumbersAndBlending) {
 TEST(HXDPrimitivesTest, textureAndNumbers__badInputIsSafe) {
     EXPECT_EQ(HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::vector<uint8_t>(10))->width(), 0u)
         << "a buffer of the wrong size gives an empty texture, not a read past its end";
-    const auto t = HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {64, 32, 16, 128}, true);
-    EXPECT_EQ(t->rgba()[0], 128) << "premultiplied input is stored straight";
+    const auto t = HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {255, 128, 0, 128});
+    EXPECT_EQ(t->rgba(), (std::vector<uint8_t>{128, 64, 0, 128}))
+        << "an image's straight pixels are stored premultiplied";
+    EXPECT_EQ(HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {64, 32, 16, 128}, true)->rgba(),
+              (std::vector<uint8_t>{64, 32, 16, 128}))
+        << "premultiplied input is kept";
     EXPECT_EQ(t->alphaAt(-1, 0), 0.0f);
     EXPECT_NE(t->textureID(),
               HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {0, 0, 0, 0})->textureID());

@@ -10,10 +10,10 @@ namespace {
 
 class ViewCurvesTest : public ViewDrawFixture {
 protected:
-    HXDColor colourOf(const TQCurveEditorChannelItemPtr& item, float factor = 1.0f) const {
-        const GDColor c =
-            TQCurveEditorViewBase::getColorForIndex(item->colorIndex()).scaled(factor);
-        return HXD_sRGBA(c.red, c.green, c.blue, c.alpha);
+    // The item's (opaque) colour at `opacity`, premultiplied as primitives carry it.
+    static HXDColor colourOf(const TQCurveEditorChannelItemPtr& item, float opacity = 1.0f) {
+        const GDColor c = TQCurveEditorViewBase::getColorForIndex(item->colorIndex());
+        return HXDColor{c.red * opacity, c.green * opacity, c.blue * opacity, opacity};
     }
     size_t handles(uint32_t which) const { return pickable<HXDQuadTexture>(which).size(); }
 };
@@ -35,7 +35,7 @@ TEST_F(ViewCurvesTest, drawOriginalCurve__dimsAndStipplesTheEndsAndJoinsThePiece
     for (size_t i = 1; i < after.size(); ++i) ASSERT_GT(after[i].start.x, 6.0f) << "vertex " << i;
 
     EXPECT_EQ(before.front().color, colourOf(item, 0.3f))
-        << "ends are the curve colour times 0.3, alpha too";
+        << "ends are the curve colour at 0.3 opacity: 30 % of it over the background";
     EXPECT_EQ(middle.front().color, colourOf(item));
     EXPECT_TRUE(pieces[0]->stippled() && pieces[2]->stippled() && !pieces[1]->stippled());
     EXPECT_EQ(pieces[2]->stipplePattern(), 0x33333333u);
@@ -178,8 +178,44 @@ TEST_F(ViewTangentHandlesTest, drawTangent__lineStopsAtTheEllipseAndShortHandles
     EXPECT_NEAR(line->end().x, 5.0 + keypointWidth * 0.25, 1e-5)
         << "and stops a quarter image from the keypoint";
     const GDColor s = view.selectionColor();
-    EXPECT_EQ(line->color(), HXD_sRGBA(s.red, s.green, s.blue, s.blue))
-        << "the fourth component is blue, kept so";
+    EXPECT_EQ(line->color(), (HXDColor{s.red * s.blue, s.green * s.blue, s.blue * s.blue, s.blue}))
+        << "the selection colour at the opacity of its blue, kept so";
+}
+
+TEST_F(ViewTangentHandlesTest, frame__translucentColoursReachTheEncoderPremultiplied) {
+    // Everything a frame can hold at once: handles, a value label, the ghost of a drag, the
+    // processed curve and the rubber band.
+    ASSERT_TRUE(frame());
+    selectInView({keypointEntry(item, 5.0)});
+    view.setPrintText(1);
+    item->select(1);
+    item->takeCurveSnapshot(0);
+    item->setDrawGhost(1);
+    view.setMouseIsDown(1);
+    c->addBehavior(std::make_unique<TQOscillateBehavior>(0.1, 1.0, 0.0));
+    item->setDrawProcessedCurve(1);
+    item->setNumberOfProcessedSamples(100);
+    item->setProcessedCurveDirty(1);
+    view.setSelecting(1);
+    view.setSelectionViewVolume(CGRectMake(2.0, -0.5, 3.0, 1.0));
+    ASSERT_TRUE(frame());
+    EXPECT_TRUE(encoder.colourFaults.empty()) << "the frame's colours and images are premultiplied";
+
+    std::vector<HXDColor> unpickableLines;
+    const HXDScreenspaceQuad* band = nullptr;
+    for (const auto& p : view.primitives()) {
+        if (const auto* m = dynamic_cast<const HXDMultiline*>(p.get());
+            m && p->hitInfo().hitID() == 0 && !m->vertices().empty() && !m->loop())
+            unpickableLines.push_back(m->vertices().front().color);
+        if (const auto* q = dynamic_cast<const HXDScreenspaceQuad*>(p.get())) band = q;
+    }
+    const HXDColor translucent = colourOf(item, 0.4f);
+    EXPECT_EQ(std::count(unpickableLines.begin(), unpickableLines.end(), translucent), 2)
+        << "the ghost and the processed curve: the curve colour at 0.4 opacity";
+    ASSERT_NE(band, nullptr);
+    const GDColor s = view.selectionColor();
+    EXPECT_EQ(band->color(), (HXDColor{s.red * 0.25f, s.green * 0.25f, s.blue * 0.25f, 0.25f}))
+        << "the band is the selection colour at a quarter opacity";
 }
 
 TEST_F(ViewCurvesTest, drawPoints__onABackingScaleOfTwoImagesCoverTwiceThePixels) {

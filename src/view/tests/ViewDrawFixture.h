@@ -12,10 +12,16 @@ namespace view_test {
 
 class ViewDrawFixture : public ViewFixture {
 protected:
-    // Past the gate, one frame; answers whether it was drawn.
+    // Past the gate, one frame; answers whether it was drawn. Every frame must hand the
+    // encoder premultiplied colours only.
     bool frame() {
         clock.advance(1.0);
-        return view.displayLayer(&encoder);
+        const bool drawn = view.displayLayer(&encoder);
+        for (const auto& fault : encoder.colourFaults)
+            ADD_FAILURE() << "colour (" << fault.color.red << ", " << fault.color.green << ", "
+                          << fault.color.blue << ", " << fault.color.alpha
+                          << ") is not premultiplied";
+        return drawn;
     }
 
     // The channel id an item's primitive carries, or -1 without one.
