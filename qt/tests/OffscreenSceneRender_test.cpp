@@ -303,10 +303,10 @@ TEST_F(OffscreenSceneRenderTest, frame__curve_colours_on_the_curves_background_e
         for (int x = 4; x < image.width(); x += 16) {
             const CGPoint p = CGPointMake(x + 0.5, y + 0.5);
             if (nearKeypoint(curves, p)) continue;
-            bool nearCurve = false;
-            for (const ScreenCurve& c : curves)
-                if ((nearCurve = distanceToPolyline(p, c.points) < kCurveClearance)) break;
-            if (nearCurve) continue;
+            if (std::any_of(curves.begin(), curves.end(), [&](const ScreenCurve& c) {
+                    return distanceToPolyline(p, c.points) < kCurveClearance;
+                }))
+                continue;
             ++clear;
             const QColor got = pixel(x, y);
             EXPECT_TRUE(std::abs(got.red() - background.red()) <= 2 &&
@@ -348,7 +348,7 @@ TEST_F(OffscreenSceneRenderTest, frame__dimmed_ends_show_30_percent_of_the_curve
         for (int x = static_cast<int>(lastKeyColumn); x + kStipplePeriod + 1 < image.width() - 2;
              x += kStipplePeriod) {
             const CGPoint& p = curve.points[static_cast<size_t>(x)];
-            const CGPoint& q = curve.points[static_cast<size_t>(x + kStipplePeriod)];
+            const CGPoint& q = curve.points[static_cast<size_t>(x) + kStipplePeriod];
             if (std::abs(q.y - p.y) > 0.5 || p.y < 3 || p.y > image.height() - 4) continue;
             if (crowded(curves, ci, p) || crowded(curves, ci, q)) continue;
             // The dash of the period: the column with the most of the curve's colour.
