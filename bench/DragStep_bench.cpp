@@ -9,11 +9,13 @@
 
 #include <cstdio>
 #include <memory>
+#include <optional>
 
 #include "host/TQHostAppDelegate.h"
 #include "platform/channels/TQChannelObjectRootBase.h"
 #include "src/curvesets/TQCurveSet.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
+#include "src/engine/TQEditBrackets.h"
 
 namespace {
 
@@ -81,7 +83,7 @@ struct DragScene {
             const CMTime* u = nullptr;
             const double* v = nullptr;
             unsigned number = kSamples;
-            ctrl.getSamples(item.get(), 0, start, step, &u, &v, &number);
+            ctrl.getSamples(item.get(), kTQSamplesOriginalCurve, start, step, &u, &v, &number);
             benchmark::DoNotOptimize(v);
         }
     }
@@ -90,23 +92,20 @@ struct DragScene {
 void dragSteps(benchmark::State& state, bool withBrackets, bool withResampling) {
     DragScene scene;
     TQCurveSelectionList* list = &scene.selection;
-    if (withBrackets) {
-        scene.host.startCaptureModifiedChannels("Move Keypoint");
-        scene.ctrl.willModify(list);
-    }
+    std::optional<TQChangeBracket> gesture;
+    if (withBrackets) gesture.emplace(scene.ctrl, list, "Undo Move Keypoint");
     const CMTime there = BN_CMTimeSaferAdd(scene.anchorTime, CMTimeMake(1, 90));
     bool forward = true;
     for (auto _ : state) {
-        if (withBrackets) scene.ctrl.willModifyValue(list);
-        scene.ctrl.moveSelected(list, forward ? there : scene.anchorTime, 0.0, 1, 0);
-        if (withBrackets) scene.ctrl.didModifyValue(list);
+        {
+            std::optional<TQModifyValueGuard> values;
+            if (withBrackets) values.emplace(scene.ctrl, list);
+            scene.ctrl.moveSelected(list, forward ? there : scene.anchorTime, 0.0, 1, 0);
+        }
         if (withResampling) scene.resample();
         forward = !forward;
     }
-    if (withBrackets) {
-        scene.ctrl.didModify(list);
-        scene.host.endCaptureModifiedChannels();
-    }
+    gesture.reset();
     state.counters["keypoints"] = static_cast<double>(list->size());
 }
 

@@ -29,6 +29,14 @@
 #include "platform/support/BNString.h"
 #include "src/contract/TQNotificationWords.h"
 
+// The `type` and `action` words that the framework passes to addToUndo: the kind of owner of
+// the step, and what the owner is to restore.
+inline constexpr uint32_t kTQUndoTypeView = 1;
+inline constexpr uint32_t kTQUndoTypeController = 2;
+inline constexpr uint32_t kTQUndoActionBoxEdit = 0;        // of kTQUndoTypeView
+inline constexpr uint32_t kTQUndoActionRemoveChannel = 0;  // of kTQUndoTypeController
+inline constexpr uint32_t kTQUndoActionNewCurveSet = 1;    // of kTQUndoTypeController
+
 // The parsed curve set list of the open document; defined with the persistent state.
 class TQCurveSetListSerializer;
 

@@ -8,6 +8,7 @@
 #include <cstdio>
 
 #include "platform/channels/TQChannelTypes.h"
+#include "src/engine/TQEditBrackets.h"
 #include "src/resources/TQStrings.h"
 #include "src/view/TQCurveEditorViewBase.h"
 
@@ -29,7 +30,7 @@ void TQCurveEditorCtrlBase::init() {
     buildDefaultMenu();
 }
 
-void TQCurveEditorCtrlBase::setCurrentTool(uint32_t tool) {
+void TQCurveEditorCtrlBase::setCurrentTool(TQTool tool) {
     _currentTool = tool;
     if (_view) _view->currentToolChanged();
 }
@@ -192,7 +193,8 @@ bool TQCurveEditorCtrlBase::removeSelectedChannelFromSelectedCurveSet() {
     auto* mutableSet = dynamic_cast<TQCurveSetMutable*>(keep.get());
     if (!mutableSet) return false;
     if (_pAppDelegate)
-        _pAppDelegate->addToUndo(this, 2, 0, TQLocalizedString("Curve Editor Undo Remove Channel"));
+        _pAppDelegate->addToUndo(this, kTQUndoTypeController, kTQUndoActionRemoveChannel,
+                                 TQLocalizedString("Curve Editor Undo Remove Channel"));
     const bool removed = mutableSet->removeSelectedItem();
     postNotification(kTQNotifyCurveSetContentChanged);
     updateUI();
@@ -388,12 +390,9 @@ bool TQCurveEditorCtrlBase::getSelected(TQCurveSelectionList* list, double* minX
 
 void TQCurveEditorCtrlBase::setCurveInterpolation(const TQCurveSelection* entry,
                                                   uint32_t interpolation) {
-    if (!entry) return;
-    TQCurveEditorChannelItem* item = itemForEntry(*entry);
-    TQChannel* channel = item ? item->channel() : nullptr;
-    if (!channel) return;
-    channel->setInterpolation(interpolation);
-    markDirty(item);
+    // No announcement to the channel here: the old behaviour, kept.
+    editEntryChannel(entry, {.noteWillChange = false},
+                     [&](const EntryChannel& e) { e.channel.setInterpolation(interpolation); });
 }
 
 // ---- Unit conversion --------------------------------------------------------------------
@@ -470,13 +469,10 @@ void TQCurveEditorCtrlBase::performWithBracket(
     TQCurveSelectionList* list = viewSelection();
     if (!list) return;
     validateSelection(list);
-    if (_pAppDelegate) _pAppDelegate->startCaptureModifiedChannels(TQLocalizedString(undoKey));
-    willModify(list);
-    willModifyValue(list);
-    operation(list);
-    didModifyValue(list);
-    didModify(list);
-    if (_pAppDelegate) _pAppDelegate->endCaptureModifiedChannels();
+    {
+        const TQEditBracket bracket(*this, list, undoKey);
+        operation(list);
+    }
     postNotification(kTQNotifyChannelsChanged);
 }
 
@@ -539,13 +535,11 @@ void TQCurveEditorCtrlBase::showValueAtPoint(const CGPoint& point, RWWindow* inW
     window.parentRect = withRect;
     window.parentWindow = inWindow;
     if (!runValuePanel(window)) return;
-    // The panel ran a modal loop: the channel may have gone meanwhile.
-    channel = channelForEntry(*entry);
-    if (!channel) return;
-    // Deliberately outside any bracket and without a dirty mark, as this has always been.
-    channel->noteWillChange(true);
-    channel->setKeyframeValue(handle,
-                              displayScale != 0.0 ? window.value / displayScale : window.value);
+    // The panel ran a modal loop: the channel is looked up again, and may have gone. This
+    // writes outside any bracket and without a dirty mark, as it always has.
+    const double typed = displayScale != 0.0 ? window.value / displayScale : window.value;
+    editEntryChannel(entry.get(), {.markDirty = false},
+                     [&](const EntryChannel& e) { e.channel.setKeyframeValue(handle, typed); });
 }
 
 // ---- Menus ------------------------------------------------------------------------------

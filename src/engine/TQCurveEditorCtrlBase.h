@@ -22,9 +22,11 @@
 // either and must be detached (setView(nullptr)) before it goes. The controller owns its four
 // context menus and `_keys`; it shares its curve set with whoever else holds it.
 
+#include <cstddef>
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <type_traits>
 #include <vector>
 
 #include "platform/channels/TQChannel.h"
@@ -40,6 +42,7 @@
 #include "src/curvesets/TQCurveSet.h"
 #include "src/data/TQCurveEditorItem.h"
 #include "src/data/TQCurveSelection.h"
+#include "src/engine/TQCurveEditorCodes.h"
 
 class TQCurveEditorViewBase;
 
@@ -89,9 +92,9 @@ public:
     bool negativeRangeAllowed() const { return _negativeRangeAllowed; }
     void allowNegativeRange(bool allowed) { _negativeRangeAllowed = allowed; }
     bool ignoreHiddenChannels() const { return _ignoreHiddenChannels; }
-    virtual uint32_t getCurrentTool() const { return _currentTool; }
+    virtual TQTool getCurrentTool() const { return _currentTool; }
     // Stores the tool, then tells the view (currentToolChanged).
-    virtual void setCurrentTool(uint32_t tool);
+    virtual void setCurrentTool(TQTool tool);
     const RWMenuPtr& getKeyframeMenu() const { return _keyframeMenu; }
     const RWMenuPtr& getTangentMenu() const { return _tangentMenu; }
     const RWMenuPtr& getCurveMenu() const { return _curveMenu; }
@@ -178,8 +181,8 @@ public:
 
     // The cached samples of the item found by its id in `_selectedCurveSet`, refreshed first
     // when dirty (`*number` gives the sample count then). flag bit 0 chooses the processed
-    // curve. The arrays stay the item's and live until its next refresh. An item that is not
-    // in the set leaves the out pointers null and `*number` 0.
+    // curve (kTQSamplesProcessedCurve). The arrays stay the item's and live until its next
+    // refresh. An item that is not in the set leaves the out pointers null and `*number` 0.
     void getSamples(TQCurveEditorItem* item, char flag, CMTime minU, CMTime resolution,
                     const CMTime** samplesU, const double** samplesV, unsigned* number);
     // A copy of the item's keyframe handles; empty for an unknown id.
@@ -291,9 +294,9 @@ public:
 
     // ---- Tangents -----------------------------------------------------------------------
 
-    void setTangents(TQCurveSelection* entry, double u, double v);
+    void setTangents(const TQCurveSelection* entry, double u, double v);
     void setTangentsSelected(TQCurveSelectionList* list, double u, double v);
-    void setTangents45(TQCurveSelection* entry, double u, double v, char flag);
+    void setTangents45(const TQCurveSelection* entry, double u, double v, char flag);
     void setTangents45Selected(TQCurveSelectionList* list, double u, double v, char flag);
     void saveTangents(const TQCurveSelection* entry);
     void breakTangents(const TQCurveSelection* entry);
@@ -336,6 +339,40 @@ protected:
     static bool compoundLinkArgument(const TQCompoundChannel& compound, bool requested) {
         return requested || compound.isLinked();
     }
+    // ---- Per-entry edits ------------------------------------------------------------------
+
+    // What an edit of one entry's channel does around itself: announce the change to the
+    // channel first (noteWillChange(true)) and mark the item's curve dirty after. Edits that
+    // leave either out say so where they call.
+    struct EntryEditMarks {
+        bool noteWillChange = true;
+        bool markDirty = true;
+    };
+    // An entry with its live item and channel, as an edit receives it.
+    struct EntryChannel {
+        const TQCurveSelection& entry;
+        TQCurveEditorChannelItem& item;
+        TQChannel& channel;
+    };
+    // Resolves the entry's item and channel (nothing happens when either is gone), announces,
+    // runs `edit`, marks the item dirty. An edit that answers false (it found nothing to
+    // change) leaves the dirty mark alone. Answers whether the edit ran.
+    template <class Edit>
+    bool editEntryChannel(const TQCurveSelection* entry, EntryEditMarks marks, Edit&& edit);
+    // The same for each entry of the list that `wants` (a predicate on the entry), in order.
+    template <class Predicate, class Edit>
+    void forEachEntryChannel(TQCurveSelectionList* list, Predicate&& wants, EntryEditMarks marks,
+                             Edit&& edit);
+    // Lock and disable: every keypoint entry takes the opposite of the first entry's state
+    // (`read`), written by `write`, on every component when its channel is linked.
+    template <class Read, class Write>
+    void applyKeyframeState(TQCurveSelectionList* list, Read&& read, Write&& write);
+
+    // The steps of setTangents and setTangents45 on a resolved entry; false when its handle is
+    // stale (or, for the snap, when no frame has been drawn) and nothing was changed.
+    bool dragHandle(const EntryChannel& e, double u, double v);
+    bool snapHandle45(const EntryChannel& e, double u, double v, char flag);
+
     // Marks the cached curve of every component of the compound that has an item.
     void markComponentsDirty(const TQCompoundChannel& compound) const;
     static void markDirty(TQCurveEditorChannelItem* item) {
@@ -357,7 +394,7 @@ protected:
 
     TQCurveEditorAppDelegate* _pAppDelegate = nullptr;  // not owned
     TQCurveEditorViewBase* _view = nullptr;             // not owned
-    uint32_t _currentTool = 0;
+    TQTool _currentTool = TQTool::kEdit;
     TQCurveSetPtr _selectedCurveSet;
     RWMenuPtr _keyframeMenu;
     RWMenuPtr _tangentMenu;
@@ -375,3 +412,38 @@ protected:
     bool _bSelectionWasFlipped = false;  // box deformation only
     std::vector<TQKeyframePtr> _keys;    // box deformation only; owned
 };
+
+// ---- Per-entry edits --------------------------------------------------------------------
+
+template <class Edit>
+bool TQCurveEditorCtrlBase::editEntryChannel(const TQCurveSelection* entry, EntryEditMarks marks,
+                                             Edit&& edit) {
+    if (!entry) return false;
+    // Held for the edit: the set could drop the item while the channel changes.
+    const TQCurveEditorItemPtr held = channelItemWithIdentifier(entry->getCurveId());
+    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(held.get());
+    TQChannel* channel = item ? item->channel() : nullptr;
+    if (!channel) return false;
+    if (marks.noteWillChange) channel->noteWillChange(true);
+    const EntryChannel target{*entry, *item, *channel};
+    bool changed = true;
+    if constexpr (std::is_void_v<std::invoke_result_t<Edit&, const EntryChannel&>>)
+        edit(target);
+    else
+        changed = edit(target);
+    if (changed && marks.markDirty) markDirty(item);
+    return true;
+}
+
+template <class Predicate, class Edit>
+void TQCurveEditorCtrlBase::forEachEntryChannel(TQCurveSelectionList* list, Predicate&& wants,
+                                                EntryEditMarks marks, Edit&& edit) {
+    if (!list) return;
+    const std::vector<TQCurveSelectionPtr>& entries = list->getSelectionArray();
+    // By index, each entry held while it is edited: nothing here changes the list, but an
+    // edit must not be able to pull it from under the walk.
+    for (size_t i = 0; i < entries.size(); ++i) {
+        const TQCurveSelectionPtr entry = entries[i];
+        if (entry && std::invoke(wants, *entry)) editEntryChannel(entry.get(), marks, edit);
+    }
+}

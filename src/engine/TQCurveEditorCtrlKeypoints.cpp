@@ -3,11 +3,11 @@
 // commands that open their own bracket.
 
 #include <algorithm>
-#include <functional>
 #include <vector>
 
 #include "platform/channels/TQChannelObjectRootBase.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
+#include "src/engine/TQEditBrackets.h"
 #include "src/resources/TQStrings.h"
 #include "src/view/TQCurveEditorViewBase.h"
 
@@ -122,41 +122,39 @@ void TQCurveEditorCtrlBase::deleteSelected(TQCurveSelectionList* list) {
     validateSelection(list);
     // Channels whose initial value already holds the curve's present value.
     std::vector<const TQChannel*> settled;
-    // A copy: nothing here changes the list, but the entries stay alive whatever happens.
-    const std::vector<TQCurveSelectionPtr> entries = list->getSelectionArray();
-    for (const TQCurveSelectionPtr& entry : entries) {
-        if (!entry || !entry->isKeypoint()) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(*entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        const TQKeyframeHandle handle = entry->getHandle();
-        CMTime time = kCMTimeInvalid;
-        // A keyframe already deleted through a linked sibling earlier in this walk.
-        if (!channel->getKeyframe(handle, &time, nullptr)) continue;
-        if (channel->getKeyframeLocked(handle)) continue;
+    // Announcements and dirty marks differ by path, below.
+    forEachEntryChannel(
+        list, &TQCurveSelection::isKeypoint, {.noteWillChange = false, .markDirty = false},
+        [&](const EntryChannel& e) {
+            const TQKeyframeHandle handle = e.entry.getHandle();
+            CMTime time = kCMTimeInvalid;
+            // A keyframe already deleted through a linked sibling earlier in this walk.
+            if (!e.channel.getKeyframe(handle, &time, nullptr)) return;
+            if (e.channel.getKeyframeLocked(handle)) return;
 
-        if (TQCompoundChannel* compound = linkedParent(channel)) {
-            for (TQChannel* component : componentsOf(*compound)) {
-                component->noteWillChange(true);
-                if (contains(settled, component)) continue;
-                settled.push_back(component);
-                component->setInitialValue(
-                    component->getCurveValue(rootCurrentTime(*component), true), false);
+            if (TQCompoundChannel* compound = linkedParent(&e.channel)) {
+                for (TQChannel* component : componentsOf(*compound)) {
+                    component->noteWillChange(true);
+                    if (contains(settled, component)) continue;
+                    settled.push_back(component);
+                    component->setInitialValue(
+                        component->getCurveValue(rootCurrentTime(*component), true), false);
+                }
+                compound->deleteKeyframe(&e.channel, time,
+                                         compoundLinkArgument(*compound, _linked));
+                markComponentsDirty(*compound);
+            } else {
+                // This path announces nothing to the channel: the old behaviour, kept.
+                if (!contains(settled, &e.channel)) {
+                    settled.push_back(&e.channel);
+                    e.channel.setInitialValue(
+                        e.channel.getCurveValue(e.item.getCurrentTime(), true), false);
+                }
+                const CMTime axisTime = BN_CMTimeSaferAdd(time, e.channel.timeOffset());
+                e.channel.deleteKeyframeAtAxisTime(&axisTime, true);
+                markDirty(&e.item);
             }
-            compound->deleteKeyframe(channel, time, compoundLinkArgument(*compound, _linked));
-            markComponentsDirty(*compound);
-        } else {
-            // This path announces nothing to the channel: the old behaviour, kept.
-            if (!contains(settled, channel)) {
-                settled.push_back(channel);
-                channel->setInitialValue(channel->getCurveValue(item->getCurrentTime(), true),
-                                         false);
-            }
-            const CMTime axisTime = BN_CMTimeSaferAdd(time, channel->timeOffset());
-            channel->deleteKeyframeAtAxisTime(&axisTime, true);
-            markDirty(item);
-        }
-    }
+        });
 }
 
 // ---- Duplicate, reverse -----------------------------------------------------------------
@@ -173,29 +171,24 @@ void TQCurveEditorCtrlBase::duplicateSelected(TQCurveSelectionList* list) {
     CMTime smallStep = CMTimeMultiplyByFloat64(fine, 0.001);
     if (CMTimeCompare(smallStep, kCMTimeZero) <= 0) smallStep = CMTimeMake(1, fine.timescale);
 
-    const std::vector<TQCurveSelectionPtr> entries = list->getSelectionArray();
-    for (const TQCurveSelectionPtr& entry : entries) {
-        if (!entry || !entry->isKeypoint()) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(*entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        channel->noteWillChange(true);
-        const TQKeyframeHandle handle = entry->getHandle();
+    forEachEntryChannel(list, &TQCurveSelection::isKeypoint, {}, [&](const EntryChannel& e) {
+        const TQKeyframeHandle handle = e.entry.getHandle();
         CMTime time = kCMTimeInvalid;
-        if (!channel->getKeyframe(handle, &time, nullptr)) continue;
+        // A stale handle has been announced all the same, and is left unmarked: as it was.
+        if (!e.channel.getKeyframe(handle, &time, nullptr)) return false;
         // A non-discrete channel crosses each occupied frame in a thousand small steps and so
         // lands on the first free frame; a time between frames floors to the frame before it,
         // so the copy may land before its source.
-        const CMTime step = channel->isDiscrete() ? frame : smallStep;
+        const CMTime step = e.channel.isDiscrete() ? frame : smallStep;
         CMTime delta = kCMTimeZero;
         CMTime target = BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, delta), frame);
-        while (channel->getKeyframe(target)) {
+        while (e.channel.getKeyframe(target)) {
             delta = BN_CMTimeSaferAdd(delta, step);
             target = BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, delta), frame);
         }
-        channel->cloneKeyframe(handle, target);
-        markDirty(item);
-    }
+        e.channel.cloneKeyframe(handle, target);
+        return true;
+    });
 }
 
 void TQCurveEditorCtrlBase::reverseSelected(TQCurveSelectionList* list) {
@@ -235,74 +228,54 @@ void TQCurveEditorCtrlBase::reverseSelected(TQCurveSelectionList* list) {
         if (!span.earliest || !span.latest || span.earliest == span.latest) continue;
         TQCurveSelection probe;
         probe.setCurveId(span.curveId);
-        TQCurveEditorChannelItem* item = itemForEntry(probe);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        channel->noteWillChange(true);
-        channel->reverseKeyframes(span.earliest, span.latest);
-        markDirty(item);
+        editEntryChannel(&probe, {}, [&](const EntryChannel& e) {
+            e.channel.reverseKeyframes(span.earliest, span.latest);
+        });
     }
 }
 
 // ---- Lock, disable ----------------------------------------------------------------------
 
-namespace {
-
-// The shared walk of lock and disable: every keypoint entry takes `state`, through every
-// component when the channel is linked.
-template <class Setter>
-void applyKeyframeState(TQCurveSelectionList& list,
-                        const std::function<TQChannel*(const TQCurveSelection&)>& channelOf,
-                        const std::function<TQCompoundChannel*(const TQChannel*)>& linkedOf,
-                        Setter&& set) {
-    const std::vector<TQCurveSelectionPtr> entries = list.getSelectionArray();
-    for (const TQCurveSelectionPtr& entry : entries) {
-        if (!entry || !entry->isKeypoint()) continue;
-        TQChannel* channel = channelOf(*entry);
-        CMTime time = kCMTimeInvalid;
-        if (!channel || !channel->getKeyframe(entry->getHandle(), &time, nullptr)) continue;
-        if (TQCompoundChannel* compound = linkedOf(channel)) {
-            for (TQChannel* component : compound->getComponents()) {
-                component->noteWillChange(true);
-                set(*component, component->getKeyframe(time), compound);
-            }
-        } else {
-            channel->noteWillChange(true);
-            set(*channel, entry->getHandle(), nullptr);
-        }
-    }
-}
-
-}  // namespace
-
-void TQCurveEditorCtrlBase::lockSelected(TQCurveSelectionList* list) {
+template <class Read, class Write>
+void TQCurveEditorCtrlBase::applyKeyframeState(TQCurveSelectionList* list, Read&& read,
+                                               Write&& write) {
     if (!list) return;
     validateSelection(list);
     if (list->empty()) return;
     const TQCurveSelectionPtr first = list->selectionAtIndex(0);
     TQChannel* firstChannel = first ? channelForEntry(*first) : nullptr;
     // One state for all, the opposite of the first entry's: a mixed selection becomes uniform.
-    const bool locked = !(firstChannel && firstChannel->getKeyframeLocked(first->getHandle()));
+    const bool state = !(firstChannel && read(*firstChannel, first->getHandle()));
+    // Announced after the stale test, on every component when linked; marks are the writer's.
+    forEachEntryChannel(list, &TQCurveSelection::isKeypoint,
+                        {.noteWillChange = false, .markDirty = false}, [&](const EntryChannel& e) {
+                            CMTime time = kCMTimeInvalid;
+                            if (!e.channel.getKeyframe(e.entry.getHandle(), &time, nullptr)) return;
+                            if (TQCompoundChannel* compound = linkedParent(&e.channel)) {
+                                for (TQChannel* component : componentsOf(*compound)) {
+                                    component->noteWillChange(true);
+                                    write(*component, component->getKeyframe(time), state);
+                                }
+                            } else {
+                                e.channel.noteWillChange(true);
+                                write(e.channel, e.entry.getHandle(), state);
+                            }
+                        });
+}
+
+void TQCurveEditorCtrlBase::lockSelected(TQCurveSelectionList* list) {
     applyKeyframeState(
-        *list, [this](const TQCurveSelection& e) { return channelForEntry(e); },
-        [this](const TQChannel* c) { return linkedParent(c); },
-        [locked](TQChannel& c, TQKeyframeHandle h, TQCompoundChannel*) {
+        list, [](const TQChannel& c, TQKeyframeHandle h) { return c.getKeyframeLocked(h); },
+        [](TQChannel& c, TQKeyframeHandle h, bool locked) {
             // No dirty mark: a lock does not change the curve.
             c.setKeyframeLocked(h, locked);
         });
 }
 
 void TQCurveEditorCtrlBase::disableSelected(TQCurveSelectionList* list) {
-    if (!list) return;
-    validateSelection(list);
-    if (list->empty()) return;
-    const TQCurveSelectionPtr first = list->selectionAtIndex(0);
-    TQChannel* firstChannel = first ? channelForEntry(*first) : nullptr;
-    const bool enabled = !(firstChannel && firstChannel->getKeyframeEnabled(first->getHandle()));
     applyKeyframeState(
-        *list, [this](const TQCurveSelection& e) { return channelForEntry(e); },
-        [this](const TQChannel* c) { return linkedParent(c); },
-        [this, enabled](TQChannel& c, TQKeyframeHandle h, TQCompoundChannel*) {
+        list, [](const TQChannel& c, TQKeyframeHandle h) { return c.getKeyframeEnabled(h); },
+        [this](TQChannel& c, TQKeyframeHandle h, bool enabled) {
             c.setKeyframeEnabled(h, enabled);
             markDirty(itemForChannel(&c));
         });
@@ -311,41 +284,35 @@ void TQCurveEditorCtrlBase::disableSelected(TQCurveSelectionList* list) {
 // ---- Ease -------------------------------------------------------------------------------
 
 void TQCurveEditorCtrlBase::easeInSelected(TQCurveSelectionList* list) {
-    if (!list) return;
     // An ease-in works on the segment arriving at the keypoint, whose interpolation belongs
-    // to the keyframe before it.
-    for (const TQCurveSelectionPtr& entry : list->getSelectionArray()) {
-        if (!entry || !entry->isKeypoint()) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(*entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        const TQKeyframeHandle previous = channel->getPreviousEnabledKeyframe(entry->getHandle());
-        if (!previous) continue;
-        channel->noteWillChange(true);
-        const unsigned k = channel->getKeyframeInterpolation(previous);
-        if (k != kTQInterpolationEaseBoth)
-            channel->setKeyframeInterpolation(previous, k == kTQInterpolationEaseOut
-                                                            ? kTQInterpolationEaseBoth
-                                                            : kTQInterpolationEaseIn);
-        markDirty(item);
-    }
+    // to the keyframe before it. The channel is announced only when there is one.
+    forEachEntryChannel(
+        list, &TQCurveSelection::isKeypoint, {.noteWillChange = false}, [](const EntryChannel& e) {
+            const TQKeyframeHandle previous =
+                e.channel.getPreviousEnabledKeyframe(e.entry.getHandle());
+            if (!previous) return false;
+            e.channel.noteWillChange(true);
+            const unsigned k = e.channel.getKeyframeInterpolation(previous);
+            if (k != kTQInterpolationEaseBoth)
+                e.channel.setKeyframeInterpolation(previous, k == kTQInterpolationEaseOut
+                                                                 ? kTQInterpolationEaseBoth
+                                                                 : kTQInterpolationEaseIn);
+            return true;
+        });
 }
 
 void TQCurveEditorCtrlBase::easeOutSelected(TQCurveSelectionList* list) {
-    if (!list) return;
-    for (const TQCurveSelectionPtr& entry : list->getSelectionArray()) {
-        if (!entry || !entry->isKeypoint()) continue;
-        TQChannel* channel = channelForEntry(*entry);
-        if (!channel) continue;
-        channel->noteWillChange(true);
-        const unsigned k = channel->getKeyframeInterpolation(entry->getHandle());
-        if (k != kTQInterpolationEaseBoth)
-            channel->setKeyframeInterpolation(entry->getHandle(), k == kTQInterpolationEaseIn
-                                                                      ? kTQInterpolationEaseBoth
-                                                                      : kTQInterpolationEaseOut);
-        // No dirty mark here, unlike ease-in: the old behaviour, kept (the bracket's
-        // notification redraws through the host's modified set).
-    }
+    // No dirty mark here, unlike ease-in: the old behaviour, kept (the bracket's notification
+    // redraws through the host's modified set).
+    forEachEntryChannel(
+        list, &TQCurveSelection::isKeypoint, {.markDirty = false}, [](const EntryChannel& e) {
+            const TQKeyframeHandle h = e.entry.getHandle();
+            const unsigned k = e.channel.getKeyframeInterpolation(h);
+            if (k != kTQInterpolationEaseBoth)
+                e.channel.setKeyframeInterpolation(h, k == kTQInterpolationEaseIn
+                                                          ? kTQInterpolationEaseBoth
+                                                          : kTQInterpolationEaseOut);
+        });
 }
 
 void TQCurveEditorCtrlBase::easeBothSelected(TQCurveSelectionList* list) {
@@ -358,15 +325,19 @@ void TQCurveEditorCtrlBase::easeBothSelected(TQCurveSelectionList* list) {
 TQCurveSelectionPtr TQCurveEditorCtrlBase::addVertex(const TQCurveSelectionPtr& entry, CMTime u) {
     if (!entry) return entry;
     const CMTime axis = convertToCurveEditorAxis(u);
-    TQChannel* channel = channelForEntry(*entry);
-    if (!channel) return entry;
+    TQKeyframeHandle added = nullptr;
     // Neither noteWillChange nor a dirty mark here, unlike the sketch form below: callers
     // announce the channel themselves.
-    if (TQCompoundChannel* compound = linkedParent(channel))
-        compound->addKeyframe(channel, axis, compoundLinkArgument(*compound, _linked));
-    else
-        channel->addKeyframeAtAxisTime(&axis);
-    entry->setHandle(channel->getKeyframe(BN_CMTimeSaferSubtract(axis, channel->timeOffset())));
+    const bool ran = editEntryChannel(
+        entry.get(), {.noteWillChange = false, .markDirty = false}, [&](const EntryChannel& e) {
+            if (TQCompoundChannel* compound = linkedParent(&e.channel))
+                compound->addKeyframe(&e.channel, axis, compoundLinkArgument(*compound, _linked));
+            else
+                e.channel.addKeyframeAtAxisTime(&axis);
+            added = e.channel.getKeyframe(BN_CMTimeSaferSubtract(axis, e.channel.timeOffset()));
+        });
+    if (!ran) return entry;
+    entry->setHandle(added);
     entry->setFlags(TQSelectionKeypoint);
     return entry;
 }
@@ -375,38 +346,39 @@ TQCurveSelectionPtr TQCurveEditorCtrlBase::addVertex(const TQCurveSelectionPtr& 
                                                      double v, char link) {
     if (!entry) return entry;
     const CMTime axis = convertToCurveEditorAxis(u);
-    TQCurveEditorChannelItem* item = itemForEntry(*entry);
-    TQChannel* channel = item ? item->channel() : nullptr;
-    if (!channel) return entry;
-    const double value = convertToChannelCoords(item, v);
-    if (link) {
-        if (TQCompoundChannel* compound = linkedParent(channel))
-            compound->addKeyframe(channel, convertToCurveEditorAxis(axis),
-                                  compoundLinkArgument(*compound, _linked));
-    }
-    const CMTime channelTime = BN_CMTimeSaferSubtract(axis, channel->timeOffset());
-    channel->noteWillChange(true);
-    channel->setKeyframe(channelTime, value, false);
-    markDirty(item);
-    entry->setHandle(channel->getKeyframe(channelTime));
+    TQKeyframeHandle added = nullptr;
+    // Announced after the compound's own keyframe is added, as it always was.
+    const bool ran =
+        editEntryChannel(entry.get(), {.noteWillChange = false}, [&](const EntryChannel& e) {
+            const double value = convertToChannelCoords(&e.item, v);
+            if (link) {
+                if (TQCompoundChannel* compound = linkedParent(&e.channel))
+                    compound->addKeyframe(&e.channel, convertToCurveEditorAxis(axis),
+                                          compoundLinkArgument(*compound, _linked));
+            }
+            const CMTime channelTime = BN_CMTimeSaferSubtract(axis, e.channel.timeOffset());
+            e.channel.noteWillChange(true);
+            e.channel.setKeyframe(channelTime, value, false);
+            added = e.channel.getKeyframe(channelTime);
+        });
+    if (!ran) return entry;
+    entry->setHandle(added);
     entry->setFlags(TQSelectionKeypoint);
     return entry;
 }
 
 void TQCurveEditorCtrlBase::deleteVertex(const TQCurveSelection* entry, CMTime u) {
-    if (!entry) return;
-    TQCurveEditorChannelItem* item = itemForEntry(*entry);
-    TQChannel* channel = item ? item->channel() : nullptr;
-    if (!channel) return;
-    if (TQCompoundChannel* compound = linkedParent(channel)) {
-        compound->deleteKeyframe(channel, u, compoundLinkArgument(*compound, false));
-        markComponentsDirty(*compound);
-        return;
-    }
-    if (TQKeyframeHandle handle = channel->getKeyframe(u)) {
-        channel->deleteKeyframe(handle);
-        markDirty(item);
-    }
+    // No announcement; the dirty marks differ by path.
+    editEntryChannel(
+        entry, {.noteWillChange = false, .markDirty = false}, [&](const EntryChannel& e) {
+            if (TQCompoundChannel* compound = linkedParent(&e.channel)) {
+                compound->deleteKeyframe(&e.channel, u, compoundLinkArgument(*compound, false));
+                markComponentsDirty(*compound);
+            } else if (TQKeyframeHandle handle = e.channel.getKeyframe(u)) {
+                e.channel.deleteKeyframe(handle);
+                markDirty(&e.item);
+            }
+        });
 }
 
 // ---- Commands ---------------------------------------------------------------------------
@@ -448,17 +420,11 @@ void TQCurveEditorCtrlBase::menuAddKeyframe(void*) {
     const CGPoint world = _view->getPointWorld(_view->getMouseOrigin());
     TQChannel* channel = channelForEntry(*entry);
     if (channel && channel->canKeyframe()) {
-        // One channel, one step, recorded in its present state: no capture bracket here.
-        if (_pAppDelegate) {
+        // Deliberately no capture bracket: the channel is recorded as its own undo step.
+        if (_pAppDelegate)
             _pAppDelegate->addChannelToUndo(channel, TQLocalizedString("Undo Add keypoint"));
-            _pAppDelegate->willChangeChannel(channel);
-            _pAppDelegate->willSetChannelValue(channel);
-        }
-        addVertex(entry, TQTarnTimeForChannelSeconds(world.x, 0x40000));
-        if (_pAppDelegate) {
-            _pAppDelegate->didSetChannelValue(channel);
-            _pAppDelegate->didChangeChannel(channel);
-        }
+        const TQChannelEditGuard announced(_pAppDelegate, channel);
+        addVertex(entry, TQTarnTimeForChannelSeconds(world.x, kTQCurveEditorTimescale));
     }
     list->reset();
     list->addSelection(entry);

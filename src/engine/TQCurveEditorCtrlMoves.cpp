@@ -66,10 +66,9 @@ void TQCurveEditorCtrlBase::moveSelected(TQCurveSelectionList* list, CMTime x, d
 
     if (anchor->isCurve()) {
         // The segment is taken at x as it came: no conversion to channel time here.
-        const double value = convertToChannelCoords(anchorItem, y);
-        anchorChannel->noteWillChange(true);
-        anchorChannel->setCurveSegmentValue(x, value, false);
-        markDirty(anchorItem);
+        editEntryChannel(anchor.get(), {}, [&](const EntryChannel& e) {
+            e.channel.setCurveSegmentValue(x, convertToChannelCoords(&e.item, y), false);
+        });
         return;
     }
 
@@ -102,46 +101,45 @@ void TQCurveEditorCtrlBase::moveSelected(TQCurveSelectionList* list, CMTime x, d
     // Keyframes of linked components already carried along by an earlier entry of this call.
     std::unordered_set<TQKeyframeHandle> moved;
 
+    // Announced after the stale test, on the compound when linked; the dirty marks are made
+    // by path, below.
+    const EntryEditMarks byPath{.noteWillChange = false, .markDirty = false};
     for (const OrderedEntry& o : ordered) {
-        TQCurveSelection& entry = *o.entry;
-        if (!entry.isKeypoint()) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        const TQKeyframeHandle handle = entry.getHandle();
-        const CMTime offset = channel->timeOffset();
-        CMTime time = kCMTimeInvalid;
-        double value = 0.0;
-        // A handle can die within the call when a linked move resolved a meeting; skip it.
-        if (!channel->getKeyframe(handle, &time, &value)) continue;
-        // The same V distance on screen for every curve, each through its own scale.
-        const double newValue = value + ((y - anchorV) * item->scaleY()) / item->conversionFactor();
-        const CMTime from = BN_CMTimeSaferAdd(time, offset);
-        CMTime to = BN_CMTimeSaferAdd(BN_CMTimeSaferAdd(time, dt), offset);
+        if (!o.entry->isKeypoint()) continue;
+        editEntryChannel(o.entry, byPath, [&](const EntryChannel& e) {
+            const TQKeyframeHandle handle = e.entry.getHandle();
+            const CMTime offset = e.channel.timeOffset();
+            CMTime time = kCMTimeInvalid;
+            double value = 0.0;
+            // A handle can die within the call when a linked move resolved a meeting; skip it.
+            if (!e.channel.getKeyframe(handle, &time, &value)) return;
+            // The same V distance on screen for every curve, each through its own scale.
+            const double newValue =
+                value + ((y - anchorV) * e.item.scaleY()) / e.item.conversionFactor();
+            const CMTime from = BN_CMTimeSaferAdd(time, offset);
+            CMTime to = BN_CMTimeSaferAdd(BN_CMTimeSaferAdd(time, dt), offset);
 
-        TQCompoundChannel* compound = linkedParent(channel);
-        if (!compound) {
-            channel->noteWillChange(true);
-            channel->setKeyframeValue(handle, newValue);
-            if (moveInTime) {
-                if (!_negativeRangeAllowed && CMTimeCompare(to, kCMTimeZero) < 0) to = kCMTimeZero;
-                // Only a keypoint moved alone lands on the grid; a group keeps its spacing.
-                if (singleEntry && !isConstraining) to = convertToCurveEditorAxis(to);
-                channel->moveKeyframe(&from, &to, true);
+            TQCompoundChannel* compound = linkedParent(&e.channel);
+            if (!compound) {
+                e.channel.noteWillChange(true);
+                e.channel.setKeyframeValue(handle, newValue);
+                if (moveInTime) {
+                    if (!_negativeRangeAllowed && CMTimeCompare(to, kCMTimeZero) < 0)
+                        to = kCMTimeZero;
+                    // Only a keypoint moved alone lands on the grid; a group keeps its spacing.
+                    if (singleEntry && !isConstraining) to = convertToCurveEditorAxis(to);
+                    e.channel.moveKeyframe(&from, &to, true);
+                }
+                markDirty(&e.item);
+                return;
             }
-            markDirty(item);
-            continue;
-        }
 
-        // Linked: no clamp at 0, no rounding, and the move runs even when dt is zero.
-        compound->noteWillChange(true);
-        channel->setKeyframeValue(handle, newValue);
-        if (moved.contains(handle)) continue;
-        compound->moveKeyframe(channel, from, to, nullptr, nullptr, _linked);
-        if (const auto* children = compound->getChildren()) {
-            for (TQChannelBase* child : *children) {
-                auto* component = dynamic_cast<TQChannel*>(child);
-                if (!component) continue;
+            // Linked: no clamp at 0, no rounding, and the move runs even when dt is zero.
+            compound->noteWillChange(true);
+            e.channel.setKeyframeValue(handle, newValue);
+            if (moved.contains(handle)) return;
+            compound->moveKeyframe(&e.channel, from, to, nullptr, nullptr, _linked);
+            for (TQChannel* component : compound->getComponents()) {
                 TQCurveEditorChannelItem* componentItem = itemForChannel(component);
                 if (!componentItem) continue;
                 markDirty(componentItem);
@@ -150,7 +148,7 @@ void TQCurveEditorCtrlBase::moveSelected(TQCurveSelectionList* list, CMTime x, d
                 const CMTime componentTime = component->toChannelTime(&to);
                 if (TQKeyframeHandle h = component->getKeyframe(componentTime)) moved.insert(h);
             }
-        }
+        });
     }
 }
 
@@ -161,15 +159,13 @@ void TQCurveEditorCtrlBase::offsetSelected(TQCurveSelectionList* list, CMTime x,
 
     const TQCurveSelectionPtr first = list->selectionAtIndex(0);
     if (first->isCurve()) {
-        TQCurveEditorChannelItem* item = itemForEntry(*first);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) return;
-        // A vertical nudge of a segment steps by the channel's value step.
-        const double value = convertToChannelCoords(item, y * channel->getInfo()->valueStep);
-        channel->noteWillChange(true);
-        const double newValue = value + channel->getInitialValue();
-        channel->setCurveSegmentValue(channel->toSegmentTime(&x), newValue, false);
-        markDirty(item);
+        editEntryChannel(first.get(), {}, [&](const EntryChannel& e) {
+            // A vertical nudge of a segment steps by the channel's value step.
+            const double value =
+                convertToChannelCoords(&e.item, y * e.channel.getInfo()->valueStep);
+            e.channel.setCurveSegmentValue(e.channel.toSegmentTime(&x),
+                                           value + e.channel.getInitialValue(), false);
+        });
         return;
     }
 
@@ -185,34 +181,31 @@ void TQCurveEditorCtrlBase::offsetSelected(TQCurveSelectionList* list, CMTime x,
     const bool moveInTime = !isZero(x);
     const bool singleEntry = ordered.size() == 1;
     for (const OrderedEntry& o : ordered) {
-        TQCurveSelection& entry = *o.entry;
-        if (!entry.isKeypoint()) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        const TQKeyframeHandle handle = entry.getHandle();
-        const CMTime offset = channel->timeOffset();
-        channel->noteWillChange(true);
-        CMTime time = kCMTimeInvalid;
-        double value = 0.0;
-        if (!channel->getKeyframe(handle, &time, &value)) continue;
-        channel->setKeyframeValue(handle, value + (item->scaleY() * y) / item->conversionFactor());
-        const CMTime from = BN_CMTimeSaferAdd(time, offset);
-        if (moveInTime) {
+        if (!o.entry->isKeypoint()) continue;
+        editEntryChannel(o.entry, {}, [&](const EntryChannel& e) {
+            const TQKeyframeHandle handle = e.entry.getHandle();
+            CMTime time = kCMTimeInvalid;
+            double value = 0.0;
+            // Announced, but a stale handle is left unmarked: as it always was.
+            if (!e.channel.getKeyframe(handle, &time, &value)) return false;
+            e.channel.setKeyframeValue(handle,
+                                       value + (e.item.scaleY() * y) / e.item.conversionFactor());
+            const CMTime from = BN_CMTimeSaferAdd(time, e.channel.timeOffset());
+            if (!moveInTime) return true;
             // No moved set here: a nudge of two components of one linked compound moves the
             // compound twice, as it always has.
-            if (TQCompoundChannel* compound = linkedParent(channel)) {
+            if (TQCompoundChannel* compound = linkedParent(&e.channel)) {
                 compound->noteWillChange(true);
-                compound->moveKeyframe(channel, from, BN_CMTimeSaferAdd(from, x), nullptr, nullptr,
-                                       _linked);
+                compound->moveKeyframe(&e.channel, from, BN_CMTimeSaferAdd(from, x), nullptr,
+                                       nullptr, _linked);
                 markComponentsDirty(*compound);
             } else {
                 CMTime to = BN_CMTimeSaferAdd(from, x);
                 if (singleEntry) to = convertToCurveEditorAxis(to);
-                channel->moveKeyframe(&from, &to, true);
+                e.channel.moveKeyframe(&from, &to, true);
             }
-        }
-        markDirty(item);
+            return true;
+        });
     }
 }
 
@@ -221,13 +214,9 @@ void TQCurveEditorCtrlBase::offsetCurve(TQCurveSelectionList* list, CMTime x, do
     validateSelection(list);
     if (list->empty()) return;
     // Only the curve of entry 0 moves; x is where the user took it.
-    TQCurveEditorChannelItem* item = itemForEntry(*list->selectionAtIndex(0));
-    TQChannel* channel = item ? item->channel() : nullptr;
-    if (!channel) return;
-    const double value = convertToChannelCoords(item, y);
-    channel->noteWillChange(true);
-    channel->offsetCurve(&x, value);
-    markDirty(item);
+    editEntryChannel(list->selectionAtIndex(0).get(), {}, [&](const EntryChannel& e) {
+        e.channel.offsetCurve(&x, convertToChannelCoords(&e.item, y));
+    });
 }
 
 void TQCurveEditorCtrlBase::sortKeypoints(std::vector<TQKeyframePtr>& keys, bool bBackward) {

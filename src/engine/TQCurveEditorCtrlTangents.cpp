@@ -46,6 +46,10 @@ void writeHandle(TQChannel& channel, TQKeyframeHandle h, Side side, double u, do
 
 Side opposite(Side side) { return side == Side::Output ? Side::Input : Side::Output; }
 
+bool isKeypointOrTangent(const TQCurveSelection& entry) {
+    return entry.isKeypoint() || entry.isTangent();
+}
+
 double length(const CGPoint& p) { return std::hypot(p.x, p.y); }
 bool isFinite(const CGPoint& p) { return std::isfinite(p.x) && std::isfinite(p.y); }
 
@@ -60,23 +64,24 @@ static CGPoint toWorld(const TQCurveEditorViewBase* view, const CGPoint& screen)
     return view ? view->getPointWorld(screen) : screen;
 }
 
-void TQCurveEditorCtrlBase::setTangents(TQCurveSelection* entry, double u, double v) {
-    if (!entry) return;
-    TQCurveEditorChannelItem* item = itemForEntry(*entry);
-    TQChannel* channel = item ? item->channel() : nullptr;
-    if (!channel) return;
+void TQCurveEditorCtrlBase::setTangents(const TQCurveSelection* entry, double u, double v) {
+    editEntryChannel(entry, {}, [&](const EntryChannel& e) { return dragHandle(e, u, v); });
+}
 
+bool TQCurveEditorCtrlBase::dragHandle(const EntryChannel& e, double u, double v) {
+    TQCurveEditorChannelItem* item = &e.item;
+    TQChannel* channel = &e.channel;
     const CMTime offset = channel->timeOffset();
-    channel->noteWillChange(true);
-    const TQKeyframeHandle h = entry->getHandle();
+    const TQKeyframeHandle h = e.entry.getHandle();
     CMTime keyTime = kCMTimeInvalid;
     double keyValue = 0.0;
-    if (!channel->getKeyframe(h, &keyTime, &keyValue)) return;  // stale handle: nothing to drag
+    // A stale handle: nothing to drag, and the curve is left unmarked.
+    if (!channel->getKeyframe(h, &keyTime, &keyValue)) return false;
     const bool broken = channel->getKeyframeTangentsBroken(h);
     const bool scaled = channel->getKeyframeTangentsScaled(h);
     const double channelV = convertToChannelCoords(item, v);
 
-    const Side side = sideOfWord(entry->getFlags());
+    const Side side = sideOfWord(e.entry.getFlags());
     if (side != Side::None) {
         // The time offset enters here only: u is on the editor's axis.
         const double newU = u - CMTimeGetSeconds(BN_CMTimeSaferAdd(keyTime, offset));
@@ -141,7 +146,7 @@ void TQCurveEditorCtrlBase::setTangents(TQCurveSelection* entry, double u, doubl
             if (ok) writeHandle(*channel, h, opposite(side), followU, followV);
         }
     }
-    markDirty(item);
+    return true;
 }
 
 void TQCurveEditorCtrlBase::setTangentsSelected(TQCurveSelectionList* list, double u, double v) {
@@ -189,23 +194,27 @@ void TQCurveEditorCtrlBase::setTangentsSelected(TQCurveSelectionList* list, doub
     }
 }
 
-void TQCurveEditorCtrlBase::setTangents45(TQCurveSelection* entry, double u, double v, char flag) {
-    if (!entry) return;
-    TQCurveEditorChannelItem* item = itemForEntry(*entry);
-    TQChannel* channel = item ? item->channel() : nullptr;
-    if (!channel) return;
+void TQCurveEditorCtrlBase::setTangents45(const TQCurveSelection* entry, double u, double v,
+                                          char flag) {
+    // Announced by the drag it ends in (setTangents), not here.
+    editEntryChannel(entry, {.noteWillChange = false},
+                     [&](const EntryChannel& e) { return snapHandle45(e, u, v, flag); });
+}
 
-    const TQKeyframeHandle h = entry->getHandle();
+bool TQCurveEditorCtrlBase::snapHandle45(const EntryChannel& e, double u, double v, char flag) {
+    TQCurveEditorChannelItem* item = &e.item;
+    TQChannel* channel = &e.channel;
+    const TQKeyframeHandle h = e.entry.getHandle();
     CMTime keyTime = kCMTimeInvalid;
     double keyValue = 0.0;
-    if (!channel->getKeyframe(h, &keyTime, &keyValue)) return;
+    if (!channel->getKeyframe(h, &keyTime, &keyValue)) return false;
     const double keySeconds = CMTimeGetSeconds(keyTime);
 
     // The reference direction: the handle as it stood when the drag began (flag set), or a
     // vertical one (flag clear), so that the steps are then absolute screen directions. An
     // entry that names no handle takes the world origin as its reference point.
     CGPoint reference = CGPointZero;
-    const Side side = sideOfWord(entry->getFlags());
+    const Side side = sideOfWord(e.entry.getFlags());
     if (side != Side::None) {
         double refU = 0.0;
         double refV = 0.0;
@@ -226,9 +235,9 @@ void TQCurveEditorCtrlBase::setTangents45(TQCurveSelection* entry, double u, dou
     const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection({m.x, m.y}, {t.x, t.y}, 0.0);
     const CGPoint target = toWorld(_view, p + CGPointMake(r.x, r.y));
     // No frame drawn yet: there is no screen to snap on.
-    if (!isFinite(target)) return;
-    setTangents(entry, target.x, target.y);
-    markDirty(item);
+    if (!isFinite(target)) return false;
+    setTangents(&e.entry, target.x, target.y);
+    return true;
 }
 
 void TQCurveEditorCtrlBase::setTangents45Selected(TQCurveSelectionList* list, double u, double v,
@@ -286,12 +295,11 @@ void TQCurveEditorCtrlBase::saveTangents(const TQCurveSelection* entry) {
 }
 
 void TQCurveEditorCtrlBase::breakTangents(const TQCurveSelection* entry) {
-    if (!entry) return;
-    TQChannel* channel = channelForEntry(*entry);
-    if (!channel) return;
-    channel->noteWillChange(true);
-    const TQKeyframeHandle h = entry->getHandle();
-    channel->setKeyframeTangentsBroken(h, !channel->getKeyframeTangentsBroken(h));
+    // Toggles, with no dirty mark: the old behaviour, kept.
+    editEntryChannel(entry, {.markDirty = false}, [](const EntryChannel& e) {
+        const TQKeyframeHandle h = e.entry.getHandle();
+        e.channel.setKeyframeTangentsBroken(h, !e.channel.getKeyframeTangentsBroken(h));
+    });
 }
 
 void TQCurveEditorCtrlBase::breakTangentsSelected(TQCurveSelectionList* list) {
@@ -299,106 +307,79 @@ void TQCurveEditorCtrlBase::breakTangentsSelected(TQCurveSelectionList* list) {
     // One state for all, decided by the first keypoint or handle that has a channel.
     bool reading = true;
     for (const auto& entry : list->getSelectionArray()) {
-        TQChannel* channel = channelForEntry(*entry);
-        if (!channel || !(entry->isKeypoint() || entry->isTangent())) continue;
+        TQChannel* channel = entry ? channelForEntry(*entry) : nullptr;
+        if (!channel || !isKeypointOrTangent(*entry)) continue;
         reading = channel->getKeyframeTangentsBroken(entry->getHandle());
         break;
     }
-    for (const auto& entry : list->getSelectionArray()) {
-        if (!(entry->isKeypoint() || entry->isTangent())) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(*entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        channel->noteWillChange(true);
-        channel->setKeyframeTangentsBroken(entry->getHandle(), !reading);
-        markDirty(item);
-    }
+    forEachEntryChannel(list, isKeypointOrTangent, {}, [&](const EntryChannel& e) {
+        e.channel.setKeyframeTangentsBroken(e.entry.getHandle(), !reading);
+    });
 }
 
 void TQCurveEditorCtrlBase::alignTangentsSelected(TQCurveSelectionList* list) {
-    if (!list) return;
-    for (const auto& entry : list->getSelectionArray()) {
-        if (!entry->isTangent()) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(*entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        channel->noteWillChange(true);
+    forEachEntryChannel(list, &TQCurveSelection::isTangent, {}, [](const EntryChannel& e) {
         // The opposite handle becomes the exact mirror; its own length is lost by design.
-        const Side from = entry->getFlags() == TQSelectionInTangent ? Side::Input : Side::Output;
+        const Side from = e.entry.getFlags() == TQSelectionInTangent ? Side::Input : Side::Output;
         double tu = 0.0;
         double tv = 0.0;
-        readHandle(*channel, entry->getHandle(), from, tu, tv);
-        writeHandle(*channel, entry->getHandle(), opposite(from), -tu, -tv);
-        markDirty(item);
-    }
+        readHandle(e.channel, e.entry.getHandle(), from, tu, tv);
+        writeHandle(e.channel, e.entry.getHandle(), opposite(from), -tu, -tv);
+    });
 }
 
 void TQCurveEditorCtrlBase::weightTangents(const TQCurveSelection* entry, char flag) {
-    if (!entry) return;
-    TQChannel* channel = channelForEntry(*entry);
-    if (!channel) return;
-    channel->noteWillChange(true);
-    channel->setKeyframeTangentsScaled(entry->getHandle(), flag != 0);
+    // No dirty mark for one entry, unlike the list form: the old behaviour, kept.
+    editEntryChannel(entry, {.markDirty = false}, [&](const EntryChannel& e) {
+        e.channel.setKeyframeTangentsScaled(e.entry.getHandle(), flag != 0);
+    });
 }
 
 void TQCurveEditorCtrlBase::weightTangentsSelected(TQCurveSelectionList* list, char flag) {
-    if (!list) return;
-    for (const auto& entry : list->getSelectionArray()) {
-        if (!(entry->isKeypoint() || entry->isTangent())) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(*entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        channel->noteWillChange(true);
-        channel->setKeyframeTangentsScaled(entry->getHandle(), flag != 0);
-        markDirty(item);
-    }
+    forEachEntryChannel(list, isKeypointOrTangent, {}, [&](const EntryChannel& e) {
+        e.channel.setKeyframeTangentsScaled(e.entry.getHandle(), flag != 0);
+    });
 }
 
 void TQCurveEditorCtrlBase::setBezierPoint(const TQCurveSelection* entry) {
     // Unlike its siblings this announces nothing and leaves the dirty mark alone; callers
     // rely on that. A missing channel is guarded all the same.
     if (!entry || !entry->isKeypoint()) return;
-    TQChannel* channel = channelForEntry(*entry);
-    if (!channel) return;
-    const TQKeyframeHandle h = entry->getHandle();
-    channel->smoothKeyframe(h, true);
-    CMTime time = kCMTimeInvalid;
-    if (!channel->getKeyframe(h, &time, nullptr)) return;
-    // The segment into the keypoint depends on its predecessor, so that one is smoothed too.
-    CMTime previous = kCMTimeInvalid;
-    if (channel->getPreviousKeyframe(time, &previous, nullptr)) {
-        channel->smoothKeyframe(channel->getKeyframe(previous), true);
-    }
+    editEntryChannel(entry, {.noteWillChange = false, .markDirty = false},
+                     [](const EntryChannel& e) {
+                         const TQKeyframeHandle h = e.entry.getHandle();
+                         e.channel.smoothKeyframe(h, true);
+                         CMTime time = kCMTimeInvalid;
+                         if (!e.channel.getKeyframe(h, &time, nullptr)) return;
+                         // The segment into the keypoint depends on its predecessor, so that
+                         // one is smoothed too.
+                         CMTime previous = kCMTimeInvalid;
+                         if (e.channel.getPreviousKeyframe(time, &previous, nullptr))
+                             e.channel.smoothKeyframe(e.channel.getKeyframe(previous), true);
+                     });
 }
 
 void TQCurveEditorCtrlBase::setBezierPointSelected(TQCurveSelectionList* list) {
     if (!list) return;
     validateSelection(list);
-    for (const auto& entry : list->getSelectionArray()) {
-        if (entry->isKeypoint()) setBezierPoint(entry.get());
-    }
+    for (const auto& entry : list->getSelectionArray())
+        if (entry && entry->isKeypoint()) setBezierPoint(entry.get());
 }
 
 void TQCurveEditorCtrlBase::flattenSelected(TQCurveSelectionList* list) {
     if (!list) return;
     validateSelection(list);
-    for (const auto& entry : list->getSelectionArray()) {
-        if (!entry->isKeypoint()) continue;
-        TQCurveEditorChannelItem* item = itemForEntry(*entry);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel) continue;
-        const TQKeyframeHandle h = entry->getHandle();
-        channel->noteWillChange(true);
-        channel->setKeyframeInterpolation(h, kTQInterpolationLinear);
-        channel->setKeyframeTangentsBroken(h, false);
+    forEachEntryChannel(list, &TQCurveSelection::isKeypoint, {}, [](const EntryChannel& e) {
+        const TQKeyframeHandle h = e.entry.getHandle();
+        e.channel.setKeyframeInterpolation(h, kTQInterpolationLinear);
+        e.channel.setKeyframeTangentsBroken(h, false);
         CMTime time = kCMTimeInvalid;
         CMTime previous = kCMTimeInvalid;
         // The incoming segment is the predecessor's: it turns Linear too.
-        if (channel->getKeyframe(h, &time, nullptr) &&
-            channel->getPreviousKeyframe(time, &previous, nullptr)) {
-            channel->setKeyframeInterpolation(channel->getKeyframe(previous),
-                                              kTQInterpolationLinear);
+        if (e.channel.getKeyframe(h, &time, nullptr) &&
+            e.channel.getPreviousKeyframe(time, &previous, nullptr)) {
+            e.channel.setKeyframeInterpolation(e.channel.getKeyframe(previous),
+                                               kTQInterpolationLinear);
         }
-        markDirty(item);
-    }
+    });
 }

@@ -12,11 +12,6 @@
 
 namespace {
 
-// Zero test on doubles and degenerate extents, as everywhere in the editor.
-constexpr double kEpsilon = 1e-7;
-// Every time made from seconds on a curve has this timescale.
-constexpr int kChannelTimescale = 0x40000;
-
 // 2^floor(log2(x)): the power of two at or below x.
 double powerOfTwoBelow(double x) { return std::exp2(std::floor(std::log2(x))); }
 
@@ -28,8 +23,16 @@ TQCurveEditorViewBase::TQCurveEditorViewBase()
       _previousSelection(std::make_shared<TQCurveSelectionList>()) {}
 
 TQCurveEditorViewBase::~TQCurveEditorViewBase() {
+    // A drag still under way ends here: its undo step closes while the selection it
+    // announced is still alive.
+    closeDragCapture();
     // A controller that still points here would call a dead view at its next update.
     if (_controller && _controller->getView() == this) _controller->setView(nullptr);
+}
+
+void TQCurveEditorViewBase::setController(TQCurveEditorCtrlBase* controller) {
+    if (controller != _controller) closeDragCapture();
+    _controller = controller;
 }
 
 // ---- Wiring, size and backing --------------------------------------------------------------
@@ -99,7 +102,7 @@ CGPoint TQCurveEditorViewBase::adjustWorldPointToScreen(const CGPoint& world) co
     // Truncation to 32 bits is guarded: a NaN or out-of-range pixel (no frame yet) stays as
     // it is instead of being converted, which would be undefined.
     auto snap = [](double c) {
-        const double f = std::floor(c + 0.5 + kEpsilon);
+        const double f = std::floor(c + 0.5 + kTQZeroTolerance);
         if (!(f >= static_cast<double>(INT32_MIN) && f <= static_cast<double>(INT32_MAX))) return f;
         return static_cast<double>(static_cast<int32_t>(f));
     };
@@ -143,11 +146,11 @@ void TQCurveEditorViewBase::zoom(double dx, double y) {
 
     // Horizontal: the anchor keeps its fraction of the width; the controller decides.
     const double ax = a.x - c.origin.x;
-    if (std::fabs(ax) >= kEpsilon) {
+    if (std::fabs(ax) >= kTQZeroTolerance) {
         const double r = (a.x + o.x * 0.5 - c.origin.x) / ax;
         double origin = 0.0;
         double duration = 0.0;
-        if (std::fabs(r) >= kEpsilon) {
+        if (std::fabs(r) >= kTQZeroTolerance) {
             duration = c.size.width / r;
             origin = a.x - (ax / c.size.width) * duration;
         }
@@ -157,12 +160,12 @@ void TQCurveEditorViewBase::zoom(double dx, double y) {
     // Vertical: the same about the anchor, limited by _maxZoomY (and not below: a drag may
     // take the zoom under 1/_maxZoomY, only the factor buttons clamp there).
     const double b = a.y - c.origin.y;
-    if (std::fabs(b) >= kEpsilon) {
+    if (std::fabs(b) >= kTQZeroTolerance) {
         const double f = b / c.size.height;
         const double r = (a.y + o.y * 0.5 - c.origin.y) / b;
         double newY = 0.0;
         double height = 0.0;
-        if (std::fabs(r) >= kEpsilon) {
+        if (std::fabs(r) >= kTQZeroTolerance) {
             height = c.size.height / r;
             newY = a.y - height * f;
         }
@@ -188,7 +191,7 @@ void TQCurveEditorViewBase::zoom(double dx, double y) {
 
 void TQCurveEditorViewBase::zoomWithFactor(double fx, double y) {
     double fy = y;
-    if (std::fabs(fx - 1.0) >= kEpsilon) {
+    if (std::fabs(fx - 1.0) >= kTQZeroTolerance) {
         const double duration = _originalViewVolume.size.width / fx;
         const double origin =
             _originalViewVolume.origin.x + _originalViewVolume.size.width * 0.5 - duration * 0.5;
@@ -196,7 +199,7 @@ void TQCurveEditorViewBase::zoomWithFactor(double fx, double y) {
         takeHorizontalFromDisplayRange();
         _zoomFactorX = _originalViewVolume.size.width / _currentViewVolume.size.width;
     }
-    if (std::fabs(fy - 1.0) >= kEpsilon) {
+    if (std::fabs(fy - 1.0) >= kTQZeroTolerance) {
         const double minZoom = 1.0 / _maxZoomY;
         fy = fy < minZoom ? minZoom : (fy > _maxZoomY ? _maxZoomY : fy);
         const CGRect c = _currentViewVolume;
@@ -269,7 +272,7 @@ void TQCurveEditorViewBase::performAutoZoom(bool force) {
 
     double bottom = 1e6;
     double top = -1e6;
-    if (_controller->getCurrentTool() != 2 || !_fourCornerBoxInitialized) {
+    if (_controller->getCurrentTool() != TQTool::kBox || !_fourCornerBoxInitialized) {
         auto set = _controller->selectedCurveSet();
         if (set) {
             for (const TQCurveEditorItemPtr& item : set->allItems()) {
@@ -291,7 +294,7 @@ void TQCurveEditorViewBase::performAutoZoom(bool force) {
     }
 
     CGRect& c = _currentViewVolume;
-    if (std::fabs(bottom - top) < kEpsilon) {
+    if (std::fabs(bottom - top) < kTQZeroTolerance) {
         // Deliberately compares a vertical value with the horizontal edges: that is how the
         // flat case has always behaved, and views of one flat curve rely on it not zooming.
         if (bottom < c.origin.x)
@@ -352,12 +355,12 @@ void TQCurveEditorViewBase::frameAll(char includeTime) {
         // Without an enabled keyframed item minT stays infinite; the fit would then make the
         // volume infinite and the view unusable, so the time axis is left as it is.
         if (std::isfinite(span)) {
-            const CMTime pad = TQTarnTimeForChannelSeconds(span * 0.05, kChannelTimescale);
+            const CMTime pad = TQTarnTimeForChannelSeconds(span * 0.05, kTQCurveEditorTimescale);
             maxT = BN_CMTimeSaferAdd(maxT, pad);
             minT = BN_CMTimeSaferSubtract(minT, pad);
             const double ratio = _currentViewVolume.size.width /
                                  CMTimeGetSeconds(BN_CMTimeSaferSubtract(maxT, minT));
-            if (std::fabs(ratio - 1.0) >= kEpsilon) {
+            if (std::fabs(ratio - 1.0) >= kTQZeroTolerance) {
                 _currentViewVolume.size.width /= ratio;
                 _zoomFactorX = _originalViewVolume.size.width / _currentViewVolume.size.width;
             }

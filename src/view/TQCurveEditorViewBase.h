@@ -41,6 +41,8 @@
 #include "platform/ui/RWServices.h"
 #include "src/contract/TQNotificationWords.h"
 #include "src/data/TQCurveSelection.h"
+#include "src/engine/TQCurveEditorCodes.h"
+#include "src/engine/TQEditBrackets.h"
 #include "src/resources/GDColor.h"
 
 class TQCurveEditorCtrlBase;
@@ -56,6 +58,28 @@ struct KeyframeAsset {
 
 // The frame's keypoint quads by the item's channelId (what a rubber band tests).
 using TQKeypointPrimitives = std::map<uint32_t, HXDPrimitiveArray>;
+
+// The axis to which a Shift drag of keypoints is held.
+enum class TQConstrainDirection : uint32_t {
+    kUndecided = 0,
+    kHorizontal = 1,  // time follows the pointer, the value stays
+    kVertical = 2,    // the value follows the pointer, the time stays
+};
+
+// Parts of the box tool's box: the hit ids of what the box draws, and what a gesture holds.
+// Hit ids of a pick are compared as raw words, so these are plain constants.
+enum TQBoxPart : uint32_t {
+    kTQBoxPartNone = 0,
+    kTQBoxPartBottomLeft = 1,
+    kTQBoxPartBottomRight = 2,
+    kTQBoxPartTopRight = 3,
+    kTQBoxPartTopLeft = 4,
+    kTQBoxPartTopMiddle = 5,
+    kTQBoxPartBottomMiddle = 6,
+    kTQBoxPartLeftMiddle = 7,
+    kTQBoxPartRightMiddle = 8,
+    kTQBoxPartInside = 9,
+};
 
 class TQCurveEditorViewBase {
 public:
@@ -73,7 +97,8 @@ public:
     // ---- Wiring ----
 
     TQCurveEditorCtrlBase* getController() const { return _controller; }
-    void setController(TQCurveEditorCtrlBase* controller) { _controller = controller; }
+    // A drag's open undo step belongs to the old controller: it is closed first.
+    void setController(TQCurveEditorCtrlBase* controller);
     RWViewHost* viewHost() const { return _viewHost; }
     // Also takes the host's backing (viewDidChangeBackingProperties).
     void setViewHost(RWViewHost* host);
@@ -262,7 +287,7 @@ public:
     // decides it from p - origin (a tie is vertical) and answers origin; later calls keep
     // origin's y (horizontal) or x (vertical).
     CGPoint constrainMove(const CGPoint& p, const CGPoint& origin);
-    uint32_t constrainMoveDirection() const { return _constrainMove; }
+    TQConstrainDirection constrainMoveDirection() const { return _constrainMove; }
     // Keeps a world x inside [total range start, later of total and display range end].
     CGPoint constrainTime(const CGPoint& p) const;
     // Round trip through the screen: the dragged point is deliberately not moved onto the
@@ -273,8 +298,8 @@ public:
     char snapCursor() const { return _snapCursor; }
     void setLockKeyframesInU(char lock) { _lockInU = lock; }
     char lockKeyframesInU() const { return _lockInU; }
-    char getCapturing() const { return _capturing; }
-    void setCapturing(char capturing) { _capturing = capturing; }
+    // A drag's undo step is open (from its first step until the release).
+    char getCapturing() const { return _capturing.has_value() ? 1 : 0; }
     void setShouldDrawProcessedCurve(char draw) { _shouldDrawProcessedCurve = draw; }
     char shouldDrawProcessedCurve() const { return _shouldDrawProcessedCurve; }
     char startDrag() const { return _startDrag; }
@@ -459,8 +484,12 @@ protected:
     CGPoint dragKeypointStep(TQCurveSelection& primary, CGPoint world, double dx,
                              uint64_t modifierFlags);
     void dragCurveStep(CGPoint world, uint64_t modifierFlags);
-    // Opens the drag's one undo step at its first step.
+    // Opens the drag's one undo step at its first step (a step after the first, or after a
+    // key release, opens nothing).
     void openDragCapture(const char* undoKey);
+    // Closes the drag's undo step, if one is open: didModify of the selection, then the end
+    // of the capture.
+    void closeDragCapture() { _capturing.reset(); }
     // Turns the ghost on and lowers the sample count of every selected item for a drag, and
     // restores them at its end.
     void prepareItemsForDrag();
@@ -505,11 +534,14 @@ protected:
     char _startDrag = 0;         // no drag step has run yet in this gesture
     char _useOriginalAngle = 0;  // a Shift-constrained tangent drag keeps its stored angle
     char _printText = 0;         // show the value label of the primary keypoint
-    uint32_t _constrainMove = 0;  // 0 not decided, 1 horizontal, 2 vertical
-    char _shiftWasPressed = 0;    // Shift has been seen during this drag
-    char _cursorHidden = 0;       // the drag has hidden the pointer
-    char _capturing = 0;          // a capture of modified channels is open
-    char _mouseIsDown = 0;        // a gesture is under way
+    TQConstrainDirection _constrainMove = TQConstrainDirection::kUndecided;
+    char _shiftWasPressed = 0;  // Shift has been seen during this drag
+    char _cursorHidden = 0;     // the drag has hidden the pointer
+    // The drag's undo step while it is open: set at the first step that changes anything,
+    // reset at the release, or when the gesture is abandoned (a new press without a release,
+    // a new controller, the view's end).
+    std::optional<TQChangeBracket> _capturing;
+    char _mouseIsDown = 0;  // a gesture is under way
     char _snapCursor = 0;
     char _lockInU = 0;                   // keypoints keep their time in a drag unless Shift is down
     char _didAddPoint = 0;               // the mouse down added a keypoint
@@ -517,8 +549,8 @@ protected:
     // Clock time of the last drag step that ran; -infinity lets the first one through.
     double _lastMouseDraggedEvent = -std::numeric_limits<double>::infinity();
     char _selecting = 0;
-    uint32_t _activePart = 0;         // box part of the gesture, 0 for none
-    uint32_t _currentActivePart = 0;  // box part the last pick found
+    uint32_t _activePart = kTQBoxPartNone;         // box part of the gesture
+    uint32_t _currentActivePart = kTQBoxPartNone;  // hit id of the last pick of the box tool
 
     // ---- Selection lists, owned, never null ----
     std::shared_ptr<TQCurveSelectionList> _selection;

@@ -14,12 +14,11 @@
 #include "platform/channels/TQChannel.h"
 #include "src/data/TQCurveEditorItem.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
+#include "src/resources/TQKeyframeImages.h"
 #include "src/view/TQCurveEditorViewBase.h"
 
 namespace {
 
-constexpr double kEpsilon = 1e-7;
-constexpr int kChannelTimescale = 0x40000;
 // Hit ids of what this file draws: the selection kinds of the entries a pick makes.
 constexpr uint32_t kCurveHitID = TQSelectionCurve;
 constexpr uint32_t kKeypointHitID = TQSelectionKeypoint;
@@ -37,6 +36,17 @@ constexpr double kLabelOffset = 5.0;
 constexpr double kLabelMargin = 2.0;
 // Beyond this many entries a selection is looked up by bisection over its sorted handles.
 constexpr size_t kLinearSelectionLimit = 16;
+
+// The six keypoint images an item can show, as drawPoints lays them out for drawKeypoint.
+enum KeypointSlot : size_t {
+    kSlotDisabledSelected = 0,
+    kSlotDisabled = 1,
+    kSlotLockedSelected = 2,
+    kSlotLocked = 3,
+    kSlotSelected = 4,
+    kSlotNormal = 5,
+    kSlotCount = 6,
+};
 
 // Seconds of a sample time; the plain case inline, as it runs for every sample of a frame.
 inline double secondsOf(const CMTime& t) {
@@ -108,9 +118,9 @@ struct SampleRequest {
 };
 
 SampleRequest sampleRequest(const CMTimeRange& display, const CMTime& offset, uint32_t count) {
-    return {
-        BN_CMTimeSaferSubtract(display.start, offset),
-        TQTarnTimeForChannelSeconds(CMTimeGetSeconds(display.duration) / count, kChannelTimescale)};
+    return {BN_CMTimeSaferSubtract(display.start, offset),
+            TQTarnTimeForChannelSeconds(CMTimeGetSeconds(display.duration) / count,
+                                        kTQCurveEditorTimescale)};
 }
 
 }  // namespace
@@ -151,8 +161,8 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
     const CMTime* samplesU = nullptr;
     const double* samplesV = nullptr;
     unsigned count = n;
-    _controller->getSamples(channelItem, 0, request.minU, request.resolution, &samplesU, &samplesV,
-                            &count);
+    _controller->getSamples(channelItem, kTQSamplesOriginalCurve, request.minU, request.resolution,
+                            &samplesU, &samplesV, &count);
 
     // A channel that answers with another count than asked samples off the keyframe grid: the
     // selected keypoints are merged in, so that each lies exactly on the line.
@@ -285,8 +295,8 @@ void TQCurveEditorViewBase::drawProcessedCurve(TQCurveEditorItem* item) {
     const CMTime* samplesU = nullptr;
     const double* samplesV = nullptr;
     unsigned count = n;
-    _controller->getSamples(channelItem, 1, request.minU, request.resolution, &samplesU, &samplesV,
-                            &count);
+    _controller->getSamples(channelItem, kTQSamplesProcessedCurve, request.minU, request.resolution,
+                            &samplesU, &samplesV, &count);
     if (!samplesU || !samplesV) return;
 
     const GDColor own = getColorForIndex(channelItem->colorIndex());
@@ -317,11 +327,14 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
     if (!channel || !channel->canKeyframe()) return;
 
     const std::vector<TQKeyframeHandle> keypoints = *channelItem->keypoints();
-    // The six images this item can show, by slot (see drawKeypoint). The selected rows are the
-    // same in every colour; [0][1] and [1][0] are loaded but never shown.
+    // The six images this item can show, by slot. The selected images are the same in every
+    // colour; the selected normal and the unselected pressed image are loaded but never shown:
+    // a selected keypoint that can be edited shows as pressed.
+    using namespace TQKeyframeImages;
     const auto& row = _keyframeAssets[channelItem->colorIndex() & 7u];
-    const KeyframeAsset assets[6] = {row[3][1], row[3][0], row[2][1],
-                                     row[2][0], row[1][1], row[0][0]};
+    const KeyframeAsset assets[kSlotCount] = {row[kDisabled][1], row[kDisabled][0],
+                                              row[kInactive][1], row[kInactive][0],
+                                              row[kPressed][1],  row[kNormal][0]};
 
     // A large selection is bisected instead of walked for every keypoint.
     const auto& entries = _selection->getSelectionArray();
@@ -363,7 +376,7 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
             double iu = 0.0;
             double iv = 0.0;
             channel->getKeyframeInputTangents(h, &iu, &iv, true);
-            if (std::fabs(iu) >= kEpsilon || std::fabs(iv) >= kEpsilon)
+            if (std::fabs(iu) >= kTQZeroTolerance || std::fabs(iv) >= kTQZeroTolerance)
                 drawTangent(h, iu, iv, &u, v, TQSelectionInTangent, channelItem, rasterSize);
         }
         prevUsesTangents = channel->getKeyframeInterpolationUsesTangents(h);
@@ -384,13 +397,14 @@ void TQCurveEditorViewBase::drawKeypoint(TQKeyframeHandle handle, const CMTime* 
     auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item);
     if (!u || !assets || !channelItem) return;
     // Selected, enabled, unlocked keypoints always show the pressed selected image.
-    const int slot =
-        !enabled ? (selected ? 0 : 1) : (!locked ? (selected ? 4 : 5) : (selected ? 2 : 3));
+    const KeypointSlot slot = !enabled  ? (selected ? kSlotDisabledSelected : kSlotDisabled)
+                              : !locked ? (selected ? kSlotSelected : kSlotNormal)
+                                        : (selected ? kSlotLockedSelected : kSlotLocked);
     const double x = CMTimeGetSeconds(*u);
 
     // The value label of the primary keypoint while it is being edited.
     const TQCurveSelectionPtr primary = _selection->selectionAtIndex(0);
-    if (slot == 4 && _printText && primary && primary->getHandle() == handle) {
+    if (slot == kSlotSelected && _printText && primary && primary->getHandle() == handle) {
         const CGPoint p = getPointScreen(CGPointMake(x, v));
         const double value = channelItem->scaleY() * v + channelItem->offsetY();
         const BNString text = getCoordinates(item, *u, value);
@@ -440,7 +454,7 @@ void TQCurveEditorViewBase::calculateDrawTangentU(double* tangentU, double* tang
     const double tv = channelItem->conversionFactor() * *tangentV / channelItem->scaleY();
     *tangentV = tv;
     double angle = 0.0;
-    if (std::fabs(*tangentU) >= kEpsilon)
+    if (std::fabs(*tangentU) >= kTQZeroTolerance)
         angle = std::atan2(tv, *tangentU);
     else
         angle = tv < 0.0 ? -std::numbers::pi / 2.0 : std::numbers::pi / 2.0;

@@ -195,7 +195,9 @@ KeyframeAsset TQCurveEditorViewBase::keyframeAssetWithImageName(const BNString& 
 const KeyframeAsset& TQCurveEditorViewBase::keyframeAsset(uint32_t colorIndex, uint32_t state,
                                                           uint32_t selected) const {
     static const KeyframeAsset kNone;
-    if (colorIndex >= 8 || state >= 4 || selected >= 2) return kNone;
+    if (colorIndex >= TQKeyframeImages::kColorCount || state >= TQKeyframeImages::kStateCount ||
+        selected >= 2)
+        return kNone;
     return _keyframeAssets[colorIndex][state][selected];
 }
 
@@ -232,8 +234,8 @@ void TQCurveEditorViewBase::drawCurveEditor() {
 
 void TQCurveEditorViewBase::drawOverlays(const CGRect&) {
     if (_selecting) drawSelectionRect();
-    const uint32_t tool = _controller ? _controller->getCurrentTool() : 0;
-    if (tool == 2 && !_selecting && _fourCornerBoxInitialized) drawFourCornerBox();
+    const TQTool tool = _controller ? _controller->getCurrentTool() : TQTool::kEdit;
+    if (tool == TQTool::kBox && !_selecting && _fourCornerBoxInitialized) drawFourCornerBox();
 }
 
 void TQCurveEditorViewBase::drawSelectionRect() {

@@ -12,18 +12,13 @@
 #include "src/curvesets/TQCurveSet.h"
 #include "src/data/TQCurveEditorItem.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
-#include "src/resources/TQStrings.h"
 #include "src/view/TQCurveEditorViewBase.h"
 
 namespace {
 
-constexpr double kEpsilon = 1e-7;
-constexpr int kChannelTimescale = 0x40000;
 // "Option alone" and "Command alone" look at these two bits only: Shift and Control do not
 // count.
 constexpr uint64_t kOptionCommandMask = RWEventModifierFlagOption | RWEventModifierFlagCommand;
-// A channel flag that forbids pulling tangents out of its keypoints with Command.
-constexpr uint64_t kNoTangentPullFlag = 0x800000;
 
 bool hasShift(uint64_t flags) { return (flags & RWEventModifierFlagShift) != 0; }
 bool hasControl(uint64_t flags) { return (flags & RWEventModifierFlagControl) != 0; }
@@ -35,7 +30,7 @@ bool commandAlone(uint64_t flags) {
 }
 bool optionAndCommand(uint64_t flags) { return (flags & kOptionCommandMask) == kOptionCommandMask; }
 
-CMTime timeOfWorldX(double x) { return TQTarnTimeForChannelSeconds(x, kChannelTimescale); }
+CMTime timeOfWorldX(double x) { return TQTarnTimeForChannelSeconds(x, kTQCurveEditorTimescale); }
 
 // The channel items of a selection's entries. Entries of one curve usually follow each other,
 // so the lookup through the curve set runs again only when the curve changes.
@@ -93,9 +88,12 @@ void TQCurveEditorViewBase::notifyChannelChangeDone() const {
 // ---- Dispatch ------------------------------------------------------------------------------
 
 void TQCurveEditorViewBase::mouseDown(const RWEvent& event) {
+    // A press while a drag's step is still open means its release was lost: that step ends
+    // before this gesture begins.
+    closeDragCapture();
     _needsAutoZoom = 0;
     _mouseIsDown = 1;
-    _constrainMove = 0;
+    _constrainMove = TQConstrainDirection::kUndecided;
     _mouseOrigin = drawablePointOfEvent(event);
     _lastMousePos = _mouseOrigin;
     _startDrag = 1;
@@ -104,11 +102,11 @@ void TQCurveEditorViewBase::mouseDown(const RWEvent& event) {
     TQCurveEditorAppDelegate* delegate = _controller ? _controller->appDelegate() : nullptr;
     if (delegate) delegate->suppressEventCoalescing();
 
-    switch (_controller ? _controller->getCurrentTool() : 0) {
-        case 0: mouseDownEdit(event); break;
-        case 1: mouseDownSketch(event); break;
-        case 2: mouseDownBox(event); break;
-        default: break;
+    switch (_controller ? _controller->getCurrentTool() : TQTool::kEdit) {
+        case TQTool::kEdit: mouseDownEdit(event); break;
+        case TQTool::kSketch: mouseDownSketch(event); break;
+        case TQTool::kBox: mouseDownBox(event); break;
+        default: break;  // a host's own tool id: nothing more
     }
 }
 
@@ -118,10 +116,10 @@ void TQCurveEditorViewBase::mouseDragged(const RWEvent& event) {
     // At most one step per frame interval. A dropped event loses nothing: the next step
     // measures its movement from _lastPoint, which only a step that runs moves.
     if (clock().now() - _lastMouseDraggedEvent <= kFrameInterval) return;
-    switch (_controller ? _controller->getCurrentTool() : 0) {
-        case 0: mouseDraggedEdit(event); break;
-        case 1: mouseDraggedSketch(event); break;
-        case 2: mouseDraggedBox(event); break;
+    switch (_controller ? _controller->getCurrentTool() : TQTool::kEdit) {
+        case TQTool::kEdit: mouseDraggedEdit(event); break;
+        case TQTool::kSketch: mouseDraggedSketch(event); break;
+        case TQTool::kBox: mouseDraggedBox(event); break;
         default: break;
     }
     _lastMouseDraggedEvent = clock().now();
@@ -145,11 +143,7 @@ void TQCurveEditorViewBase::mouseUp(const RWEvent& event) {
         _controller->purgeSelected(selection);
         restoreItemsAfterDrag();
     }
-    if (_capturing) {
-        if (_controller) _controller->didModify(selection);
-        if (delegate) delegate->endCaptureModifiedChannels();
-        _capturing = 0;
-    }
+    closeDragCapture();
     // A plain rubber band changed no channel and posts nothing.
     if (!_selecting || hasControl(mods)) postNotification(kTQNotifyChannelsChanged);
 
@@ -160,14 +154,15 @@ void TQCurveEditorViewBase::mouseUp(const RWEvent& event) {
     _printText = 0;
     _shiftWasPressed = 0;
     _mouseIsDown = 0;
-    _activePart = 0;
-    _currentActivePart = 0;
+    _activePart = kTQBoxPartNone;
+    _currentActivePart = kTQBoxPartNone;
     _didAddPoint = 0;
-    _constrainMove = 0;
+    _constrainMove = TQConstrainDirection::kUndecided;
     _currentSelection->reset();
     _previousSelection->reset();
 
-    if (_controller && _controller->getCurrentTool() == 0) setCursorShape(RWCursor::EditPoints);
+    if (_controller && _controller->getCurrentTool() == TQTool::kEdit)
+        setCursorShape(RWCursor::EditPoints);
     if (_cursorHidden) {
         if (_viewHost) _viewHost->setCursorHidden(false);
         _cursorHidden = 0;
@@ -218,11 +213,10 @@ void TQCurveEditorViewBase::restoreItemsAfterDrag() {
 }
 
 void TQCurveEditorViewBase::openDragCapture(const char* undoKey) {
+    // After a key release before the first step (_startDrag cleared) the drag's value
+    // announcements run with no capture open: left so on purpose.
     if (!_startDrag) return;
-    if (TQCurveEditorAppDelegate* delegate = _controller->appDelegate())
-        delegate->startCaptureModifiedChannels(TQLocalizedString(undoKey));
-    _controller->willModify(_selection.get());
-    _capturing = 1;
+    _capturing.emplace(*_controller, _selection.get(), undoKey);
 }
 
 // ---- The edit tool: mouse down -------------------------------------------------------------
@@ -231,16 +225,10 @@ void TQCurveEditorViewBase::mouseDownEdit(const RWEvent& event) {
     if (!_controller) return;
     const uint64_t mods = event.modifierFlags();
     TQCurveSelectionList* selection = _selection.get();
-    TQCurveEditorAppDelegate* delegate = _controller->appDelegate();
     // One step that opens and closes within the click.
     auto clickStep = [&](const char* undoKey, TQCurveSelectionList* list, auto&& change) {
-        if (delegate) delegate->startCaptureModifiedChannels(TQLocalizedString(undoKey));
-        _controller->willModify(list);
-        _controller->willModifyValue(list);
+        const TQEditBracket bracket(*_controller, list, undoKey);
         change();
-        _controller->didModifyValue(list);
-        _controller->didModify(list);
-        if (delegate) delegate->endCaptureModifiedChannels();
     };
 
     _didAddPoint = 0;
@@ -293,7 +281,8 @@ void TQCurveEditorViewBase::mouseDownEdit(const RWEvent& event) {
             clickStep("Undo Break Tangents", selection,
                       [&] { _controller->breakTangentsSelected(selection); });
         if (hasShift(mods)) {
-            // Shift snaps the handle onto its nearest 45-degree direction at once.
+            // Shift snaps the handle onto its nearest 45-degree direction at once. Deliberately
+            // outside any bracket: the snap is part of the press, as it has always been.
             const CGPoint w = getPointWorld(_mouseOrigin);
             _controller->saveTangents(e.get());
             _controller->setTangents45Selected(selection, w.x, w.y, 0);
@@ -407,7 +396,7 @@ void TQCurveEditorViewBase::mouseDraggedEdit(const RWEvent& event) {
         h = band.origin.x - (lo.x + dx);
     else if (hi.x + dx > band.origin.x + band.size.width)
         h = (band.origin.x + band.size.width) - (hi.x + dx);
-    if (std::fabs(v) >= kEpsilon) {
+    if (std::fabs(v) >= kTQZeroTolerance) {
         if (_autoZoom) {
             _needsAutoZoom = 1;
         } else if (_autoPan && _canPanVertically) {
@@ -430,7 +419,7 @@ void TQCurveEditorViewBase::mouseDraggedEdit(const RWEvent& event) {
         dragCurveStep(world, mods);
     }
 
-    if (std::fabs(h) >= kEpsilon && _autoPan && _canPanHorizontally) {
+    if (std::fabs(h) >= kTQZeroTolerance && _autoPan && _canPanHorizontally) {
         pan(h, 0.0);
         // The vertical figure in this horizontal case too: the scrollers expect it so.
         _controller->windowWasPanned(ny / _currentViewVolume.size.height);
@@ -448,10 +437,11 @@ void TQCurveEditorViewBase::dragTangentStep(TQCurveSelection& primary, CGPoint w
     TQCurveSelectionList* selection = _selection.get();
     setCursorShape(RWCursor::Move);
     openDragCapture("Undo Set Tangents");
-    // Command pulls the handles unweighted: the weighting is switched off around the change.
+    // Command pulls the handles unweighted: the weighting is switched off around the change,
+    // the first switch ahead of the value announcement, as it always was.
     const char c = (mods & RWEventModifierFlagCommand) ? 1 : 0;
     _controller->weightTangentsSelected(selection, static_cast<char>(1 - c));
-    _controller->willModifyValue(selection);
+    const TQModifyValueGuard step(*_controller, selection);
     if (!hasShift(mods)) {
         _shiftWasPressed = 0;
         _useOriginalAngle = 0;
@@ -465,7 +455,6 @@ void TQCurveEditorViewBase::dragTangentStep(TQCurveSelection& primary, CGPoint w
         _controller->setTangents45Selected(selection, world.x, world.y, _useOriginalAngle);
     }
     _controller->weightTangentsSelected(selection, c);
-    _controller->didModifyValue(selection);
 }
 
 CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoint world, double dx,
@@ -479,9 +468,10 @@ CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoi
         const TQCurveEditorItemPtr item =
             _controller->channelItemWithIdentifier(primary.getCurveId());
         const TQChannel* channel = item ? item->channel() : nullptr;
-        if (channel && channel->testFlag(kNoTangentPullFlag)) return world;
+        // A channel whose interpolation may not change keeps its keypoints as they are.
+        if (channel && channel->testFlag(kTQChannelFlagNoInterpolationChange)) return world;
         openDragCapture("Undo Set Tangents");
-        _controller->willModifyValue(selection);
+        const TQModifyValueGuard step(*_controller, selection);
         _controller->setBezierPointSelected(selection);
         _controller->weightTangents(&primary, 0);
         // The entry becomes that tangent: the following steps drag it as a handle.
@@ -489,12 +479,11 @@ CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoi
         _controller->setTangents(&primary, world.x, world.y);
         _controller->alignTangentsSelected(selection);
         _controller->weightTangents(&primary, 1);
-        _controller->didModifyValue(selection);
         return world;
     }
 
     openDragCapture("Undo Move Keypoint");
-    _controller->willModifyValue(selection);
+    const TQModifyValueGuard step(*_controller, selection);
     double u = 0.0;
     double y = 0.0;
     _controller->getSelectedVertex(&primary, &u, &y);
@@ -502,7 +491,7 @@ CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoi
     const bool shift = hasShift(mods);
     if (!shift || _lockInU) {
         _shiftWasPressed = 0;
-        _constrainMove = 0;
+        _constrainMove = TQConstrainDirection::kUndecided;
     } else {
         const CGPoint ps = getPointScreen(w);
         const CGPoint vs = getPointScreen(CGPointMake(u, y));
@@ -516,7 +505,7 @@ CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoi
     }
     w = constrainTime(w);
     if (_snapCursor) w = snapCursorTo(w);
-    const char isConstraining = _constrainMove == 2 ? 1 : 0;
+    const char isConstraining = _constrainMove == TQConstrainDirection::kVertical ? 1 : 0;
 
     if (!_lockInU || shift) {
         if (optionAndCommand(mods))
@@ -528,7 +517,6 @@ CGPoint TQCurveEditorViewBase::dragKeypointStep(TQCurveSelection& primary, CGPoi
         _controller->moveSelected(selection, timeOfWorldX(getPointWorld(_mouseOrigin).x), w.y, 1,
                                   isConstraining);
     }
-    _controller->didModifyValue(selection);
     return w;
 }
 
@@ -537,25 +525,26 @@ void TQCurveEditorViewBase::dragCurveStep(CGPoint world, uint64_t mods) {
     openDragCapture("Undo Move Curve");
     setCursorShape(RWCursor::Move);
     hideCursorForDrag();
-    _controller->willModifyValue(selection);
+    const TQModifyValueGuard step(*_controller, selection);
     // A curve moves only vertically: the time is always that of the gesture's origin.
     const CMTime originTime = timeOfWorldX(getPointWorld(_mouseOrigin).x);
     if (optionAndCommand(mods))
         _controller->offsetCurve(selection, originTime, world.y);
     else
         _controller->moveSelected(selection, originTime, world.y, 1, 0);
-    _controller->didModifyValue(selection);
 }
 
 // ---- Constraints ---------------------------------------------------------------------------
 
 CGPoint TQCurveEditorViewBase::constrainMove(const CGPoint& p, const CGPoint& origin) {
     switch (_constrainMove) {
-        case 2: return CGPointMake(origin.x, p.y);
-        case 1: return CGPointMake(p.x, origin.y);
+        case TQConstrainDirection::kVertical: return CGPointMake(origin.x, p.y);
+        case TQConstrainDirection::kHorizontal: return CGPointMake(p.x, origin.y);
         default:
             // A tie is vertical.
-            _constrainMove = std::fabs(p.x - origin.x) > std::fabs(p.y - origin.y) ? 1 : 2;
+            _constrainMove = std::fabs(p.x - origin.x) > std::fabs(p.y - origin.y)
+                                 ? TQConstrainDirection::kHorizontal
+                                 : TQConstrainDirection::kVertical;
             return origin;
     }
 }

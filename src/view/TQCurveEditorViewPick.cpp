@@ -69,8 +69,8 @@ void TQCurveEditorViewBase::select() {
 
 void TQCurveEditorViewBase::processHits(const std::vector<HXDHitRecord>& hits, char keyframesOnly) {
     _currentSelection->reset();
-    _currentActivePart = 0;
-    const uint32_t tool = _controller ? _controller->getCurrentTool() : 0;
+    _currentActivePart = kTQBoxPartNone;
+    const TQTool tool = _controller ? _controller->getCurrentTool() : TQTool::kEdit;
     const TQCurveSetPtr set = _controller ? _controller->selectedCurveSet() : nullptr;
     // A band's records come channel by channel: the item of the last record is looked up
     // again only when the channel changes, not once per keypoint.
@@ -81,8 +81,8 @@ void TQCurveEditorViewBase::processHits(const std::vector<HXDHitRecord>& hits, c
     for (const HXDHitRecord& record : hits) {
         // The other tools take no entries from a click; the box tool takes the part it hit
         // (the last record wins). A band of any tool selects keypoints as the edit tool does.
-        if (tool != 0 && !_selecting) {
-            if (tool == 2 && !keyframesOnly) _currentActivePart = record.hitID();
+        if (tool != TQTool::kEdit && !_selecting) {
+            if (tool == TQTool::kBox && !keyframesOnly) _currentActivePart = record.hitID();
             continue;
         }
         const uint32_t hitID = record.hitID();

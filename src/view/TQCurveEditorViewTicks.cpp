@@ -16,7 +16,6 @@
 
 namespace {
 
-constexpr double kEpsilon = 1e-7;
 // Share of the extent added above and below a curve.
 constexpr double kExtentPadding = 0.05;
 
@@ -106,7 +105,7 @@ void TQCurveEditorViewBase::computeVerticalTickMarks() {
 
         double scale = 0.0;
         double offset = 0.0;
-        if (std::fabs(hi - lo) < kEpsilon && !_hasFixedScale) {
+        if (std::fabs(hi - lo) < kTQZeroTolerance && !_hasFixedScale) {
             // Flat: two tick steps above and below the initial value, labels on its step.
             const double c = channel->getInitialValue() * conv;
             const double half = (2.0 * t * S / Z) * conv;
@@ -161,7 +160,7 @@ void TQCurveEditorViewBase::computeVerticalTickMarks() {
         const double rangeHigh = m1 + rangePad;
         const double rangeLow = m0 - rangePad;
         const double R = rangeHigh - rangeLow;
-        if (R <= hi - lo && std::fabs(R) >= kEpsilon) {
+        if (R <= hi - lo && std::fabs(R) >= kTQZeroTolerance) {
             _gridScaleY = R / (S * T) / Z;
             // The factor 2 does not follow the number of tick marks; it never has.
             _gridOffsetY = rangeLow + _gridScaleY * 2.0 * S;

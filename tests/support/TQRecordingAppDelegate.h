@@ -58,6 +58,8 @@ public:
 
     explicit TQRecordingAppDelegate(TQCurveEditorAppDelegate* forwardTo = nullptr)
         : _forward(forwardTo) {}
+    // Forwarding from now on (null: standalone). Not owned.
+    void forwardTo(TQCurveEditorAppDelegate* delegate) { _forward = delegate; }
 
     Answers answers;
 

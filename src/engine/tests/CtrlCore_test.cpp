@@ -6,7 +6,9 @@
 #include <vector>
 
 #include "platform/channels/TQChannelTypes.h"
+#include "src/engine/TQEditBrackets.h"
 #include "src/engine/tests/EngineFixture.h"
+#include "src/resources/TQStrings.h"
 
 using namespace engine_test;
 using Seq = std::vector<std::string>;
@@ -23,38 +25,32 @@ TEST_F(CtrlCore, brackets__drag_of_ten_steps_announces_each_channel_once_per_pha
     TQCurveSelectionList* list =
         selectInView({keypointEntry(ia, 1), keypointEntry(ia, 2), keypointEntry(ib, 1)});
 
-    // The drag variant, as the view runs it: one capture, ten value steps, one close.
+    // The drag variant, as the view runs it: one step for the gesture, ten value steps.
     ctrl().validateSelection(list);
-    recorder.startCaptureModifiedChannels("Move");
-    ctrl().willModify(list);
-    for (int step = 1; step <= 10; ++step) {
-        ctrl().willModifyValue(list);
-        ctrl().moveSelected(list, seconds(1), 0.1 * step, 1, 1);
-        ctrl().didModifyValue(list);
-        recorder.postNotification(kTQNotifyChannelsChanging);
+    {
+        const TQChangeBracket gesture(ctrl(), list, "Undo Move Keypoint");
+        for (int step = 1; step <= 10; ++step) {
+            const TQModifyValueGuard values(ctrl(), list);
+            ctrl().moveSelected(list, seconds(1.0 + 0.05 * step), 0.1 * step, 1, 0);
+        }
     }
-    ctrl().didModify(list);
-    recorder.endCaptureModifiedChannels();
-    recorder.postNotification(kTQNotifyChannelsChanged);
 
-    Seq expected = {"startCaptureModifiedChannels(Move)", "willChangeChannel(A)",
-                    "willChangeChannel(B)"};
+    Seq expected = {"startCaptureModifiedChannels(" + TQLocalizedString("Undo Move Keypoint") + ")",
+                    "willChangeChannel(A)", "willChangeChannel(B)"};
     for (int step = 0; step < 10; ++step) {
-        Seq one = {"willSetChannelValue(A)", "willSetChannelValue(B)", "didSetChannelValue(B)",
-                   "didSetChannelValue(A)", "postNotification(0x4)"};
-        expected.insert(expected.end(), one.begin(), one.end());
+        expected.insert(expected.end(), {"willSetChannelValue(A)", "willSetChannelValue(B)",
+                                         "didSetChannelValue(B)", "didSetChannelValue(A)"});
     }
-    Seq tail = {"didChangeChannel(B)", "didChangeChannel(A)", "endCaptureModifiedChannels()",
-                "postNotification(0x8)"};
-    expected.insert(expected.end(), tail.begin(), tail.end());
+    expected.insert(expected.end(),
+                    {"didChangeChannel(B)", "didChangeChannel(A)", "endCaptureModifiedChannels()"});
     EXPECT_EQ(recorder.bracketSequence(), expected);
     EXPECT_EQ(recorder.captureBalance(), 0);
-    EXPECT_NEAR(keyValueAt(a, 1), 1.0, kValueTolerance)
+    // Each step measures from where the last one left the keypoints: the steps add up.
+    EXPECT_EQ(keyTimes(a), (std::vector<double>{1.5, 2.5}));
+    EXPECT_EQ(keyTimes(b), (std::vector<double>{1.5}));
+    EXPECT_NEAR(keyValueAt(a, 1.5), 1.0, kValueTolerance)
         << "the drag lands where the last step put it";
-    EXPECT_NEAR(keyValueAt(b, 1), 1.0, kValueTolerance);
-    EXPECT_TRUE(host.canUndo()) << "the host should have recorded the step";
-    host.undo();
-    EXPECT_NEAR(keyValueAt(a, 1), 0.0, kValueTolerance) << "one undo takes back the whole drag";
+    EXPECT_NEAR(keyValueAt(b, 1.5), 1.0, kValueTolerance);
 }
 
 TEST_F(CtrlCore, brackets__entry_of_a_removed_channel_is_not_announced) {
@@ -185,7 +181,8 @@ TEST_F(CtrlCore, samples__refresh_when_dirty_and_nothing_for_a_foreign_item) {
     const CMTime* u = nullptr;
     const double* v = nullptr;
     unsigned n = 11;
-    ctrl().getSamples(item.get(), 0, kCMTimeZero, CMTimeMake(1, 10), &u, &v, &n);
+    ctrl().getSamples(item.get(), kTQSamplesOriginalCurve, kCMTimeZero, CMTimeMake(1, 10), &u, &v,
+                      &n);
     ASSERT_NE(v, nullptr);
     EXPECT_EQ(n, 11u);
     EXPECT_NEAR(v[10], 1.0, kValueTolerance);
@@ -193,7 +190,8 @@ TEST_F(CtrlCore, samples__refresh_when_dirty_and_nothing_for_a_foreign_item) {
     auto stranger = std::make_shared<TQCurveEditorChannelItem>();
     stranger->initWithChannel(addChannel("B", {}), 5, &recorder, 0);
     n = 7;
-    ctrl().getSamples(stranger.get(), 0, kCMTimeZero, CMTimeMake(1, 10), &u, &v, &n);
+    ctrl().getSamples(stranger.get(), kTQSamplesOriginalCurve, kCMTimeZero, CMTimeMake(1, 10), &u,
+                      &v, &n);
     EXPECT_EQ(u, nullptr);
     EXPECT_EQ(v, nullptr);
     EXPECT_EQ(n, 0u);
@@ -267,8 +265,8 @@ TEST_F(CtrlCore, menus__built_from_the_tables_and_routed_to_actions) {
 }
 
 TEST_F(CtrlCore, tool__change_tells_the_view) {
-    ctrl().setCurrentTool(2);
-    EXPECT_EQ(ctrl().getCurrentTool(), 2u);
+    ctrl().setCurrentTool(TQTool::kBox);
+    EXPECT_EQ(ctrl().getCurrentTool(), TQTool::kBox);
     EXPECT_EQ(recorder.count("postNotification"), 1u);
     EXPECT_EQ(recorder.calls().back().word, kTQNotifyToolChangedWord);
 }

@@ -46,7 +46,7 @@ TEST_F(CtrlKeypoints, delete__locked_keypoint_opens_no_bracket) {
 TEST_F(CtrlKeypoints, delete__keeps_the_present_value_in_the_initial_value_once) {
     TQChannel* a = addChannel("A", {{0, 0}, {1, 10}});
     auto item = addItem(a);
-    host.setCurrentTime(seconds(0.5));
+    recorder.answers.currentTime = seconds(0.5);
     const double shown = a->getCurveValue(seconds(0.5), true);
     selectInView({keypointEntry(item, 0), keypointEntry(item, 1)});
 

@@ -1,11 +1,10 @@
 // Moving keypoints: the order of the channel calls, the clamp at time 0, the frame grid, the
-// linked compounds, the nudge and curve forms, and a whole drag through the host's brackets.
+// linked compounds, and the nudge and curve forms.
 
 #include <string>
 #include <vector>
 
 #include "src/engine/tests/EngineFixture.h"
-#include "src/resources/TQStrings.h"
 
 namespace engine_test {
 namespace {
@@ -226,46 +225,6 @@ TEST_F(CtrlMovesGridTest, moveSelected__singleKeypointLandsOnFrameGroupKeepsSpac
         EXPECT_NEAR(times[0], 1.0 + 2.0 * frame, kTimeTolerance) << "the anchor lands on the grid";
         EXPECT_NEAR(times[1] - times[0], 0.5 * frame, kTimeTolerance) << "spacing must be kept";
     }
-}
-
-// One drag of ten steps as the view runs it: the bracket opens once, each step announces the
-// values, and the host keeps the whole drag as one undo step.
-TEST_F(CtrlMovesTest, moveSelected__dragOfTenStepsIsOneBracketAndOneUndoStep) {
-    TQChannel* a = addChannel("A", {{1.0, 0.0}, {2.0, 0.0}});
-    TQChannel* b = addChannel("B", {{1.0, 0.0}});
-    auto ia = addItem(a);
-    auto ib = addItem(b);
-    TQCurveSelectionList* list = selectInView({keypointEntry(ia, 1.0), keypointEntry(ib, 1.0)});
-
-    ctrl().validateSelection(list);
-    recorder.startCaptureModifiedChannels(TQLocalizedString("Undo Move Keypoint"));
-    ctrl().willModify(list);
-    for (int step = 1; step <= 10; ++step) {
-        ctrl().willModifyValue(list);
-        ctrl().moveSelected(list, seconds(1.0 + 0.05 * step), 0.0, 1, 0);
-        ctrl().didModifyValue(list);
-        recorder.postNotification(kTQNotifyChannelsChanging);
-    }
-    ctrl().didModify(list);
-    recorder.endCaptureModifiedChannels();
-    recorder.postNotification(kTQNotifyChannelsChanged);
-
-    std::vector<std::string> expected{
-        "startCaptureModifiedChannels(" + TQLocalizedString("Undo Move Keypoint") + ")",
-        "willChangeChannel(A)", "willChangeChannel(B)"};
-    for (int step = 0; step < 10; ++step) {
-        expected.insert(expected.end(), {"willSetChannelValue(A)", "willSetChannelValue(B)",
-                                         "didSetChannelValue(B)", "didSetChannelValue(A)",
-                                         "postNotification(0x4)"});
-    }
-    expected.insert(expected.end(), {"didChangeChannel(B)", "didChangeChannel(A)",
-                                     "endCaptureModifiedChannels()", "postNotification(0x8)"});
-    EXPECT_EQ(recorder.bracketSequence(), expected);
-    EXPECT_NEAR(keyTimes(a)[0], 1.5, kTimeTolerance) << "the steps add up";
-
-    ASSERT_TRUE(host.undo());
-    EXPECT_EQ(keyTimes(a), (std::vector<double>{1.0, 2.0})) << "one undo takes back the whole drag";
-    EXPECT_EQ(keyTimes(b), (std::vector<double>{1.0}));
 }
 
 }  // namespace

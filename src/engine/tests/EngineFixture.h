@@ -1,8 +1,10 @@
 #pragma once
-// Shared set-up of the engine and view tests: the reference host with one bare object, a
-// recording delegate in front of it, a controller, a view on a stub view host (800 x 400
+// Shared set-up of the engine and view tests: a scene with one bare object, a recording
+// delegate that answers for the host, a controller, a view on a stub view host (800 x 400
 // points at scale 1, showing 0..10 s by -1..1), and a mutable curve set that the controller
 // has selected. Helpers build channels with keyframes, their items, and selection entries.
+// Tests whose point is a real undo put the reference host behind the recorder
+// (WithReferenceHost); the scene is then the host's.
 //
 // The controller is made in SetUp by makeController(), so a test fixture can derive and hand
 // in a subclass (FrameGridController puts times on a 1/30 s grid, as the full editor does).
@@ -42,7 +44,15 @@ public:
 class EngineFixture : public ::testing::Test {
 protected:
     void SetUp() override {
-        object = host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
+        auto root = std::make_unique<TQChannelObjectRootBase>("Object", 1);
+        if (TQHostAppDelegate* host = referenceHost()) {
+            recorder.forwardTo(host);
+            object = host->scene().adoptObject(std::move(root));
+        } else {
+            scene = std::make_unique<TQChannelFolder>("Scene", 0);
+            object = static_cast<TQChannelObjectRootBase*>(scene->addChild(std::move(root)));
+            recorder.answers.sceneChannelRoot = scene.get();
+        }
         controllerPtr = makeController();
         controllerPtr->init();
         controllerPtr->setAppDelegate(&recorder);
@@ -69,6 +79,8 @@ protected:
     virtual std::unique_ptr<TQCurveEditorCtrlBase> makeController() {
         return std::make_unique<TQCurveEditorCtrlBase>();
     }
+    // The reference host behind the recorder; none here.
+    virtual TQHostAppDelegate* referenceHost() { return nullptr; }
 
     TQCurveEditorCtrlBase& ctrl() { return *controllerPtr; }
 
@@ -155,8 +167,8 @@ protected:
         return list;
     }
 
-    TQHostAppDelegate host;
-    TQRecordingAppDelegate recorder{&host};
+    std::unique_ptr<TQChannelFolder> scene;  // without a reference host
+    TQRecordingAppDelegate recorder;
     RWManualClock clock;
     RWManualTimer timer{clock};
     RWStubViewHost viewHost{800.0, 400.0, 1.0};
@@ -165,6 +177,15 @@ protected:
     TQCurveSetMutablePtr set;
     TQChannelObjectRootBase* object = nullptr;
     TQChannelId nextChannelId = 5000;
+};
+
+// A fixture of these tests with the reference host, and its undo, behind the recorder. The
+// host goes before the fixture's controller and view: TearDown detaches them first.
+template <class Fixture>
+class WithReferenceHost : public Fixture {
+protected:
+    TQHostAppDelegate* referenceHost() override { return &host; }
+    TQHostAppDelegate host;
 };
 
 }  // namespace engine_test

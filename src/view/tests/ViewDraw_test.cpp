@@ -139,7 +139,7 @@ TEST_F(ViewFrameTest, setVisibleOriginalCurveDirty__marksOnlyWhatTheHostReportsC
     ASSERT_TRUE(frame());
     ASSERT_FALSE(changed->originalCurveDirty() || still->originalCurveDirty())
         << "a frame caches every curve";
-    changed->channel()->noteWillChange(true);
+    recorder.answers.modified = {changed->channel()};
     view.setVisibleOriginalCurveDirty(1);
     EXPECT_TRUE(changed->originalCurveDirty());
     EXPECT_FALSE(still->originalCurveDirty()) << "an unchanged curve keeps its samples";

@@ -64,6 +64,12 @@ protected:
     }
 
     size_t countCalls(const char* operation) const { return recorder.count(operation); }
+    // The description of the last undo step opened, as the host received it; empty if none.
+    std::string lastUndoStep() const {
+        for (auto it = recorder.calls().rbegin(); it != recorder.calls().rend(); ++it)
+            if (it->operation == "startCaptureModifiedChannels") return it->text;
+        return {};
+    }
 };
 
 }  // namespace view_test

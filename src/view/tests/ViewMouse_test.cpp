@@ -4,6 +4,9 @@
 // navigation.
 
 #include <cmath>
+#include <memory>
+#include <string>
+#include <vector>
 
 #include "src/view/tests/ViewMouseFixture.h"
 
@@ -11,6 +14,8 @@ namespace view_test {
 namespace {
 
 class ViewMouseEdit : public ViewMouseFixture {};
+// Where a real undo is the point: the reference host behind the recorder.
+class ViewMouseUndo : public WithReferenceHost<ViewMouseFixture> {};
 
 TEST_F(ViewMouseEdit, drag__fromAnUnselectedKeypointMovesItAlone) {
     auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
@@ -46,14 +51,14 @@ TEST_F(ViewMouseEdit, drag__shiftInMidDragDecidesTheAxisFromTheWholeMovement) {
         down(5.0, 0.0);
         dragTo(5.1, 0.1);
         dragTo(5.5, 0.15, kShift);
-        EXPECT_EQ(view.constrainMoveDirection(), 1u);
+        EXPECT_EQ(view.constrainMoveDirection(), TQConstrainDirection::kHorizontal);
         dragTo(5.75, 0.6, kShift);
         const auto [t, v] = keyOf(item, k);
         EXPECT_NEAR(t, 5.75, kDragTolerance) << "time follows the pointer";
         EXPECT_NEAR(v, 0.1, kDragTolerance) << "value stays at its position when Shift came";
         // Releasing Shift clears the axis; pressing it again decides afresh.
         dragTo(5.8, 0.2);
-        EXPECT_EQ(view.constrainMoveDirection(), 0u);
+        EXPECT_EQ(view.constrainMoveDirection(), TQConstrainDirection::kUndecided);
         up(5.8, 0.2);
     }
     {
@@ -63,7 +68,7 @@ TEST_F(ViewMouseEdit, drag__shiftInMidDragDecidesTheAxisFromTheWholeMovement) {
         const auto [t0, v0] = keyOf(item, k);
         down(t0, v0);
         dragTo(t0 + 0.05, v0 + 0.5, kShift);
-        EXPECT_EQ(view.constrainMoveDirection(), 2u);
+        EXPECT_EQ(view.constrainMoveDirection(), TQConstrainDirection::kVertical);
         dragTo(t0 + 1.0, v0 + 0.6, kShift);
         const auto [t, v] = keyOf(item, k);
         EXPECT_NEAR(t, t0, kDragTolerance) << "a vertical constraint keeps the time";
@@ -75,7 +80,7 @@ TEST_F(ViewMouseEdit, drag__shiftInMidDragDecidesTheAxisFromTheWholeMovement) {
 TEST_F(ViewMouseEdit, constrainMove__aTieIsVertical) {
     EXPECT_EQ(view.constrainMove(CGPointMake(13, 17), CGPointMake(10, 20)), CGPointMake(10, 20))
         << "the deciding call answers the origin";
-    EXPECT_EQ(view.constrainMoveDirection(), 2u);
+    EXPECT_EQ(view.constrainMoveDirection(), TQConstrainDirection::kVertical);
     EXPECT_EQ(view.constrainMove(CGPointMake(50, 60), CGPointMake(1, 2)), CGPointMake(1, 60));
 }
 
@@ -103,10 +108,9 @@ TEST_F(ViewMouseEdit, click__withoutADragOpensNoCapture) {
     EXPECT_EQ(countCalls("unsuppressEventCoalescing"), 1u);
     EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyChannelsChanged});
     EXPECT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{keyAt(item, 5.0)});
-    EXPECT_FALSE(host.canUndo());
 }
 
-TEST_F(ViewMouseEdit, drag__tenStepsAreOneUndoStepThatRestoresExactly) {
+TEST_F(ViewMouseUndo, drag__tenStepsAreOneUndoStepThatRestoresExactly) {
     auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.25}, {8.0, 0.0}});
     const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
     ASSERT_TRUE(frame());
@@ -119,12 +123,77 @@ TEST_F(ViewMouseEdit, drag__tenStepsAreOneUndoStepThatRestoresExactly) {
     EXPECT_EQ(countCalls("endCaptureModifiedChannels"), 1u);
     EXPECT_EQ(countCalls("willSetChannelValue"), 10u) << "each step announces its value change";
     ASSERT_EQ(host.undoStack().undoCount(), 1u);
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Keypoint"));
+    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Keypoint"));
     EXPECT_NEAR(keyValueAt(item->channel(), 6.0), 0.75, kDragTolerance);
 
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(*item->channel() == *before) << "undo restores the channel exactly";
     EXPECT_FALSE(host.canUndo());
+}
+
+TEST_F(ViewMouseUndo, drag__abandonedClosesItsStepInReverseOrderAndUndoesWhole) {
+    auto a = linearItem("A", {{2.0, 0.0}, {5.0, 0.25}, {8.0, 0.0}});
+    auto b = linearItem("B", {{5.0, -0.5}});
+    const std::unique_ptr<TQChannelBase> aBefore(a->channel()->cloneChannel());
+    const std::unique_ptr<TQChannelBase> bBefore(b->channel()->cloneChannel());
+    // What the release would have closed, and nothing else.
+    const std::vector<std::string> closing = {"didChangeChannel(B)", "didChangeChannel(A)",
+                                              "endCaptureModifiedChannels()"};
+    // One step of a drag of A's and B's keypoints at 5 s on `on`, left without its release.
+    const auto startDrag = [&](TQCurveEditorViewBase& on) {
+        TQCurveSelectionList* list = on.getSelection();
+        list->reset();
+        list->addSelection(keypointEntry(a, 5.0));
+        list->addSelection(keypointEntry(b, 5.0));
+        clock.advance(1.0);
+        ASSERT_TRUE(on.displayLayer(&encoder));
+        on.mouseDown(mouseAt(RWEventType::LeftMouseDown, CGPointMake(5.0, 0.25), 0));
+        clock.advance(kStepSeconds);
+        on.mouseDragged(mouseAt(RWEventType::LeftMouseDragged, CGPointMake(5.5, 0.5), 0));
+        ASSERT_TRUE(on.getCapturing());
+        ASSERT_NE(keyAt(a, 5.5), nullptr) << "the step moved the keypoint";
+        recorder.clearCalls();
+    };
+    const auto expectUndoneWhole = [&](const char* what) {
+        EXPECT_FALSE(host.undoStack().isStepOpen()) << what;
+        ASSERT_EQ(host.undoStack().undoCount(), 1u) << what;
+        ASSERT_TRUE(host.undo()) << what;
+        EXPECT_TRUE(*a->channel() == *aBefore) << what;
+        EXPECT_TRUE(*b->channel() == *bBefore) << what;
+    };
+    {
+        startDrag(view);
+        down(5.5, 0.5);
+        EXPECT_EQ(recorder.bracketSequence(), closing)
+            << "a lost release: the next press ends the step before its own gesture";
+        EXPECT_FALSE(view.getCapturing());
+        up(5.5, 0.5);
+        expectUndoneWhole("lost release");
+    }
+    {
+        startDrag(view);
+        view.setController(nullptr);
+        EXPECT_EQ(recorder.bracketSequence(), closing) << "closed through the old controller";
+        view.setController(&ctrl());
+        expectUndoneWhole("controller detached");
+    }
+    {
+        auto doomed = std::make_unique<TQCurveEditorViewBase>();
+        doomed->setViewHost(&viewHost);
+        doomed->setClock(&clock);
+        doomed->setTimer(&timer);
+        doomed->setController(&ctrl());
+        ctrl().setView(doomed.get());
+        doomed->setCurrentViewVolume(view.getCurrentViewVolume());
+        doomed->setOriginalViewVolume(view.getOriginalViewVolume());
+        const CMTimeRange range = view.getDisplayRange();
+        doomed->setDisplayRange(&range.start, &range.duration);
+        startDrag(*doomed);
+        doomed.reset();
+        ctrl().setView(&view);
+        EXPECT_EQ(recorder.bracketSequence(), closing) << "the view torn down in mid-drag";
+        expectUndoneWhole("view torn down");
+    }
 }
 
 TEST_F(ViewMouseEdit, mouseDragged__stepsAreGatedToThirtyASecondWithoutLosingMovement) {
@@ -160,11 +229,12 @@ TEST_F(ViewMouseEdit, drag__commandPullsTangentsOnTheSideOfTheMovement) {
         item->channel()->getKeyframeOutputTangents(keyAt(item, 5.0), &u, &v);
         EXPECT_GT(u, 0.0) << "the output handle leads toward the pointer";
         EXPECT_GT(v, 0.0);
-        EXPECT_TRUE(host.undoStack().isStepOpen()) << "the drag's step stays open until mouse up";
+        EXPECT_EQ(recorder.captureBalance(), 1) << "the drag's step stays open until mouse up";
         up(6.0, 0.4, kCommand);
-        EXPECT_FALSE(host.undoStack().isStepOpen());
-        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Tangents"));
-        EXPECT_EQ(host.undoStack().undoCount(), 2u) << "the Command click's flatten, then the pull";
+        EXPECT_EQ(recorder.captureBalance(), 0);
+        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Set Tangents"));
+        EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 2u)
+            << "the Command click's flatten, then the pull";
         ctrl().removeChannelWithIdentifier(item->channelId(), set);
     }
     {
@@ -191,7 +261,7 @@ TEST_F(ViewMouseEdit, click__commandFlattensOptionOnACurveAddsAKeypoint) {
         ASSERT_EQ(view.getSelection()->size(), 1u);
         EXPECT_TRUE(view.getSelection()->selectionAtIndex(0)->isKeypoint())
             << "the new keypoint is selected";
-        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Add keypoint"));
+        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Add keypoint"));
     }
     {
         c->setInterpolation(kTQInterpolationBezier);
@@ -199,11 +269,11 @@ TEST_F(ViewMouseEdit, click__commandFlattensOptionOnACurveAddsAKeypoint) {
         click(5.0, 0.5, kCommand);
         EXPECT_EQ(c->getKeyframeInterpolation(keyAt(item, 5.0)), kTQInterpolationLinear)
             << "Command-click flattens the keypoint into a linear one";
-        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Flatten Keypoint"));
+        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Flatten Keypoint"));
     }
 }
 
-TEST_F(ViewMouseEdit, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
+TEST_F(ViewMouseUndo, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
     auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.25}});
     const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
     RWScriptedModal modal;
@@ -224,7 +294,7 @@ TEST_F(ViewMouseEdit, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
     EXPECT_NEAR(keyValueAt(item->channel(), 5.0), 0.75, kValueTolerance)
         << "the typed value is set";
     EXPECT_EQ(host.undoStack().undoCount(), 1u);
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Keypoint"));
+    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Keypoint"));
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(*item->channel() == *before) << "the step holds what was typed";
 }
@@ -243,7 +313,7 @@ TEST_F(ViewMouseEdit, tangent__optionClickBreaksAndShiftDragStepsBy45DegreesFrom
 
     click(6.0, 0.2, kOption);
     EXPECT_TRUE(c->getKeyframeTangentsBroken(k));
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Break Tangents"));
+    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Break Tangents"));
     ASSERT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionOutTangent);
 
     down(6.0, 0.2, kShift);
@@ -261,7 +331,7 @@ TEST_F(ViewMouseEdit, tangent__optionClickBreaksAndShiftDragStepsBy45DegreesFrom
     double inV = 0.0;
     c->getKeyframeInputTangents(k, &inU, &inV);
     EXPECT_NEAR(inV, -0.2, kValueTolerance) << "broken: the input handle stays";
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Tangents"));
+    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Set Tangents"));
 }
 
 TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
@@ -274,7 +344,7 @@ TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
     EXPECT_EQ(keyTimes(item->channel()), (std::vector<double>{2.0, 8.0})) << "times stay";
     EXPECT_NEAR(keyValueAt(item->channel(), 2.0), 0.3, kDragTolerance);
     EXPECT_NEAR(keyValueAt(item->channel(), 8.0), 0.3, kDragTolerance);
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Move Curve"));
+    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Curve"));
 }
 
 TEST_F(ViewMouseEdit, drag__intoTheEdgeBandZoomsOrPans) {

@@ -88,13 +88,13 @@ TEST_F(ViewPick, pick__otherToolsMakeNoEntry) {
     ASSERT_TRUE(frame());
     const CGPoint onKey = view.getPointScreen(CGPointMake(5.0, 0.0));
     {
-        ctrl().setCurrentTool(1);
+        ctrl().setCurrentTool(TQTool::kSketch);
         view.pick(onKey);
         EXPECT_TRUE(view.getCurrentSelection()->empty()) << "sketch";
         EXPECT_EQ(view.getCurrentActivePart(), 0u);
     }
     {
-        ctrl().setCurrentTool(2);
+        ctrl().setCurrentTool(TQTool::kBox);
         view.pick(onKey);
         EXPECT_TRUE(view.getCurrentSelection()->empty()) << "box, no band";
         EXPECT_EQ(view.getCurrentActivePart(), TQSelectionKeypoint)

@@ -267,7 +267,7 @@ TEST_F(ViewFramingTest, resets__restoreTheReferenceVolumeAndPostOnce) {
 
 TEST_F(ViewFramingTest, currentToolChanged__forgetsTheBoxAndPostsTheToolWord) {
     viewHost.resetRedrawRequests();
-    ctrl().setCurrentTool(2);
+    ctrl().setCurrentTool(TQTool::kBox);
     EXPECT_EQ(view.fourCornerBoxInitialized(), 0);
     EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyToolChangedWord});
     EXPECT_EQ(viewHost.redrawRequests(), 1);
