@@ -131,7 +131,11 @@ void TQCurveEditorFolderItem::initWithChannel(TQChannelBase* channel, double num
     if (!_ignoreHiddenChannels && folderChannel->testFlag(kTQChannelFlagHiddenInCurveEditor))
         return;
 
-    const uint32_t excluded = _ignoreHiddenChannels ? 0x2u : 0x10002u;
+    // Descendants left out of the flattened list: hidden ones, and those hidden in curve
+    // editors too unless hidden channels are ignored (the same reversal as above).
+    const uint32_t excluded =
+        _ignoreHiddenChannels ? uint32_t{kTQChannelFlagHidden}
+                              : uint32_t{kTQChannelFlagHidden | kTQChannelFlagHiddenInCurveEditor};
     const bool flattenAll = folderChannel->testFlag(kTQChannelFlagShowFlattened);
     const std::vector<TQChannelBase*>* kids = folderChannel->getChildren();
     if (kids) {
@@ -175,16 +179,16 @@ void TQCurveEditorFolderItem::addChild(const TQCurveEditorItemPtr& child) {
 
 bool TQCurveEditorFolderItem::isCollapsed() const {
     TQChannelFolder* f = folder();
-    return f ? f->testFoldFlag(0x2) : false;
+    return f ? f->testFoldFlag(kTQFoldFlagCollapsed) : false;
 }
 
 void TQCurveEditorFolderItem::collapse(bool collapsed) {
     TQChannelFolder* f = folder();
     if (!f) return;
     if (collapsed)
-        f->setFoldFlag(0x2);
+        f->setFoldFlag(kTQFoldFlagCollapsed);
     else
-        f->resetFoldFlag(0x2);
+        f->resetFoldFlag(kTQFoldFlagCollapsed);
 }
 
 void TQCurveEditorFolderItem::select(char selected) {

@@ -434,44 +434,41 @@ std::vector<const TQChannelBase*> gatherChannels(const TQCurveSelectionList& lis
 
 }  // namespace
 
-void TQCurveEditorCtrlBase::willModify(TQCurveSelectionList* list) {
+void TQCurveEditorCtrlBase::announce(TQCurveSelectionList* list, ChannelAnnouncement call,
+                                     bool lastFirst) {
     if (!list || !_pAppDelegate) return;
     const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
-    for (const TQChannelBase* c : gatherChannels(*list, lookup))
-        _pAppDelegate->willChangeChannel(c);
+    const std::vector<const TQChannelBase*> channels = gatherChannels(*list, lookup);
+    if (lastFirst) {
+        for (auto it = channels.rbegin(); it != channels.rend(); ++it) (_pAppDelegate->*call)(*it);
+    } else {
+        for (const TQChannelBase* c : channels) (_pAppDelegate->*call)(c);
+    }
+}
+
+void TQCurveEditorCtrlBase::willModify(TQCurveSelectionList* list) {
+    announce(list, &TQCurveEditorAppDelegate::willChangeChannel, false);
 }
 
 void TQCurveEditorCtrlBase::didModify(TQCurveSelectionList* list) {
-    if (!list || !_pAppDelegate) return;
-    const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
-    const auto channels = gatherChannels(*list, lookup);
-    for (auto it = channels.rbegin(); it != channels.rend(); ++it)
-        _pAppDelegate->didChangeChannel(*it);
+    announce(list, &TQCurveEditorAppDelegate::didChangeChannel, true);
 }
 
 void TQCurveEditorCtrlBase::willModifyValue(TQCurveSelectionList* list) {
-    if (!list || !_pAppDelegate) return;
-    const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
-    for (const TQChannelBase* c : gatherChannels(*list, lookup))
-        _pAppDelegate->willSetChannelValue(c);
+    announce(list, &TQCurveEditorAppDelegate::willSetChannelValue, false);
 }
 
 void TQCurveEditorCtrlBase::didModifyValue(TQCurveSelectionList* list) {
-    if (!list || !_pAppDelegate) return;
-    const auto lookup = [this](const TQCurveSelection& e) { return channelForEntry(e); };
-    const auto channels = gatherChannels(*list, lookup);
-    for (auto it = channels.rbegin(); it != channels.rend(); ++it)
-        _pAppDelegate->didSetChannelValue(*it);
+    announce(list, &TQCurveEditorAppDelegate::didSetChannelValue, true);
 }
 
-void TQCurveEditorCtrlBase::performWithBracket(
-    const char* undoKey, const std::function<void(TQCurveSelectionList*)>& operation) {
+void TQCurveEditorCtrlBase::performWithBracket(const char* undoKey, ListOperation operation) {
     TQCurveSelectionList* list = viewSelection();
     if (!list) return;
     validateSelection(list);
     {
         const TQEditBracket bracket(*this, list, undoKey);
-        operation(list);
+        (this->*operation)(list);
     }
     postNotification(kTQNotifyChannelsChanged);
 }
@@ -640,11 +637,9 @@ bool TQCurveEditorCtrlBase::performAction(const std::string& action, RWMenuItem&
     else if (action == "menuAddKeyframe:")
         menuAddKeyframe(from);
     else if (action == "menuBreakTangent:")
-        performWithBracket("Undo Break Tangents",
-                           [this](TQCurveSelectionList* l) { breakTangentsSelected(l); });
+        performWithBracket("Undo Break Tangents", &TQCurveEditorCtrlBase::breakTangentsSelected);
     else if (action == "menuAlignTangent:")
-        performWithBracket("Undo Align Tangents",
-                           [this](TQCurveSelectionList* l) { alignTangentsSelected(l); });
+        performWithBracket("Undo Align Tangents", &TQCurveEditorCtrlBase::alignTangentsSelected);
     else
         return false;
     return true;

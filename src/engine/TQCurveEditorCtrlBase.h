@@ -383,10 +383,14 @@ protected:
     // The view's selection list, or null without a view.
     TQCurveSelectionList* viewSelection() const;
     void postNotification(TQNotificationWord word) const;
+    // One announcement of the delegate for each distinct channel of the list, in order of
+    // first appearance or, for the closing ones, last first.
+    using ChannelAnnouncement = void (TQCurveEditorAppDelegate::*)(const TQChannelBase*);
+    void announce(TQCurveSelectionList* list, ChannelAnnouncement call, bool lastFirst);
     // The one-shot bracket of the menu commands around `operation` on the view's selection,
     // closed by a post of kTQNotifyChannelsChanged.
-    void performWithBracket(const char* undoKey,
-                            const std::function<void(TQCurveSelectionList*)>& operation);
+    using ListOperation = void (TQCurveEditorCtrlBase::*)(TQCurveSelectionList*);
+    void performWithBracket(const char* undoKey, ListOperation operation);
     // Runs the value window modally; true when it was accepted (value updated).
     virtual bool runValuePanel(TQCurveEditorValueWindow& window);
 

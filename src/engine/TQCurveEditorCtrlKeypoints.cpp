@@ -113,8 +113,7 @@ void TQCurveEditorCtrlBase::deleteKeypoints(void* sender) {
     if (!list) return;
     validateSelection(list);
     if (!shouldDeleteKeypoints()) return;
-    performWithBracket("Undo Delete Keypoint",
-                       [this](TQCurveSelectionList* l) { deleteSelected(l); });
+    performWithBracket("Undo Delete Keypoint", &TQCurveEditorCtrlBase::deleteSelected);
 }
 
 void TQCurveEditorCtrlBase::deleteSelected(TQCurveSelectionList* list) {
@@ -384,32 +383,31 @@ void TQCurveEditorCtrlBase::deleteVertex(const TQCurveSelection* entry, CMTime u
 // ---- Commands ---------------------------------------------------------------------------
 
 void TQCurveEditorCtrlBase::menuDuplicate(void*) {
-    performWithBracket("Undo Duplicate", [this](TQCurveSelectionList* l) { duplicateSelected(l); });
+    performWithBracket("Undo Duplicate", &TQCurveEditorCtrlBase::duplicateSelected);
 }
 
 void TQCurveEditorCtrlBase::menuReverse(void*) {
-    performWithBracket("Undo Reverse", [this](TQCurveSelectionList* l) { reverseSelected(l); });
+    performWithBracket("Undo Reverse", &TQCurveEditorCtrlBase::reverseSelected);
 }
 
 void TQCurveEditorCtrlBase::menuEaseIn(void*) {
-    performWithBracket("Undo Ease In", [this](TQCurveSelectionList* l) { easeInSelected(l); });
+    performWithBracket("Undo Ease In", &TQCurveEditorCtrlBase::easeInSelected);
 }
 
 void TQCurveEditorCtrlBase::menuEaseOut(void*) {
-    performWithBracket("Undo Ease Out", [this](TQCurveSelectionList* l) { easeOutSelected(l); });
+    performWithBracket("Undo Ease Out", &TQCurveEditorCtrlBase::easeOutSelected);
 }
 
 void TQCurveEditorCtrlBase::menuEaseBoth(void*) {
-    performWithBracket("Undo Ease Both", [this](TQCurveSelectionList* l) { easeBothSelected(l); });
+    performWithBracket("Undo Ease Both", &TQCurveEditorCtrlBase::easeBothSelected);
 }
 
 void TQCurveEditorCtrlBase::menuLockSelected(void*) {
-    performWithBracket("Undo Lock Keypoint", [this](TQCurveSelectionList* l) { lockSelected(l); });
+    performWithBracket("Undo Lock Keypoint", &TQCurveEditorCtrlBase::lockSelected);
 }
 
 void TQCurveEditorCtrlBase::menuDisableSelected(void*) {
-    performWithBracket("Undo Disable Keypoint",
-                       [this](TQCurveSelectionList* l) { disableSelected(l); });
+    performWithBracket("Undo Disable Keypoint", &TQCurveEditorCtrlBase::disableSelected);
 }
 
 void TQCurveEditorCtrlBase::menuAddKeyframe(void*) {

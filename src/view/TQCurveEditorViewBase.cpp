@@ -375,34 +375,52 @@ void TQCurveEditorViewBase::frameAll(char includeTime) {
 
 // ---- Resets --------------------------------------------------------------------------------
 
+namespace {
+
+// One axis of a rectangle, so that both axes are reset by the same lines.
+struct VolumeAxis {
+    double CGPoint::*origin;
+    double CGSize::*extent;
+};
+constexpr VolumeAxis kTimeAxis{&CGPoint::x, &CGSize::width};
+constexpr VolumeAxis kValueAxis{&CGPoint::y, &CGSize::height};
+
+// The axis of `current` back to where `original` has it; its extent too with `extent`.
+void resetAxis(CGRect& current, const CGRect& original, const VolumeAxis& axis, bool extent) {
+    current.origin.*axis.origin = original.origin.*axis.origin;
+    if (extent) current.size.*axis.extent = original.size.*axis.extent;
+}
+
+}  // namespace
+
 void TQCurveEditorViewBase::resetZoomX() {
     _zoomFactorX = 1.0;
     _gridZoomX = 1.0;
-    _currentViewVolume.origin.x = _originalViewVolume.origin.x;
-    _currentViewVolume.size.width = _originalViewVolume.size.width;
-    if (_controller) _controller->currentViewVolumeChangedTo(&_currentViewVolume);
-    setAllOriginalCurveDirty(1);
+    resetAxis(_currentViewVolume, _originalViewVolume, kTimeAxis, true);
+    volumeReset(false);
 }
 
 void TQCurveEditorViewBase::resetZoomY() {
     _zoomFactorY = 1.0;
     _gridZoomY = 1.0;
-    _currentViewVolume.origin.y = _originalViewVolume.origin.y;
-    _currentViewVolume.size.height = _originalViewVolume.size.height;
-    if (_controller) _controller->currentViewVolumeChangedTo(&_currentViewVolume);
-    setAllOriginalCurveDirty(1);
+    resetAxis(_currentViewVolume, _originalViewVolume, kValueAxis, true);
+    volumeReset(false);
 }
 
 void TQCurveEditorViewBase::resetPanX() {
-    _currentViewVolume.origin.x = _originalViewVolume.origin.x;
-    if (_controller) _controller->currentViewVolumeChangedTo(&_currentViewVolume);
-    setAllOriginalCurveDirty(1);
+    resetAxis(_currentViewVolume, _originalViewVolume, kTimeAxis, false);
+    volumeReset(false);
 }
 
 void TQCurveEditorViewBase::resetPanY() {
-    _currentViewVolume.origin.y = _originalViewVolume.origin.y;
+    resetAxis(_currentViewVolume, _originalViewVolume, kValueAxis, false);
+    volumeReset(true);
+}
+
+void TQCurveEditorViewBase::volumeReset(bool ticksAgain) {
     if (_controller) _controller->currentViewVolumeChangedTo(&_currentViewVolume);
-    computeVerticalTickMarks();
+    // Only a vertical pan asks for the tick marks again, as it always has.
+    if (ticksAgain) computeVerticalTickMarks();
     setAllOriginalCurveDirty(1);
 }
 

@@ -467,6 +467,9 @@ protected:
     void postNotification(TQNotificationWord word) const;
     // After a change of the view volume that moves or zooms it.
     void volumeChanged(bool markCurvesDirty);
+    // After a reset of one axis of the view volume: the controller is told, every curve is
+    // dirty, and with ticksAgain the tick marks are computed again first. No word is posted.
+    void volumeReset(bool ticksAgain);
     // The display range's start and duration, in seconds, into x and width.
     void takeHorizontalFromDisplayRange();
     // One drag step of the rubber band by a pointer movement in backing pixels (dy up).

@@ -111,16 +111,24 @@ void appendVertices(std::vector<HXDLineVertex>& out, const CMTime* u, const doub
     }
 }
 
-// The start of the display range in channel time, and one sample step for `count` samples.
-struct SampleRequest {
-    CMTime minU;
-    CMTime resolution;
+// One cached curve of an item as the controller serves it; the arrays stay the item's.
+struct Samples {
+    const CMTime* u = nullptr;
+    const double* v = nullptr;
+    unsigned count = 0;
 };
 
-SampleRequest sampleRequest(const CMTimeRange& display, const CMTime& offset, uint32_t count) {
-    return {BN_CMTimeSaferSubtract(display.start, offset),
-            TQTarnTimeForChannelSeconds(CMTimeGetSeconds(display.duration) / count,
-                                        kTQCurveEditorTimescale)};
+// `count` samples across the display range (which is axis time: the channel's offset is taken
+// off its start), of the curve that `which` names.
+Samples fetchSamples(TQCurveEditorCtrlBase& controller, TQCurveEditorChannelItem& item, char which,
+                     const CMTimeRange& display, const CMTime& offset, uint32_t count) {
+    const CMTime start = BN_CMTimeSaferSubtract(display.start, offset);
+    const CMTime step = TQTarnTimeForChannelSeconds(CMTimeGetSeconds(display.duration) / count,
+                                                    kTQCurveEditorTimescale);
+    Samples out;
+    out.count = count;
+    controller.getSamples(&item, which, start, step, &out.u, &out.v, &out.count);
+    return out;
 }
 
 }  // namespace
@@ -157,12 +165,11 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
     const uint32_t n = static_cast<uint32_t>(width);
     const CMTime off = channel->timeOffset();
     const double offSeconds = CMTimeGetSeconds(off);
-    const SampleRequest request = sampleRequest(getDisplayRange(), off, n);
-    const CMTime* samplesU = nullptr;
-    const double* samplesV = nullptr;
-    unsigned count = n;
-    _controller->getSamples(channelItem, kTQSamplesOriginalCurve, request.minU, request.resolution,
-                            &samplesU, &samplesV, &count);
+    const Samples fetched = fetchSamples(*_controller, *channelItem, kTQSamplesOriginalCurve,
+                                         getDisplayRange(), off, n);
+    const CMTime* samplesU = fetched.u;
+    const double* samplesV = fetched.v;
+    unsigned count = fetched.count;
 
     // A channel that answers with another count than asked samples off the keyframe grid: the
     // selected keypoints are merged in, so that each lies exactly on the line.
@@ -291,13 +298,12 @@ void TQCurveEditorViewBase::drawProcessedCurve(TQCurveEditorItem* item) {
     if (n == 0) return;  // no step can be made from zero samples
 
     const CMTime off = channel->timeOffset();
-    const SampleRequest request = sampleRequest(getDisplayRange(), off, n);
-    const CMTime* samplesU = nullptr;
-    const double* samplesV = nullptr;
-    unsigned count = n;
-    _controller->getSamples(channelItem, kTQSamplesProcessedCurve, request.minU, request.resolution,
-                            &samplesU, &samplesV, &count);
-    if (!samplesU || !samplesV) return;
+    const Samples fetched = fetchSamples(*_controller, *channelItem, kTQSamplesProcessedCurve,
+                                         getDisplayRange(), off, n);
+    if (!fetched.u || !fetched.v) return;
+    const CMTime* samplesU = fetched.u;
+    const double* samplesV = fetched.v;
+    const unsigned count = fetched.count;
 
     const GDColor own = getColorForIndex(channelItem->colorIndex());
     const HXDColor color = drawingColor(own).scaled(kTranslucentFactor);

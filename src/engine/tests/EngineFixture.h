@@ -14,6 +14,7 @@
 
 #include <initializer_list>
 #include <memory>
+#include <string>
 #include <utility>
 #include <vector>
 
@@ -157,6 +158,21 @@ protected:
         double v = 0.0;
         channel->getKeyframe(channel->getKeyframe(seconds(t)), nullptr, &v);
         return v;
+    }
+
+    // What the host sees of a one-shot edit bracket under `description` over the channels
+    // named, in order of first appearance, closed by its post.
+    static std::vector<std::string> oneShotBracket(const std::string& description,
+                                                   const std::vector<std::string>& channels) {
+        std::vector<std::string> out{"startCaptureModifiedChannels(" + description + ")"};
+        for (const auto& c : channels) out.push_back("willChangeChannel(" + c + ")");
+        for (const auto& c : channels) out.push_back("willSetChannelValue(" + c + ")");
+        for (auto c = channels.rbegin(); c != channels.rend(); ++c)
+            out.push_back("didSetChannelValue(" + *c + ")");
+        for (auto c = channels.rbegin(); c != channels.rend(); ++c)
+            out.push_back("didChangeChannel(" + *c + ")");
+        out.insert(out.end(), {"endCaptureModifiedChannels()", "postNotification(0x8)"});
+        return out;
     }
 
     // The view's own selection, filled with the entries.
