@@ -180,9 +180,9 @@ TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendFolder(TQChannelFolder* folder
 bool TQCurveEditorCtrlBase::removeChannelWithIdentifier(uint32_t identifier,
                                                         const TQCurveSetPtr& fromCurveSet) {
     if (!fromCurveSet) return false;
-    // Keep the set alive through the notification, which may replace the selected set.
-    const TQCurveSetPtr keep = fromCurveSet;
-    const bool removed = keep->removeItemWithIdentifier(identifier);
+    // The set is not read after the notification, which may replace the selected set (and so
+    // what `fromCurveSet` refers to).
+    const bool removed = fromCurveSet->removeItemWithIdentifier(identifier);
     postNotification(kTQNotifyCurveSetContentChanged);
     updateUI();
     return removed;

@@ -253,8 +253,10 @@ void TQCurveEditorViewBase::scrollWheel(const RWEvent& event) {
     double sumX = event.deltaX();
     double sumY = event.deltaY();
     if (_viewHost) {
-        while (std::optional<RWEvent> next =
-                   _viewHost->nextEventMatchingMask(RWEventMaskScrollWheel)) {
+        for (;;) {
+            const std::optional<RWEvent> next =
+                _viewHost->nextEventMatchingMask(RWEventMaskScrollWheel);
+            if (!next.has_value()) break;
             sumX += next->deltaX();
             sumY += next->deltaY();
         }
