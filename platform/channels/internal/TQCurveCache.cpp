@@ -157,11 +157,15 @@ double solveBracketed(const CurveSegment& seg, double tr, double guess) {
     return s;
 }
 
-// Halley steps converge cubically: from the chord's parameter three of them reach machine
-// precision on all but sharply bent segments. A last step this small leaves an error of
-// about its cube.
+// Halley steps converge cubically near a simple root: from the chord's parameter three of them
+// reach machine precision on all but sharply bent segments.
 constexpr int kHalleySteps = 3;
-constexpr double kHalleyStepTolerance = 1e-5;
+// Their result stands when the Newton correction left at it, time error over slope, is below
+// this: near a simple root that is the error left (a third of it at the flat inflection of a
+// segment whose handles both reach across it). The last step's size is no guide: close to that
+// inflection each step is about as long as the distance to it, so the steps grow while the
+// root may still lie far off.
+constexpr double kSettledTolerance = 1e-13;
 
 // The lane kernels below run the same arithmetic on every lane without branches, so the
 // compiler turns their loops into vector code; on x86-64 a second copy for the AVX2 and FMA
@@ -184,31 +188,42 @@ struct Lanes {
     alignas(64) double c2[kColdBatch];
     alignas(64) double tr[kColdBatch];  // target time - t0
     alignas(64) double s[kColdBatch];
-    alignas(64) double step[kColdBatch];
+    alignas(64) double settled[kColdBatch];  // 1 where s stands, 0 where it needs the safe path
 };
 
-// One Halley step for time(s) = tr, given the time polynomial's coefficients: moves s and
-// answers the step taken, 1 where it is undefined, which marks the sample as unsettled.
-// Without branches, so that the lane kernel's loop vectorises.
-inline double halleyStep(double c0, double c1, double c2, double tr, double& s) {
+// One Halley step for time(s) = tr, given the time polynomial's coefficients; where the step
+// is undefined s stays, and the check after the steps finds it unsettled. Without branches,
+// so that the lane kernel's loop vectorises.
+inline double halleyStep(double c0, double c1, double c2, double tr, double s) {
+    // The step 2 f d / (2 d^2 - f d2), with d the slope and d2 its derivative, written with
+    // h = d2 / 2: the same value in fewer operations.
     const double f = s * (c0 + s * (c1 + s * c2)) - tr;
-    const double d = c0 + s * (2.0 * c1 + 3.0 * c2 * s);
-    const double d2 = 2.0 * c1 + 6.0 * c2 * s;
-    const double den = 2.0 * d * d - f * d2;
+    const double h = c1 + 3.0 * c2 * s;
+    const double d = c0 + s * (c1 + h);
+    const double den = d * d - f * h;
     const bool defined = den > 0.0;
     // Divide unconditionally and select after: a branch would keep the loop scalar.
-    const double q = (2.0 * f * d) / (defined ? den : 1.0);
-    const double step = defined ? q : 1.0;
-    s = clampUnit(s - step);
-    return step;
+    const double q = (f * d) / (defined ? den : 1.0);
+    return clampUnit(s - (defined ? q : 0.0));
 }
 
-// kHalleySteps Halley steps on every lane; step keeps each lane's last step.
+// Whether s solves time(s) = tr to kSettledTolerance: |f| / slope, compared without dividing.
+// Where the slope is zero only an exact root settles.
+inline bool settledAt(double c0, double c1, double c2, double tr, double s) {
+    const double f = s * (c0 + s * (c1 + s * c2)) - tr;
+    const double d = c0 + s * (2.0 * c1 + 3.0 * c2 * s);
+    return std::fabs(f) <= kSettledTolerance * d;
+}
+
+// kHalleySteps Halley steps on every lane; settled marks the lanes whose result stands.
 TQ_LANE_CLONES void halleyLanes(Lanes& l, unsigned lanes) {
     for (int k = 0; k < kHalleySteps; ++k) {
         for (unsigned m = 0; m < lanes; ++m) {
-            l.step[m] = halleyStep(l.c0[m], l.c1[m], l.c2[m], l.tr[m], l.s[m]);
+            l.s[m] = halleyStep(l.c0[m], l.c1[m], l.c2[m], l.tr[m], l.s[m]);
         }
+    }
+    for (unsigned m = 0; m < lanes; ++m) {
+        l.settled[m] = settledAt(l.c0[m], l.c1[m], l.c2[m], l.tr[m], l.s[m]) ? 1.0 : 0.0;
     }
 }
 
@@ -218,9 +233,8 @@ double solveBezierParameter(const CurveSegment& seg, double target, double guess
     const double tr = target - seg.t0;
     // Fixed Halley steps; the bracketed solver takes what they leave unsettled.
     double s = clampUnit(guess);
-    double step = 1.0;
-    for (int k = 0; k < kHalleySteps; ++k) step = halleyStep(seg.x[0], seg.x[1], seg.x[2], tr, s);
-    if (std::fabs(step) <= kHalleyStepTolerance) return s;
+    for (int k = 0; k < kHalleySteps; ++k) s = halleyStep(seg.x[0], seg.x[1], seg.x[2], tr, s);
+    if (settledAt(seg.x[0], seg.x[1], seg.x[2], tr, s)) return s;
     return solveBracketed(seg, tr, s);
 }
 
@@ -244,7 +258,7 @@ void CurveCache::solveColdBatch(const ColdSample* batch, unsigned n, double* val
     for (unsigned m = 0; m < n; ++m) {
         const CurveSegment& seg = *batch[m].segment;
         double s = l.s[m];
-        if (!(std::fabs(l.step[m]) <= kHalleyStepTolerance)) s = solveBracketed(seg, l.tr[m], s);
+        if (!(l.settled[m] > 0.0)) s = solveBracketed(seg, l.tr[m], s);
         values[batch[m].index] = polynomial(seg, s);
         if (solved) solved[m] = s;
     }
