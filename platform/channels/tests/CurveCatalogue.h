@@ -54,7 +54,9 @@ inline std::unique_ptr<TQChannel> cusp() {
     return c;
 }
 
-// Deterministic generator (64-bit LCG, top bits) so that every run sees the same curve.
+// Deterministic generator (64-bit LCG, top bits) so that every run sees the same curve. Draw
+// into named locals, one per statement: two draws in one call's arguments happen in an order
+// each compiler picks, and the curve would differ between compilers.
 struct Lcg {
     uint64_t state;
     double next() {
@@ -63,6 +65,18 @@ struct Lcg {
     }
 };
 
+// Handles of random reach (up to inReach, outReach) and rise (within +-inRise, +-outRise), drawn
+// in that order.
+inline void randomHandles(TQChannel& c, TQKeyframeHandle h, Lcg& rng, double inReach, double inRise,
+                          double outReach, double outRise) {
+    const double inU = -rng.next() * inReach;
+    const double inV = (rng.next() * 2.0 - 1.0) * inRise;
+    c.setKeyframeInputTangents(h, inU, inV);
+    const double outU = rng.next() * outReach;
+    const double outV = (rng.next() * 2.0 - 1.0) * outRise;
+    c.setKeyframeOutputTangents(h, outU, outV);
+}
+
 inline std::unique_ptr<TQChannel> dense(int n, uint64_t seed = 7) {
     auto c = makeChannel("dense");
     Lcg rng{seed};
@@ -70,8 +84,7 @@ inline std::unique_ptr<TQChannel> dense(int n, uint64_t seed = 7) {
     for (int i = 0; i < n; ++i) {
         TQKeyframeHandle h = c->setKeyframe(seconds(t), rng.next() * 20.0 - 10.0);
         c->setKeyframeTangentsBroken(h, rng.next() < 0.3);
-        c->setKeyframeInputTangents(h, -rng.next() * 0.6, rng.next() * 8.0 - 4.0);
-        c->setKeyframeOutputTangents(h, rng.next() * 0.6, rng.next() * 8.0 - 4.0);
+        randomHandles(*c, h, rng, 0.6, 4.0, 0.6, 4.0);
         t += 0.1 + rng.next() * 0.5;
     }
     return c;

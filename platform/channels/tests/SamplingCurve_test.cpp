@@ -72,8 +72,7 @@ TEST_F(SamplingCurve, clustered_keyframes__segments_crossed_per_sample_vary_wide
         for (int k = 0; k < size; ++k) {
             TQKeyframeHandle h = c->setKeyframe(seconds(t), rng.next() * 20.0 - 10.0);
             c->setKeyframeTangentsBroken(h, true);
-            c->setKeyframeInputTangents(h, -rng.next() * 0.001, rng.next() * 2.0 - 1.0);
-            c->setKeyframeOutputTangents(h, rng.next() * 0.6, rng.next() * 8.0 - 4.0);
+            randomHandles(*c, h, rng, 0.001, 1.0, 0.6, 4.0);
             t += 0.001;
         }
         t += 1.0;
