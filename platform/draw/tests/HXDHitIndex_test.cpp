@@ -129,7 +129,10 @@ protected:
         std::mt19937 rng(seed);
         std::uniform_real_distribution<double> ux(-0.5, 10.5), uy(-5.5, 5.5), band(0.0, 1.0);
         for (int trial = 0; trial < trials; ++trial) {
-            const CGPoint p = pixel(ux(rng), uy(rng));
+            // One draw per statement, so every compiler tests the same points.
+            const double px = ux(rng);
+            const double py = uy(rng);
+            const CGPoint p = pixel(px, py);
             // Small bands use the columns, wide ones the pass over every entry.
             const double w = trial % 5 == 4 ? 180.0 * band(rng) : 12.0 * band(rng);
             const HXDHitTestContext contexts[] = {

@@ -153,7 +153,10 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
         const auto& v = line->vertices();
         const size_t segments = v.size() - 1 + (line->loop() ? 1 : 0);
         for (int trial = 0; trial < 300; ++trial) {
-            const CGPoint p = pixel(ux(rng), uy(rng));
+            // One draw per statement, so every compiler tests the same points.
+            const double px = ux(rng);
+            const double py = uy(rng);
+            const CGPoint p = pixel(px, py);
             double best = std::numeric_limits<double>::infinity();
             for (size_t s = 0; s < segments; ++s) {
                 const HXDLineVertex& a = v[s];
