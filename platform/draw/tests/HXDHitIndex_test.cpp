@@ -103,6 +103,7 @@ protected:
             }
         }
         std::vector<HXDLineVertex> ring;
+        ring.reserve(60);
         for (int i = 0; i < 60; ++i)
             ring.push_back(
                 {{float(5 + 3 * std::cos(i * 0.1)), float(3 * std::sin(i * 0.1)), 0}, {}});

@@ -141,6 +141,7 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
     }
     // Jagged: few, long segments, so that each one decides some answers.
     std::vector<HXDLineVertex> jagged;
+    jagged.reserve(120);
     std::uniform_real_distribution<double> jy(-4.5, 4.5);
     for (int i = 0; i < 120; ++i)
         jagged.push_back(
