@@ -1,39 +1,46 @@
 #pragma once
-// The sample scene that tests, benchmarks and the demo share: a few objects of the scene's
-// family, each with a few hundred keyframes spread over the first ten seconds across every
-// interpolation kind, built from a seeded generator so that every run builds the same scene.
+// The sample project: a six-second motion-graphics piece at 30 frames per second, authored as
+// an animator would key it, on the channels (ids and names) of the scene's object family.
 //
-//   "Title"        plain keyframes
-//   "Logo"         an oscillate behaviour on its position X, a noise behaviour on its opacity
-//   "Background"   (kestrel family) its rotation blends as quaternions: no Exp or Log there
-//   "Lower Third"  starts one second late: its root carries a time offset of 1 s
-//   further objects ("Object 5", ...) are plain, like "Title"
+//   "Title"        flies in from the left with a hard ease into its rest, its scale pops up
+//                  past full size and settles (overshoot), it fades in; at 5 s it leaves
+//                  to the right and fades out
+//   "Logo"         drops in at 1 s and bounces to rest, squashing at each contact; it spins
+//                  for ever (a two-second turn repeated by its extrapolation) around an
+//                  offset pivot set by a single keypoint; an oscillate behaviour sways it
+//                  sideways with no keypoint on that channel
+//   "Lower Third"  slides in from the left and later out again, leaning (shear, where the
+//                  family has it) while it moves, with a fade at each end; its layer starts
+//                  1 s into the piece (time offset 1 s), and its height is set without a
+//                  keypoint, off the default
+//   "Background"   drifts slowly (linear, extrapolated both ways), pushes in, turns a
+//                  little, runs a speed ramp on its retiming and fades its music out; its
+//                  opacity is dimmed without a keypoint
 //
-// Keyframes sit on frames of 1/30 s, in channel time, with timescale 0x40000.
-
-#include <cstddef>
-#include <cstdint>
+// So every automatic set finds something on some object: Position, Scale, Rotation, Opacity,
+// Pivot and Retiming on both families, Shear on the kestrel family only; Animated and
+// Modified differ on the single keypoint, the value set without a keypoint and the resting
+// components of the spinning compound. Keyframes sit on frames, in channel time, timescale
+// 0x40000.
 
 #include "host/TQHostScene.h"
 
 class TQHostAppDelegate;
 
-struct TQHostSampleSceneSpec {
-    size_t objects = 4;
-    uint32_t seed = 1;
-    // Multiplies every channel's keyframe count (1: a few hundred keyframes per object).
-    double density = 1.0;
-};
-
+inline constexpr const char* kTQHostSampleTitleObject = "Title";
 inline constexpr const char* kTQHostSampleBehaviorObject = "Logo";
-inline constexpr const char* kTQHostSampleQuaternionObject = "Background";
 inline constexpr const char* kTQHostSampleOffsetObject = "Lower Third";
+// In the kestrel family its rotation blends as quaternions: no Exp or Log interpolation there.
+inline constexpr const char* kTQHostSampleQuaternionObject = "Background";
 
-// Appends the sample objects to the scene.
-void TQHostPopulateSampleScene(TQHostScene& scene, const TQHostSampleSceneSpec& spec = {});
+// Frames per second of the piece, and its length.
+inline constexpr int kTQHostSampleFramesPerSecond = 30;
+inline constexpr int kTQHostSampleFrames = 6 * kTQHostSampleFramesPerSecond;
 
-// Replaces the host's scene by the sample scene in the given family: display range 0-10 s,
-// frame duration 1/30 s, playhead at 0, the first object selected; undo history and modified
-// set start empty.
-void TQHostLoadSampleScene(TQHostAppDelegate& host, TQHostObjectFamily family,
-                           const TQHostSampleSceneSpec& spec = {});
+// Appends the four objects of the piece, in the order above, to the scene.
+void TQHostPopulateSampleScene(TQHostScene& scene);
+
+// Replaces the host's scene by the piece in the given family: display range 0-6 s, frame
+// duration 1/30 s, playhead at 0, the title selected; undo history and modified set start
+// empty, and kTQNotifySceneChanged is posted.
+void TQHostLoadSampleScene(TQHostAppDelegate& host, TQHostObjectFamily family);

@@ -14,8 +14,8 @@
 
 namespace {
 
-// World rectangle of the view before the first framing: the sample scene's ten seconds.
-constexpr double kInitialSeconds = 10.0;
+// World rectangle of the view before the first framing: the sample piece's six seconds.
+constexpr double kInitialSeconds = 6.0;
 constexpr double kInitialHalfHeight = 150.0;
 // The value step of the full editor's labels: each curve is fitted to the grid on its own.
 constexpr double kGridSpacingY = 25.0;

@@ -1,10 +1,8 @@
-// The scene's object model in both families, selection, change tracking and the sample scene.
+// The scene's object model in both families, selection and change tracking.
 #include <gtest/gtest.h>
 
-#include <set>
-
 #include "host/TQHostAppDelegate.h"
-#include "host/TQHostSampleScene.h"
+#include "host/TQHostDenseScene.h"
 #include "platform/channels/TQChannelTypes.h"
 
 namespace {
@@ -57,43 +55,15 @@ TEST_P(SceneFamilies, typedChannels__giveEveryDowncastSomethingToFind) {
     EXPECT_NE(dynamic_cast<TQChannelAngle*>(orientation->getAngleChannel(kTQComponentZ)), nullptr);
 }
 
-TEST_P(SceneFamilies, sampleScene__holdsAFewHundredKeyframesPerObjectOfEveryKind) {
-    TQHostScene scene(GetParam());
-    TQHostPopulateSampleScene(scene);
-    ASSERT_EQ(scene.numberOfObjects(), 4u);
-
-    size_t behaviours = 0;
-    for (TQChannelObjectRootBase* object : scene.objects()) {
-        std::vector<TQChannelBase*> channels;
-        object->getAllDescendantsFlattened(channels, 0, true);
-        size_t keys = 0;
-        std::set<unsigned> kinds;
-        for (TQChannelBase* base : channels) {
-            auto* channel = static_cast<TQChannel*>(base);
-            keys += channel->numberOfKeyframes();
-            behaviours += channel->numberOfBehaviors();
-            for (TQKeyframeHandle key : channel->getKeyframes(false))
-                kinds.insert(channel->getKeyframeInterpolation(key));
-        }
-        EXPECT_GE(keys, 250u) << object->getName();
-        EXPECT_LE(keys, 600u) << object->getName();
-        for (unsigned kind : {0u, 1u, 4u, 6u, 13u, 14u, 15u, 16u, 17u})
-            EXPECT_TRUE(kinds.contains(kind))
-                << object->getName() << " lacks interpolation " << kind;
-    }
-    EXPECT_EQ(behaviours, 2u) << "only the behaviour object carries behaviours";
-    TQChannelObjectRootBase* late = scene.objectNamed(kTQHostSampleOffsetObject);
-    ASSERT_NE(late, nullptr);
-    EXPECT_EQ(CMTimeGetSeconds(late->timeOffset()), 1.0);
-}
-
 INSTANTIATE_TEST_SUITE_P(BothFamilies, SceneFamilies,
                          ::testing::Values(TQHostObjectFamily::Kestrel, TQHostObjectFamily::Other));
 
 class HostDelegate : public ::testing::Test {
 protected:
     void SetUp() override {
-        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel, {3, 3, 0.2});
+        // Three objects of the family, a few keyframes on their first channels.
+        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel,
+                             {.objects = 3, .channelsPerObject = 3, .keyframesPerChannel = 4});
         objects = host.scene().objects();
         const auto& positions =
             TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);

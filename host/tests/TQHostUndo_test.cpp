@@ -16,7 +16,7 @@ std::unique_ptr<TQChannelBase> snapshot(const TQChannelBase* channel) {
 class HostUndo : public ::testing::Test {
 protected:
     void SetUp() override {
-        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel, {2, 7, 0.25});
+        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
         object = host.scene().objects().front();
         const auto& positions =
             TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);

@@ -10,7 +10,7 @@ namespace {
 
 TEST(RecordingAppDelegate, forwarding__recordsTheBracketInOrderAndTheHostStillUndoes) {
     TQHostAppDelegate host;
-    TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel, {1, 1, 0.2});
+    TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
     TQRecordingAppDelegate recorder(&host);
     TQChannelBase* object = host.scene().objects().front();
     const auto& paths = TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
