@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cctype>
+#include <unordered_set>
 
 #include "platform/channels/TQChannel.h"
 #include "src/contract/TQCurveEditorAppDelegate.h"
@@ -16,16 +17,6 @@ bool containsEqual(const std::vector<TQCurveEditorItemPtr>& list, const TQCurveE
                        [&](const TQCurveEditorItemPtr& e) { return e && e->isEqual(item); });
 }
 }  // namespace
-
-template <class Ptr, class Doomed>
-void TQCurveSet::removeEqual(std::vector<Ptr>& from, const std::vector<Doomed>& doomed) {
-    if (doomed.empty()) return;
-    std::erase_if(from, [&](const Ptr& e) {
-        return std::any_of(doomed.begin(), doomed.end(), [&](const Doomed& d) {
-            return e.get() == d.get() || (e && d && e->isEqual(*d));
-        });
-    });
-}
 
 void TQCurveSet::initWithName(const BNString& name, TQCurveEditorAppDelegate* appDelegate) {
     _roots.clear();
@@ -305,20 +296,28 @@ void TQCurveSet::filterList() {
                       [](const TQCurveEditorFolderItemPtr& r) { return !r || !r->hasChildren(); });
         return;
     }
-    std::vector<TQCurveEditorItemPtr> dropped;  // runs across all roots
+    filterChildren([this](const TQCurveEditorItem& child) {
+        return std::find(_ids->begin(), _ids->end(), relativeRef(child)) != _ids->end();
+    });
+}
+
+void TQCurveSet::filterChildren(const std::function<bool(const TQCurveEditorItem&)>& keep) {
+    // Items are equal when they resolve to the same channel, so the drop list is kept as the
+    // set of dropped channels: one resolution per child instead of one per comparison.
+    std::unordered_set<const TQChannelBase*> dropped;  // runs across all roots
     std::vector<TQCurveEditorItemPtr> emptyRoots;
     for (const TQCurveEditorFolderItemPtr& root : _roots) {
         if (!root) continue;
-        // The item last handled: the root itself only if it had no children at the outset.
-        // A root that loses every child here stays, empty; refresh drops it. Kept on purpose.
         TQCurveEditorItemPtr lastHandled = root;
         for (const TQCurveEditorItemPtr& child : root->children()) {
             if (!child) continue;
             lastHandled = child;
-            const TQChannelRef ref = relativeRef(*child);
-            if (std::find(_ids->begin(), _ids->end(), ref) == _ids->end()) dropped.push_back(child);
+            if (!keep(*child)) dropped.insert(child->channelBase());
         }
-        removeEqual(root->children(), dropped);
+        if (!dropped.empty())
+            std::erase_if(root->children(), [&](const TQCurveEditorItemPtr& c) {
+                return c && dropped.contains(c->channelBase());
+            });
         root->collapse(false);
         if (!root->hasChildren()) emptyRoots.push_back(lastHandled);
     }
@@ -336,12 +335,13 @@ void TQCurveSet::refresh(uint32_t numberOfSamples, bool snapshot) {
         const std::vector<TQChannelBase*> objects =
             _pAppDelegate ? _pAppDelegate->selectedObjectsRootChannels()
                           : std::vector<TQChannelBase*>{};
+        const EnableStates before = captureEnableStates();
         reset();
         for (TQChannelBase* object : objects) {
             TQCurveEditorItem::resetColorIndex();  // colours restart for each object
             auto folder = std::make_shared<TQCurveEditorFolderItem>();
             folder->initWithChannel(object, numberOfSamples, _pAppDelegate, _ignoreHiddenChannels);
-            validateCurveSet(*folder);
+            validateCurveSet(*folder, before);
             addRootItem(folder);
             if (!folder->hasChildren()) removeItem(folder);
         }
@@ -349,15 +349,22 @@ void TQCurveSet::refresh(uint32_t numberOfSamples, bool snapshot) {
     if (snapshot) takeSnapshot(true);
 }
 
-void TQCurveSet::validateCurveSet(TQCurveEditorFolderItem& folder) const {
+TQCurveSet::EnableStates TQCurveSet::captureEnableStates() const {
+    EnableStates states;
+    for (const TQCurveEditorItemPtr& item : allItems())
+        if (const TQChannelBase* c = item->channelBase())
+            states.try_emplace(c, item->isEnabledItem() != 0);
+    return states;
+}
+
+void TQCurveSet::validateCurveSet(TQCurveEditorFolderItem& folder,
+                                  const EnableStates& before) const {
     for (const TQCurveEditorItemPtr& item : folder.flattenDescendants()) {
         if (!item) continue;
-        TQChannelBase* c = item->channelBase();
+        const TQChannelBase* c = item->channelBase();
         if (!c) continue;
-        if (TQCurveEditorItemPtr present = itemWithChannel(c))
-            item->enableItem(present->isEnabledItem() != 0 ? 1 : 0);
-        else
-            item->enableItem(1);
+        const auto present = before.find(c);
+        item->enableItem(present == before.end() || present->second ? 1 : 0);
     }
     if (folder.isEnabledItem() == -1) folder.enableItemNoDescendants(-1);
 }

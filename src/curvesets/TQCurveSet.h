@@ -12,8 +12,11 @@
 // are built in two phases (construct, then initWithName) so that subclasses can extend the
 // initialisation.
 
+#include <algorithm>
 #include <cstdint>
+#include <functional>
 #include <memory>
+#include <unordered_map>
 #include <vector>
 
 #include "platform/channels/TQChannelRef.h"
@@ -112,11 +115,26 @@ public:
     // whose path they hold.
     virtual void filterList();
     virtual void refresh(uint32_t numberOfSamples, bool snapshot);
-    // Carries the enable states of the present items over to a new folder.
-    void validateCurveSet(TQCurveEditorFolderItem& folder) const;
+    // The enable state of each present item, by channel (the first item of a channel counts,
+    // as itemWithChannel finds it).
+    using EnableStates = std::unordered_map<const TQChannelBase*, bool>;
+    // A rebuild takes the states before it builds new items: a new item enables its channel,
+    // and the state lives on the channel, so afterwards the old items would all read enabled.
+    EnableStates captureEnableStates() const;
+    // Carries the captured states over to a new folder: an item whose channel was in the set
+    // takes the state it had, any other item is enabled.
+    void validateCurveSet(TQCurveEditorFolderItem& folder, const EnableStates& before) const;
     bool isChannelAffectedBySelectedBehaviors(const TQChannel* channel) const;
 
 protected:
+    // Keeps, under each root in order, the children that `keep` accepts (a child without a
+    // channel reaches `keep` too). The drop list runs across the roots and is applied to each
+    // root in turn by isEqual (same channel). Then each root is opened. A root left without
+    // children goes only if it had none at the outset: what goes on the removal list is the
+    // item handled last, which is the root only then. Kept on purpose: refreshes drop the
+    // roots that the filter emptied.
+    void filterChildren(const std::function<bool(const TQCurveEditorItem&)>& keep);
+
     // An uninitialised set of the receiver's own class, for copy().
     virtual TQCurveSetPtr makeEmpty() const;
     // The path of an item's channel below its object's root (invalid without a channel).
@@ -125,7 +143,14 @@ protected:
     static bool sameRootName(const TQCurveEditorItem& item, const TQCurveEditorItem& root);
     // Removes every element that is equal (isEqual) to one of `doomed`.
     template <class Ptr, class Doomed>
-    static void removeEqual(std::vector<Ptr>& from, const std::vector<Doomed>& doomed);
+    static void removeEqual(std::vector<Ptr>& from, const std::vector<Doomed>& doomed) {
+        if (doomed.empty()) return;
+        std::erase_if(from, [&](const Ptr& e) {
+            return std::any_of(doomed.begin(), doomed.end(), [&](const Doomed& d) {
+                return e.get() == d.get() || (e && d && e->isEqual(*d));
+            });
+        });
+    }
 
     BNString _name;
     BNString _shortcut;
