@@ -122,21 +122,18 @@ void animateLogo(const Rig& rig) {
                                  {.frame = 71, .value = -180, .slope = -1200, .outSlope = 700},
                                  {.frame = 74, .value = -145, .slope = 0},
                                  {.frame = 77, .value = -180, .slope = -700, .outSlope = 0}});
-    // Squash and stretch at the first two contacts.
-    animate(rig.x(P::Scale), {{.frame = 43, .value = 1.0},
-                              {.frame = 45, .value = 1.22},
-                              {.frame = 49, .value = 0.95},
-                              {.frame = 53, .value = 1.0},
-                              {.frame = 59, .value = 1.0},
-                              {.frame = 61, .value = 1.1},
-                              {.frame = 64, .value = 1.0}});
-    animate(rig.y(P::Scale), {{.frame = 43, .value = 1.0},
-                              {.frame = 45, .value = 0.75},
-                              {.frame = 49, .value = 1.06},
-                              {.frame = 53, .value = 1.0},
-                              {.frame = 59, .value = 1.0},
-                              {.frame = 61, .value = 0.88},
-                              {.frame = 64, .value = 1.0}});
+    // Squash and stretch at the first two contacts: wider and flatter, then back.
+    const struct {
+        double frame, width, height;
+    } squash[] = {{43, 1.0, 1.0}, {45, 1.22, 0.75}, {49, 0.95, 1.06}, {53, 1.0, 1.0},
+                  {59, 1.0, 1.0}, {61, 1.1, 0.88},  {64, 1.0, 1.0}};
+    std::vector<Key> width, height;
+    for (const auto& k : squash) {
+        width.push_back({.frame = k.frame, .value = k.width});
+        height.push_back({.frame = k.frame, .value = k.height});
+    }
+    animate(rig.x(P::Scale), width);
+    animate(rig.y(P::Scale), height);
     // One turn in two seconds, repeated by the extrapolation for as long as the piece runs.
     if (TQChannel* spin = rig.spin()) {
         animate(spin, {{.frame = 30, .value = 0, .interpolation = kTQInterpolationLinear},

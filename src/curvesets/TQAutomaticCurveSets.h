@@ -7,7 +7,7 @@
 //                                           behaviour
 //                      TQCurveSetModified   as Animated, and also one keypoint, a value away
 //                                           from the default, a component of an animated
-//                                           compound
+//                                           compound (both on TQCurveSetByChannelState)
 //   active             TQCurveSetCurrent    the channels the host reports as modified
 //   by property        TQCurveSetPosition, TQCurveSetScale, TQCurveSetRotation,
 //                      TQCurveSetShear, TQCurveSetPivot, TQCurveSetOpacity,
@@ -42,16 +42,13 @@ protected:
     TQCurveSetPtr makeEmpty() const override { return std::make_shared<TQCurveSetAll>(); }
 };
 
-// Channels of the selected objects that move: a curve of two keypoints or more, or a
-// behaviour (unless the channel is rigged); and channels moved by a selected behaviour on an
-// object that is not selected. Shortcut "u". Enable states survive a refresh.
-class TQCurveSetAnimated : public TQCurveSet {
+// What Animated and Modified share. A refresh rebuilds the set from the selected objects in a
+// temporary set, carrying the enable states of the present items over (they survive a
+// refresh), and calls addObjectsAffectedByBehavior once per object; then the set takes the
+// temporary set's roots. The filter keeps, under each root, the channels its rule accepts.
+class TQCurveSetByChannelState : public TQCurveSet {
 public:
-    static constexpr const char* kNameKey = "Curve Editor Curve Set Animated";
-
-    void initWithName(const BNString& name, TQCurveEditorAppDelegate* appDelegate) override;
     void filterList() override;
-    // Rebuilds in a temporary set of the receiver's own class, then takes its roots over.
     void refresh(uint32_t numberOfSamples, bool snapshot) override;
     // Called once per selected object during a refresh, with the temporary set being built.
     // Adds nothing here; it is the hook for a subclass that brings in objects that behaviours
@@ -60,26 +57,43 @@ public:
                                               uint32_t numberOfSamples);
 
 protected:
+    // Whether the set shows a channel, knowing whether the channel's object is selected.
+    virtual bool keepsChannel(const TQChannel& channel, bool objectSelected) const = 0;
+    // The uninitialised set a refresh builds in.
+    virtual TQCurveSetPtr makeTemporarySet() const = 0;
+};
+
+// Channels of the selected objects that move: a curve of two keypoints or more, or a
+// behaviour (unless the channel is rigged); and channels moved by a selected behaviour on an
+// object that is not selected. Shortcut "u".
+class TQCurveSetAnimated : public TQCurveSetByChannelState {
+public:
+    static constexpr const char* kNameKey = "Curve Editor Curve Set Animated";
+
+    void initWithName(const BNString& name, TQCurveEditorAppDelegate* appDelegate) override;
+
+protected:
+    bool keepsChannel(const TQChannel& channel, bool objectSelected) const override;
+    // Of the receiver's own class, so that a subclass's filter decides alone.
+    TQCurveSetPtr makeTemporarySet() const override { return makeEmpty(); }
     TQCurveSetPtr makeEmpty() const override { return std::make_shared<TQCurveSetAnimated>(); }
 };
 
 // What Animated shows, and also: a channel with a single keypoint, a channel without keypoints
 // whose value at time zero is off its default by 1e-7 or more, and a component of an animated
-// compound. Shortcut "y". Enable states survive a refresh.
-class TQCurveSetModified : public TQCurveSet {
+// compound. Shortcut "y".
+class TQCurveSetModified : public TQCurveSetByChannelState {
 public:
     static constexpr const char* kNameKey = "Curve Editor Curve Set Modified";
 
     void initWithName(const BNString& name, TQCurveEditorAppDelegate* appDelegate) override;
-    void filterList() override;
-    // Rebuilds in a temporary TQCurveSetModified (of this class even for a subclass), then
-    // takes its roots over.
-    void refresh(uint32_t numberOfSamples, bool snapshot) override;
-    // As TQCurveSetAnimated::addObjectsAffectedByBehavior: an empty hook, called per object.
-    virtual void addObjectsAffectedByBehavior(TQChannelBase* objectRoot, TQCurveSet& curveSet,
-                                              uint32_t numberOfSamples);
 
 protected:
+    bool keepsChannel(const TQChannel& channel, bool objectSelected) const override;
+    // Of this class whatever the receiver's: a subclass's filter runs after this one's.
+    TQCurveSetPtr makeTemporarySet() const override {
+        return std::make_shared<TQCurveSetModified>();
+    }
     TQCurveSetPtr makeEmpty() const override { return std::make_shared<TQCurveSetModified>(); }
 };
 

@@ -308,11 +308,12 @@ void TQCurveSet::filterChildren(const std::function<bool(const TQCurveEditorItem
     std::vector<TQCurveEditorItemPtr> emptyRoots;
     for (const TQCurveEditorFolderItemPtr& root : _roots) {
         if (!root) continue;
+        const bool settled = isSettled(*root);
         TQCurveEditorItemPtr lastHandled = root;
         for (const TQCurveEditorItemPtr& child : root->children()) {
             if (!child) continue;
             lastHandled = child;
-            if (!keep(*child)) dropped.insert(child->channelBase());
+            if (!settled && !keep(*child)) dropped.insert(child->channelBase());
         }
         if (!dropped.empty())
             std::erase_if(root->children(), [&](const TQCurveEditorItemPtr& c) {
@@ -320,8 +321,36 @@ void TQCurveSet::filterChildren(const std::function<bool(const TQCurveEditorItem
             });
         root->collapse(false);
         if (!root->hasChildren()) emptyRoots.push_back(lastHandled);
+        settle(root);
     }
     removeEqual(_roots, emptyRoots);
+}
+
+TQCurveSet::RebuildScope::RebuildScope(TQCurveSet& set)
+    : _set(set), _outer(!set._settled.has_value()) {
+    if (_outer) _set._settled.emplace();
+}
+
+TQCurveSet::RebuildScope::~RebuildScope() {
+    if (_outer) _set._settled.reset();
+}
+
+bool TQCurveSet::isSettled(const TQCurveEditorFolderItem& root) const {
+    if (!_settled) return false;
+    const auto found = _settled->find(&root);
+    if (found == _settled->end()) return false;
+    const auto& kids = root.children();
+    const Settled& then = found->second;
+    return then.count == kids.size() &&
+           then.first == (kids.empty() ? nullptr : kids.front().get()) &&
+           then.last == (kids.empty() ? nullptr : kids.back().get());
+}
+
+void TQCurveSet::settle(const TQCurveEditorFolderItemPtr& root) {
+    if (!_settled || !root) return;
+    const auto& kids = root->children();
+    (*_settled)[root.get()] = {root, kids.size(), kids.empty() ? nullptr : kids.front().get(),
+                               kids.empty() ? nullptr : kids.back().get()};
 }
 
 void TQCurveSet::refresh(uint32_t numberOfSamples, bool snapshot) {
@@ -336,6 +365,7 @@ void TQCurveSet::refresh(uint32_t numberOfSamples, bool snapshot) {
             _pAppDelegate ? _pAppDelegate->selectedObjectsRootChannels()
                           : std::vector<TQChannelBase*>{};
         const EnableStates before = captureEnableStates();
+        const RebuildScope rebuilding(*this);
         reset();
         for (TQChannelBase* object : objects) {
             TQCurveEditorItem::resetColorIndex();  // colours restart for each object

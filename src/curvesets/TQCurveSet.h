@@ -16,6 +16,7 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <unordered_map>
 #include <vector>
 
@@ -126,6 +127,23 @@ public:
     void validateCurveSet(TQCurveEditorFolderItem& folder, const EnableStates& before) const;
     bool isChannelAffectedBySelectedBehaviors(const TQChannel* channel) const;
 
+    // A rebuild adds its roots one at a time, and each addition filters every root again.
+    // Nothing changes the channels while a rebuild runs, so within one a root whose children
+    // all passed the rule at an earlier pass, and that has not changed since, is not asked
+    // about again: the quadratic walk over children becomes one over roots. The refreshes
+    // open this scope on each set they fill; nested scopes share the outer one.
+    class RebuildScope {
+    public:
+        explicit RebuildScope(TQCurveSet& set);
+        ~RebuildScope();
+        RebuildScope(const RebuildScope&) = delete;
+        RebuildScope& operator=(const RebuildScope&) = delete;
+
+    private:
+        TQCurveSet& _set;
+        bool _outer;
+    };
+
 protected:
     // Keeps, under each root in order, the children that `keep` accepts (a child without a
     // channel reaches `keep` too). The drop list runs across the roots and is applied to each
@@ -134,6 +152,11 @@ protected:
     // item handled last, which is the root only then. Kept on purpose: refreshes drop the
     // roots that the filter emptied.
     void filterChildren(const std::function<bool(const TQCurveEditorItem&)>& keep);
+
+    // Within a rebuild: whether the root's children all passed at an earlier pass.
+    bool isSettled(const TQCurveEditorFolderItem& root) const;
+    // Within a rebuild: the root's present children have all passed the rule.
+    void settle(const TQCurveEditorFolderItemPtr& root);
 
     // An uninitialised set of the receiver's own class, for copy().
     virtual TQCurveSetPtr makeEmpty() const;
@@ -160,6 +183,16 @@ protected:
     std::unique_ptr<std::vector<TQChannelRef>> _ids = std::make_unique<std::vector<TQChannelRef>>();
     uint32_t _curveSetId = 0;
     bool _ignoreHiddenChannels = true;
+
+private:
+    // The roots settled in the open rebuild, each with what it held then; absent outside one.
+    struct Settled {
+        TQCurveEditorFolderItemPtr pinned;  // so that no other root takes its address meanwhile
+        size_t count;
+        const TQCurveEditorItem* first;
+        const TQCurveEditorItem* last;
+    };
+    std::optional<std::unordered_map<const TQCurveEditorFolderItem*, Settled>> _settled;
 };
 
 // A set whose membership a user changes by hand: the class of every custom set.

@@ -28,31 +28,6 @@ bool movedByBehaviour(const TQCurveSet& set, const TQChannel& channel, bool obje
     return set.isChannelAffectedBySelectedBehaviors(&channel) && !objectSelected;
 }
 
-// The rebuild of Animated and Modified: every selected object's folder is validated against
-// the receiver's present items and filtered in a temporary set; then the receiver takes the
-// temporary set's roots, filtering them once more as it adds them.
-template <class Hook>
-void rebuildThroughTemporarySet(TQCurveSet& receiver, TQCurveSet& temporary,
-                                uint32_t numberOfSamples, bool snapshot, Hook addAffected) {
-    TQCurveEditorAppDelegate* delegate = receiver.appDelegate();
-    const std::vector<TQChannelBase*> objects = selectedObjects(delegate);
-    temporary.initWithName(receiver.curveSetName(), delegate);
-    const TQCurveSet::EnableStates before = receiver.captureEnableStates();
-    for (TQChannelBase* object : objects) {
-        TQCurveEditorItem::resetColorIndex();  // colours restart for each object
-        auto folder = std::make_shared<TQCurveEditorFolderItem>();
-        folder->initWithChannel(object, numberOfSamples, delegate,
-                                receiver.ignoreHiddenChannels() ? 1 : 0);
-        receiver.validateCurveSet(*folder, before);
-        temporary.addRootItem(folder);
-        addAffected(object, temporary, numberOfSamples);
-    }
-    receiver.reset();
-    const std::vector<TQCurveEditorFolderItemPtr> roots = temporary.roots();
-    for (const TQCurveEditorFolderItemPtr& root : roots) receiver.addRootItem(root);
-    if (snapshot) receiver.takeSnapshot(true);
-}
-
 }  // namespace
 
 // --- All ----------------------------------------------------------------------------------------
@@ -67,16 +42,19 @@ void TQCurveSetAll::filterList() {
         root->collapse(false);
         // Tested before the children are filtered: a root emptied below stays for now.
         if (!root->hasChildren()) emptyRoots.push_back(root);
-        std::erase_if(root->children(), [](const TQCurveEditorItemPtr& child) {
-            TQChannel* channel = child ? child->channel() : nullptr;
-            return !channel || !channel->canKeyframe();
-        });
+        if (!isSettled(*root))
+            std::erase_if(root->children(), [](const TQCurveEditorItemPtr& child) {
+                TQChannel* channel = child ? child->channel() : nullptr;
+                return !channel || !channel->canKeyframe();
+            });
+        settle(root);
     }
     removeEqual(_roots, emptyRoots);
 }
 
 void TQCurveSetAll::refresh(uint32_t numberOfSamples, bool snapshot) {
     const std::vector<TQChannelBase*> objects = selectedObjects(_pAppDelegate);
+    const RebuildScope rebuilding(*this);
     reset();
     for (TQChannelBase* object : objects) {
         TQCurveEditorItem::resetColorIndex();
@@ -88,69 +66,68 @@ void TQCurveSetAll::refresh(uint32_t numberOfSamples, bool snapshot) {
     if (snapshot) takeSnapshot(true);
 }
 
-// --- Animated -----------------------------------------------------------------------------------
+// --- Animated and Modified ---------------------------------------------------------------------
+
+void TQCurveSetByChannelState::filterList() {
+    filterChildren([this](const TQCurveEditorItem& child) {
+        const TQChannel* channel = child.channel();
+        return channel &&
+               keepsChannel(*channel, isObjectOfChannelSelected(_pAppDelegate, *channel));
+    });
+}
+
+void TQCurveSetByChannelState::refresh(uint32_t numberOfSamples, bool snapshot) {
+    const std::vector<TQChannelBase*> objects = selectedObjects(_pAppDelegate);
+    const TQCurveSetPtr temporary = makeTemporarySet();
+    temporary->initWithName(_name, _pAppDelegate);
+    const RebuildScope buildingTemporary(*temporary);
+    const RebuildScope buildingThis(*this);
+    const EnableStates before = captureEnableStates();
+    for (TQChannelBase* object : objects) {
+        TQCurveEditorItem::resetColorIndex();  // colours restart for each object
+        auto folder = std::make_shared<TQCurveEditorFolderItem>();
+        folder->initWithChannel(object, numberOfSamples, _pAppDelegate,
+                                _ignoreHiddenChannels ? 1 : 0);
+        validateCurveSet(*folder, before);  // against the items this set still holds
+        temporary->addRootItem(folder);
+        addObjectsAffectedByBehavior(object, *temporary, numberOfSamples);
+    }
+    reset();
+    const std::vector<TQCurveEditorFolderItemPtr> roots = temporary->roots();
+    for (const TQCurveEditorFolderItemPtr& root : roots) addRootItem(root);  // filters again
+    if (snapshot) takeSnapshot(true);
+}
+
+void TQCurveSetByChannelState::addObjectsAffectedByBehavior(TQChannelBase*, TQCurveSet&, uint32_t) {
+}
 
 void TQCurveSetAnimated::initWithName(const BNString& name, TQCurveEditorAppDelegate* appDelegate) {
     TQCurveSet::initWithName(name, appDelegate);
     setCurveSetShortcut("u");
 }
 
-void TQCurveSetAnimated::filterList() {
-    filterChildren([this](const TQCurveEditorItem& child) {
-        const TQChannel* channel = child.channel();
-        if (!channel) return false;
-        const bool selected = isObjectOfChannelSelected(_pAppDelegate, *channel);
-        if (channel->canKeyframe() && channel->numberOfKeyframes() >= 2 && selected) return true;
-        return movedByBehaviour(*this, *channel, selected);
-    });
+bool TQCurveSetAnimated::keepsChannel(const TQChannel& channel, bool objectSelected) const {
+    if (channel.canKeyframe() && channel.numberOfKeyframes() >= 2 && objectSelected) return true;
+    return movedByBehaviour(*this, channel, objectSelected);
 }
-
-void TQCurveSetAnimated::refresh(uint32_t numberOfSamples, bool snapshot) {
-    // A subclass rebuilds in a set of its own class, so that its own filter runs.
-    const TQCurveSetPtr temporary = makeEmpty();
-    rebuildThroughTemporarySet(*this, *temporary, numberOfSamples, snapshot,
-                               [this](TQChannelBase* object, TQCurveSet& set, uint32_t samples) {
-                                   addObjectsAffectedByBehavior(object, set, samples);
-                               });
-}
-
-void TQCurveSetAnimated::addObjectsAffectedByBehavior(TQChannelBase*, TQCurveSet&, uint32_t) {}
-
-// --- Modified -----------------------------------------------------------------------------------
 
 void TQCurveSetModified::initWithName(const BNString& name, TQCurveEditorAppDelegate* appDelegate) {
     TQCurveSet::initWithName(name, appDelegate);
     setCurveSetShortcut("y");
 }
 
-void TQCurveSetModified::filterList() {
-    filterChildren([this](const TQCurveEditorItem& child) {
-        const TQChannel* channel = child.channel();
-        if (!channel) return false;
-        const bool selected = isObjectOfChannelSelected(_pAppDelegate, *channel);
-        // One keypoint is enough here, where Animated wants two.
-        if (channel->canKeyframe() && channel->numberOfKeyframes() != 0 && selected) return true;
-        if (movedByBehaviour(*this, *channel, selected)) return true;
-        if (selected &&
-            std::fabs(channel->getDefaultValue() - channel->getValueAsDouble(kCMTimeZero, 0.0)) >=
-                kDefaultValueTolerance &&
-            channel->canKeyframe())
-            return true;
-        const TQChannelFolder* parent = channel->getParent();
-        return parent && parent->isCompoundChannel() && parent->isAnimated(false);
-    });
+bool TQCurveSetModified::keepsChannel(const TQChannel& channel, bool objectSelected) const {
+    // One keypoint is enough here, where Animated wants two.
+    if (channel.canKeyframe() && channel.numberOfKeyframes() != 0 && objectSelected) return true;
+    if (movedByBehaviour(*this, channel, objectSelected)) return true;
+    if (objectSelected &&
+        std::fabs(channel.getDefaultValue() - channel.getValueAsDouble(kCMTimeZero, 0.0)) >=
+            kDefaultValueTolerance &&
+        channel.canKeyframe())
+        return true;
+    const TQChannelFolder* parent = channel.getParent();
+    return parent && parent->isCompoundChannel() && parent->isAnimated(false);
 }
-
-void TQCurveSetModified::refresh(uint32_t numberOfSamples, bool snapshot) {
-    // Of this class whatever the receiver's: a subclass still filters as Modified does here.
-    TQCurveSetModified temporary;
-    rebuildThroughTemporarySet(*this, temporary, numberOfSamples, snapshot,
-                               [this](TQChannelBase* object, TQCurveSet& set, uint32_t samples) {
-                                   addObjectsAffectedByBehavior(object, set, samples);
-                               });
-}
-
-void TQCurveSetModified::addObjectsAffectedByBehavior(TQChannelBase*, TQCurveSet&, uint32_t) {}
 
 // --- Active -------------------------------------------------------------------------------------
 

@@ -49,29 +49,6 @@ protected:
 
 }  // namespace
 
-TEST_F(CurveSetFixture, relativeRefresh__followsSelectedObjects) {
-    auto set = relativeSet(position);
-    host.scene().setSelection({cube, ball});
-    set->refresh(10, false);
-    ASSERT_EQ(set->numberOfItems(), 2u) << "one root per selected object";
-    EXPECT_EQ(set->numberOfChannelItems(), 6u);
-    EXPECT_EQ(names(*set).front(), "Cube:Transform.Position.X");
-    EXPECT_EQ(names(*set).back(), "Ball:Transform.Position.Z");
-
-    host.scene().setSelection({ball});
-    set->refresh(10, false);
-    ASSERT_EQ(set->numberOfItems(), 1u);
-    EXPECT_EQ(*set->rootItemAtIndex(0)->rootName(), "Ball");
-    {
-        auto none = relativeSet({});
-        none->refresh(10, false);
-        EXPECT_EQ(none->numberOfItems(), 0u) << "no paths, no roots";
-        auto foreign = relativeSet(refs({"./9/9"}));
-        foreign->refresh(10, false);
-        EXPECT_EQ(foreign->numberOfItems(), 0u) << "objects without the paths leave no empty root";
-    }
-}
-
 TEST_F(CurveSetFixture, filterList__keepsRootEmptiedByFilterButDropsRootEmptyFromStart) {
     auto set = relativeSet(refs({"./1/200/202"}));
     auto full = std::make_shared<TQCurveEditorFolderItem>();
