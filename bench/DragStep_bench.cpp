@@ -1,18 +1,18 @@
 // One step of an edit drag as the view runs it on each mouse event: the value announcements,
 // moveSelected on the selection, and the resampling of every affected curve for the next
-// frame. The scene: 50 channels of 1000 keyframes each (0.1 s apart), 20 keypoints selected
-// on each (1000 in all), curves sampled at 2000 points. The selection moves back and forth by
-// a third of a frame, so every step moves every keypoint and no two ever meet.
+// frame. The scene: the dense scene's plain channels, 50 of 1000 keyframes each (0.1 s
+// apart), 20 keypoints selected on each (1000 in all), curves sampled at 2000 points. The
+// selection moves back and forth by a third of a frame, so every step moves every keypoint
+// and no two ever meet.
 //
 // Target: under 8 ms per step.
 #include <benchmark/benchmark.h>
 
-#include <cstdio>
 #include <memory>
 #include <optional>
 
 #include "host/TQHostAppDelegate.h"
-#include "platform/channels/TQChannelObjectRootBase.h"
+#include "host/TQHostDenseScene.h"
 #include "src/curvesets/TQCurveSet.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
 #include "src/engine/TQEditBrackets.h"
@@ -20,9 +20,9 @@
 namespace {
 
 constexpr int kTimescale = 0x40000;
-constexpr int kChannels = 50;
-constexpr int kKeyframesPerChannel = 1000;
-constexpr int kSelectedPerChannel = 20;
+constexpr size_t kChannels = 50;
+constexpr size_t kKeyframesPerChannel = 1000;
+constexpr size_t kSelectedPerChannel = 20;
 constexpr unsigned kSamples = 2000;
 constexpr double kKeySpacing = 0.1;
 
@@ -41,28 +41,29 @@ struct DragScene {
         ctrl.setAppDelegate(&host);
         set->initWithName("Drag", &host);
         ctrl.setSelectedCurveSet(set);
-        auto* object =
-            host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
-        for (int c = 0; c < kChannels; ++c) {
-            char name[16];
-            std::snprintf(name, sizeof name, "C%d", c);
-            auto* channel = static_cast<TQChannel*>(object->addChild(
-                std::make_unique<TQChannel>(name, static_cast<TQChannelId>(100 + c))));
-            channel->setInterpolation(kTQInterpolationBezier);
-            for (int k = 0; k < kKeyframesPerChannel; ++k)
-                channel->setKeyframe(seconds(k * kKeySpacing), (k % 7) * 0.25 + c);
+        TQHostPopulateDenseScene(host.scene(), {.objects = 1,
+                                                .channelsPerObject = kChannels,
+                                                .keyframesPerChannel = kKeyframesPerChannel,
+                                                .seconds = kKeyframesPerChannel * kKeySpacing,
+                                                .channels = TQHostDenseChannels::Plain,
+                                                .bandSpacing = 1.0,
+                                                .amplitude = 0.75});
+        TQChannelObjectRootBase* object = host.scene().objects().front();
+        for (size_t c = 0; c < kChannels; ++c) {
+            auto* channel = static_cast<TQChannel*>(object->getChild(c));
             auto item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(
                 ctrl.appendChannel(channel, set));
             item->setScaleY(1.0);
             item->setOffsetY(0.0);
             items.push_back(item);
             // Every 50th keyframe, staggered per channel.
-            for (int s = 0; s < kSelectedPerChannel; ++s) {
-                const int k = s * (kKeyframesPerChannel / kSelectedPerChannel) + c % 10;
+            const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+            for (size_t s = 0; s < kSelectedPerChannel; ++s) {
+                const size_t k = s * (kKeyframesPerChannel / kSelectedPerChannel) + c % 10;
                 auto entry = std::make_shared<TQCurveSelection>();
                 entry->setCurveId(item->channelId());
                 entry->setFlags(TQSelectionKeypoint);
-                entry->setHandle(channel->getKeyframe(seconds(k * kKeySpacing)));
+                entry->setHandle(keys[k]);
                 CMTime t = kCMTimeInvalid;
                 double v = 0.0;
                 channel->getKeyframe(entry->getHandle(), &t, &v);

@@ -1,5 +1,5 @@
-// One frame of the curve view and one pick over it. The scene: 300 channels of 20 Bezier
-// keyframes each, in a view 2000 points wide, so that each curve is drawn through 2000
+// One frame of the curve view and one pick over it. The scene: the dense scene's 300 stacked
+// curves of 20 Bezier keyframes each (TQBenchScenes.h), in a view 2000 points wide, so that each curve is drawn through 2000
 // cached samples (600,000 vertices a frame). The samples are fetched once, before timing: a
 // frame rebuilds every primitive from the items' caches, as it does while nothing changes.
 //
@@ -11,13 +11,11 @@
 // Targets: a frame build under 5 ms, one pick under 10 us.
 #include <benchmark/benchmark.h>
 
-#include <cmath>
-#include <cstdio>
 #include <memory>
 #include <vector>
 
+#include "bench/TQBenchScenes.h"
 #include "host/TQHostAppDelegate.h"
-#include "platform/channels/TQChannelObjectRootBase.h"
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "src/curvesets/TQCurveSet.h"
@@ -27,11 +25,9 @@
 namespace {
 
 constexpr int kTimescale = 0x40000;
-constexpr int kCurves = 300;
-constexpr int kKeyframesPerCurve = 20;
 constexpr double kViewWidthPoints = 2000.0;
 constexpr double kViewHeightPoints = 600.0;
-constexpr double kDurationSeconds = 20.0;
+constexpr double kDurationSeconds = kTQBenchStackedSeconds;
 
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTimescale); }
 
@@ -68,6 +64,7 @@ struct FrameScene {
     RWStubViewHost viewHost{kViewWidthPoints, kViewHeightPoints, 1.0};
     TQCurveEditorViewBase view;
     DiscardingEncoder encoder;
+    std::vector<TQChannel*> channels;
 
     FrameScene() {
         ctrl.init();
@@ -81,27 +78,14 @@ struct FrameScene {
         const CMTime start = seconds(0.0);
         const CMTime duration = seconds(kDurationSeconds);
         view.setDisplayRange(&start, &duration);
-        view.setCurrentViewVolume(
-            CGRectMake(0.0, -1.0, kDurationSeconds, 2.0 * kCurves / 10.0 + 2.0));
+        view.setCurrentViewVolume(CGRectMake(0.0, -1.0, kDurationSeconds,
+                                             kTQBenchStackedBand * kTQBenchStackedCurves + 2.0));
         view.setOriginalViewVolume(view.getCurrentViewVolume());
         view.drawProjection();
         ctrl.setSelectedCurveSet(set);
 
-        auto* object =
-            host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
-        const double spacing = kDurationSeconds / kKeyframesPerCurve;
-        for (int c = 0; c < kCurves; ++c) {
-            char name[16];
-            std::snprintf(name, sizeof name, "C%d", c);
-            auto* channel = static_cast<TQChannel*>(object->addChild(
-                std::make_unique<TQChannel>(name, static_cast<TQChannelId>(100 + c))));
-            channel->setInterpolation(kTQInterpolationBezier);
-            // Each curve a wave in its own band, 0.2 units apart.
-            for (int k = 0; k < kKeyframesPerCurve; ++k)
-                channel->setKeyframe(seconds(spacing * (k + 0.5)),
-                                     c * 0.2 + 0.08 * std::sin(k + c));
-            ctrl.appendChannel(channel, set);
-        }
+        TQHostPopulateDenseScene(host.scene(), TQBenchStackedCurvesSpec());
+        channels = TQBenchAppendAllChannels(ctrl, host.scene(), set);
         // The first frame fetches and caches every curve's samples.
         frame();
     }
@@ -128,12 +112,19 @@ void BM_PickClosest(benchmark::State& state) {
     // Points on keypoints, on curves between them, and between the bands.
     std::vector<HXDFloat2> points;
     for (int i = 0; i < 64; ++i) {
-        const int c = (i * 37) % kCurves;
-        const double t = (i % 3 == 0) ? (kDurationSeconds / kKeyframesPerCurve) *
-                                            ((i % kKeyframesPerCurve) + 0.5)
-                                      : 0.37 + i * 0.29;
-        const double v = c * 0.2 + (i % 4 == 3 ? 0.1 : 0.0);
-        const CGPoint p = scene.view.getPointScreen(CGPointMake(t, v));
+        const TQChannel* channel =
+            scene.channels[static_cast<size_t>(i * 37) % kTQBenchStackedCurves];
+        CMTime t = kCMTimeInvalid;
+        double v = 0.0;
+        if (i % 3 == 0) {
+            channel->getKeyframe(
+                channel->getKeyframes(false)[static_cast<size_t>(i) % kTQBenchStackedKeyframes], &t,
+                &v);
+        } else {
+            t = seconds(0.37 + i * 0.29);
+            v = channel->getCurveValue(t) + (i % 4 == 3 ? kTQBenchStackedBand / 2.0 : 0.0);
+        }
+        const CGPoint p = scene.view.getPointScreen(CGPointMake(CMTimeGetSeconds(t), v));
         points.push_back(HXDFloat2{static_cast<float>(p.x), static_cast<float>(p.y)});
     }
     // The first pick after a frame builds the curves' indexes: not what a click costs.

@@ -1,29 +1,23 @@
 // Items resolve their channel through a TQChannelRef against the host's scene root at every
 // access; a drag makes thousands of such resolutions. This measures one pass over the items
-// of a relative set spanning several objects (about 300 channel items).
+// of the All set spanning ten objects of the dense scene (300 channel items).
 #include <benchmark/benchmark.h>
 
 #include "host/TQHostAppDelegate.h"
-#include "host/TQHostSampleScene.h"
-#include "src/curvesets/TQCurveSet.h"
+#include "host/TQHostDenseScene.h"
+#include "src/curvesets/TQAutomaticCurveSets.h"
 
 namespace {
 
 void BM_ResolveItemChannels(benchmark::State& state) {
     TQHostAppDelegate host;
-    TQHostSampleSceneSpec spec;
-    spec.objects = 14;
-    TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel, spec);
+    TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel,
+                         {.objects = 10, .channelsPerObject = 30, .keyframesPerChannel = 20});
     const std::vector<TQChannelObjectRootBase*> objects = host.scene().objects();
-    host.scene().setSelection(std::vector<TQChannelBase*>(objects.begin(), objects.end()));
-    auto set = std::make_shared<TQCurveSet>();
+    host.setSelectedObjects(std::vector<TQChannelBase*>(objects.begin(), objects.end()));
+    auto set = std::make_shared<TQCurveSetAll>();
     set->initWithName("All", &host);
-    set->refresh(0, false);  // absolute: keeps nothing; build roots by hand below
-    for (TQChannelBase* object : host.selectedObjectsRootChannels()) {
-        auto root = std::make_shared<TQCurveEditorFolderItem>();
-        root->initWithChannel(object, 0, &host, 1);
-        set->addRootItem(root);
-    }
+    set->refresh(0, false);
     const std::vector<TQCurveEditorItemPtr> items = set->allItems();
     for (auto _ : state) {
         size_t live = 0;

@@ -1,6 +1,7 @@
 // Gesture steps through the curve view, as mouse events reach it: a rubber-band step and an
-// edit drag step. The scene: 300 channels of 20 Bezier keyframes (6000 keypoints) in a view
-// 2000 x 600 points, one frame drawn so that the hit tests have primitives.
+// edit drag step. The scene: the dense scene's 300 stacked curves of 20 Bezier keyframes
+// (6000 keypoints, TQBenchScenes.h) in a view 2000 x 600 points, one frame drawn so that the
+// hit tests have primitives.
 //
 // BM_BandStep: one drag step of a band that covers every keypoint: the rectangle test over
 // every channel's keypoint quads, the entries it makes, and the new selection.
@@ -12,12 +13,10 @@
 // Targets: a band step under 5 ms, a drag step of 6000 keypoints under 10 ms.
 #include <benchmark/benchmark.h>
 
-#include <cmath>
-#include <cstdio>
 #include <memory>
 
+#include "bench/TQBenchScenes.h"
 #include "host/TQHostAppDelegate.h"
-#include "platform/channels/TQChannelObjectRootBase.h"
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "src/curvesets/TQCurveSet.h"
@@ -27,11 +26,11 @@
 namespace {
 
 constexpr int kTimescale = 0x40000;
-constexpr int kCurves = 300;
-constexpr int kKeyframesPerCurve = 20;
 constexpr double kWidth = 2000.0;
 constexpr double kHeight = 600.0;
-constexpr double kDuration = 20.0;
+constexpr double kDuration = kTQBenchStackedSeconds;
+// Above every curve.
+constexpr double kTop = kTQBenchStackedBand * kTQBenchStackedCurves + 0.5;
 constexpr double kStep = 0.05;  // past the view's 1/30 s gate on drag steps
 
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTimescale); }
@@ -78,27 +77,15 @@ struct GestureScene {
         const CMTime duration = seconds(kDuration);
         view.setDisplayRange(&start, &duration);
         view.setTotalRange(&start, &duration);
-        // Curves 0.2 units apart; the top unit is empty, for gestures that start on nothing.
-        view.setCurrentViewVolume(CGRectMake(0.0, -1.0, kDuration, 0.2 * kCurves + 2.0));
+        // The top unit is empty, for gestures that start on nothing.
+        view.setCurrentViewVolume(
+            CGRectMake(0.0, -1.0, kDuration, kTQBenchStackedBand * kTQBenchStackedCurves + 2.0));
         view.setOriginalViewVolume(view.getCurrentViewVolume());
         view.setAutoZoom(0);
         view.setAutoPan(0);
         ctrl.setSelectedCurveSet(set);
-        auto* object =
-            host.scene().adoptObject(std::make_unique<TQChannelObjectRootBase>("Object", 1));
-        const double spacing = kDuration / kKeyframesPerCurve;
-        for (int c = 0; c < kCurves; ++c) {
-            char name[16];
-            std::snprintf(name, sizeof name, "C%d", c);
-            auto* channel = static_cast<TQChannel*>(object->addChild(
-                std::make_unique<TQChannel>(name, static_cast<TQChannelId>(100 + c))));
-            channel->setInterpolation(kTQInterpolationBezier);
-            channel->setFlag(kTQChannelFlagEnabledInCurveEditor);
-            for (int k = 0; k < kKeyframesPerCurve; ++k)
-                channel->setKeyframe(seconds(spacing * (k + 0.5)),
-                                     c * 0.2 + 0.08 * std::sin(k + c));
-            ctrl.appendChannel(channel, set);
-        }
+        TQHostPopulateDenseScene(host.scene(), TQBenchStackedCurvesSpec());
+        TQBenchAppendAllChannels(ctrl, host.scene(), set);
         frame();
     }
 
@@ -120,8 +107,7 @@ void bandSteps(benchmark::State& state, uint64_t mods) {
         for (size_t i = 0, j = 0; i < entries.size(); i += 2) entries[j++] = entries[i];
         entries.resize((entries.size() + 1) / 2);
     }
-    const double top = 0.2 * kCurves + 0.5;
-    scene.view.mouseDown(scene.at(RWEventType::LeftMouseDown, 0.01, top, mods));
+    scene.view.mouseDown(scene.at(RWEventType::LeftMouseDown, 0.01, kTop, mods));
     bool out = true;
     for (auto _ : state) {
         scene.clock.advance(kStep);
@@ -144,10 +130,11 @@ void BM_DragStepThroughView(benchmark::State& state) {
     GestureScene scene;
     scene.view.selectAll();
     // A press on a selected keypoint keeps the selection and makes that keypoint primary.
-    const double t = kDuration / kKeyframesPerCurve * 10.5;
-    double v = 0.0;
     TQChannel* first = scene.set->allItems().front()->channel();
-    first->getKeyframe(first->getKeyframe(seconds(t)), nullptr, &v);
+    CMTime keyTime = kCMTimeInvalid;
+    double v = 0.0;
+    first->getKeyframe(first->getKeyframes(false)[kTQBenchStackedKeyframes / 2], &keyTime, &v);
+    const double t = CMTimeGetSeconds(keyTime);
     scene.view.mouseDown(scene.at(RWEventType::LeftMouseDown, t, v));
     bool forward = true;
     for (auto _ : state) {
