@@ -34,6 +34,7 @@ struct Key {
 void animate(TQChannel* channel, const std::vector<Key>& keys) {
     if (!channel) return;
     std::vector<TQKeyframeHandle> handles;
+    handles.reserve(keys.size());
     for (const Key& k : keys) handles.push_back(channel->setKeyframe(frameTime(k.frame), k.value));
     // Handles once every keypoint is in: the automatic slope looks at both neighbours.
     for (size_t i = 0; i < keys.size(); ++i) {

@@ -60,8 +60,10 @@ TQChannelRef TQCurveSet::relativeRef(const TQCurveEditorItem& item) {
 bool TQCurveSet::sameRootName(const TQCurveEditorItem& item, const TQCurveEditorItem& root) {
     // An item without a root name compares equal to any root, as a message to nothing answers
     // "same"; a root without one matches only such an item.
-    if (!item.rootName()) return true;
-    return root.rootName() && *item.rootName() == *root.rootName();
+    const std::optional<BNString>& mine = item.rootName();
+    if (!mine) return true;
+    const std::optional<BNString>& theirs = root.rootName();
+    return theirs && *mine == *theirs;
 }
 
 void TQCurveSet::setRelative(bool relative) {

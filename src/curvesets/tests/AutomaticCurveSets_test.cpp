@@ -21,7 +21,7 @@ protected:
         logo = host.scene().objectNamed(kTQHostSampleBehaviorObject);
     }
     template <class Set>
-    std::shared_ptr<Set> refreshed(std::vector<TQChannelBase*> selection) {
+    std::shared_ptr<Set> refreshed(const std::vector<TQChannelBase*>& selection) {
         auto set = std::make_shared<Set>();
         set->initWithName("Set", &host);
         host.setSelectedObjects(selection);

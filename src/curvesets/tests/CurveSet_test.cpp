@@ -15,7 +15,7 @@ std::vector<TQChannelRef> refs(std::initializer_list<const char*> paths) {
 std::vector<BNString> names(const TQCurveSet& set) {
     std::vector<BNString> out;
     for (const auto& item : set.allItems())
-        out.push_back(*item->rootName() + ":" + item->simpleName());
+        out.push_back(item->rootName().value_or("") + ":" + item->simpleName());
     return out;
 }
 
@@ -134,7 +134,7 @@ TEST_F(CurveSetFixture, removeSelectedItem__onlyFirstSelectedRoot) {
     set->rootItemAtIndex(1)->select(true);
     static_cast<TQCurveSetMutable*>(set.get())->removeSelectedItem();
     ASSERT_EQ(set->numberOfItems(), 1u);
-    EXPECT_EQ(*set->rootItemAtIndex(0)->rootName(), "Ball");
+    EXPECT_EQ(set->rootItemAtIndex(0)->rootName(), "Ball");
 }
 
 TEST_F(CurveSetFixture, identity__namesShortcutsIdsAndCopies) {
