@@ -127,6 +127,7 @@ public:
     void validateCurveSet(TQCurveEditorFolderItem& folder, const EnableStates& before) const;
     bool isChannelAffectedBySelectedBehaviors(const TQChannel* channel) const;
 
+protected:
     // A rebuild adds its roots one at a time, and each addition filters every root again.
     // Nothing changes the channels while a rebuild runs, so within one a root whose children
     // all passed the rule at an earlier pass, and that has not changed since, is not asked
@@ -144,7 +145,6 @@ public:
         bool _outer;
     };
 
-protected:
     // Keeps, under each root in order, the children that `keep` accepts (a child without a
     // channel reaches `keep` too). The drop list runs across the roots and is applied to each
     // root in turn by isEqual (same channel). Then each root is opened. A root left without

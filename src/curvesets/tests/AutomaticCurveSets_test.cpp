@@ -136,7 +136,8 @@ TEST_P(AutomaticSets, byProperty__eachSelectedObjectShowsItsRowOfTheTable) {
         EXPECT_EQ(shown(*set, title), Paths(row.begin(), row.end()));
         EXPECT_EQ(shown(*set, logo), Paths(row.begin(), row.end()));
         const TQCurveSetPtr copy = set->copy();
-        EXPECT_EQ(typeid(*copy), typeid(*set));
+        const TQCurveSet &copied = *copy, &source = *set;
+        EXPECT_EQ(typeid(copied), typeid(source));
         EXPECT_EQ(*copy->references(), *set->references());
     }
 }
