@@ -37,7 +37,7 @@ i128 floorDiv(i128 n, i128 d) {
     return q;
 }
 
-// value/timescale as a CMTime, with the saturation documented in the header.
+// value/timescale as a CMTime, saturating to the infinity of the value's sign.
 CMTime fromWide(i128 value, CMTimeScale timescale, bool rounded) {
     if (value > kMaxValue) return kCMTimePositiveInfinity;
     if (value < kMinValue) return kCMTimeNegativeInfinity;
@@ -46,65 +46,55 @@ CMTime fromWide(i128 value, CMTimeScale timescale, bool rounded) {
     return t;
 }
 
-// Expresses a rational value n / d (d > 0, as 128-bit) in a timescale that fits.
-CMTime fromRational(i128 n, i128 d) {
-    if (d <= std::numeric_limits<CMTimeScale>::max()) {
-        // Reduce when the value is too wide for 64 bits at this timescale.
-        if (n <= kMaxValue && n >= kMinValue)
-            return fromWide(n, static_cast<CMTimeScale>(d), false);
+// The rational n / d (d > 0) in `scale`, rounded to nearest. A value too wide for 64 bits
+// halves the timescale until it fits, and saturates once even a timescale of 1 is too fine.
+// Each try rounds from the exact rational, so halving never rounds twice.
+CMTime fitRational(i128 n, i128 d, CMTimeScale scale) {
+    for (;;) {
+        const i128 scaled = n * scale;
+        const i128 v = divRound(scaled, d);
+        if ((v <= kMaxValue && v >= kMinValue) || scale == 1)
+            return fromWide(v, scale, scaled % d != 0);
+        scale /= 2;
     }
-    const i128 g = gcd128(n, d);
-    if (g > 1) {
-        n /= g;
-        d /= g;
-        if (d <= std::numeric_limits<CMTimeScale>::max() && n <= kMaxValue && n >= kMinValue)
-            return fromWide(n, static_cast<CMTimeScale>(d), false);
-    }
-    // Still too wide: round into the largest timescale that fits.
-    const CMTimeScale scale =
-        d > kCMTimeMaxTimescale ? kCMTimeMaxTimescale : static_cast<CMTimeScale>(d);
-    return fromWide(divRound(n * scale, d), scale, true);
 }
 
-// Adds or subtracts two numeric times exactly where the timescales allow it.
+// Adds or subtracts two numeric times: exact in the least common multiple of the timescales
+// while that is at most kCMTimeMaxTimescale, rounded into kCMTimeMaxTimescale beyond it.
 CMTime addNumeric(const CMTime& a, const CMTime& b, bool subtract) {
     const i128 bv = subtract ? -static_cast<i128>(b.value) : static_cast<i128>(b.value);
-    if (a.timescale == b.timescale) {
-        return fromRational(static_cast<i128>(a.value) + bv, a.timescale);
-    }
     const i128 l = static_cast<i128>(a.timescale) / gcd128(a.timescale, b.timescale) * b.timescale;
-    if (l <= std::numeric_limits<CMTimeScale>::max()) {
-        return fromRational(a.value * (l / a.timescale) + bv * (l / b.timescale), l);
-    }
-    // The common timescale does not fit: use the finer of the two and round. The flag
-    // tells of a real loss only; whole multiples convert exactly.
-    const CMTimeScale scale = a.timescale > b.timescale ? a.timescale : b.timescale;
-    const i128 an = static_cast<i128>(a.value) * scale, bn = bv * scale;
-    const bool inexact = an % a.timescale != 0 || bn % b.timescale != 0;
-    return fromWide(divRound(an, a.timescale) + divRound(bn, b.timescale), scale, inexact);
+    const i128 n = a.value * (l / a.timescale) + bv * (l / b.timescale);
+    const CMTimeScale scale =
+        l > kCMTimeMaxTimescale ? kCMTimeMaxTimescale : static_cast<CMTimeScale>(l);
+    return fitRational(n, l, scale);
 }
 
 // Rank of a time's kind in the total order of CMTimeCompare.
 int kindRank(const CMTime& t) {
     if (CMTIME_IS_INVALID(t)) return 4;
-    if (CMTIME_IS_INDEFINITE(t)) return 3;
-    if (CMTIME_IS_POSITIVE_INFINITY(t)) return 2;
+    if (CMTIME_IS_POSITIVE_INFINITY(t)) return 3;
+    if (CMTIME_IS_INDEFINITE(t)) return 2;
     if (CMTIME_IS_NEGATIVE_INFINITY(t)) return 0;
     return 1;  // numeric
 }
 
 CMTime combine(const CMTime& a, const CMTime& b, bool subtract) {
     if (CMTIME_IS_INVALID(a) || CMTIME_IS_INVALID(b)) return kCMTimeInvalid;
-    if (CMTIME_IS_INDEFINITE(a) || CMTIME_IS_INDEFINITE(b)) return kCMTimeIndefinite;
     const bool aPos = CMTIME_IS_POSITIVE_INFINITY(a), aNeg = CMTIME_IS_NEGATIVE_INFINITY(a);
     bool bPos = CMTIME_IS_POSITIVE_INFINITY(b), bNeg = CMTIME_IS_NEGATIVE_INFINITY(b);
     if (subtract) std::swap(bPos, bNeg);
-    if ((aPos && bNeg) || (aNeg && bPos)) return kCMTimeIndefinite;
+    if ((aPos && bNeg) || (aNeg && bPos)) return kCMTimeInvalid;
     if (aPos || bPos) return kCMTimePositiveInfinity;
     if (aNeg || bNeg) return kCMTimeNegativeInfinity;
+    if (CMTIME_IS_INDEFINITE(a) || CMTIME_IS_INDEFINITE(b)) return kCMTimeIndefinite;
     if (a.timescale <= 0 || b.timescale <= 0) return kCMTimeInvalid;
+    if (a.epoch != 0 && b.epoch != 0 && a.epoch != b.epoch) return kCMTimeInvalid;
     CMTime r = addNumeric(a, b, subtract);
-    if (CMTIME_IS_NUMERIC(r)) r.flags |= (a.flags | b.flags) & kCMTimeFlags_HasBeenRounded;
+    if (CMTIME_IS_NUMERIC(r)) {
+        r.flags |= (a.flags | b.flags) & kCMTimeFlags_HasBeenRounded;
+        r.epoch = a.epoch != 0 ? a.epoch : b.epoch;
+    }
     return r;
 }
 
@@ -132,7 +122,8 @@ CMTime CMTimeMultiply(const CMTime& time, int32_t multiplier) {
         const bool positive = CMTIME_IS_POSITIVE_INFINITY(time) == (multiplier > 0);
         return positive ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
     }
-    CMTime r = fromRational(static_cast<i128>(time.value) * multiplier, time.timescale);
+    CMTime r =
+        fitRational(static_cast<i128>(time.value) * multiplier, time.timescale, time.timescale);
     if (CMTIME_IS_NUMERIC(r)) r.flags |= time.flags & kCMTimeFlags_HasBeenRounded;
     return r;
 }
@@ -170,6 +161,8 @@ int32_t CMTimeCompare(const CMTime& lhs, const CMTime& rhs) {
     const int ra = kindRank(lhs), rb = kindRank(rhs);
     if (ra != rb) return ra < rb ? -1 : 1;
     if (ra != 1) return 0;
+    // Numeric times of different epochs are ordered by epoch alone.
+    if (lhs.epoch != rhs.epoch) return lhs.epoch < rhs.epoch ? -1 : 1;
     if (lhs.timescale <= 0 || rhs.timescale <= 0) {
         // A valid flag with no timescale is malformed; order it by its kind only.
         return (lhs.timescale > 0) - (rhs.timescale > 0);

@@ -2,19 +2,24 @@
 // Media time: a rational number of seconds (value / timescale) with flags for validity and
 // the infinities, the same fields and arithmetic as the public media-time type it stands for.
 //
-// Arithmetic is exact while the result fits: sums of two timescales use their least common
-// multiple when it fits in 32 bits; otherwise the larger timescale is used and the result is
-// rounded to nearest (kCMTimeFlags_HasBeenRounded is set when that loses anything). A value
-// that would not fit in 64 bits even then saturates to the infinity of its sign. Once set,
-// the rounded flag is carried through later arithmetic.
+// Sums and differences of two numeric times are exact in the least common multiple of their
+// timescales while that is at most kCMTimeMaxTimescale; beyond it the result is rounded to
+// nearest into kCMTimeMaxTimescale. A value too wide for 64 bits halves the timescale until
+// it fits (rounding to nearest) and saturates to the infinity of its sign when even a
+// timescale of 1 does not hold it. kCMTimeFlags_HasBeenRounded tells of a real loss, and once
+// set it is carried through later arithmetic. Numeric operands with different non-zero epochs
+// give invalid; otherwise the result takes the non-zero epoch.
 //
 // Non-numeric times, and what every operation answers for them:
 //   invalid   (flags without Valid; includes the all-zero time a missing host yields)
 //   +infinity, -infinity, indefinite (Valid plus the matching flag)
-// CMTimeAdd / CMTimeSubtract: invalid if either side is invalid; indefinite if either side
-//   is indefinite or the infinities cancel (+inf + -inf); otherwise an infinity dominates.
-// CMTimeCompare orders -inf < every numeric time < +inf < indefinite < invalid; two
-//   invalid times compare equal, as do two equal infinities.
+// CMTimeAdd / CMTimeSubtract (the right side's infinity counts with its sign turned when
+//   subtracting): invalid beats everything; infinities of opposite sign give invalid; one
+//   infinity gives that infinity, also against indefinite; otherwise indefinite on either
+//   side gives indefinite.
+// CMTimeCompare orders -inf < every numeric time < indefinite < +inf < invalid; numeric
+//   times of different epochs by epoch alone; two invalid times compare equal, as do two
+//   equal infinities and two indefinite times.
 // CMTimeGetSeconds: NaN for invalid and indefinite, +/-HUGE_VAL for the infinities.
 
 #include <compare>
@@ -84,6 +89,7 @@ CMTime CMTimeMake(CMTimeValue value, CMTimeScale timescale);
 CMTime CMTimeMakeWithSeconds(double seconds, CMTimeScale preferredTimescale);
 CMTime CMTimeAdd(const CMTime& lhs, const CMTime& rhs);
 CMTime CMTimeSubtract(const CMTime& lhs, const CMTime& rhs);
+// Keeps the time's timescale; a value too wide for it halves the timescale as a sum does.
 CMTime CMTimeMultiply(const CMTime& time, int32_t multiplier);
 // Keeps the time's timescale, rounding to nearest; NaN gives invalid, and zero times an
 // infinity (either way round) gives indefinite.
