@@ -577,10 +577,16 @@ void TQChannel::setCurveSegmentValue(const CMTime& time, double value, bool noti
     _d->curveChanged();
 }
 
-void TQChannel::offsetCurve(const CMTime* /*time: a uniform offset needs none*/, double value) {
-    if (!std::isfinite(value)) return;
-    if (_d->keys.empty()) _d->initialValue += value;
-    for (TQKeyframeRecord& k : _d->keys) k.value += value;
+void TQChannel::offsetCurve(const CMTime* time, double value) {
+    if (!time || !std::isfinite(value)) return;
+    const CMTime at = toChannelTime(time);
+    if (!CMTIME_IS_NUMERIC(at)) return;
+    // Every extrapolation moves with its keyframes, so one uniform shift carries the curve's
+    // value at `at`, inside the keyframe span or outside it, onto the target.
+    const double delta = value - getCurveValue(at, true);
+    if (!std::isfinite(delta) || delta == 0.0) return;
+    if (_d->keys.empty()) _d->initialValue += delta;
+    for (TQKeyframeRecord& k : _d->keys) k.value += delta;
     _d->curveChanged();
 }
 

@@ -227,9 +227,12 @@ public:
     // there move by the same amount (the end keyframe outside the keyframe span; the initial
     // value without keyframes).
     virtual void setCurveSegmentValue(const CMTime& time, double value, bool notify = false);
-    // Moves the whole curve by `value` in channel units (keyframes, or the initial value
-    // without keyframes). The time names where the user took the curve and is not needed for
-    // a uniform offset; a null time is accepted.
+    // Moves the whole curve up or down so that its value at axis time *time becomes `value`
+    // (channel units): every keyframe, or the initial value without keyframes, moves by the
+    // same amount. The target is absolute, so a drag that passes the pointer at each step
+    // keeps the curve under the pointer however many steps were dropped, and calling it
+    // twice with the same arguments changes nothing the second time. Null or non-numeric
+    // time, or a value that is not finite: no-op.
     virtual void offsetCurve(const CMTime* time, double value);
     virtual void setKeyframeInterpolation(TQKeyframeHandle handle, unsigned interpolation);
     // Every keyframe, and the interpolation of keyframes created later.

@@ -187,8 +187,44 @@ TEST_F(CurveKeyframes, segment_and_curve_offsets__move_the_right_keyframes) {
     c->setCurveSegmentValue(seconds(1.5), 25.0);
     EXPECT_NEAR(c->getCurveValue(seconds(1.5)), 25.0, kTolerance);
     EXPECT_EQ(valueOf(d), 30.0) << "keyframes outside the segment stay";
-    c->offsetCurve(nullptr, -5.0);
-    EXPECT_NEAR(valueOf(d), 25.0, kTolerance);
+}
+
+TEST_F(CurveKeyframes, offsetCurve__puts_the_curve_through_the_target_at_axis_time) {
+    c->setInterpolation(kTQInterpolationLinear);
+    c->setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter);
+    c->setTimeOffset(seconds(10.0));
+    const CMTime at = seconds(11.5);  // channel time 1.5, value 15
+    c->offsetCurve(&at, 40.0);
+    EXPECT_NEAR(c->getCurveValue(seconds(1.5)), 40.0, kTolerance);
+    EXPECT_NEAR(valueOf(a), 35.0, kTolerance) << "every keyframe moves by the same amount";
+    EXPECT_NEAR(valueOf(d), 55.0, kTolerance);
+    {
+        // The target is absolute: a repeated or skipped step lands in the same place.
+        auto once = std::unique_ptr<TQChannelBase>(c->cloneChannel());
+        c->offsetCurve(&at, 40.0);
+        EXPECT_TRUE(*c == *once);
+    }
+    {
+        // Past the last keyframe the extrapolated curve is what reaches the target.
+        const CMTime late = seconds(14.0);
+        c->offsetCurve(&late, 0.0);
+        EXPECT_NEAR(c->getCurveValue(seconds(4.0)), 0.0, kTolerance);
+        EXPECT_NEAR(valueOf(d), -10.0, kTolerance);
+    }
+    {
+        auto before = std::unique_ptr<TQChannelBase>(c->cloneChannel());
+        c->offsetCurve(nullptr, 5.0);
+        const CMTime invalid = kCMTimeInvalid;
+        c->offsetCurve(&invalid, 5.0);
+        c->offsetCurve(&at, NAN);
+        EXPECT_TRUE(*c == *before) << "no time, or no finite value: nothing moves";
+    }
+    {
+        auto empty = makeChannel("empty");
+        empty->setInitialValue(3.0);
+        empty->offsetCurve(&at, -2.0);
+        EXPECT_EQ(empty->getInitialValue(), -2.0) << "without keyframes the initial value moves";
+    }
 }
 
 TEST_F(CurveKeyframes, deleteAllKeyframes__keeps_the_value_shown_at_the_current_time) {

@@ -347,6 +347,43 @@ TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
     EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Curve"));
 }
 
+TEST_F(ViewMouseEdit, optionCommandDrag__keepsTheWholeCurveUnderThePointerThroughDroppedSteps) {
+    // Each step moves the curve so that it passes through the pointer; a step the gate
+    // drops must not change where the curve ends up.
+    const auto expectShiftedBy = [](const TQCurveEditorChannelItemPtr& item, double delta) {
+        EXPECT_EQ(keyTimes(item->channel()), (std::vector<double>{2.0, 5.0, 8.0}));
+        EXPECT_NEAR(keyValueAt(item->channel(), 2.0), delta, kDragTolerance);
+        EXPECT_NEAR(keyValueAt(item->channel(), 5.0), 0.3 + delta, kDragTolerance);
+        EXPECT_NEAR(keyValueAt(item->channel(), 8.0), delta, kDragTolerance);
+    };
+    const uint64_t mods = kOption | kCommand;
+    {
+        // From a keypoint the curve follows the pointer in time too: at t = 6 the original
+        // curve is at 0.2, the pointer ends at 0.5.
+        auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.3}, {8.0, 0.0}});
+        ASSERT_TRUE(frame());
+        down(5.0, 0.3, mods);
+        dragTo(5.5, 0.4, mods);
+        dragTo(5.75, 0.9, mods, 0.01);  // dropped by the gate
+        dragTo(6.0, 0.5, mods);
+        up(6.0, 0.5, mods);
+        expectShiftedBy(item, 0.3);
+        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Keypoint"));
+        ASSERT_TRUE(set->removeItemWithIdentifier(item->channelId()));
+    }
+    {
+        // From the curve the time stays that of the press, at 3.5 (value 0.15).
+        auto item = linearItem("B", {{2.0, 0.0}, {5.0, 0.3}, {8.0, 0.0}});
+        ASSERT_TRUE(frame());
+        down(3.5, 0.15, mods);
+        ASSERT_TRUE(view.getSelection()->selectionAtIndex(0)->isCurve());
+        for (int i = 1; i <= 4; ++i) dragTo(4.0, 0.15 + 0.1 * i, mods, i % 2 ? kStepSeconds : 0.01);
+        up(4.0, 0.55, mods);
+        expectShiftedBy(item, 0.3);
+        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Curve"));
+    }
+}
+
 TEST_F(ViewMouseEdit, drag__intoTheEdgeBandZoomsOrPans) {
     auto item = linearItem("A", {{2.0, 0.0}, {9.5, 0.0}});
     const TQKeyframeHandle k2 = keyAt(item, 2.0);
