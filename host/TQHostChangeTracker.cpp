@@ -4,17 +4,17 @@
 
 void TQHostChangeTracker::channelWillChange(const TQChannelBase& channel,
                                             const TQChannelBase* sceneRoot) {
-    auto found = _entries.find(&channel);
-    if (found != _entries.end() && found->second.announced) return;  // the hot path of a drag
+    auto found = _entries.find(channel.getSerial());
+    if (found != _entries.end() && found->second) return;  // the hot path of a drag
     if (!sceneRoot || &channel == sceneRoot) return;
 
     TQChannelRef ref(&channel, sceneRoot);
     if (!ref.isValid()) return;  // not below the scene root
 
     if (found != _entries.end()) {
-        found->second = Entry{ref, true};
+        found->second = true;
     } else {
-        _entries.emplace(&channel, Entry{ref, true});
+        _entries.emplace(channel.getSerial(), true);
     }
     _announced.push_back(ref);
 
@@ -22,30 +22,20 @@ void TQHostChangeTracker::channelWillChange(const TQChannelBase& channel,
     // its own ancestors were recorded with it.
     for (const TQChannelBase* folder = channel.getParent(); folder && folder != sceneRoot;
          folder = folder->getParent()) {
-        if (_entries.contains(folder)) break;
-        _entries.emplace(folder, Entry{TQChannelRef(folder, sceneRoot), false});
+        if (!_entries.emplace(folder->getSerial(), false).second) break;
     }
-}
-
-bool TQHostChangeTracker::entryNames(const Entry& entry, const TQChannelBase* node,
-                                     const TQChannelBase* sceneRoot) const {
-    return entry.ref.getChannel(sceneRoot) == node;
 }
 
 bool TQHostChangeTracker::wasChannelModified(const TQChannelBase* channel,
                                              const TQChannelBase* sceneRoot) const {
     if (!channel || !sceneRoot || _entries.empty()) return false;
     // The node itself, announced or holding an announced node.
-    if (auto it = _entries.find(channel);
-        it != _entries.end() && entryNames(it->second, channel, sceneRoot))
-        return true;
+    if (_entries.contains(channel->getSerial())) return true;
     // A folder above it that was announced as a whole.
     for (const TQChannelBase* folder = channel->getParent(); folder && folder != sceneRoot;
          folder = folder->getParent()) {
-        auto it = _entries.find(folder);
-        if (it != _entries.end() && it->second.announced &&
-            entryNames(it->second, folder, sceneRoot))
-            return true;
+        auto it = _entries.find(folder->getSerial());
+        if (it != _entries.end() && it->second) return true;
     }
     return false;
 }

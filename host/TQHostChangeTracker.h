@@ -7,9 +7,8 @@
 // of modified channels holds exactly the announced nodes, in order of first announcement,
 // as references from the scene root.
 //
-// The tracker keeps channel pointers only as keys and never follows one without first
-// checking, through its stored reference, that the pointer still names the same place of
-// the scene: a destroyed channel whose address is reused does not count as modified.
+// Records are keyed by the channel's serial, never by its address: a channel made where a
+// destroyed, announced one lay is a channel of its own, modified only once announced itself.
 
 #include <cstddef>
 #include <unordered_map>
@@ -34,14 +33,7 @@ public:
     void reset();
 
 private:
-    struct Entry {
-        TQChannelRef ref;
-        bool announced = false;  // false: only a folder above an announced node
-    };
-    // The entry names `node` if its reference still resolves to that very node.
-    bool entryNames(const Entry& entry, const TQChannelBase* node,
-                    const TQChannelBase* sceneRoot) const;
-
-    std::unordered_map<const TQChannelBase*, Entry> _entries;
+    // By serial; true: announced itself, false: only a folder above an announced node.
+    std::unordered_map<TQChannelSerial, bool> _entries;
     std::vector<TQChannelRef> _announced;
 };

@@ -87,21 +87,21 @@ bool TQHostUndoStack::addClientStep(const void* object, uint32_t type, uint32_t 
 }
 
 void TQHostUndoStack::captureBefore(Step& step, const TQChannelBase& channel) {
-    if (step.captured.contains(&channel)) return;
+    if (step.captured.contains(channel.getSerial())) return;
     TQChannelBase* root = _sceneRoot ? _sceneRoot() : nullptr;
     if (!root) return;
     TQChannelRef ref(&channel, root);
     // A channel outside the scene could never be found again to restore it.
     if (!ref.isValid() || ref.getChannel(root) != &channel) return;
 
-    step.captured.insert(&channel);
+    step.captured.insert(channel.getSerial());
     step.parts.emplace_back(
         ChannelPart{std::move(ref), std::unique_ptr<TQChannelBase>(channel.cloneChannel()), {}});
 }
 
 void TQHostUndoStack::closeStep(std::unique_ptr<Step> step) {
     if (!step) return;
-    step->captured.clear();  // pointers are not kept past the step's close
+    step->captured.clear();  // only needed while the step is open
 
     TQChannelBase* root = _sceneRoot ? _sceneRoot() : nullptr;
     std::erase_if(step->parts, [root](Part& part) {

@@ -117,9 +117,9 @@ private:
     struct Step {
         BNString description;
         std::vector<Part> parts;
-        // Pointers of the channels captured while the step is open, so that each channel is
-        // captured once; cleared when the step closes.
-        std::unordered_set<const TQChannelBase*> captured;
+        // Serials of the channels captured while the step is open, so that each channel is
+        // captured once (an address may be reused by a channel made inside the step).
+        std::unordered_set<TQChannelSerial> captured;
     };
 
     void captureBefore(Step& step, const TQChannelBase& channel);

@@ -1,6 +1,8 @@
 // The scene's object model in both families, selection and change tracking.
 #include <gtest/gtest.h>
 
+#include <cstdint>
+
 #include "host/TQHostAppDelegate.h"
 #include "host/TQHostDenseScene.h"
 #include "platform/channels/TQChannelTypes.h"
@@ -13,6 +15,36 @@ constexpr TQHostProperty kAllProperties[] = {TQHostProperty::Position, TQHostPro
                                              TQHostProperty::Retiming};
 
 class SceneFamilies : public ::testing::TestWithParam<TQHostObjectFamily> {};
+
+// A channel class whose allocator hands the last freed address to the next channel, as a
+// real allocator may at any time.
+class ReusedAddressChannel : public TQChannel {
+public:
+    using TQChannel::TQChannel;
+    static void* operator new(std::size_t size) {
+        if (slotTaken || size > sizeof(slot)) return ::operator new(size);
+        slotTaken = true;
+        return slot;
+    }
+    static void operator delete(void* p) {
+        if (p == slot)
+            slotTaken = false;
+        else
+            ::operator delete(p);
+    }
+    // Of this class, so that undo can assign the snapshot back.
+    TQChannelBase* cloneChannel() const override {
+        auto* clone = new ReusedAddressChannel(getName(), getChannelId());
+        clone->copyIdentityFrom(*this);
+        copyConfigurationTo(*clone);
+        clone->assignState(*this);
+        return clone;
+    }
+
+private:
+    alignas(TQChannel) static inline unsigned char slot[sizeof(TQChannel)];
+    static inline bool slotTaken = false;
+};
 
 TEST_P(SceneFamilies, pathTables__resolveToKeyframableChannelsOfEveryObject) {
     const TQHostObjectFamily family = GetParam();
@@ -105,6 +137,31 @@ TEST_F(HostDelegate, modifiedSet__isExactlyWhatChangedSinceTheLastReset) {
     host.resetModifiedChannels();
     EXPECT_FALSE(host.wasChannelModified(x));
     EXPECT_TRUE(host.modifiedChannels().empty());
+}
+
+TEST_F(HostDelegate, channelAtAReusedAddress__isTrackedAndUndoneAsAChannelOfItsOwn) {
+    TQChannelBase* first =
+        objects[0]->addChild(std::unique_ptr<TQChannelBase>(new ReusedAddressChannel("A", 9000)));
+    const auto firstAddress = reinterpret_cast<std::uintptr_t>(first);
+    host.startCaptureModifiedChannels("Replace");
+    first->noteWillChange(true);
+    ASSERT_TRUE(objects[0]->removeChild(first));
+    auto* second = static_cast<TQChannel*>(
+        objects[1]->addChild(std::unique_ptr<TQChannelBase>(new ReusedAddressChannel("B", 9001))));
+    ASSERT_EQ(reinterpret_cast<std::uintptr_t>(second), firstAddress);
+    EXPECT_FALSE(host.wasChannelModified(second)) << "not announced yet";
+
+    second->noteWillChange(true);
+    second->setKeyframe(CMTimeMake(1, 1), 5.0);
+    host.endCaptureModifiedChannels();
+
+    EXPECT_TRUE(host.wasChannelModified(second));
+    EXPECT_TRUE(host.wasChannelModified(objects[1])) << "the object holding it";
+    const std::vector<TQChannelRef> modified = host.modifiedChannels();
+    ASSERT_EQ(modified.size(), 2u);
+    EXPECT_EQ(modified[1].getChannel(host.sceneChannelRoot()), second);
+    ASSERT_TRUE(host.undo());
+    EXPECT_EQ(second->numberOfKeyframes(), 0u) << "the step captured the new channel too";
 }
 
 TEST_F(HostDelegate, removedObject__leavesAReferenceThatResolvesToNothing) {

@@ -1,13 +1,21 @@
 #include "platform/channels/TQChannelBase.h"
 
+#include <atomic>
 #include <typeinfo>
 
 #include "platform/channels/TQChannelFolder.h"
 #include "platform/channels/TQChannelObjectRootBase.h"
 #include "platform/channels/TQChannelRef.h"
 
+namespace {
+// Atomic although channels live on the main thread: a host may build a scene off it.
+std::atomic<TQChannelSerial> gNextChannelSerial{1};
+}  // namespace
+
 TQChannelBase::TQChannelBase(const BNString& name, TQChannelId channelId)
-    : _name(name), _channelId(channelId) {}
+    : _name(name),
+      _channelId(channelId),
+      _serial(gNextChannelSerial.fetch_add(1, std::memory_order_relaxed)) {}
 
 TQChannelBase::~TQChannelBase() {
     // Deleted on its own while still in a folder: leave it, so the folder keeps no dangling

@@ -26,6 +26,8 @@ using TQKeyframeHandle = void*;
 
 // Identifier of a channel among its siblings; paths of TQChannelRef are chains of these.
 using TQChannelId = uint32_t;
+// Process-wide serial number of a node (see getSerial).
+using TQChannelSerial = uint64_t;
 
 // Channel flags (64-bit words, tested with any-bit semantics).
 enum : uint64_t {
@@ -115,6 +117,10 @@ public:
     void setName(const BNString& name) { _name = name; }
     TQChannelId getChannelId() const { return _channelId; }
     TQChannelFolder* getParent() const { return _parent; }
+    // Unique to this node for the life of the process, never copied and never reused: a node
+    // made at the address of a destroyed one has another serial. Hosts key per-node records
+    // by it where an address could outlive its node.
+    TQChannelSerial getSerial() const { return _serial; }
 
     // Null for a node that is not a folder, or a folder without children. Order is display
     // order; an element may be null.
@@ -184,7 +190,7 @@ protected:
     virtual bool equalState(const TQChannelBase& other) const;
     // Used by the copy operations of subclasses: name, id, own time offset, time extent and
     // X axis label. The change observer and the object manipulator belong to the host's
-    // attachment of this very node and are never copied.
+    // attachment of this very node and, like the serial, are never copied.
     void copyIdentityFrom(const TQChannelBase& other);
 
 private:
@@ -192,6 +198,7 @@ private:
 
     BNString _name;
     TQChannelId _channelId = 0;
+    TQChannelSerial _serial;
     TQChannelFolder* _parent = nullptr;  // not owned
     uint64_t _flags = 0;
     bool _locked = false;
