@@ -345,22 +345,23 @@ void TQCurveEditorChannelItem::refreshOriginalCurve(const CMTime& start, const C
         return;
     }
     if (!_originalCurveDirty) return;
-    _samplesU = std::make_unique<CMTime[]>(size_t{_numberOfSamples} + 1);
-    _samplesV = std::make_unique<double[]>(size_t{_numberOfSamples} + 1);
-    CMTime* times = _samplesU.get();
-    double* values = _samplesV.get();
+    CMTime* times = _samplesU.allocate(_numberOfSamples);
+    double* values = _samplesV.allocate(_numberOfSamples);
     c->getSamples(nullptr, start, resolution, _numberOfSamples, &times, &values);
+    // The channel may lower the count; a channel that raised it gets no room beyond the arrays.
+    const uint32_t n = std::min(_numberOfSamples, _samplesU.held);
+    _samplesU.held = _samplesV.held = n;
 
     // Pin the polyline onto the keyframes: each keyframe takes the first sample at or after
     // it that an earlier keyframe has not taken, however coarse the step.
     uint32_t i = 0;
     for (TQKeyframeHandle k : c->getKeyframes(true)) {
-        if (i >= _numberOfSamples) break;
+        if (i >= n) break;
         CMTime t{};
         double v = 0.0;
         if (!c->getKeyframe(k, &t, &v)) continue;
-        while (i < _numberOfSamples && CMTimeCompare(t, times[i]) > 0) ++i;
-        if (i < _numberOfSamples) {
+        while (i < n && CMTimeCompare(t, times[i]) > 0) ++i;
+        if (i < n) {
             times[i] = t;
             values[i] = v;
         }
@@ -379,11 +380,11 @@ void TQCurveEditorChannelItem::refreshProcessedCurve(const CMTime& start,
         return;
     }
     if (!_processedCurveDirty) return;
-    _processedSamplesU = std::make_unique<CMTime[]>(size_t{_numberOfProcessedSamples} + 1);
-    _processedSamplesV = std::make_unique<double[]>(size_t{_numberOfProcessedSamples} + 1);
-    CMTime* times = _processedSamplesU.get();
-    double* values = _processedSamplesV.get();
+    CMTime* times = _processedSamplesU.allocate(_numberOfProcessedSamples);
+    double* values = _processedSamplesV.allocate(_numberOfProcessedSamples);
     c->getSamples(start, resolution, _numberOfProcessedSamples, &times, &values);
+    _processedSamplesU.held = _processedSamplesV.held =
+        std::min(_numberOfProcessedSamples, _processedSamplesU.held);
     _processedCurveDirty = 0;
 }
 
@@ -413,7 +414,7 @@ double TQCurveEditorChannelItem::extreme(double& cached, int sign) {
     cached = wantMax ? c->getKeyframeMaxValue(true) : c->getKeyframeMinValue(true);
     if (!drawProcessedCurve()) return cached;
 
-    const bool absent = _processedSamplesV == nullptr;
+    const bool absent = !_processedSamplesV;
     if (absent) {
         const CMTimeRange range = _appDelegate ? _appDelegate->displayRange() : CMTimeRange{};
         const CMTime frame = _appDelegate ? _appDelegate->getFrameDuration() : CMTime{};
@@ -430,8 +431,12 @@ double TQCurveEditorChannelItem::extreme(double& cached, int sign) {
     }
     const double other = wantMax ? c->getKeyframeMinValue(true) : c->getKeyframeMaxValue(true);
     double s = wantMax ? -DBL_MAX : DBL_MAX;
-    for (uint32_t i = 0; i < _numberOfProcessedSamples; ++i)
-        s = wantMax ? std::max(s, _processedSamplesV[i]) : std::min(s, _processedSamplesV[i]);
+    // A new count set since the fetch is not what the arrays hold: read what they hold.
+    const uint32_t n = readableProcessedSamples();
+    for (uint32_t i = 0; i < n; ++i) {
+        const double value = _processedSamplesV.data[i];
+        s = wantMax ? std::max(s, value) : std::min(s, value);
+    }
     const bool widens = wantMax ? cached < s : cached > s;
     if (widens) {
         const double d = cached - other;
@@ -458,11 +463,12 @@ void TQCurveEditorChannelItem::takeCurveSnapshot(char withChannel) {
     _samplesVSnapshot.reset();
     _backupChannel.reset();
     if (withChannel) _backupChannel.reset(dynamic_cast<TQChannel*>(c->cloneChannel()));
-    _samplesVSnapshot = std::make_unique<double[]>(size_t{_numberOfSamples} + 1);
-    _samplesUSnapshot = std::make_unique<CMTime[]>(size_t{_numberOfSamples} + 1);
-    std::copy_n(_samplesV.get(), _numberOfSamples, _samplesVSnapshot.get());
-    if (_samplesU) std::copy_n(_samplesU.get(), _numberOfSamples, _samplesUSnapshot.get());
-    _numberOfSamplesSnapshot = _numberOfSamples;
+    // The curve as last fetched: a count set since then is not what the arrays hold.
+    const uint32_t n = readableSamples();
+    std::copy_n(_samplesV.data.get(), n, _samplesVSnapshot.allocate(n));
+    CMTime* times = _samplesUSnapshot.allocate(n);
+    if (_samplesU) std::copy_n(_samplesU.data.get(), n, times);
+    _numberOfSamplesSnapshot = n;
 }
 
 double TQCurveEditorChannelItem::currentValue() const {

@@ -9,6 +9,7 @@
 // outlive the item. Items are built in two phases: construct, then initWithChannel (which
 // calls overridable operations).
 
+#include <algorithm>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -28,6 +29,27 @@ extern uint32_t gColorIndex;
 
 class TQCurveEditorItem;
 using TQCurveEditorItemPtr = std::shared_ptr<TQCurveEditorItem>;
+
+// An owned sample array and the number of entries it holds, so that a reader given a count
+// that has moved on (a new sample count waits for the next fetch) can stay inside it.
+template <class T>
+struct TQSampleArray {
+    std::unique_ptr<T[]> data;
+    uint32_t held = 0;
+
+    // Room for `count` + 1 entries, as getSamples wants; holds `count` until told otherwise.
+    T* allocate(uint32_t count) {
+        data = std::make_unique<T[]>(size_t{count} + 1);
+        held = count;
+        return data.get();
+    }
+    void take(std::unique_ptr<T[]> array, uint32_t count) {
+        data = std::move(array);
+        held = data ? count : 0;
+    }
+    void reset() { take(nullptr, 0); }
+    explicit operator bool() const { return data != nullptr; }
+};
 
 class TQCurveEditorItem {
 public:
@@ -158,11 +180,21 @@ public:
     void setProcessedCurveDirty(char dirty);
     char originalCurveDirty() const { return _originalCurveDirty; }
     char processedCurveDirty() const { return _processedCurveDirty; }
-    // Both counts; marks the keyframed curve dirty without freeing its arrays.
+    // Both counts; marks the keyframed curve dirty without freeing its arrays, so until the
+    // next fetch a count may exceed what the arrays hold; readers of the arrays use the
+    // readable counts below.
     void setNumberOfSamples(uint32_t count);
     uint32_t numberOfSamples() const { return _numberOfSamples; }
     void setNumberOfProcessedSamples(uint32_t count) { _numberOfProcessedSamples = count; }
     uint32_t numberOfProcessedSamples() const { return _numberOfProcessedSamples; }
+    // The count, but no more than the present arrays hold.
+    uint32_t readableSamples() const { return readable(_numberOfSamples, _samplesU, _samplesV); }
+    uint32_t readableProcessedSamples() const {
+        return readable(_numberOfProcessedSamples, _processedSamplesU, _processedSamplesV);
+    }
+    uint32_t readableSamplesSnapshot() const {
+        return readable(_numberOfSamplesSnapshot, _samplesUSnapshot, _samplesVSnapshot);
+    }
 
     // Fetches the keyframed curve when dirty and pins the samples onto the keyframes.
     void refreshOriginalCurve(const CMTime& start, const CMTime& resolution);
@@ -201,19 +233,32 @@ public:
 
     TQCurveEditorItemPtr copy() const override;
 
-    // The sample arrays: owned, null when absent. Setters free what they replace.
-    const CMTime* samplesU() const { return _samplesU.get(); }
-    const double* samplesV() const { return _samplesV.get(); }
-    const CMTime* samplesUSnapshot() const { return _samplesUSnapshot.get(); }
-    const double* samplesVSnapshot() const { return _samplesVSnapshot.get(); }
-    const CMTime* processedSamplesU() const { return _processedSamplesU.get(); }
-    const double* processedSamplesV() const { return _processedSamplesV.get(); }
-    void setSamplesU(std::unique_ptr<CMTime[]> a) { _samplesU = std::move(a); }
-    void setSamplesV(std::unique_ptr<double[]> a) { _samplesV = std::move(a); }
-    void setSamplesUSnapshot(std::unique_ptr<CMTime[]> a) { _samplesUSnapshot = std::move(a); }
-    void setSamplesVSnapshot(std::unique_ptr<double[]> a) { _samplesVSnapshot = std::move(a); }
-    void setProcessedSamplesU(std::unique_ptr<CMTime[]> a) { _processedSamplesU = std::move(a); }
-    void setProcessedSamplesV(std::unique_ptr<double[]> a) { _processedSamplesV = std::move(a); }
+    // The sample arrays: owned, null when absent. Setters free what they replace and are
+    // told how many entries the new array holds.
+    const CMTime* samplesU() const { return _samplesU.data.get(); }
+    const double* samplesV() const { return _samplesV.data.get(); }
+    const CMTime* samplesUSnapshot() const { return _samplesUSnapshot.data.get(); }
+    const double* samplesVSnapshot() const { return _samplesVSnapshot.data.get(); }
+    const CMTime* processedSamplesU() const { return _processedSamplesU.data.get(); }
+    const double* processedSamplesV() const { return _processedSamplesV.data.get(); }
+    void setSamplesU(std::unique_ptr<CMTime[]> a, uint32_t held) {
+        _samplesU.take(std::move(a), held);
+    }
+    void setSamplesV(std::unique_ptr<double[]> a, uint32_t held) {
+        _samplesV.take(std::move(a), held);
+    }
+    void setSamplesUSnapshot(std::unique_ptr<CMTime[]> a, uint32_t held) {
+        _samplesUSnapshot.take(std::move(a), held);
+    }
+    void setSamplesVSnapshot(std::unique_ptr<double[]> a, uint32_t held) {
+        _samplesVSnapshot.take(std::move(a), held);
+    }
+    void setProcessedSamplesU(std::unique_ptr<CMTime[]> a, uint32_t held) {
+        _processedSamplesU.take(std::move(a), held);
+    }
+    void setProcessedSamplesV(std::unique_ptr<double[]> a, uint32_t held) {
+        _processedSamplesV.take(std::move(a), held);
+    }
     uint32_t numberOfSamplesSnapshot() const { return _numberOfSamplesSnapshot; }
     void setNumberOfSamplesSnapshot(uint32_t n) { _numberOfSamplesSnapshot = n; }
 
@@ -232,18 +277,25 @@ protected:
 private:
     // One walk for both extremes: `sign` is -1 for the minimum, +1 for the maximum.
     double extreme(double& cached, int sign);
+    // `count` bounded by the arrays present; with neither present, `count` (nothing to read).
+    template <class U, class V>
+    static uint32_t readable(uint32_t count, const TQSampleArray<U>& u, const TQSampleArray<V>& v) {
+        if (u) count = std::min(count, u.held);
+        if (v) count = std::min(count, v.held);
+        return count;
+    }
 
     char _originalCurveDirty = 1;
     char _processedCurveDirty = 1;
     char _drawGhost = 0;
     char _drawProcessedCurve = 1;
-    std::unique_ptr<CMTime[]> _processedSamplesU;
-    std::unique_ptr<double[]> _processedSamplesV;
+    TQSampleArray<CMTime> _processedSamplesU;
+    TQSampleArray<double> _processedSamplesV;
     uint32_t _numberOfProcessedSamples = 0;
-    std::unique_ptr<CMTime[]> _samplesU;
-    std::unique_ptr<double[]> _samplesV;
-    std::unique_ptr<double[]> _samplesVSnapshot;
-    std::unique_ptr<CMTime[]> _samplesUSnapshot;
+    TQSampleArray<CMTime> _samplesU;
+    TQSampleArray<double> _samplesV;
+    TQSampleArray<double> _samplesVSnapshot;
+    TQSampleArray<CMTime> _samplesUSnapshot;
     uint32_t _numberOfSamples = 0;
     uint32_t _numberOfSamplesSnapshot = 0;
     std::vector<TQKeyframeHandle> _keypoints;

@@ -310,6 +310,7 @@ void TQCurveEditorCtrlBase::getSamples(TQCurveEditorItem* item, char flag, CMTim
         if (number) *number = 0;
         return;
     }
+    // The count goes out as the arrays bound it: a new count waits for the next fetch.
     if ((flag & 1) == 0) {
         if (own->originalCurveDirty()) {
             // A caller passes the count it wants filled in; without one, keep the item's.
@@ -318,7 +319,7 @@ void TQCurveEditorCtrlBase::getSamples(TQCurveEditorItem* item, char flag, CMTim
         }
         if (samplesU) *samplesU = own->samplesU();
         if (samplesV) *samplesV = own->samplesV();
-        if (number) *number = own->numberOfSamples();
+        if (number) *number = own->readableSamples();
     } else {
         if (own->processedCurveDirty()) {
             if (number) own->setNumberOfProcessedSamples(*number);
@@ -326,7 +327,7 @@ void TQCurveEditorCtrlBase::getSamples(TQCurveEditorItem* item, char flag, CMTim
         }
         if (samplesU) *samplesU = own->processedSamplesU();
         if (samplesV) *samplesV = own->processedSamplesV();
-        if (number) *number = own->numberOfProcessedSamples();
+        if (number) *number = own->readableProcessedSamples();
     }
 }
 

@@ -272,7 +272,7 @@ void TQCurveEditorViewBase::drawOriginalCurve(TQCurveEditorItem* item) {
 
     // The ghost: where the curve was when the gesture began. Not pickable.
     const bool gesture = _controller->snapshotChannels() || _mouseIsDown;
-    const uint32_t ghostCount = channelItem->numberOfSamplesSnapshot();
+    const uint32_t ghostCount = channelItem->readableSamplesSnapshot();
     if (channelItem->drawGhost() && channelItem->isSelected() && gesture && ghostCount != 0 &&
         channelItem->samplesUSnapshot() && channelItem->samplesVSnapshot()) {
         const GDColor own = getColorForIndex(channelItem->colorIndex());

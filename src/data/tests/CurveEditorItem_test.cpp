@@ -145,6 +145,29 @@ TEST_F(ItemFixture, maxY__processedCurveWidensAtMostFiveTimes) {
     EXPECT_EQ(item->processedCurveDirty(), 1) << "samples taken to measure are not for drawing";
 }
 
+TEST_F(ItemFixture, newSampleCount__readersTakeOnlyWhatTheHeldArraysHoldUntilTheNextFetch) {
+    opacity->setKeyframe(sec(0), 0.0);
+    opacity->setKeyframe(sec(4), 4.0);
+    opacity->addBehavior(std::make_unique<TQOscillateBehavior>(1.0, 1.0));
+    auto item = channelItem(opacity, 5);
+    item->refreshOriginalCurve(kCMTimeZero, sec(1));
+    item->refreshProcessedCurve(kCMTimeZero, sec(1));
+    const double maxBefore = item->maxY();
+    const double minBefore = item->minY();
+
+    item->setNumberOfSamples(5000);  // the arrays still hold 5
+    EXPECT_EQ(item->maxY(), maxBefore) << "extremes of the samples held";
+    EXPECT_EQ(item->minY(), minBefore);
+    item->takeCurveSnapshot(1);
+    ASSERT_EQ(item->numberOfSamplesSnapshot(), 5u) << "the ghost is the curve as last drawn";
+    EXPECT_EQ(item->samplesVSnapshot()[4], 4.0);
+
+    item->refreshOriginalCurve(kCMTimeZero, sec(0.001));
+    EXPECT_EQ(item->numberOfSamples(), 5000u) << "the next fetch takes the new count";
+    item->takeCurveSnapshot(0);
+    EXPECT_EQ(item->numberOfSamplesSnapshot(), 5000u);
+}
+
 TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
     auto empty = std::make_shared<TQCurveEditorFolderItem>();
     empty->initWithRoot(cube, 0, &host, 1);

@@ -177,6 +177,13 @@ TEST_F(CtrlCore, samples__refresh_when_dirty_and_nothing_for_a_foreign_item) {
     ASSERT_NE(v, nullptr);
     EXPECT_EQ(n, 11u);
     EXPECT_NEAR(v[10], 1.0, kValueTolerance);
+    {
+        // A clean processed curve is served as held, even after a new count was asked for.
+        ctrl().getSamples(item.get(), 1, kCMTimeZero, CMTimeMake(1, 10), &u, &v, &n);
+        item->setNumberOfSamples(5000);
+        ctrl().getSamples(item.get(), 1, kCMTimeZero, CMTimeMake(1, 10), &u, &v, &n);
+        EXPECT_EQ(n, 11u) << "no more than the arrays hold";
+    }
 
     auto stranger = std::make_shared<TQCurveEditorChannelItem>();
     stranger->initWithChannel(addChannel("B", {}), 5, &recorder, 0);

@@ -60,8 +60,8 @@ TEST_F(ViewCurvesTest, drawOriginalCurve__mergesSelectedKeypointsIntoACoarserLin
         u[i] = seconds(2.5 * i);
         v[i] = std::min(2.5 * i, 4.0);
     }
-    item->setSamplesU(std::move(u));
-    item->setSamplesV(std::move(v));
+    item->setSamplesU(std::move(u), 5);
+    item->setSamplesV(std::move(v), 5);
     selectInView({keypointEntry(item, 0.0), keypointEntry(item, 1.0)});
     ASSERT_TRUE(frame());
 
