@@ -1,10 +1,10 @@
 #include "src/curvesets/TQCurveSet.h"
 
 #include <algorithm>
-#include <cctype>
 #include <unordered_set>
 
 #include "platform/channels/TQChannel.h"
+#include "platform/support/BNStringCase.h"
 #include "src/contract/TQCurveEditorAppDelegate.h"
 
 uint32_t gNewCurveSetIndex = 1;
@@ -43,14 +43,10 @@ TQCurveSetPtr TQCurveSet::copy() const {
 }
 
 void TQCurveSet::setCurveSetShortcut(const BNString& shortcut) {
-    _shortcut = shortcut;
-    std::transform(_shortcut.begin(), _shortcut.end(), _shortcut.begin(),
-                   [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
+    _shortcut = BNLowercaseString(shortcut);
 }
 
-uint16_t TQCurveSet::shortcut() const {
-    return _shortcut.empty() ? 0 : static_cast<uint16_t>(static_cast<unsigned char>(_shortcut[0]));
-}
+uint16_t TQCurveSet::shortcut() const { return BNFirstUTF16Unit(_shortcut); }
 
 TQChannelRef TQCurveSet::relativeRef(const TQCurveEditorItem& item) {
     TQChannelBase* c = item.channelBase();

@@ -56,9 +56,9 @@ public:
     bool ignoreHiddenChannels() const { return _ignoreHiddenChannels; }
     void setIgnoreHiddenChannels(bool ignore) { _ignoreHiddenChannels = ignore; }
     const BNString& curveSetShortcut() const { return _shortcut; }
-    // Stored lower case.
+    // Stored lower case, character by character (any script, not only ASCII).
     void setCurveSetShortcut(const BNString& shortcut);
-    // The first character of the shortcut, 0 when there is none.
+    // The first character of the shortcut as a UTF-16 code unit, 0 when there is none.
     uint16_t shortcut() const;
     bool isRelative() const { return _relative; }
     // True freezes the present channels into paths; false forgets the paths.

@@ -145,6 +145,9 @@ TEST_F(CurveSetFixture, identity__namesShortcutsIdsAndCopies) {
     a->setCurveSetShortcut("U");
     EXPECT_EQ(a->curveSetShortcut(), "u");
     EXPECT_EQ(a->shortcut(), 'u');
+    b->setCurveSetShortcut("ÄRGER");
+    EXPECT_EQ(b->curveSetShortcut(), "ärger") << "every character, beyond ASCII too";
+    EXPECT_EQ(b->shortcut(), 0x00E4) << "a character, not the first byte of its UTF-8";
 
     host.scene().setSelection({cube});
     a->refresh(10, false);
