@@ -266,6 +266,14 @@ void TQCurveEditorCtrlBase::deselectAllChannels() {
     if (_selectedCurveSet) _selectedCurveSet->deselectAll();
 }
 
+void TQCurveEditorCtrlBase::selectAll(void* sender) {
+    if (_view) _view->selectAll(sender);
+}
+
+void TQCurveEditorCtrlBase::selectNone(void* sender) {
+    if (_view) _view->selectNone(sender);
+}
+
 TQCurveEditorItemPtr TQCurveEditorCtrlBase::getFirstChannel() const {
     if (!_selectedCurveSet) return nullptr;
     const uint32_t n = _selectedCurveSet->numberOfChannelItems();

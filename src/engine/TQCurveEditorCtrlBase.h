@@ -261,6 +261,10 @@ public:
     TQCurveSelectionPtr addVertex(const TQCurveSelectionPtr& entry, CMTime u, double v, char link);
     // Deletes the keypoint at a channel time.
     void deleteVertex(const TQCurveSelection* entry, CMTime u);
+    // Forwarded to the view (every keypoint of the enabled items, or none); nothing without
+    // a view.
+    void selectAll(void* sender = nullptr);
+    void selectNone(void* sender = nullptr);
 
     // ---- Commands with their own bracket -----------------------------------------------
 

@@ -137,18 +137,19 @@ TEST_F(ViewPick, validateSelectedHandles__matchesByTimeAndDropsDeletedKeypoints)
         << "order kept, value ignored";
 }
 
-TEST_F(ViewPick, selectAll__skipsDisabledItemsAndTakesLockedKeypoints) {
+TEST_F(ViewPick, selectAllFromTheController__skipsDisabledItemsAndTakesLockedKeypoints) {
     TQChannel* other = addChannel("B", {{1.0, 0.0}});
     auto disabled = addItem(other);
     other->resetFlag(kTQChannelFlagEnabledInCurveEditor);
     item->channel()->setFlag(kTQChannelFlagEnabledInCurveEditor);
     item->channel()->setKeyframeLocked(k5, true);
 
-    view.selectAll();
+    // The channel list reaches the view's selection through the controller.
+    ctrl().selectAll(nullptr);
     EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{k2, k5, k8}));
     for (const auto& e : view.getSelection()->getSelectionArray())
         EXPECT_EQ(e->getFlags(), TQSelectionKeypoint);
-    view.selectNone();
+    ctrl().selectNone(nullptr);
     EXPECT_TRUE(view.getSelection()->empty());
 }
 
