@@ -144,6 +144,13 @@ TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendFolderToCurveSet(TQChannelFold
 
 TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendChannel(TQChannel* channel,
                                                           const TQCurveSetPtr& toCurveSet) {
+    TQCurveEditorItemPtr item = appendChannelItem(channel, toCurveSet);
+    if (item) postNotification(kTQNotifyCurveSetContentChanged);
+    return item;
+}
+
+TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendChannelItem(TQChannel* channel,
+                                                              const TQCurveSetPtr& toCurveSet) {
     auto* mutableSet = dynamic_cast<TQCurveSetMutable*>(toCurveSet.get());
     if (!channel || !mutableSet) return nullptr;
     auto item = std::make_shared<TQCurveEditorChannelItem>();
@@ -151,7 +158,6 @@ TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendChannel(TQChannel* channel,
                           static_cast<char>(_ignoreHiddenChannels));
     // No isValid test at this level: the set's appendItem decides.
     mutableSet->appendItem(item);
-    postNotification(kTQNotifyCurveSetContentChanged);
     return item;
 }
 
@@ -165,13 +171,14 @@ TQCurveEditorItemPtr TQCurveEditorCtrlBase::appendFolder(TQChannelFolder* folder
         for (TQChannelBase* child : snapshot) {
             if (!child) continue;
             if (auto* c = dynamic_cast<TQChannel*>(child)) {
-                if (TQCurveEditorItemPtr made = appendChannel(c, toCurveSet)) last = made;
+                // The set's own append, which posts nothing: the level posts once below.
+                if (TQCurveEditorItemPtr made = appendChannelItem(c, toCurveSet)) last = made;
             } else if (auto* f = dynamic_cast<TQChannelFolder*>(child)) {
                 if (TQCurveEditorItemPtr made = appendFolder(f, toCurveSet)) last = made;
             }
         }
     }
-    // Once for each level of the recursion, as the set's watchers have always seen it.
+    // Once for each level of the recursion.
     postNotification(kTQNotifyCurveSetContentChanged);
     updateUI();
     return last;

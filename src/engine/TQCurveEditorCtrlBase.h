@@ -384,6 +384,8 @@ protected:
     }
     // Sample count of new items: the view's width + 1, truncated.
     uint32_t newItemSampleCount() const;
+    // appendChannel without its post: the set's appendItem, which posts nothing.
+    TQCurveEditorItemPtr appendChannelItem(TQChannel* channel, const TQCurveSetPtr& toCurveSet);
     // The view's selection list, or null without a view.
     TQCurveSelectionList* viewSelection() const;
     void postNotification(TQNotificationWord word) const;

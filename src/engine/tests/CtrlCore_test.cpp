@@ -128,12 +128,18 @@ TEST_F(CtrlCore, maxViewVolume__empty_set_and_negative_curves) {
 }
 
 TEST_F(CtrlCore, sets__append_remove_and_first_channel) {
+    // Group: W, then the compound Pos (X, Y), so the append recurses once.
+    auto* group = static_cast<TQChannelFolder*>(
+        object->addChild(std::make_unique<TQChannelFolder>("Group", nextChannelId++)));
+    addChannel("W", {{1, 0}}, group);
     TQCompoundChannel* folder = addCompound("Pos", 2, false, {{1, 0}});
-    TQCurveEditorItemPtr last = ctrl().appendFolder(folder, set);
+    group->addChild(object->takeChild(folder));
+    TQCurveEditorItemPtr last = ctrl().appendFolder(group, set);
     ASSERT_NE(last, nullptr);
     EXPECT_EQ(last->channelBase(), folder->getChild(1));
-    EXPECT_EQ(ctrl().numberOfChannelItems(), 2u);
-    EXPECT_EQ(recorder.count("postNotification"), 3u) << "one per item and one per level";
+    EXPECT_EQ(ctrl().numberOfChannelItems(), 3u);
+    EXPECT_EQ(recorder.count("postNotification"), 2u)
+        << "once per level of the recursion, nothing per item";
 
     {
         // Selected but disabled items are passed over.
