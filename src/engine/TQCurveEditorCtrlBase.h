@@ -45,6 +45,7 @@
 #include "src/engine/TQCurveEditorCodes.h"
 
 class TQCurveEditorViewBase;
+struct TQBilinearMap;
 
 // A host's own wrapper around one of its channels or folders (what the appendCH... forms
 // take): all the framework asks of it is the channel inside.
@@ -296,6 +297,32 @@ public:
     // In place by u; equal times never compare equal, and a null element counts as time 0.
     void sortKeypoints(std::vector<TQKeyframePtr>& keys, bool bBackward);
 
+    // ---- Box deformation (TQCurveEditorCtrlDeform.cpp) ----------------------------------
+    //
+    // The box tool's math. Setup freezes every keypoint of a list, with both its handles,
+    // as coordinates normalised to the box around the keypoints; each deform maps those
+    // frozen coordinates through the bilinear map of the box's four corners and writes the
+    // result to the channels. Every deform starts from the frozen copy, so a drag of many
+    // steps ends where one step to the same corners ends, and a box pulled inside out and
+    // back gives back what it took. The caller holds the edit bracket.
+    //
+    // The frozen keys live in `_keys` until the next setup. They are valid for the box that
+    // setup answered: a deform with that box's corners is the identity, up to one tick of
+    // each keypoint's timescale times the box's width. Keys whose item, channel or keyframe
+    // has gone since are skipped.
+
+    // Freezes the keypoint entries of the list (validated first). Answers the box: origin the
+    // earliest keypoint (axis seconds) and the lowest (V), size their extent, a degenerate
+    // extent widened to 1e-6. Handles never widen it. Without a keypoint: the zero rectangle.
+    CGRect setupDeformSelected(TQCurveSelectionList* list);
+    // Maps the frozen keys through the box with these corners (world points). The list is
+    // not read: the work list is `_keys`. Times stay between frames during a drag; the last
+    // deformation of a gesture puts them on the grid when the controller constrains to
+    // frames.
+    void deformSelected(TQCurveSelectionList* list, CGPoint bottomLeft, CGPoint bottomRight,
+                        CGPoint topRight, CGPoint topLeft, char lastDeformation);
+    const std::vector<TQKeyframePtr>& deformKeys() const { return _keys; }
+
     // ---- Tangents -----------------------------------------------------------------------
 
     void setTangents(const TQCurveSelection* entry, double u, double v);
@@ -400,6 +427,21 @@ protected:
     // Runs the value window modally; true when it was accepted (value updated).
     virtual bool runValuePanel(TQCurveEditorValueWindow& window);
 
+    // A frozen key's item and channel, resolved once per curve for one deform call.
+    struct DeformTarget {
+        uint32_t curveId = 0;
+        TQCurveEditorItemPtr held;  // keeps the item alive through the call
+        TQCurveEditorChannelItem* item = nullptr;
+        TQChannel* channel = nullptr;
+    };
+    // The target of a curve id for this call (null channel when the item or channel is gone).
+    const DeformTarget& deformTarget(uint32_t curveId);
+    // The first pass of a deform: the direction of travel and whether the box is mirrored,
+    // and the write order that follows from them.
+    void orderKeysForDeform(const TQBilinearMap& map);
+    // The second pass for one key: value and handles first, the time last.
+    void writeDeformedKey(const TQKeyframe& key, const TQBilinearMap& map, char lastDeformation);
+
     // ---- Fields, in declaration order ---------------------------------------------------
 
     TQCurveEditorAppDelegate* _pAppDelegate = nullptr;  // not owned
@@ -421,6 +463,11 @@ protected:
     int32_t _iLastDragDirection = 0;     // box deformation only
     bool _bSelectionWasFlipped = false;  // box deformation only
     std::vector<TQKeyframePtr> _keys;    // box deformation only; owned
+
+private:
+    // Scratch of deformSelected: the targets by curve id, sorted, kept between calls so that
+    // a drag step allocates nothing per keypoint.
+    std::vector<DeformTarget> _deformTargets;
 };
 
 // ---- Per-entry edits --------------------------------------------------------------------
