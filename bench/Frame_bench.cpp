@@ -11,89 +11,24 @@
 // Targets: a frame build under 5 ms, one pick under 10 us.
 #include <benchmark/benchmark.h>
 
-#include <memory>
 #include <vector>
 
-#include "bench/TQBenchScenes.h"
-#include "host/TQHostAppDelegate.h"
-#include "platform/draw/HXDPrimitives.h"
-#include "platform/ui/testing/RWTestDoubles.h"
-#include "src/curvesets/TQCurveSet.h"
-#include "src/engine/TQCurveEditorCtrlBase.h"
-#include "src/view/TQCurveEditorViewBase.h"
+#include "bench/TQBenchView.h"
 
 namespace {
 
 constexpr int kTimescale = 0x40000;
 constexpr double kViewWidthPoints = 2000.0;
 constexpr double kViewHeightPoints = 600.0;
-constexpr double kDurationSeconds = kTQBenchStackedSeconds;
 
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTimescale); }
 
-// Takes the frame and paints nothing: what is measured is the view's own work.
-class DiscardingEncoder final : public HXDEncoder {
-public:
-    HXDTexture* nextDrawable() override { return &_target; }
-    void beginEncoding(HXDTexture&, const HXDColor&) override {}
-    void endEncoding() override {}
-    void encodeMultiline(const HXDMultiline& m, const HXDRenderingContext&) override {
-        benchmark::DoNotOptimize(&m);
-    }
-    void encodeQuadTexture(const HXDQuadTexture& q, const HXDRenderingContext&) override {
-        benchmark::DoNotOptimize(&q);
-    }
-    void encodeScreenspaceQuad(const HXDScreenspaceQuad&, const HXDRenderingContext&) override {}
-    void encodeMesh(const HXDMesh&, const HXDRenderingContext&) override {}
-    void encodeText(const HXDText&, const HXDRenderingContext&) override {}
-
-private:
-    class Target final : public HXDTexture {
-    public:
-        uint32_t width() const override { return static_cast<uint32_t>(kViewWidthPoints); }
-        uint32_t height() const override { return static_cast<uint32_t>(kViewHeightPoints); }
-    } _target;
-};
-
-struct FrameScene {
-    TQHostAppDelegate host;
-    TQCurveEditorCtrlBase ctrl;
-    TQCurveSetMutablePtr set = std::make_shared<TQCurveSetMutable>();
-    RWManualClock clock;
-    RWManualTimer timer{clock};
-    RWStubViewHost viewHost{kViewWidthPoints, kViewHeightPoints, 1.0};
-    TQCurveEditorViewBase view;
-    DiscardingEncoder encoder;
-    std::vector<TQChannel*> channels;
-
-    FrameScene() {
-        ctrl.init();
-        ctrl.setAppDelegate(&host);
-        set->initWithName("Frame", &host);
-        view.setViewHost(&viewHost);
-        view.setClock(&clock);
-        view.setTimer(&timer);
-        view.setController(&ctrl);
-        ctrl.setView(&view);
-        const CMTime start = seconds(0.0);
-        const CMTime duration = seconds(kDurationSeconds);
-        view.setDisplayRange(&start, &duration);
-        view.setCurrentViewVolume(CGRectMake(0.0, -1.0, kDurationSeconds,
-                                             kTQBenchStackedBand * kTQBenchStackedCurves + 2.0));
-        view.setOriginalViewVolume(view.getCurrentViewVolume());
-        view.drawProjection();
-        ctrl.setSelectedCurveSet(set);
-
-        TQHostPopulateDenseScene(host.scene(), TQBenchStackedCurvesSpec());
-        channels = TQBenchAppendAllChannels(ctrl, host.scene(), set);
-        // The first frame fetches and caches every curve's samples.
-        frame();
-    }
-
-    bool frame() {
-        clock.advance(1.0);
-        return view.displayLayer(&encoder);
-    }
+// The stacked curves in a view 2000 points wide; the first frame has fetched and cached every
+// curve's samples.
+struct FrameScene : TQBenchGestureView {
+    FrameScene()
+        : TQBenchGestureView(TQBenchStackedCurvesSpec(), kViewWidthPoints, kViewHeightPoints,
+                             kTQBenchStackedBand * kTQBenchStackedCurves + 1.0) {}
 };
 
 void BM_FrameBuild(benchmark::State& state) {

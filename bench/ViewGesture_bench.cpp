@@ -13,89 +13,20 @@
 // Targets: a band step under 5 ms, a drag step of 6000 keypoints under 10 ms.
 #include <benchmark/benchmark.h>
 
-#include <memory>
-
-#include "bench/TQBenchScenes.h"
-#include "host/TQHostAppDelegate.h"
-#include "platform/draw/HXDPrimitives.h"
-#include "platform/ui/testing/RWTestDoubles.h"
-#include "src/curvesets/TQCurveSet.h"
-#include "src/engine/TQCurveEditorCtrlBase.h"
-#include "src/view/TQCurveEditorViewBase.h"
+#include "bench/TQBenchView.h"
 
 namespace {
 
-constexpr int kTimescale = 0x40000;
-constexpr double kWidth = 2000.0;
-constexpr double kHeight = 600.0;
 constexpr double kDuration = kTQBenchStackedSeconds;
 // Above every curve.
 constexpr double kTop = kTQBenchStackedBand * kTQBenchStackedCurves + 0.5;
-constexpr double kStep = 0.05;  // past the view's 1/30 s gate on drag steps
 
-CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTimescale); }
-
-class NullEncoder final : public HXDEncoder {
-public:
-    HXDTexture* nextDrawable() override { return &_target; }
-    void beginEncoding(HXDTexture&, const HXDColor&) override {}
-    void endEncoding() override {}
-    void encodeMultiline(const HXDMultiline&, const HXDRenderingContext&) override {}
-    void encodeQuadTexture(const HXDQuadTexture&, const HXDRenderingContext&) override {}
-    void encodeScreenspaceQuad(const HXDScreenspaceQuad&, const HXDRenderingContext&) override {}
-    void encodeMesh(const HXDMesh&, const HXDRenderingContext&) override {}
-    void encodeText(const HXDText&, const HXDRenderingContext&) override {}
-
-private:
-    class Target final : public HXDTexture {
-    public:
-        uint32_t width() const override { return static_cast<uint32_t>(kWidth); }
-        uint32_t height() const override { return static_cast<uint32_t>(kHeight); }
-    } _target;
-};
-
-struct GestureScene {
-    TQHostAppDelegate host;
-    TQCurveEditorCtrlBase ctrl;
-    TQCurveSetMutablePtr set = std::make_shared<TQCurveSetMutable>();
-    RWManualClock clock;
-    RWManualTimer timer{clock};
-    RWStubViewHost viewHost{kWidth, kHeight, 1.0};
-    TQCurveEditorViewBase view;
-    NullEncoder encoder;
-
-    GestureScene() {
-        ctrl.init();
-        ctrl.setAppDelegate(&host);
-        set->initWithName("Gesture", &host);
-        view.setViewHost(&viewHost);
-        view.setClock(&clock);
-        view.setTimer(&timer);
-        view.setController(&ctrl);
-        ctrl.setView(&view);
-        const CMTime start = seconds(0.0);
-        const CMTime duration = seconds(kDuration);
-        view.setDisplayRange(&start, &duration);
-        view.setTotalRange(&start, &duration);
-        // The top unit is empty, for gestures that start on nothing.
-        view.setCurrentViewVolume(
-            CGRectMake(0.0, -1.0, kDuration, kTQBenchStackedBand * kTQBenchStackedCurves + 2.0));
-        view.setOriginalViewVolume(view.getCurrentViewVolume());
-        view.setAutoZoom(0);
-        view.setAutoPan(0);
-        ctrl.setSelectedCurveSet(set);
-        TQHostPopulateDenseScene(host.scene(), TQBenchStackedCurvesSpec());
-        TQBenchAppendAllChannels(ctrl, host.scene(), set);
-        frame();
-    }
-
-    void frame() {
-        clock.advance(1.0);
-        view.displayLayer(&encoder);
-    }
-    RWEvent at(RWEventType type, double t, double v, uint64_t mods = 0) const {
-        return RWEvent::mouseEvent(type, view.getPointScreen(CGPointMake(t, v)), mods);
-    }
+// 300 stacked curves in a view 2000 x 600 points, with an empty unit on top for gestures
+// that start on nothing.
+struct GestureScene : TQBenchGestureView {
+    GestureScene()
+        : TQBenchGestureView(TQBenchStackedCurvesSpec(), 2000.0, 600.0,
+                             kTQBenchStackedBand * kTQBenchStackedCurves + 1.0) {}
 };
 
 void bandSteps(benchmark::State& state, uint64_t mods) {
@@ -110,10 +41,8 @@ void bandSteps(benchmark::State& state, uint64_t mods) {
     scene.view.mouseDown(scene.at(RWEventType::LeftMouseDown, 0.01, kTop, mods));
     bool out = true;
     for (auto _ : state) {
-        scene.clock.advance(kStep);
         // Back and forth between a band over everything and one a little smaller.
-        scene.view.mouseDragged(scene.at(RWEventType::LeftMouseDragged,
-                                         out ? kDuration - 0.01 : kDuration - 0.5, -0.5, mods));
+        scene.dragTo(out ? kDuration - 0.01 : kDuration - 0.5, -0.5, mods);
         out = !out;
     }
     state.counters["selected"] = static_cast<double>(scene.view.getSelection()->size());
@@ -138,10 +67,8 @@ void BM_DragStepThroughView(benchmark::State& state) {
     scene.view.mouseDown(scene.at(RWEventType::LeftMouseDown, t, v));
     bool forward = true;
     for (auto _ : state) {
-        scene.clock.advance(kStep);
         // A third of a frame to and fro: every keypoint moves, none meets another.
-        scene.view.mouseDragged(
-            scene.at(RWEventType::LeftMouseDragged, forward ? t + 0.011 : t, v));
+        scene.dragTo(forward ? t + 0.011 : t, v);
         forward = !forward;
     }
     state.counters["keypoints"] = static_cast<double>(scene.view.getSelection()->size());

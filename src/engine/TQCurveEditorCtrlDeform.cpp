@@ -95,7 +95,8 @@ CGRect TQCurveEditorCtrlBase::setupDeformSelected(TQCurveSelectionList* list) {
         const CMTime axisTime = BN_CMTimeSaferAdd(time, channel->timeOffset());
         key->setU(axisTime);
         key->setV(convertFromChannelCoords(item, value));
-        key->setInTanU(CMTimeAdd(axisTime, TQTarnTimeForChannelSeconds(inU, kTQCurveEditorTimescale)));
+        key->setInTanU(
+            CMTimeAdd(axisTime, TQTarnTimeForChannelSeconds(inU, kTQCurveEditorTimescale)));
         key->setInTanV(convertFromChannelCoords(item, inV + value));
         key->setOutTanU(
             CMTimeAdd(axisTime, TQTarnTimeForChannelSeconds(outU, kTQCurveEditorTimescale)));
@@ -259,8 +260,8 @@ void TQCurveEditorCtrlBase::writeDeformedKey(const TQKeyframe& key, const TQBili
         // of one compound each move the compound; their times agree unless the box is freely
         // distorted, and then the later one's stands.
         const CMTime from = BN_CMTimeSaferAdd(present, offset);
-        compound->moveKeyframe(&channel, from, BN_CMTimeSaferAdd(newTime, offset), nullptr,
-                               nullptr, _linked);
+        compound->moveKeyframe(&channel, from, BN_CMTimeSaferAdd(newTime, offset), nullptr, nullptr,
+                               _linked);
         markComponentsDirty(*compound);
     } else {
         // By the keyframe itself, not by its time: keypoints that meet (a box pulled through

@@ -267,12 +267,17 @@ public:
     // The edit tool (tool 0).
     virtual void mouseDownEdit(const RWEvent& event);
     virtual void mouseDraggedEdit(const RWEvent& event);
-    // The sketch (1) and box (2) tools: nothing in this class; the views that offer those
-    // tools override them.
+    // The sketch tool (1): nothing in this class; the views that offer it override these.
     virtual void mouseDownSketch(const RWEvent&) {}
     virtual void mouseDraggedSketch(const RWEvent&) {}
-    virtual void mouseDownBox(const RWEvent&) {}
-    virtual void mouseDraggedBox(const RWEvent&) {}
+    // The box tool (2, TQCurveEditorViewBox.cpp): a press on a part of the box starts its
+    // drag; anywhere else it forgets the box and starts a rubber band, whose release puts a
+    // box around the keypoints it caught (two at least).
+    virtual void mouseDownBox(const RWEvent& event);
+    // One step: the band, or the part's drag, which moves the corners (Command: a corner
+    // alone; Shift: keeping the aspect; Option: about the centre, or mirrored on the opposite
+    // side) and deforms the frozen keypoints to the new box. A drag is one undo step.
+    virtual void mouseDraggedBox(const RWEvent& event);
     // The space bar: a repeated space key arms the space-bar navigation of a drag on empty
     // space. Answers false when the key is not the view's (the caller passes it on).
     virtual bool keyDown(const RWEvent& event);
@@ -367,8 +372,9 @@ public:
     // The rubber band while selecting; the box of the box tool.
     virtual void drawOverlays(const CGRect& bounds);
     virtual void drawSelectionRect();
-    // The box tool's handles and inside; empty here.
-    virtual void drawFourCornerBox() {}
+    // The box tool's outline, its eight handles (hit ids 1 to 8) and its inside (hit id 9,
+    // pickable, not drawn).
+    virtual void drawFourCornerBox();
 
     // The frame's lists. Primitives live until the next frame starts; the hit test runs on
     // _selectionPrimitives and _keypointsPrimitives.
@@ -462,6 +468,28 @@ public:
     virtual void resetBoxDeformation();
     char fourCornerBoxInitialized() const { return _fourCornerBoxInitialized; }
 
+    // ---- The box of the box tool (TQCurveEditorViewBox.cpp) ----
+    //
+    // Four corners in world coordinates. Made at the release of a rubber band of any tool
+    // around the keypoints it caught (the controller's setupDeformSelected); shown and
+    // dragged with the box tool only.
+
+    // The bounding rectangle of the four corners: its size and centre; any pointer may be
+    // null, and a null corner does not count.
+    static void getBoxLimits(const CGPoint* boxTopLeft, const CGPoint* boxTopRight,
+                             const CGPoint* boxBottomLeft, const CGPoint* boxBottomRight,
+                             double* pWidth, double* pHeight, double* pCenterX, double* pCenterY);
+    // Origin the bottom-left corner; width top-right minus top-left in x, height top-right
+    // minus bottom-right in y. Exact for a box that is still a rectangle.
+    CGRect getEditBox() const;
+    // All four corners to the rectangle's; the box is shown unless the rectangle is zero.
+    // For a host's undo of a box edit: the corners the box was made with stay as they were.
+    void setEditBox(const CGRect& box);
+    CGPoint fourCornersTopLeft() const { return _fourCornersTopLeft; }
+    CGPoint fourCornersTopRight() const { return _fourCornersTopRight; }
+    CGPoint fourCornersBottomLeft() const { return _fourCornersBottomLeft; }
+    CGPoint fourCornersBottomRight() const { return _fourCornersBottomRight; }
+
 protected:
     // Posts through the controller's delegate; nothing without one.
     void postNotification(TQNotificationWord word) const;
@@ -493,10 +521,28 @@ protected:
     // Closes the drag's undo step, if one is open: didModify of the selection, then the end
     // of the capture.
     void closeDragCapture() { _capturing.reset(); }
-    // Turns the ghost on and lowers the sample count of every selected item for a drag, and
-    // restores them at its end.
-    void prepareItemsForDrag();
+    // Turns the ghost on for every selected item at a drag's first step (with coarseCurves,
+    // an edit drag's, also a lower sample count and no processed curve), and restores them at
+    // its end.
+    void prepareItemsForDrag(bool coarseCurves);
     void restoreItemsAfterDrag();
+    // The box tool's part of mouseUp: the last deformation of a part drag (on the time grid),
+    // and the box around what a rubber band caught, with any tool.
+    void finishBoxDeformation();
+    void makeBoxAroundBand();
+    // Steps of a box part's drag: the overrun of the view's edges, the Shift bookkeeping, the
+    // corners' moves for each kind of part, by world deltas.
+    struct BoxOverrun {
+        double vertical = 0.0;
+        double horizontal = 0.0;
+    };
+    BoxOverrun boxOverrun(double sx, double sy);
+    void trackBoxShift(bool shiftDown);
+    void moveBoxCorner(uint32_t part, double dx, double dy, uint64_t modifierFlags);
+    void moveBoxSide(uint32_t part, double dx, double dy, uint64_t modifierFlags);
+    void moveBoxInside(const CGPoint& world, double dx, double dy, uint64_t modifierFlags);
+    // Whether Shift may keep an aspect: a collapsed box has none.
+    bool boxKeepsAspect() const;
     void setCursorShape(RWCursor cursor) const;
     void hideCursorForDrag();
 
@@ -565,7 +611,25 @@ protected:
     CGPoint _fourCornersTopRight;
     CGPoint _fourCornersBottomLeft;
     CGPoint _fourCornersBottomRight;
+    // The corners when the box was made: kept for a host, never read here.
+    CGPoint _initialFourCornersTopLeft;
+    CGPoint _initialFourCornersTopRight;
+    CGPoint _initialFourCornersBottomLeft;
+    CGPoint _initialFourCornersBottomRight;
     char _fourCornerBoxInitialized = 0;
+    // Proportions of each corner within the bounding rectangle, taken when Shift goes down:
+    // a Shift drag moves every corner in proportion, so a distorted box scales as a whole.
+    double _topLeftXFactor = 1.0;
+    double _topLeftYFactor = 1.0;
+    double _topRightXFactor = 1.0;
+    double _topRightYFactor = 1.0;
+    double _bottomLeftXFactor = 1.0;
+    double _bottomLeftYFactor = 1.0;
+    double _bottomRightXFactor = 1.0;
+    double _bottomRightYFactor = 1.0;
+    double _boxAspect = 0.0;   // width / height when Shift went down; 0 otherwise
+    double _boxCenterX = 0.0;  // centre of the corners' bounding rectangle at this step
+    double _boxCenterY = 0.0;
 
     // ---- Backing and frame ----
     RWViewHost* _viewHost = nullptr;   // not owned

@@ -138,6 +138,8 @@ void TQCurveEditorViewBase::mouseUp(const RWEvent& event) {
         _controller->cleanSelection(selection);
     }
     if (delegate) delegate->unsuppressEventCoalescing();
+    if (_controller && _controller->getCurrentTool() == TQTool::kBox && !_selecting)
+        finishBoxDeformation();
 
     if (_controller && !selection->empty()) {
         _controller->purgeSelected(selection);
@@ -146,6 +148,7 @@ void TQCurveEditorViewBase::mouseUp(const RWEvent& event) {
     closeDragCapture();
     // A plain rubber band changed no channel and posts nothing.
     if (!_selecting || hasControl(mods)) postNotification(kTQNotifyChannelsChanged);
+    makeBoxAroundBand();
 
     _selecting = 0;
     _selectionViewVolume = CGRectZero;
@@ -171,7 +174,7 @@ void TQCurveEditorViewBase::mouseUp(const RWEvent& event) {
 
 // ---- Items during a drag -------------------------------------------------------------------
 
-void TQCurveEditorViewBase::prepareItemsForDrag() {
+void TQCurveEditorViewBase::prepareItemsForDrag(bool coarseCurves) {
     const bool snapshot = _controller->snapshotChannels();
     // A coarser curve while dragging; the next draw takes this count for the dirty curve.
     const auto dragSamples = static_cast<uint32_t>(bounds().size.width / 5.0 + 1.0);
@@ -184,6 +187,7 @@ void TQCurveEditorViewBase::prepareItemsForDrag() {
         if ((!snapshot && !item->drawGhost()) || item->numberOfSamplesSnapshot() == 0)
             item->takeCurveSnapshot(snapshot);
         item->setDrawGhost(1);
+        if (!coarseCurves) continue;
         item->setNumberOfSamples(dragSamples);
         if (item->drawProcessedCurve()) item->setDrawProcessedCurve(0);
     }
@@ -370,7 +374,7 @@ void TQCurveEditorViewBase::mouseDraggedEdit(const RWEvent& event) {
 
     const TQCurveSelectionPtr e = selection->selectionAtIndex(0);
     if (!e) return;  // a list given a null entry from outside: nothing to drag
-    if (_startDrag) prepareItemsForDrag();
+    if (_startDrag) prepareItemsForDrag(true);
 
     // The scroll band: how far the dragged keypoints (or the pointer) would go past the
     // padded top or bottom, and past the unpadded left or right edge.

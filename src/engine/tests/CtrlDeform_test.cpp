@@ -22,7 +22,8 @@ struct Box {
 Box boxOf(const CGRect& r) {
     const double x1 = r.origin.x + r.size.width;
     const double y1 = r.origin.y + r.size.height;
-    return {r.origin, CGPointMake(x1, r.origin.y), CGPointMake(x1, y1), CGPointMake(r.origin.x, y1)};
+    return {r.origin, CGPointMake(x1, r.origin.y), CGPointMake(x1, y1),
+            CGPointMake(r.origin.x, y1)};
 }
 
 Box moved(Box b, double dx) {
@@ -55,8 +56,8 @@ constexpr double kHandleV = 0.125;
 class CtrlDeformTest : public EngineFixture {
 protected:
     TQChannel* addBoxChannel(const char* name, TQChannelFolder* parent = nullptr) {
-        TQChannel* c =
-            addChannel(name, {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}, {4.0, 0.25}, {5.0, 0.75}}, parent);
+        TQChannel* c = addChannel(
+            name, {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}, {4.0, 0.25}, {5.0, 0.75}}, parent);
         for (TQKeyframeHandle h : c->getKeyframes(false)) {
             c->setKeyframeInputTangents(h, -kHandleU, -kHandleV);
             c->setKeyframeOutputTangents(h, kHandleU, kHandleV);
@@ -90,6 +91,7 @@ protected:
                                                     const std::vector<KeyAfter>& keys) {
         auto out = cloneOf(c);
         std::vector<TQKeyframeHandle> handles;
+        handles.reserve(keys.size());
         for (const KeyAfter& k : keys) handles.push_back(out->getKeyframe(seconds(k.from)));
         for (size_t i = 0; i < keys.size(); ++i) {
             const KeyAfter& k = keys[i];
@@ -108,7 +110,8 @@ protected:
         for (int i = 0; i < 5; ++i) {
             const double t = 1.0 + i;
             if (mirrored)  // the output handle, turned back in time, becomes the input one
-                out.push_back({t, 2.0 - t + dt, values[i], -kHandleU, kHandleV, kHandleU, -kHandleV});
+                out.push_back(
+                    {t, 2.0 - t + dt, values[i], -kHandleU, kHandleV, kHandleU, -kHandleV});
             else
                 out.push_back({t, t + dt, values[i], -kHandleU, -kHandleV, kHandleU, kHandleV});
         }
@@ -127,14 +130,17 @@ TEST_F(CtrlDeformTest, setupDeformSelected__boxAroundKeypointsAlone) {
         EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()), CGRectMake(1.0, -1.0, 8.0, 4.0));
         EXPECT_EQ(ctrl().deformKeys().size(), 7u);
         deform(box);
-        EXPECT_EQ(*a->channel(), *before) << "the box setup answered maps every keypoint onto itself";
+        EXPECT_EQ(*a->channel(), *before)
+            << "the box setup answered maps every keypoint onto itself";
     }
     {
         SCOPED_TRACE("one time and one value: a degenerate extent is widened");
         selectInView({keypointEntry(a, 2.0), keypointEntry(b, 2.0)});
-        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()), CGRectMake(2.0, -1.0, 1e-6, 1.5));
+        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()),
+                  CGRectMake(2.0, -1.0, 1e-6, 1.5));
         selectInView({keypointEntry(a, 4.0), tangentEntry(a, 1.0, true), keypointEntry(a, 4.0)});
-        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()), CGRectMake(4.0, 0.25, 1e-6, 1e-6));
+        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()),
+                  CGRectMake(4.0, 0.25, 1e-6, 1e-6));
     }
     {
         SCOPED_TRACE("tangent entries alone freeze nothing, and a deform then changes nothing");
@@ -226,8 +232,8 @@ TEST_F(CtrlDeformTest, deformSelected__leadingKeypointFirstSoNoneTakesAnothersPl
 TEST_F(CtrlDeformTest, deformSelected__linkedComponentsFollow) {
     for (const bool linked : {true, false}) {
         SCOPED_TRACE(linked ? "linked" : "not linked");
-        TQCompoundChannel* position =
-            addCompound(linked ? "Linked" : "Free", 2, linked, {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}});
+        TQCompoundChannel* position = addCompound(linked ? "Linked" : "Free", 2, linked,
+                                                  {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}});
         auto* x = static_cast<TQChannel*>(position->getChild(0));
         auto* y = static_cast<TQChannel*>(position->getChild(1));
         auto xItem = boxItem(x);
@@ -281,7 +287,8 @@ TEST_F(CtrlDeformSnapTest, deformSelected__onlyTheLastDeformationSnapsToFrames) 
     ASSERT_EQ(after.size(), during.size());
     for (size_t i = 0; i < after.size(); ++i) {
         EXPECT_TRUE(onFrame(after[i])) << "keypoint " << i << " at " << after[i];
-        EXPECT_NEAR(after[i], during[i], 1.0 / 60.0) << "keypoint " << i << " snaps to its nearest frame";
+        EXPECT_NEAR(after[i], during[i], 1.0 / 60.0)
+            << "keypoint " << i << " snaps to its nearest frame";
     }
 }
 
