@@ -6,7 +6,6 @@
 // coordinate exact in binary, so that a box mapped back onto itself gives back the very
 // channel it started from.
 
-#include <cmath>
 #include <memory>
 #include <vector>
 
@@ -38,26 +37,14 @@ Box rightSideAt(Box b, double x) {
     return b;
 }
 
-Box lerp(const Box& a, const Box& b, double f) {
-    auto mix = [f](CGPoint p, CGPoint q) {
-        return CGPointMake(p.x + (q.x - p.x) * f, p.y + (q.y - p.y) * f);
-    };
-    return {mix(a.bl, b.bl), mix(a.br, b.br), mix(a.tr, b.tr), mix(a.tl, b.tl)};
-}
-
-// What a keyframe (found by its time before) should hold after: time, value, handles.
-struct KeyAfter {
-    double from, to, value, inU, inV, outU, outV;
-};
-
 constexpr double kHandleU = 0.25;
 constexpr double kHandleV = 0.125;
 
 class CtrlDeformTest : public EngineFixture {
 protected:
-    TQChannel* addBoxChannel(const char* name, TQChannelFolder* parent = nullptr) {
-        TQChannel* c = addChannel(
-            name, {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}, {4.0, 0.25}, {5.0, 0.75}}, parent);
+    TQChannel* addBoxChannel(const char* name) {
+        TQChannel* c =
+            addChannel(name, {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}, {4.0, 0.25}, {5.0, 0.75}});
         for (TQKeyframeHandle h : c->getKeyframes(false)) {
             c->setKeyframeInputTangents(h, -kHandleU, -kHandleV);
             c->setKeyframeOutputTangents(h, kHandleU, kHandleV);
@@ -86,34 +73,24 @@ protected:
     static std::unique_ptr<TQChannel> cloneOf(const TQChannel& c) {
         return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
     }
-    // A clone of the channel with its keyframes rewritten.
-    static std::unique_ptr<TQChannel> expectedAfter(const TQChannel& c,
-                                                    const std::vector<KeyAfter>& keys) {
+    // A clone with every keyframe moved by dt in time, after a mirror about 1 s if asked: the
+    // handles then turn back in time, the output one becoming the input one.
+    static std::unique_ptr<TQChannel> expectedAfter(const TQChannel& c, double dt, bool mirrored) {
         auto out = cloneOf(c);
-        std::vector<TQKeyframeHandle> handles;
-        handles.reserve(keys.size());
-        for (const KeyAfter& k : keys) handles.push_back(out->getKeyframe(seconds(k.from)));
-        for (size_t i = 0; i < keys.size(); ++i) {
-            const KeyAfter& k = keys[i];
-            out->setKeyframeValue(handles[i], k.value);
-            out->setKeyframeInputTangents(handles[i], k.inU, k.inV);
-            out->setKeyframeOutputTangents(handles[i], k.outU, k.outV);
-            const CMTime to = seconds(k.to);
-            out->setKeyframeTime(handles[i], &to);
-        }
-        return out;
-    }
-    // The box scene's keyframes moved in time by `dt`, mirrored about 1 s first if asked.
-    static std::vector<KeyAfter> boxKeysAfter(double dt, bool mirrored) {
-        std::vector<KeyAfter> out;
-        const double values[] = {0.0, 0.5, 1.0, 0.25, 0.75};
-        for (int i = 0; i < 5; ++i) {
-            const double t = 1.0 + i;
-            if (mirrored)  // the output handle, turned back in time, becomes the input one
-                out.push_back(
-                    {t, 2.0 - t + dt, values[i], -kHandleU, kHandleV, kHandleU, -kHandleV});
-            else
-                out.push_back({t, t + dt, values[i], -kHandleU, -kHandleV, kHandleU, kHandleV});
+        for (TQKeyframeHandle h : out->getKeyframes(false)) {
+            CMTime t = kCMTimeInvalid;
+            double inU = 0.0, inV = 0.0, outU = 0.0, outV = 0.0;
+            out->getKeyframe(h, &t, nullptr);
+            out->getKeyframeInputTangents(h, &inU, &inV);
+            out->getKeyframeOutputTangents(h, &outU, &outV);
+            double s = CMTimeGetSeconds(t);
+            if (mirrored) {
+                s = 2.0 - s;
+                out->setKeyframeInputTangents(h, -outU, outV);
+                out->setKeyframeOutputTangents(h, -inU, inV);
+            }
+            const CMTime to = seconds(s + dt);
+            out->setKeyframeTime(h, &to);
         }
         return out;
     }
@@ -122,35 +99,16 @@ protected:
 TEST_F(CtrlDeformTest, setupDeformSelected__boxAroundKeypointsAlone) {
     auto a = boxItem(addBoxChannel("A"));
     auto b = boxItem(addChannel("B", {{2.0, -1.0}, {9.0, 3.0}}));
-    const TQChannel& channelB = *b->channel();
-    {
-        SCOPED_TRACE("handles reach past the box and do not widen it");
-        const auto before = cloneOf(*a->channel());
-        const Box box = setupAll({a, b});
-        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()), CGRectMake(1.0, -1.0, 8.0, 4.0));
-        EXPECT_EQ(ctrl().deformKeys().size(), 7u);
-        deform(box);
-        EXPECT_EQ(*a->channel(), *before)
-            << "the box setup answered maps every keypoint onto itself";
-    }
-    {
-        SCOPED_TRACE("one time and one value: a degenerate extent is widened");
-        selectInView({keypointEntry(a, 2.0), keypointEntry(b, 2.0)});
-        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()),
-                  CGRectMake(2.0, -1.0, 1e-6, 1.5));
-        selectInView({keypointEntry(a, 4.0), tangentEntry(a, 1.0, true), keypointEntry(a, 4.0)});
-        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()),
-                  CGRectMake(4.0, 0.25, 1e-6, 1e-6));
-    }
-    {
-        SCOPED_TRACE("tangent entries alone freeze nothing, and a deform then changes nothing");
-        const auto before = cloneOf(channelB);
-        selectInView({tangentEntry(b, 2.0, true), tangentEntry(b, 6.0, false)});
-        EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()), CGRectZero);
-        EXPECT_TRUE(ctrl().deformKeys().empty());
-        deform(boxOf(CGRectMake(0.0, 0.0, 3.0, 3.0)));
-        EXPECT_EQ(channelB, *before);
-    }
+    const Box box = setupAll({a, b});
+    EXPECT_EQ(box.bl, CGPointMake(1.0, -1.0)) << "handles reach past the box, not widening it";
+    EXPECT_EQ(box.tr, CGPointMake(9.0, 3.0));
+    selectInView({keypointEntry(a, 4.0), keypointEntry(a, 4.0)});
+    EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()), CGRectMake(4.0, 0.25, 1e-6, 1e-6))
+        << "a degenerate extent is widened";
+    selectInView({tangentEntry(a, 2.0, true), tangentEntry(b, 9.0, false)});
+    EXPECT_EQ(ctrl().setupDeformSelected(view.getSelection()), CGRectZero)
+        << "tangent entries freeze nothing";
+    EXPECT_TRUE(ctrl().deformKeys().empty());
 }
 
 TEST_F(CtrlDeformTest, deformSelected__manySmallStepsEndWhereOneStepEnds) {
@@ -162,7 +120,14 @@ TEST_F(CtrlDeformTest, deformSelected__manySmallStepsEndWhereOneStepEnds) {
     const Box start = setupAll({item});
     const Box end{CGPointMake(1.25, -0.25), CGPointMake(6.75, 0.5), CGPointMake(6.0, 1.75),
                   CGPointMake(2.0, 1.25)};
-    for (int i = 1; i <= 40; ++i) deform(lerp(start, end, i / 40.0));
+    for (int i = 1; i <= 40; ++i) {
+        const double f = i / 40.0;
+        auto mix = [f](CGPoint p, CGPoint q) {
+            return p + CGPointMake((q.x - p.x) * f, (q.y - p.y) * f);
+        };
+        deform({mix(start.bl, end.bl), mix(start.br, end.br), mix(start.tr, end.tr),
+                mix(start.tl, end.tl)});
+    }
     const auto stepped = cloneOf(*c);
 
     *c = *original;
@@ -178,7 +143,7 @@ TEST_F(CtrlDeformTest, deformSelected__insideOutAndBackRestoresEveryKeypoint) {
     const Box box = setupAll({item});
     // The right side pulled through the left one (through a box of no width) and back.
     for (double x : {3.0, 1.0, -1.0, -3.0}) deform(rightSideAt(box, x));
-    EXPECT_EQ(*c, *expectedAfter(*original, boxKeysAfter(0.0, true)))
+    EXPECT_EQ(*c, *expectedAfter(*original, 0.0, true))
         << "mirrored in time, each keypoint keeps its input handle before it";
     for (double x : {-1.0, 1.0, 3.0, 5.0}) deform(rightSideAt(box, x));
     EXPECT_EQ(*c, *original);
@@ -202,7 +167,7 @@ TEST_F(CtrlDeformTest, deformSelected__leadingKeypointFirstSoNoneTakesAnothersPl
     // leading the move is written first, in a box mirrored in time as well.
     auto* c = static_cast<TimeWriteLog*>(
         object->addChild(std::make_unique<TimeWriteLog>("A", nextChannelId++)));
-    for (const auto& k : boxKeysAfter(0.0, false)) c->setKeyframe(seconds(k.from), k.value);
+    for (double t : {1.0, 2.0, 3.0, 4.0, 5.0}) c->setKeyframe(seconds(t), t);
     auto item = boxItem(c);
     const Box box = setupAll({item});
     const Box mirrored = rightSideAt(box, -3.0);
@@ -232,33 +197,21 @@ TEST_F(CtrlDeformTest, deformSelected__leadingKeypointFirstSoNoneTakesAnothersPl
 TEST_F(CtrlDeformTest, deformSelected__linkedComponentsFollow) {
     for (const bool linked : {true, false}) {
         SCOPED_TRACE(linked ? "linked" : "not linked");
-        TQCompoundChannel* position = addCompound(linked ? "Linked" : "Free", 2, linked,
-                                                  {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}});
+        TQCompoundChannel* position =
+            addCompound("Position", 2, linked, {{1.0, 0.0}, {2.0, 0.5}, {3.0, 1.0}});
         auto* x = static_cast<TQChannel*>(position->getChild(0));
         auto* y = static_cast<TQChannel*>(position->getChild(1));
         auto xItem = boxItem(x);
         boxItem(y);
         const auto yBefore = cloneOf(*y);
-        // Half a second later, and twice as tall: the selected component alone changes value.
+        // Half a second later, and twice as tall: only the selected component's values change.
         Box box = setupAll({xItem});
         box.tl.y = box.tr.y = 2.0;
         deform(moved(box, 0.5));
         EXPECT_EQ(keyTimes(x), (std::vector<double>{1.5, 2.5, 3.5}));
         EXPECT_NEAR(keyValueAt(x, 3.5), 2.0, kValueTolerance);
-        if (linked) {
-            std::vector<KeyAfter> retimed;
-            for (double t : {1.0, 2.0, 3.0}) {
-                double inU = 0, inV = 0, outU = 0, outV = 0;
-                const TQKeyframeHandle h = yBefore->getKeyframe(seconds(t));
-                yBefore->getKeyframeInputTangents(h, &inU, &inV);
-                yBefore->getKeyframeOutputTangents(h, &outU, &outV);
-                retimed.push_back({t, t + 0.5, keyValueAt(yBefore.get(), t), inU, inV, outU, outV});
-            }
-            EXPECT_EQ(*y, *expectedAfter(*yBefore, retimed))
-                << "the other component's keyframes move in time with the box, values kept";
-        } else {
-            EXPECT_EQ(*y, *yBefore);
-        }
+        EXPECT_EQ(*y, *expectedAfter(*yBefore, linked ? 0.5 : 0.0, false))
+            << "a linked component's keyframes follow in time, keeping their values";
     }
 }
 
@@ -276,20 +229,12 @@ protected:
 
 TEST_F(CtrlDeformSnapTest, deformSelected__onlyTheLastDeformationSnapsToFrames) {
     auto item = boxItem(addBoxChannel("A"));
-    // A fifth of a frame wider: every keypoint but the first leaves its frame.
+    // A fifth of a frame wider: the last keypoint leaves its frame until the last deformation.
     const Box wider = rightSideAt(setupAll({item}), 5.0 + 1.0 / 150.0);
-    auto onFrame = [](double t) { return std::fabs(t * 30.0 - std::round(t * 30.0)) < 1e-6; };
     deform(wider);
-    const std::vector<double> during = keyTimes(item->channel());
-    EXPECT_FALSE(onFrame(during.back())) << "a drag step must leave times where the box puts them";
+    EXPECT_NEAR(keyTimes(item->channel()).back(), 5.0 + 1.0 / 150.0, 1e-5);
     deform(wider, 1);
-    const std::vector<double> after = keyTimes(item->channel());
-    ASSERT_EQ(after.size(), during.size());
-    for (size_t i = 0; i < after.size(); ++i) {
-        EXPECT_TRUE(onFrame(after[i])) << "keypoint " << i << " at " << after[i];
-        EXPECT_NEAR(after[i], during[i], 1.0 / 60.0)
-            << "keypoint " << i << " snaps to its nearest frame";
-    }
+    EXPECT_EQ(keyTimes(item->channel()), (std::vector<double>{1.0, 2.0, 3.0, 4.0, 5.0}));
 }
 
 }  // namespace

@@ -1,6 +1,6 @@
 // The box tool through the view: the box a band leaves (with any tool), its primitives, how
-// each part's drag moves the corners with each modifier, the keypoints that follow, the
-// view's edges, and one undo step per drag.
+// each part's drag moves the corners with each modifier and the keypoints with them, and one
+// undo step per drag.
 
 #include <any>
 #include <memory>
@@ -23,30 +23,19 @@ protected:
         ctrl().setCurrentTool(TQTool::kBox);
         recorder.clearCalls();
     }
-    // A band from one world point to another, dragged in two steps.
-    void band(double t0, double v0, double t1, double v1, uint64_t mods = 0) {
-        down(t0, v0, mods);
-        dragTo((t0 + t1) * 0.5, (v0 + v1) * 0.5, mods);
-        dragTo(t1, v1, mods);
-        up(t1, v1, mods);
-    }
-    // A press at a world point, one step by (dt, dv), and the release.
-    void dragBy(CGPoint at, double dt, double dv, uint64_t mods = 0) {
-        down(at.x, at.y, mods);
-        dragTo(at.x + dt, at.y + dv, mods);
-        up(at.x + dt, at.y + dv, mods);
-    }
-    Corners corners() const {
-        return {view.fourCornersBottomLeft(), view.fourCornersBottomRight(),
-                view.fourCornersTopRight(), view.fourCornersTopLeft()};
+    // A band from (1, 0.9) to a world point, in two steps.
+    void bandTo(double t, double v) {
+        down(1.0, 0.9);
+        dragTo((1.0 + t) * 0.5, (0.9 + v) * 0.5);
+        dragTo(t, v);
+        up(t, v);
     }
     static void expectCorners(const Corners& actual, const Corners& expected) {
-        const char* names[] = {"bottom-left", "bottom-right", "top-right", "top-left"};
         const CGPoint a[] = {actual.bl, actual.br, actual.tr, actual.tl};
         const CGPoint e[] = {expected.bl, expected.br, expected.tr, expected.tl};
         for (int i = 0; i < 4; ++i) {
-            EXPECT_NEAR(a[i].x, e[i].x, kDragTolerance) << names[i] << " x";
-            EXPECT_NEAR(a[i].y, e[i].y, kDragTolerance) << names[i] << " y";
+            EXPECT_NEAR(a[i].x, e[i].x, kDragTolerance) << "corner " << i << " (from bottom-left)";
+            EXPECT_NEAR(a[i].y, e[i].y, kDragTolerance) << "corner " << i << " (from bottom-left)";
         }
     }
     // The box parts the last frame made pickable, by hit id.
@@ -58,53 +47,42 @@ protected:
 };
 
 TEST_F(ViewBoxTest, band__leavesABoxAroundWhatItCaughtWithAnyTool) {
-    auto a = linearItem("A", {{2.0, 0.0}, {4.0, 0.5}, {6.0, -0.25}});
-    linearItem("B", {{3.0, 0.25}});
+    linearItem("A", {{2.0, 0.0}, {4.0, 0.5}, {6.0, -0.25}});
     const CGRect around = CGRectMake(2.0, -0.25, 4.0, 0.75);
     ASSERT_TRUE(frame());
-    {
-        SCOPED_TRACE("box tool");
-        band(1.0, 0.9, 7.0, -0.9);
-        EXPECT_EQ(view.getSelection()->size(), 4u);
-        ASSERT_TRUE(view.fourCornerBoxInitialized());
-        expectRectNear(view.getEditBox(), around, kWorldTolerance, "box");
-        ASSERT_TRUE(frame());
-        for (uint32_t part = kTQBoxPartBottomLeft; part <= kTQBoxPartInside; ++part)
-            EXPECT_EQ(pickableParts(part), 1u) << "part " << part;
-        EXPECT_EQ(pickable<HXDMesh>(kTQBoxPartInside).size(), 1u);
-        for (const auto& p : view.primitives())
-            EXPECT_EQ(dynamic_cast<const HXDMesh*>(p.get()), nullptr) << "the inside is not seen";
-        click(9.0, 0.9);
-        EXPECT_FALSE(view.fourCornerBoxInitialized()) << "a click off the box forgets it";
-        EXPECT_TRUE(view.getSelection()->empty()) << "and what it held";
-    }
-    {
-        SCOPED_TRACE("one keypoint makes no box");
-        ASSERT_TRUE(frame());
-        band(1.0, 0.9, 2.5, -0.9);
-        EXPECT_EQ(view.getSelection()->size(), 1u);
-        EXPECT_FALSE(view.fourCornerBoxInitialized());
-    }
-    {
-        SCOPED_TRACE("edit tool: the box is made and not shown");
-        ctrl().setCurrentTool(TQTool::kEdit);
-        ASSERT_TRUE(frame());
-        band(1.0, 0.9, 7.0, -0.9);
-        ASSERT_TRUE(view.fourCornerBoxInitialized());
-        expectRectNear(view.getEditBox(), around, kWorldTolerance, "box");
-        EXPECT_EQ(ctrl().deformKeys().size(), 4u);
-        ASSERT_TRUE(frame());
-        EXPECT_EQ(pickableParts(kTQBoxPartInside), 0u);
-        ctrl().setCurrentTool(TQTool::kBox);
-        EXPECT_FALSE(view.fourCornerBoxInitialized()) << "a change of tool forgets it";
-    }
-    EXPECT_EQ(a->channel()->getKeyframes(false).size(), 3u) << "bands and clicks edit nothing";
+    bandTo(7.0, -0.9);
+    expectRectNear(view.getEditBox(), around, kWorldTolerance, "box tool");
+    ASSERT_TRUE(frame());
+    for (uint32_t part = kTQBoxPartBottomLeft; part <= kTQBoxPartInside; ++part)
+        EXPECT_EQ(pickableParts(part), 1u) << "part " << part;
+    const auto inside = pickable<HXDMesh>(kTQBoxPartInside);
+    ASSERT_EQ(inside.size(), 1u);
+    for (const auto& p : view.primitives()) EXPECT_NE(p.get(), inside[0]) << "it is not seen";
+    click(9.0, 0.9);
+    EXPECT_FALSE(view.fourCornerBoxInitialized()) << "a click off the box forgets it";
+    EXPECT_TRUE(view.getSelection()->empty()) << "and what it held";
+
+    ASSERT_TRUE(frame());
+    bandTo(3.0, -0.9);
+    EXPECT_FALSE(view.fourCornerBoxInitialized()) << "one keypoint makes no box";
+
+    ctrl().setCurrentTool(TQTool::kEdit);
+    ASSERT_TRUE(frame());
+    bandTo(7.0, -0.9);
+    ASSERT_TRUE(view.fourCornerBoxInitialized()) << "the edit tool's band makes one too";
+    expectRectNear(view.getEditBox(), around, kWorldTolerance, "edit tool");
+    ASSERT_TRUE(frame());
+    EXPECT_EQ(pickableParts(kTQBoxPartInside), 0u) << "and does not show it";
+    ctrl().setCurrentTool(TQTool::kBox);
+    EXPECT_FALSE(view.fourCornerBoxInitialized()) << "a change of tool forgets it";
 }
 
-TEST_F(ViewBoxTest, drag__eachPartMovesTheCornersItShould) {
-    linearItem("A", {{2.0, -0.5}, {6.0, 0.5}});
+TEST_F(ViewBoxTest, drag__eachPartMovesTheCornersAndTheKeypointsWithThem) {
+    auto a = linearItem("A", {{2.0, -0.5}, {6.0, 0.5}});
+    const TQKeyframeHandle onBottomLeft = keyAt(a, 2.0);
+    const TQKeyframeHandle onTopRight = keyAt(a, 6.0);
     ASSERT_TRUE(frame());
-    band(1.0, 0.9, 7.0, -0.9);
+    bandTo(7.0, -0.9);
     const CGRect box = CGRectMake(2.0, -0.5, 4.0, 1.0);  // aspect 4
     // The pointer moves 40 px across and 50 px up at each drag.
     constexpr double dt = 0.5, dv = 0.25;
@@ -149,60 +127,16 @@ TEST_F(ViewBoxTest, drag__eachPartMovesTheCornersItShould) {
         SCOPED_TRACE(c.what);
         view.setEditBox(box);  // the box of the band again: the keypoints go back with it
         ASSERT_TRUE(frame());
-        dragBy(c.at, dt, dv, c.mods);
-        expectCorners(corners(), c.expected);
-        EXPECT_TRUE(view.fourCornerBoxInitialized()) << "the box outlives its drags";
-    }
-}
-
-TEST_F(ViewBoxTest, drag__keypointsAndHandlesFollowTheBox) {
-    auto a = linearItem("A", {{2.0, -0.5}, {4.0, 0.0}, {6.0, 0.5}});
-    const TQKeyframeHandle k4 = keyAt(a, 4.0);
-    ASSERT_TRUE(frame());
-    band(1.0, 0.9, 7.0, -0.9);
-    ASSERT_TRUE(frame());
-    // The right side dragged past the left one: the box mirrored in time.
-    down(6.0, 0.0);
-    for (double t : {5.0, 3.0, 1.0, -1.0}) dragTo(t, 0.0);
-    up(-1.0, 0.0);
-    const auto [t, v] = keyOf(a, k4);
-    EXPECT_NEAR(t, 0.5, kDragTolerance) << "the middle keypoint mirrored about the left side";
-    EXPECT_NEAR(v, 0.0, kDragTolerance);
-    for (TQKeyframeHandle h : a->channel()->getKeyframes(false)) {
-        double in = 0.0, out = 0.0;
-        a->channel()->getKeyframeInputTangents(h, &in, nullptr);
-        a->channel()->getKeyframeOutputTangents(h, &out, nullptr);
-        EXPECT_LE(in, 0.0) << "input handles stay before their keypoints";
-        EXPECT_GE(out, 0.0) << "output handles after";
-    }
-    EXPECT_EQ(keyTimes(a->channel()), (std::vector<double>{-1.0, 0.5, 2.0}));
-}
-
-TEST_F(ViewBoxTest, drag__pastTheViewsEdgeZoomsOrPans) {
-    linearItem("A", {{2.0, -0.5}, {6.0, 0.5}});
-    ASSERT_TRUE(frame());
-    band(1.0, 0.9, 7.0, -0.9);
-    {
-        SCOPED_TRACE("auto-zoom: the top side into the padding band");
-        ASSERT_TRUE(frame());
-        down(4.0, 0.5);
-        dragTo(4.0, 0.75);
-        EXPECT_FALSE(view.needsAutoZoom());
-        dragTo(4.0, 0.95);
-        EXPECT_TRUE(view.needsAutoZoom());
-        up(4.0, 0.95);
-    }
-    view.setAutoZoom(0);
-    view.setNeedsAutoZoom(0);
-    view.setEditBox(CGRectMake(2.0, -0.5, 4.0, 1.0));
-    {
-        SCOPED_TRACE("auto-pan: the inside past the right edge, by the overrun");
-        ASSERT_TRUE(frame());
-        down(4.0, 0.0);
-        dragTo(8.5, 0.0);  // the right side 40 px past the edge
-        ASSERT_EQ(range().offsets.size(), 1u);
-        EXPECT_NEAR(range().offsets[0], 0.5, kDragTolerance);
-        up(8.5, 0.0);
+        down(c.at.x, c.at.y, c.mods);
+        dragTo(c.at.x + dt, c.at.y + dv, c.mods);
+        up(c.at.x + dt, c.at.y + dv, c.mods);
+        expectCorners({view.fourCornersBottomLeft(), view.fourCornersBottomRight(),
+                       view.fourCornersTopRight(), view.fourCornersTopLeft()},
+                      c.expected);
+        // The keypoints that lay on two corners lie on them still.
+        const auto [t0, v0] = keyOf(a, onBottomLeft);
+        const auto [t1, v1] = keyOf(a, onTopRight);
+        expectCorners({{t0, v0}, c.expected.br, {t1, v1}, c.expected.tl}, c.expected);
     }
 }
 
@@ -230,7 +164,7 @@ TEST_F(ViewBoxUndo, drag__isOneUndoStepThatRestoresEveryChannel) {
     BoxUndoClient client(view);
     host.registerUndoClient(&view, &client);
     ASSERT_TRUE(frame());
-    band(1.0, 0.9, 7.0, -0.9);
+    bandTo(7.0, -0.9);
     const CGRect box = view.getEditBox();
     recorder.clearCalls();
 
