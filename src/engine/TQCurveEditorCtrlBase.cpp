@@ -433,13 +433,19 @@ namespace {
 
 // The distinct channels of the list's entries, in order of first appearance. Entries whose
 // item or channel is gone are passed over. Small lists: a linear membership test is cheaper
-// than hashing, and a drag announces at most a few dozen channels.
+// than hashing, and a drag announces at most a few dozen channels. Entries of one curve
+// usually follow each other (a band takes them channel by channel), so a curve is looked up
+// and tested again only where the curve changes.
 template <class Lookup>
 std::vector<const TQChannelBase*> gatherChannels(const TQCurveSelectionList& list,
                                                  Lookup&& lookup) {
     std::vector<const TQChannelBase*> channels;
+    bool looked = false;
+    uint32_t lastCurveId = 0;
     for (const TQCurveSelectionPtr& entry : list.getSelectionArray()) {
-        if (!entry) continue;
+        if (!entry || (looked && entry->getCurveId() == lastCurveId)) continue;
+        looked = true;
+        lastCurveId = entry->getCurveId();
         const TQChannelBase* channel = lookup(*entry);
         if (!channel) continue;
         if (std::find(channels.begin(), channels.end(), channel) == channels.end())

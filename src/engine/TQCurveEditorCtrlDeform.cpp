@@ -43,9 +43,14 @@ struct TQBilinearMap {
     // differs from the keypoint's and the input handle's only when Ax is not zero (a freely
     // distorted box), and it is kept so.
     CMTime time(const CMTime& u, double v, bool squaredU = false) const {
-        CMTime first = u * ax;
-        first = squaredU ? (first * u) * v : first * v;
-        CMTime t = BN_CMTimeSaferAdd(first, u * bx);
+        CMTime t = u * bx;
+        // Ax is zero while the box keeps parallel sides (every drag but a free corner's); the
+        // term is then an exact zero of u's own timescale, and adding it changes nothing.
+        if (ax != 0.0) {
+            CMTime first = u * ax;
+            first = squaredU ? (first * u) * v : first * v;
+            t = BN_CMTimeSaferAdd(first, t);
+        }
         t = CMTimeAdd(t, TQTarnTimeForChannelSeconds(cx * v, kTQCurveEditorTimescale));
         return CMTimeAdd(t, TQTarnTimeForChannelSeconds(dx, kTQCurveEditorTimescale));
     }
@@ -239,16 +244,15 @@ void TQCurveEditorCtrlBase::writeDeformedKey(const TQKeyframe& key, const TQBili
     const CMTime offset = channel.timeOffset();
     const CMTime channelTime = BN_CMTimeSaferSubtract(t, offset);
     const double channelValue = convertToChannelCoords(&item, w);
-    const auto relativeTime = [&](const CMTime& handleOffset) {
-        const CMTime handleTime = BN_CMTimeSaferSubtract(CMTimeAdd(handleOffset, t), offset);
-        return CMTimeGetSeconds(BN_CMTimeSaferSubtract(handleTime, channelTime));
-    };
+    // A handle's time relative to its keypoint is the same in channel time as on the axis
+    // (the offset cancels exactly in rational time); its value goes through the item's
+    // mapping, which need not keep differences.
     const auto relativeValue = [&](double handleOffset) {
         return convertToChannelCoords(&item, handleOffset + w) - channelValue;
     };
     channel.setKeyframeValue(handle, channelValue);
-    channel.setKeyframeInputTangents(handle, relativeTime(inT), relativeValue(inW), true);
-    channel.setKeyframeOutputTangents(handle, relativeTime(outT), relativeValue(outW), true);
+    channel.setKeyframeInputTangents(handle, CMTimeGetSeconds(inT), relativeValue(inW), true);
+    channel.setKeyframeOutputTangents(handle, CMTimeGetSeconds(outT), relativeValue(outW), true);
 
     // The time last. Only the gesture's last call goes on the grid; the channel time is put
     // on it before the offset is added back, as it always was.

@@ -224,8 +224,25 @@ void TQCurveEditorCtrlBase::sortKeypoints(std::vector<TQKeyframePtr>& keys, bool
     // both ways, which is an equivalence here, so the sort is well defined. Stable, so equal
     // times keep their order.
     const auto timeOf = [](const TQKeyframePtr& k) { return k ? k->u() : kCMTimeZero; };
-    std::stable_sort(keys.begin(), keys.end(), [&](const TQKeyframePtr& a, const TQKeyframePtr& b) {
+    const auto before = [&](const TQKeyframePtr& a, const TQKeyframePtr& b) {
         const int32_t c = CMTimeCompare(timeOf(a), timeOf(b));
         return bBackward ? c > 0 : c < 0;
-    });
+    };
+    // A box drag turns the order of the same keys around whenever its direction changes:
+    // keys sorted the other way are reversed, each run of equal times turned back so that it
+    // keeps its order, as the stable sort would give it, in one pass instead of a sort.
+    if (std::is_sorted(keys.begin(), keys.end(), before)) return;
+    const auto after = [&](const TQKeyframePtr& a, const TQKeyframePtr& b) { return before(b, a); };
+    if (std::is_sorted(keys.begin(), keys.end(), after)) {
+        std::reverse(keys.begin(), keys.end());
+        for (auto run = keys.begin(); run != keys.end();) {
+            const auto end = std::find_if(run, keys.end(), [&](const TQKeyframePtr& k) {
+                return CMTimeCompare(timeOf(k), timeOf(*run)) != 0;
+            });
+            std::reverse(run, end);
+            run = end;
+        }
+        return;
+    }
+    std::stable_sort(keys.begin(), keys.end(), before);
 }

@@ -191,6 +191,7 @@ TEST_F(CtrlMovesTest, sortKeypoints__byTimeBothWaysWithTiesAndNulls) {
     EXPECT_NEAR(CMTimeGetSeconds(keys[4]->u()), 2.0, kTimeTolerance);
     ctrl().sortKeypoints(keys, true);
     EXPECT_NEAR(CMTimeGetSeconds(keys[0]->u()), 2.0, kTimeTolerance);
+    EXPECT_EQ(keys[1].get(), firstOne) << "turned around, equal times still keep their order";
     EXPECT_EQ(keys[3], nullptr);
     EXPECT_NEAR(CMTimeGetSeconds(keys[4]->u()), -1.0, kTimeTolerance);
 }
