@@ -1,0 +1,374 @@
+#include <gtest/gtest.h>
+
+#include <bit>
+#include <cfloat>
+#include <cmath>
+#include <cstdio>
+#include <filesystem>
+#include <limits>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "platform/support/BNSerializerReadStream.h"
+#include "platform/support/BNSerializerWriteStream.h"
+
+namespace {
+
+// A small two-level document: a shelf of books, each with notes.
+enum : uint32_t {
+    kShelf = 10,
+    kBook = 11,
+    kNote = 12,
+    kTitle = 1,
+    kPrice = 2,
+    kPublished = 3,
+    kCopies = 4,
+    kInPrint = 5,
+};
+
+const BNScopeEntry kShelfTable[] = {
+    {"shelf", kShelf, 0},
+    {"book", kBook, 0},
+    {"title", kBook, kTitle},
+    {"price", kBook, kPrice},
+    {"published", kBook, kPublished},
+    {"copies", kBook, kCopies},
+    {"inprint", kBook, kInPrint},
+    {nullptr, 0, 0},
+};
+const BNScope kShelfScope(kShelfTable);
+
+const BNScopeEntry kBookTable[] = {
+    {"note", kNote, 0},
+    {nullptr, 0, 0},
+};
+const BNScope kBookScope(kBookTable);
+
+struct Book final : BNSerializer {
+    BNString title;
+    double price = 0.0;
+    CMTime published = kCMTimeInvalid;
+    uint32_t copies = 0;
+    bool inPrint = false;
+    std::vector<BNString> notes;
+
+    void writeHeader(BNSerializerWriteStream& s, bool) override {
+        s.pushScope(kShelfScope);
+        s.openElement(kBook);
+        s.setAttributeString(kTitle, title);
+        s.setAttributeDouble(kPrice, price);
+        s.setAttributeTime(kPublished, published);
+        s.setAttributeUInt32(kCopies, copies);
+        s.setAttributeBool(kInPrint, inPrint);
+        s.popScope();
+    }
+    void writeBody(BNSerializerWriteStream& s, bool, bool, bool) override {
+        s.pushScope(kBookScope);
+        for (const BNString& note : notes) {
+            s.openElement(kNote);
+            s.writeString(note);
+            s.closeElement();
+        }
+        s.popScope();
+    }
+    bool parseBegin(BNSerializerReadStream& s) override {
+        s.pushScope(kBookScope);
+        return true;
+    }
+    bool parseEnd(BNSerializerReadStream&) override { return true; }
+    bool parseElement(BNSerializerReadStream& s, BNStreamElement& e) override {
+        if (e.elementId() == kNote) s.getAsString(e, notes.emplace_back());
+        return false;
+    }
+};
+
+struct Shelf final : BNSerializer {
+    std::vector<std::unique_ptr<Book>> books;
+    std::vector<BNString> seen;  // every element name handed to this handler
+    bool skipChildren = false;
+
+    void writeHeader(BNSerializerWriteStream& s, bool) override {
+        s.pushScope(kShelfScope);
+        s.openElement(kShelf);
+        s.popScope();
+    }
+    void writeBody(BNSerializerWriteStream& s, bool, bool, bool) override {
+        s.pushScope(kShelfScope);
+        for (const auto& book : books) {
+            book->writeHeader(s, false);
+            book->writeBody(s, false, true, true);
+            s.closeElement();
+        }
+        s.popScope();
+    }
+    bool parseBegin(BNSerializerReadStream& s) override {
+        s.pushScope(kShelfScope);
+        return false;
+    }
+    bool parseEnd(BNSerializerReadStream&) override { return false; }
+    bool parseElement(BNSerializerReadStream& s, BNStreamElement& e) override {
+        seen.emplace_back(e.name());
+        if (e.elementId() != kBook) return false;
+        auto book = std::make_unique<Book>();
+        s.getAttributeAsString(e, kTitle, book->title);
+        e.getAttributeAsDouble(kPrice, book->price);
+        e.getAttributeAsTime(kPublished, book->published);
+        s.getAttributeAsUInt32(e, kCopies, book->copies);
+        s.getAttributeAsBool(e, kInPrint, book->inPrint);
+        s.pushHandler(book.get());
+        books.push_back(std::move(book));
+        return skipChildren;
+    }
+};
+
+std::string write(Shelf& shelf) {
+    std::string out;
+    BNStringSink sink(out);
+    BNSerializerWriteStream stream(sink);
+    shelf.writeHeader(stream, false);
+    shelf.writeBody(stream, false, true, true);
+    stream.closeElement();
+    const auto error = stream.finish();
+    EXPECT_FALSE(error) << error->text();
+    return out;
+}
+
+std::optional<BNSerializerError> read(std::string_view text, Shelf& shelf) {
+    BNSerializerReadStream stream;
+    return stream.read(text, shelf);
+}
+
+bool sameBits(double a, double b) {
+    return std::bit_cast<uint64_t>(a) == std::bit_cast<uint64_t>(b);
+}
+
+TEST(BNSerializerTest, roundTrip__textNumbersAndTimesComeBackExactly) {
+    const std::vector<double> prices = {0.1,      1.0 / 3.0,     -0.0,         5e-324,
+                                        DBL_MAX,  -DBL_MIN,      1e21,         123456789.0125,
+                                        INFINITY, -INFINITY,     2.2250738585072009e-308};
+    const std::vector<CMTime> times = {
+        CMTimeMake(1001, 30000),
+        CMTimeMake(-7, 262144),
+        kCMTimeInvalid,
+        kCMTimePositiveInfinity,
+        kCMTimeNegativeInfinity,
+        kCMTimeIndefinite,
+        CMTime{5, 3, kCMTimeFlags_Valid | kCMTimeFlags_HasBeenRounded, 0},  // rounded flag
+        CMTime{INT64_MIN, 1, kCMTimeFlags_Valid, 2},                        // an epoch
+    };
+    const std::vector<BNString> titles = {
+        "Plain",
+        "Tom & Jerry <\"quoted\"> 'single'",
+        "tab\there\nline\r\nend",
+        "  padded  ",
+        "caf\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x8E\xAC",  // 2, 3 and 4-byte sequences
+        "",
+    };
+
+    Shelf shelf;
+    for (size_t i = 0; i < prices.size(); ++i) {
+        auto book = std::make_unique<Book>();
+        book->title = titles[i % titles.size()];
+        book->price = prices[i];
+        book->published = times[i % times.size()];
+        book->copies = i == 0 ? UINT32_MAX : static_cast<uint32_t>(i);
+        book->inPrint = i % 2 == 1;
+        book->notes = {"note <" + std::to_string(i) + ">", "  kept inner  space  "};
+        shelf.books.push_back(std::move(book));
+    }
+    const std::string text = write(shelf);
+
+    Shelf back;
+    const auto error = read(text, back);
+    ASSERT_FALSE(error) << error->text();
+    ASSERT_EQ(back.books.size(), shelf.books.size());
+    for (size_t i = 0; i < shelf.books.size(); ++i) {
+        SCOPED_TRACE(i);
+        const Book& a = *shelf.books[i];
+        const Book& b = *back.books[i];
+        EXPECT_EQ(b.title, a.title) << "attribute text must survive escaping as it was";
+        EXPECT_TRUE(sameBits(b.price, a.price)) << a.price << " came back as " << b.price;
+        EXPECT_TRUE(CMTimeIdentical(b.published, a.published))
+            << "value, timescale, flags and epoch must all come back";
+        EXPECT_EQ(b.copies, a.copies);
+        EXPECT_EQ(b.inPrint, a.inPrint);
+        // Content is stripped at its ends: the inner blanks stay, the outer ones go.
+        EXPECT_EQ(b.notes, (std::vector<BNString>{a.notes[0], "kept inner  space"}));
+    }
+}
+
+TEST(BNSerializerTest, writer__alwaysWritesWellFormedUtf8) {
+    Shelf shelf;
+    auto book = std::make_unique<Book>();
+    // A control character, a stray continuation byte, a truncated sequence, an overlong
+    // form, an encoded surrogate and U+FFFE: none of them may reach the file.
+    book->title = "a\x01" "b\x80" "c\xE2\x82" "d\xC0\xAF" "e\xED\xA0\x80" "f\xEF\xBF\xBE";
+    book->notes = {"\x1B[0m"};
+    shelf.books.push_back(std::move(book));
+
+    Shelf back;
+    const auto error = read(write(shelf), back);
+    ASSERT_FALSE(error) << "the reader refused what the writer wrote: " << error->text();
+    ASSERT_EQ(back.books.size(), 1u);
+    const std::string r = "\xEF\xBF\xBD";
+    EXPECT_EQ(back.books[0]->title, "a" + r + "b" + r + "c" + r + r + "d" + r + r + "e" + r + r +
+                                        r + "f" + r + r + r);
+    EXPECT_EQ(back.books[0]->notes, std::vector<BNString>{r + "[0m"});
+}
+
+TEST(BNSerializerTest, reader__handlersScopesAndSkippedChildren) {
+    const std::string doc =
+        "<shelf>"
+        "  <unknown><book title='inside an unknown element'/></unknown>"
+        "  <book title='A' price='2.5'>"
+        "    <note>first</note>"
+        "    <book title='a book name is no element of the book scope'/>"
+        "    <note>second<note>nested</note></note>"
+        "  </book>"
+        "  <book title='B'><note>seen only without skipping</note></book>"
+        "</shelf>";
+    {
+        Shelf shelf;
+        ASSERT_FALSE(read(doc, shelf));
+        // The unknown element reaches the handler with id 0; its child is still the shelf's.
+        ASSERT_EQ(shelf.books.size(), 3u);
+        EXPECT_EQ(shelf.books[0]->title, "inside an unknown element");
+        EXPECT_EQ(shelf.books[1]->title, "A");
+        EXPECT_EQ(shelf.books[1]->price, 2.5);
+        EXPECT_EQ(shelf.books[1]->notes, (std::vector<BNString>{"first", "second", "nested"}))
+            << "inside a book only the book's scope names elements; content is the text "
+               "before the first child";
+        EXPECT_EQ(shelf.books[2]->notes, std::vector<BNString>{"seen only without skipping"});
+        EXPECT_EQ(shelf.seen, (std::vector<BNString>{"shelf", "unknown", "book", "book", "book"}));
+    }
+    {
+        Shelf shelf;
+        shelf.skipChildren = true;
+        ASSERT_FALSE(read(doc, shelf));
+        ASSERT_EQ(shelf.books.size(), 3u);
+        EXPECT_TRUE(shelf.books[2]->notes.empty()) << "a true answer skips the children";
+    }
+}
+
+TEST(BNSerializerTest, reader__damagedDocumentsFailWithTheirPlace) {
+    std::string deep;
+    for (int i = 0; i < 300; ++i) deep += "<shelf>";
+    const std::string laughs =
+        "<?xml version=\"1.0\"?>\n"
+        "<!DOCTYPE shelf [<!ENTITY a \"aaaaaaaaaa\"><!ENTITY b \"&a;&a;&a;&a;&a;&a;&a;\">]>\n"
+        "<shelf><book title=\"&b;&b;&b;&b;&b;&b;\"/></shelf>";
+    struct Case {
+        const char* what;
+        std::string doc;
+        uint64_t line;
+        uint64_t column;
+        const char* message;  // a part of the message
+    };
+    const std::vector<Case> cases = {
+        {"empty", "", 1, 1, "no element found"},
+        {"truncated", "<shelf>\n  <book title='A'>", 2, 19, "no element found"},
+        {"mismatched tag", "<shelf>\n<book></shelf>", 2, 9, "mismatched tag"},
+        {"two roots", "<shelf/><shelf/>", 1, 9, "junk after document element"},
+        {"unbound entity", "<shelf>&nope;</shelf>", 1, 8, "undefined entity"},
+        {"billion laughs", laughs, 2, 17, "document type declarations are not accepted"},
+        {"external entity", "<!DOCTYPE shelf SYSTEM \"file:///etc/passwd\"><shelf/>", 1, 44,
+         "document type declarations are not accepted"},
+        {"deep nesting", deep, 1, 1 + 7 * 256, "nested deeper than 256"},
+        {"not a number", "<shelf>\n <book price='cheap'/></shelf>", 2, 2,
+         "attribute \"price\" of element \"book\", \"cheap\", is not a value"},
+        {"double out of range", "<shelf><book price='1e999'/></shelf>", 1, 8, "out of range"},
+        {"uint32 out of range", "<shelf><book copies='4294967296'/></shelf>", 1, 8,
+         "out of range"},
+        {"negative count", "<shelf><book copies='-1'/></shelf>", 1, 8, "out of range"},
+        {"padded number", "<shelf><book copies=' 1'/></shelf>", 1, 8, "not a value"},
+        {"zero timescale", "<shelf><book published='10/0'/></shelf>", 1, 8,
+         "timescale that is not above zero"},
+        {"bad time", "<shelf><book published='10/3/1'/></shelf>", 1, 8, "not a value"},
+        {"bad bool", "<shelf><book inprint='maybe'/></shelf>", 1, 8, "not a value"},
+        {"duplicate attribute", "<shelf><book title='a' title='b'/></shelf>", 1, 24,
+         "duplicate attribute"},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.what);
+        Shelf shelf;
+        const auto error = read(c.doc, shelf);
+        ASSERT_TRUE(error) << "a damaged document was read without complaint";
+        EXPECT_EQ(error->line, c.line) << error->text();
+        EXPECT_EQ(error->column, c.column) << error->text();
+        EXPECT_NE(error->message.find(c.message), std::string::npos) << error->text();
+    }
+}
+
+TEST(BNSerializerTest, files__writtenInPiecesAndReadBack) {
+    const std::filesystem::path path =
+        std::filesystem::temp_directory_path() / ("bn_serializer_" + std::to_string(::getpid()));
+    Shelf shelf;
+    for (int i = 0; i < 3000; ++i) {  // several output and input pieces of 64 KiB
+        auto book = std::make_unique<Book>();
+        book->title = "Book " + std::to_string(i);
+        book->price = i * 0.1;
+        shelf.books.push_back(std::move(book));
+    }
+    {
+        std::FILE* file = std::fopen(path.c_str(), "wb");
+        ASSERT_TRUE(file);
+        BNFileSink sink(file);
+        BNSerializerWriteStream stream(sink);
+        shelf.writeHeader(stream, false);
+        shelf.writeBody(stream, false, false, false);
+        EXPECT_FALSE(stream.finish()) << "finish closes what is still open";
+        std::fclose(file);
+    }
+    Shelf back;
+    BNSerializerReadStream stream;
+    const auto error = stream.readFile(path, back);
+    std::filesystem::remove(path);
+    ASSERT_FALSE(error) << error->text();
+    ASSERT_EQ(back.books.size(), shelf.books.size());
+    EXPECT_EQ(back.books.back()->title, "Book 2999");
+    EXPECT_TRUE(sameBits(back.books.back()->price, 2999 * 0.1));
+
+    const auto missing = stream.readFile(path, back);
+    ASSERT_TRUE(missing);
+    EXPECT_EQ(missing->line, 0u) << "a file that cannot be opened has no place";
+}
+
+TEST(BNSerializerTest, writer__misuseIsReportedNotWritten) {
+    auto attempt = [](auto&& body) {
+        std::string out;
+        BNStringSink sink(out);
+        BNSerializerWriteStream stream(sink);
+        stream.pushScope(kShelfScope);
+        body(stream);
+        return stream.finish();
+    };
+    const auto attributeAfterContent = attempt([](BNSerializerWriteStream& s) {
+        s.openElement(kBook);
+        s.writeString("text");
+        s.setAttributeBool(kInPrint, true);
+    });
+    ASSERT_TRUE(attributeAfterContent);
+    EXPECT_NE(attributeAfterContent->message.find("after"), std::string::npos);
+
+    const auto unnamed = attempt([](BNSerializerWriteStream& s) { s.openElement(kNote); });
+    ASSERT_TRUE(unnamed);
+    EXPECT_NE(unnamed->message.find("element id 12"), std::string::npos);
+
+    const auto twoRoots = attempt([](BNSerializerWriteStream& s) {
+        s.openElement(kShelf);
+        s.closeElement();
+        s.openElement(kShelf);
+    });
+    ASSERT_TRUE(twoRoots);
+
+    const auto contentBesideChildren = attempt([](BNSerializerWriteStream& s) {
+        s.openElement(kShelf);
+        s.openElement(kBook);
+        s.closeElement();
+        s.writeBool(true);
+    });
+    ASSERT_TRUE(contentBesideChildren);
+}
+
+}  // namespace
