@@ -13,9 +13,7 @@ using tq_internal::handleOf;
 using tq_internal::TQChannelData;
 using tq_internal::TQKeyframeRecord;
 
-namespace {
-
-bool isInterpolationCode(unsigned code) {
+bool TQIsInterpolationCode(unsigned code) {
     switch (code) {
         case kTQInterpolationConstant:
         case kTQInterpolationLinear:
@@ -29,6 +27,10 @@ bool isInterpolationCode(unsigned code) {
         default: return false;
     }
 }
+
+namespace {
+
+bool isInterpolationCode(unsigned code) { return TQIsInterpolationCode(code); }
 
 // The code of a segment run backwards in time: the eased end and the exponential shapes swap.
 unsigned mirroredInterpolation(unsigned code) {
@@ -823,6 +825,53 @@ bool TQChannel::equalState(const TQChannelBase& other) const {
         if (!a.behaviors[i]->equals(*b.behaviors[i])) return false;
     }
     return true;
+}
+
+std::vector<TQKeyframeState> TQChannel::getKeyframeStates() const {
+    std::vector<TQKeyframeState> out;
+    out.reserve(_d->keys.size());
+    for (const TQKeyframeRecord& k : _d->keys) {
+        out.push_back({k.time, k.value, k.inU, k.inV, k.outU, k.outV, k.interpolation, k.locked,
+                       k.enabled, k.broken, k.scaled});
+    }
+    return out;
+}
+
+bool TQChannel::setKeyframeStates(const std::vector<TQKeyframeState>& keyframes) {
+    for (size_t i = 0; i < keyframes.size(); ++i) {
+        const TQKeyframeState& k = keyframes[i];
+        if (!CMTIME_IS_NUMERIC(k.time) || !isInterpolationCode(k.interpolation)) return false;
+        if (i > 0 && compareTimes(keyframes[i - 1].time, k.time) > 0) return false;
+    }
+    std::vector<TQKeyframeRecord> records;
+    records.reserve(keyframes.size());
+    for (const TQKeyframeState& k : keyframes) {
+        TQKeyframeRecord r;
+        r.serial = tq_internal::nextKeyframeSerial();
+        r.time = k.time;
+        r.seconds = CMTimeGetSeconds(k.time);
+        r.value = k.value;
+        r.inU = k.inU;
+        r.inV = k.inV;
+        r.outU = k.outU;
+        r.outV = k.outV;
+        r.interpolation = k.interpolation;
+        r.locked = k.locked;
+        r.enabled = k.enabled;
+        r.broken = k.broken;
+        r.scaled = k.scaled;
+        records.push_back(r);
+    }
+    _d->keys = std::move(records);
+    _d->orderChanged();
+    return true;
+}
+
+unsigned TQChannel::getDefaultInterpolation() const { return _d->defaultInterpolation; }
+
+void TQChannel::setDefaultInterpolation(unsigned interpolation) {
+    if (!isInterpolationCode(interpolation)) return;
+    _d->defaultInterpolation = interpolation;
 }
 
 void TQChannel::setDiscrete(bool discrete) {

@@ -62,6 +62,24 @@ enum : unsigned {
     kTQExtrapolationBefore = 1,  // before the first keyframe
 };
 
+// True for the interpolation codes above that a keyframe can hold (not kTQInterpolationMixed).
+bool TQIsInterpolationCode(unsigned code);
+
+// Everything one keyframe holds but its handle: what a host saves and loads.
+struct TQKeyframeState {
+    CMTime time = kCMTimeZero;  // channel time
+    double value = 0.0;
+    double inU = 0.0;  // handles relative to the keypoint, as the getters give them
+    double inV = 0.0;
+    double outU = 0.0;
+    double outV = 0.0;
+    unsigned interpolation = kTQInterpolationBezier;
+    bool locked = false;
+    bool enabled = true;
+    bool broken = false;
+    bool scaled = false;
+};
+
 // Options for the sampling form that takes a context. A null context samples the keyframed
 // curve alone; a context asks for the processed curve with the behaviours it selects.
 struct TQSampleContext {
@@ -285,6 +303,20 @@ public:
     virtual std::unique_ptr<TQChannelBehavior> removeBehavior(size_t index);
     virtual size_t numberOfBehaviors() const;
     virtual TQChannelBehavior* getBehavior(size_t index) const;
+
+    // ---- Whole state, for hosts that save and load channels ---------------------------------
+
+    // Every keyframe in order, as getKeyframes(false) lists them.
+    virtual std::vector<TQKeyframeState> getKeyframeStates() const;
+    // Replaces every keyframe by new ones with these states, in this order; every old handle
+    // goes stale. Refused (false, and nothing changes) when a time is not numeric, a time is
+    // earlier than the one before it, or an interpolation code is unknown. Equal times stay
+    // in the order given, as keyframes that met do. Costs O(n).
+    virtual bool setKeyframeStates(const std::vector<TQKeyframeState>& keyframes);
+    // The interpolation that new keyframes take; getInterpolation answers it only while there
+    // are no keyframes. The setter leaves existing keyframes alone; unknown codes: no-op.
+    virtual unsigned getDefaultInterpolation() const;
+    virtual void setDefaultInterpolation(unsigned interpolation);
 
     // ---- Tree -------------------------------------------------------------------------------
 

@@ -135,6 +135,8 @@ public:
     virtual bool testFlag(uint64_t flag) const;
     virtual void setFlag(uint64_t flag, bool notify = false);
     virtual void resetFlag(uint64_t flag, bool notify = false);
+    // The whole flag word, for saving.
+    uint64_t getFlags() const { return _flags; }
 
     // The whole animation state (keyframes, interpolation, extrapolation, initial value,
     // behaviours, flags of the state, and the same of every descendant by position) is

@@ -101,8 +101,7 @@ struct BNSerializerReadStream::Impl {
                             "document type declarations are not accepted");
     }
     static void onEntityDecl(void* data, const XML_Char*, int, const XML_Char*, int,
-                             const XML_Char*, const XML_Char*, const XML_Char*,
-                             const XML_Char*) {
+                             const XML_Char*, const XML_Char*, const XML_Char*, const XML_Char*) {
         auto* self = static_cast<Impl*>(data);
         self->stream.failAt(self->currentLine(), self->currentColumn(),
                             "entity declarations are not accepted");
@@ -194,6 +193,7 @@ void BNSerializerReadStream::Impl::dispatch(size_t index) {
     element._line = frame.line;
     element._column = frame.column;
     element._frame = index;
+    if (index > 0) element._parentName = frames[index - 1].name;
     element._content = handler->readSignificantWhiteSpace() ? std::string_view(frame.content)
                                                             : trimWhiteSpace(frame.content);
     element._elementId = stream.resolveElement(frame.name);

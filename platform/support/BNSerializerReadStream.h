@@ -49,6 +49,12 @@ public:
     uint64_t column() const { return _column; }
     // The content as it stands (after stripping white space, see above).
     std::string_view content() const { return _content; }
+    // How deep the element lies: 1 for the root element. A handler that checks the depth of
+    // what it gets finds elements out of place (a child of an element that should have none
+    // reaches the same handler, one level deeper).
+    size_t depth() const { return _frame + 1; }
+    // The name of the element that holds this one; empty for the root element.
+    std::string_view parentName() const { return _parentName; }
 
     // The content as a bool; false when there is none. Content that is no bool fails the
     // stream (and answers false).
@@ -63,6 +69,7 @@ private:
     uint32_t _elementId = 0;
     std::string_view _name;
     std::string_view _content;
+    std::string_view _parentName;
     uint64_t _line = 0;
     uint64_t _column = 0;
     size_t _frame = 0;  // the element's place on the stream's stack of open elements
@@ -96,9 +103,12 @@ public:
     void pushScope(const BNScope& scope);
     // Pops a scope the current handler pushed; the scopes of handlers below stay.
     void popScope();
-    // Makes `handler` the current handler for the children of the element being parsed (the
-    // whole document when called before read). Not owned. Answers its parseBegin.
+    // Makes `handler` the current handler for the children of the element being parsed. Not
+    // owned. Answers its parseBegin.
     bool pushHandler(BNSerializer* handler);
+    // The depth of the element being parsed, which a handler pushed now takes over (0 before
+    // the root element).
+    size_t handlerDepth() const { return _dispatchDepth; }
     // What the last handler to end answered from parseEnd.
     bool lastParseEndResult() const { return _lastParseEnd; }
 
@@ -107,12 +117,9 @@ public:
     // An attribute by id: true when it is there and reads as the type; a value that is there
     // but does not read fails the stream.
     bool getAttributeAsBool(const BNStreamElement& element, uint32_t attributeId, bool& out);
-    bool getAttributeAsString(const BNStreamElement& element, uint32_t attributeId,
-                              BNString& out);
-    bool getAttributeAsUInt32(const BNStreamElement& element, uint32_t attributeId,
-                              uint32_t& out);
-    bool getAttributeAsUInt64(const BNStreamElement& element, uint32_t attributeId,
-                              uint64_t& out);
+    bool getAttributeAsString(const BNStreamElement& element, uint32_t attributeId, BNString& out);
+    bool getAttributeAsUInt32(const BNStreamElement& element, uint32_t attributeId, uint32_t& out);
+    bool getAttributeAsUInt64(const BNStreamElement& element, uint32_t attributeId, uint64_t& out);
     bool getAttributeAsInt64(const BNStreamElement& element, uint32_t attributeId, int64_t& out);
     bool getAttributeAsDouble(const BNStreamElement& element, uint32_t attributeId, double& out);
     bool getAttributeAsTime(const BNStreamElement& element, uint32_t attributeId, CMTime& out);

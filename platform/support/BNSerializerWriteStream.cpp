@@ -68,9 +68,7 @@ void BNSerializerWriteStream::closeElement() {
     flushIfFull();
 }
 
-void BNSerializerWriteStream::writeBool(bool value) {
-    writeString(value ? "true" : "false");
-}
+void BNSerializerWriteStream::writeBool(bool value) { writeString(value ? "true" : "false"); }
 
 void BNSerializerWriteStream::writeString(std::string_view text) {
     if (_error || _finished) return;

@@ -87,6 +87,9 @@ public:
     void setAttributeString(uint32_t attributeId, std::string_view value);
     void setAttributeTime(uint32_t attributeId, const CMTime& value);
 
+    // Stops the writing with a failure of the caller's own (a value it cannot write).
+    void fail(std::string message);
+
     // Closes every open element, writes out what is held and answers the first failure, if
     // any. Nothing can be written afterwards.
     std::optional<BNSerializerError> finish();
@@ -107,7 +110,6 @@ private:
     // Completes a start tag that is still being given attributes.
     void closeStartTag();
     void newLineAndIndent(size_t depth);
-    void fail(std::string message);
     void flushIfFull();
 
     BNOutputSink& _sink;

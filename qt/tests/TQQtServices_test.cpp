@@ -1,9 +1,11 @@
 #include <gtest/gtest.h>
 
 #include <QApplication>
+#include <QFile>
 #include <QWidget>
 
 #include "qt/TQQtServices.h"
+#include "qt/TQQtUserDefaults.h"
 
 namespace {
 
@@ -87,6 +89,37 @@ TEST(QtServiceInstallerTest, installs_and_restores) {
     }
     EXPECT_EQ(RWApplicationServices().clock, before);
     EXPECT_EQ(&HXDTextMetrics::shared(), metricsBefore);
+}
+
+}  // namespace
+
+namespace {
+
+TEST(QtUserDefaultsTest, valuesOutliveTheSettingsObjectAndSitAboveRegisteredOnes) {
+    const QString path = QString::fromStdString(testing::TempDir()) + "qt_user_defaults.ini";
+    QFile::remove(path);
+    {
+        TQQtUserDefaults defaults(path);
+        defaults.registerDefaults({{"TQPreferenceManager::CurveEditorSnapping", true},
+                                   {"Registered", RWDefaultsValue{std::string("only here")}}});
+        EXPECT_TRUE(defaults.boolForKey("TQPreferenceManager::CurveEditorSnapping"));
+        defaults.setBool(false, "TQPreferenceManager::CurveEditorSnapping");
+        defaults.setInteger(-7, "Count");
+        defaults.setDouble(0.25, "Ratio");
+        defaults.setString("a/b c", "Text");
+        EXPECT_FALSE(defaults.boolForKey("TQPreferenceManager::CurveEditorSnapping"))
+            << "a stored value sits above the registered one";
+        defaults.synchronize();
+    }
+    TQQtUserDefaults reopened(path);
+    EXPECT_FALSE(reopened.boolForKey("TQPreferenceManager::CurveEditorSnapping"));
+    EXPECT_EQ(reopened.integerForKey("Count"), -7);
+    EXPECT_EQ(reopened.doubleForKey("Ratio"), 0.25);
+    EXPECT_EQ(reopened.stringForKey("Text"), "a/b c");
+    EXPECT_EQ(reopened.stringForKey("Registered"), "") << "registration is not stored";
+    reopened.removeObjectForKey("Count");
+    EXPECT_FALSE(reopened.objectForKey("Count"));
+    QFile::remove(path);
 }
 
 }  // namespace

@@ -41,10 +41,16 @@ void appendDouble(std::string& out, double value) {
 }
 
 void appendTime(std::string& out, const CMTime& time) {
-    if (time.flags == kCMTimeFlags_Valid && time.timescale > 0 && time.epoch == 0) {
+    const CMTimeFlags rounded = kCMTimeFlags_Valid | kCMTimeFlags_HasBeenRounded;
+    if ((time.flags == kCMTimeFlags_Valid || time.flags == rounded) && time.timescale > 0) {
         appendInt64(out, time.value);
         out += '/';
         appendInt64(out, time.timescale);
+        if (time.flags == rounded) out += '~';
+        if (time.epoch != 0) {
+            out += '@';
+            appendInt64(out, time.epoch);
+        }
         return;
     }
     if (CMTimeIdentical(time, kCMTimeInvalid)) {
@@ -134,19 +140,31 @@ TextValueStatus parseTime(std::string_view text, CMTime& out) {
         out = kCMTimeIndefinite;
         return TextValueStatus::Ok;
     }
-    // Two or four fields separated by '/'.
+    // "value/timescale[~][@epoch]" or "value/timescale/flags/epoch".
+    CMTime time{0, 0, kCMTimeFlags_Valid, 0};
+    const size_t at = text.find('@');
+    if (at != std::string_view::npos) {
+        const TextValueStatus status = parseInt64(text.substr(at + 1), time.epoch);
+        if (status != TextValueStatus::Ok) return status;
+        text = text.substr(0, at);
+    }
+    if (!text.empty() && text.back() == '~') {
+        time.flags |= kCMTimeFlags_HasBeenRounded;
+        text.remove_suffix(1);
+    }
     std::string_view fields[4];
     size_t count = 0;
     for (size_t start = 0;;) {
         const size_t slash = text.find('/', start);
         if (count == 4) return TextValueStatus::Malformed;
-        fields[count++] = text.substr(start, slash == std::string_view::npos ? slash : slash - start);
+        fields[count++] =
+            text.substr(start, slash == std::string_view::npos ? slash : slash - start);
         if (slash == std::string_view::npos) break;
         start = slash + 1;
     }
-    if (count != 2 && count != 4) return TextValueStatus::Malformed;
+    const bool shortForm = time.flags == kCMTimeFlags_Valid && at == std::string_view::npos;
+    if (count != 2 && !(count == 4 && shortForm)) return TextValueStatus::Malformed;
 
-    CMTime time{0, 0, kCMTimeFlags_Valid, 0};
     int64_t timescale = 0;
     TextValueStatus status = parseInt64(fields[0], time.value);
     if (status == TextValueStatus::Ok) status = parseInt64(fields[1], timescale);
@@ -163,11 +181,9 @@ TextValueStatus parseTime(std::string_view text, CMTime& out) {
     }
     if (status != TextValueStatus::Ok) return status;
     time.timescale = static_cast<CMTimeScale>(timescale);
-    // A time that claims to be a plain number needs a timescale to divide by.
-    const bool numericFlags =
-        (time.flags & (kCMTimeFlags_Valid | kCMTimeFlags_ImpliedValueFlagsMask)) ==
-        kCMTimeFlags_Valid;
-    if (numericFlags && time.timescale <= 0) return TextValueStatus::ZeroTimescale;
+    // The short form claims a plain number, which needs a timescale to divide by; the long
+    // form stands for whatever it spells out.
+    if (count == 2 && time.timescale <= 0) return TextValueStatus::ZeroTimescale;
     out = time;
     return TextValueStatus::Ok;
 }
@@ -187,14 +203,14 @@ size_t allowedSequence(const unsigned char* p, const unsigned char* end) {
     if (c >= 0xC2 && c <= 0xDF) return cont(1) ? 2 : 0;
     if (c >= 0xE0 && c <= 0xEF) {
         if (!cont(1) || !cont(2)) return 0;
-        if (c == 0xE0 && p[1] < 0xA0) return 0;  // overlong
-        if (c == 0xED && p[1] >= 0xA0) return 0;  // surrogates
+        if (c == 0xE0 && p[1] < 0xA0) return 0;                                     // overlong
+        if (c == 0xED && p[1] >= 0xA0) return 0;                                    // surrogates
         if (c == 0xEF && p[1] == 0xBF && (p[2] == 0xBE || p[2] == 0xBF)) return 0;  // U+FFFE/F
         return 3;
     }
     if (c >= 0xF0 && c <= 0xF4) {
         if (!cont(1) || !cont(2) || !cont(3)) return 0;
-        if (c == 0xF0 && p[1] < 0x90) return 0;  // overlong
+        if (c == 0xF0 && p[1] < 0x90) return 0;   // overlong
         if (c == 0xF4 && p[1] >= 0x90) return 0;  // beyond U+10FFFF
         return 4;
     }

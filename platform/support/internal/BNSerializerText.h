@@ -6,9 +6,10 @@
 //   integers decimal, no sign for unsigned; no blanks, no leading "+"
 //   double   the shortest text that reads back to the same bits ("0.1", "1e+300", "-0");
 //            "nan", "inf", "-inf" for the values that are no numbers
-//   CMTime   "value/timescale" for a plain numeric time (timescale above 0, epoch 0, no flag
-//            beyond valid); "invalid", "+infinity", "-infinity", "indefinite" for those
-//            constants; every other time as "value/timescale/flags/epoch"
+//   CMTime   "value/timescale" for a numeric time (timescale above 0), followed by "~" when
+//            it has been rounded and by "@epoch" when its epoch is not 0; "invalid",
+//            "+infinity", "-infinity", "indefinite" for those constants; every other time
+//            (flags in another combination) as "value/timescale/flags/epoch"
 //
 // Reading is strict: the whole text must be the value, or the read fails with a reason.
 
@@ -22,9 +23,9 @@ namespace bn_internal {
 
 enum class TextValueStatus {
     Ok,
-    Malformed,       // not a value of that type
-    OutOfRange,      // a number that does not fit the type
-    ZeroTimescale,   // a numeric time whose timescale is not above zero
+    Malformed,      // not a value of that type
+    OutOfRange,     // a number that does not fit the type
+    ZeroTimescale,  // a numeric time whose timescale is not above zero
 };
 
 // A short phrase for an error message ("is not a number", ...).

@@ -3,8 +3,6 @@
 #include <bit>
 #include <cfloat>
 #include <cmath>
-#include <cstdio>
-#include <filesystem>
 #include <limits>
 #include <memory>
 #include <string>
@@ -144,9 +142,17 @@ bool sameBits(double a, double b) {
 }
 
 TEST(BNSerializerTest, roundTrip__textNumbersAndTimesComeBackExactly) {
-    const std::vector<double> prices = {0.1,      1.0 / 3.0,     -0.0,         5e-324,
-                                        DBL_MAX,  -DBL_MIN,      1e21,         123456789.0125,
-                                        INFINITY, -INFINITY,     2.2250738585072009e-308};
+    const std::vector<double> prices = {0.1,
+                                        1.0 / 3.0,
+                                        -0.0,
+                                        5e-324,
+                                        DBL_MAX,
+                                        -DBL_MIN,
+                                        1e21,
+                                        123456789.0125,
+                                        INFINITY,
+                                        -INFINITY,
+                                        2.2250738585072009e-308};
     const std::vector<CMTime> times = {
         CMTimeMake(1001, 30000),
         CMTimeMake(-7, 262144),
@@ -203,7 +209,13 @@ TEST(BNSerializerTest, writer__alwaysWritesWellFormedUtf8) {
     auto book = std::make_unique<Book>();
     // A control character, a stray continuation byte, a truncated sequence, an overlong
     // form, an encoded surrogate and U+FFFE: none of them may reach the file.
-    book->title = "a\x01" "b\x80" "c\xE2\x82" "d\xC0\xAF" "e\xED\xA0\x80" "f\xEF\xBF\xBE";
+    book->title =
+        "a\x01"
+        "b\x80"
+        "c\xE2\x82"
+        "d\xC0\xAF"
+        "e\xED\xA0\x80"
+        "f\xEF\xBF\xBE";
     book->notes = {"\x1B[0m"};
     shelf.books.push_back(std::move(book));
 
@@ -212,8 +224,8 @@ TEST(BNSerializerTest, writer__alwaysWritesWellFormedUtf8) {
     ASSERT_FALSE(error) << "the reader refused what the writer wrote: " << error->text();
     ASSERT_EQ(back.books.size(), 1u);
     const std::string r = "\xEF\xBF\xBD";
-    EXPECT_EQ(back.books[0]->title, "a" + r + "b" + r + "c" + r + r + "d" + r + r + "e" + r + r +
-                                        r + "f" + r + r + r);
+    EXPECT_EQ(back.books[0]->title,
+              "a" + r + "b" + r + "c" + r + r + "d" + r + r + "e" + r + r + r + "f" + r + r + r);
     EXPECT_EQ(back.books[0]->notes, std::vector<BNString>{r + "[0m"});
 }
 
@@ -278,8 +290,7 @@ TEST(BNSerializerTest, reader__damagedDocumentsFailWithTheirPlace) {
         {"not a number", "<shelf>\n <book price='cheap'/></shelf>", 2, 2,
          "attribute \"price\" of element \"book\", \"cheap\", is not a value"},
         {"double out of range", "<shelf><book price='1e999'/></shelf>", 1, 8, "out of range"},
-        {"uint32 out of range", "<shelf><book copies='4294967296'/></shelf>", 1, 8,
-         "out of range"},
+        {"uint32 out of range", "<shelf><book copies='4294967296'/></shelf>", 1, 8, "out of range"},
         {"negative count", "<shelf><book copies='-1'/></shelf>", 1, 8, "out of range"},
         {"padded number", "<shelf><book copies=' 1'/></shelf>", 1, 8, "not a value"},
         {"zero timescale", "<shelf><book published='10/0'/></shelf>", 1, 8,
@@ -298,40 +309,6 @@ TEST(BNSerializerTest, reader__damagedDocumentsFailWithTheirPlace) {
         EXPECT_EQ(error->column, c.column) << error->text();
         EXPECT_NE(error->message.find(c.message), std::string::npos) << error->text();
     }
-}
-
-TEST(BNSerializerTest, files__writtenInPiecesAndReadBack) {
-    const std::filesystem::path path =
-        std::filesystem::temp_directory_path() / ("bn_serializer_" + std::to_string(::getpid()));
-    Shelf shelf;
-    for (int i = 0; i < 3000; ++i) {  // several output and input pieces of 64 KiB
-        auto book = std::make_unique<Book>();
-        book->title = "Book " + std::to_string(i);
-        book->price = i * 0.1;
-        shelf.books.push_back(std::move(book));
-    }
-    {
-        std::FILE* file = std::fopen(path.c_str(), "wb");
-        ASSERT_TRUE(file);
-        BNFileSink sink(file);
-        BNSerializerWriteStream stream(sink);
-        shelf.writeHeader(stream, false);
-        shelf.writeBody(stream, false, false, false);
-        EXPECT_FALSE(stream.finish()) << "finish closes what is still open";
-        std::fclose(file);
-    }
-    Shelf back;
-    BNSerializerReadStream stream;
-    const auto error = stream.readFile(path, back);
-    std::filesystem::remove(path);
-    ASSERT_FALSE(error) << error->text();
-    ASSERT_EQ(back.books.size(), shelf.books.size());
-    EXPECT_EQ(back.books.back()->title, "Book 2999");
-    EXPECT_TRUE(sameBits(back.books.back()->price, 2999 * 0.1));
-
-    const auto missing = stream.readFile(path, back);
-    ASSERT_TRUE(missing);
-    EXPECT_EQ(missing->line, 0u) << "a file that cannot be opened has no place";
 }
 
 TEST(BNSerializerTest, writer__misuseIsReportedNotWritten) {

@@ -1,0 +1,331 @@
+// The project file: a round trip of everything a document holds, and damaged files refused
+// whole, leaving the open document as it was.
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "host/TQHostAppDelegate.h"
+#include "host/TQHostProjectFile.h"
+#include "host/TQHostSampleScene.h"
+#include "platform/channels/TQChannelTypes.h"
+#include "platform/channels/TQFactory.h"
+
+namespace {
+
+std::string written(TQHostProject& project) {
+    std::string text;
+    BNStringSink sink(text);
+    const auto error = project.write(sink);
+    EXPECT_FALSE(error) << error->text();
+    return text;
+}
+
+// Identity is not part of operator==: name, id, class, own offset, extent and label are
+// compared here, node by node; the state of the whole tree by operator==.
+void expectSameNode(const TQChannelBase& a, const TQChannelBase& b, const std::string& path) {
+    SCOPED_TRACE(path);
+    EXPECT_EQ(b.getName(), a.getName());
+    EXPECT_EQ(b.getChannelId(), a.getChannelId());
+    EXPECT_EQ(TQChannelFactoryIdOf(&b), TQChannelFactoryIdOf(&a));
+    EXPECT_TRUE(CMTimeIdentical(b.ownTimeOffset(), a.ownTimeOffset()));
+    EXPECT_TRUE(CMTimeIdentical(b.timeExtent().start, a.timeExtent().start));
+    EXPECT_TRUE(CMTimeIdentical(b.timeExtent().duration, a.timeExtent().duration));
+    EXPECT_EQ(b.getXAxisLabel(), a.getXAxisLabel());
+    if (const auto* ca = dynamic_cast<const TQChannel*>(&a)) {
+        const auto* cb = dynamic_cast<const TQChannel*>(&b);
+        ASSERT_NE(cb, nullptr);
+        EXPECT_EQ(cb->getDefaultValue(), ca->getDefaultValue());
+        EXPECT_EQ(cb->sliderMaximum(), ca->sliderMaximum());
+        EXPECT_EQ(cb->isRigged(), ca->isRigged());
+    }
+    const auto* fa = dynamic_cast<const TQChannelFolder*>(&a);
+    if (!fa) return;
+    const auto* fb = dynamic_cast<const TQChannelFolder*>(&b);
+    ASSERT_NE(fb, nullptr);
+    ASSERT_EQ(fb->numberOfChildren(), fa->numberOfChildren());
+    for (size_t i = 0; i < fa->numberOfChildren(); ++i) {
+        const TQChannelBase* ca = fa->getChild(i);
+        const TQChannelBase* cb = fb->getChild(i);
+        ASSERT_EQ(cb == nullptr, ca == nullptr) << "slot " << i;
+        if (ca) expectSameNode(*ca, *cb, path + "/" + std::to_string(ca->getChannelId()));
+    }
+}
+
+// The sample piece, with every field the piece leaves at its default set to something else.
+void makeDocument(TQHostAppDelegate& host, TQHostProject& project) {
+    TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
+    std::vector<TQChannelObjectRootBase*> objects = host.scene().objects();
+    ASSERT_GE(objects.size(), 3u);
+    std::vector<TQChannelBase*> all;
+    objects[0]->getAllDescendantsFlattened(all, 0, false);
+    auto* channel = dynamic_cast<TQChannel*>(all.front());
+    ASSERT_NE(channel, nullptr);
+    const CMTime t1 = CMTimeMake(1001, 30000);  // a timescale other than the piece's
+    TQKeyframeHandle a = channel->setKeyframe(t1, 1.0 / 3.0);
+    channel->setKeyframeLocked(a, true);
+    channel->setKeyframeTangentsBroken(a, true);
+    channel->setKeyframeTangentsScaled(a, true);
+    channel->setKeyframeInputTangents(a, -0.1, 1e-300);
+    TQKeyframeHandle b = channel->setKeyframe(CMTimeMake(7, 3), -0.0);
+    channel->setKeyframeEnabled(b, false);
+    channel->setKeyframeInterpolation(b, kTQInterpolationEaseIn);
+    channel->cloneKeyframe(b, CMTimeMake(7, 3));  // two keyframes that met
+    channel->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationBefore);
+    channel->setExtrapolation(kTQExtrapolationProgressive, kTQExtrapolationAfter);
+    channel->setDefaultInterpolation(kTQInterpolationCatmullRom);
+    channel->setRigged(true);
+    channel->setSliderMaximum(12.5);
+    channel->setXAxisLabel("Position & <size>");
+    channel->setFlag(kTQChannelFlagShowFlattened | (uint64_t{1} << 63));
+    channel->getImpl()->range().setRange(-3.25, 1e308);
+    channel->getInfo()->tickStep = 0.1;
+    auto* second = dynamic_cast<TQChannel*>(all.back());
+    ASSERT_NE(second, nullptr);
+    second->setAnimationEnabled(false);
+    second->setInitialValue(0.1 + 0.2);
+    auto noise = std::make_unique<TQNoiseBehavior>(0.5, 3.0, 77);
+    noise->setSelected(true);
+    noise->setEnabled(false);
+    second->addBehavior(std::move(noise));
+    objects[1]->setLocked(true, false);
+    objects[1]->setFoldFlag(kTQFoldFlagCollapsed);
+    objects[1]->addChild(nullptr);  // an empty slot
+    objects[2]->setTimeOffset(CMTimeMake(-5, 7));
+
+    host.setFrameDuration(CMTimeMake(1001, 24000));
+    host.setDisplayRange(CMTimeRangeMake(CMTimeMake(-1, 2), CMTimeMake(37, 5)));
+    host.setCurrentTime(CMTimeMake(3, 4));
+    host.setFirstFrameNumber(1);
+    host.setStartTimecode(86400);
+    host.setSecondsPerTextStep(CMTimeMake(1, 2));
+    host.setDisplayTimeAsFrames(true);
+    host.setSelectedObjects({objects[2], objects[0]});
+
+    TQCurveEditorState& state = project.editorState();
+    state.setAutoZoom(true);
+    state.setSnapping(false);
+    state.setSnapshotChannels(true);
+    state.setDisplayAudioWaveform(false);
+    state.setLockKeyframesInTime(true);
+    state.setCurrentViewVolume(BNRect<double>(-0.5, 2.0, 0.1, 1e-9));
+
+    TQCurveSetListSerializer& sets = project.curveSets();
+    sets.setSelectedCurveSet(12);
+    for (int s = 0; s < 2; ++s) {
+        auto* set = new TQCurveSetSerializer("Set \"" + std::to_string(s) + "\" <&>");
+        set->setRelative(s == 1);
+        set->setShortcut(s == 0 ? "k" : "");
+        for (int i = 0; i < 3; ++i) {
+            auto* item = new TQCurveEditorItemSerializer;
+            item->setChannelRef(TQChannelRef("./1/100/101/" + std::to_string(i + 1)));
+            item->setColorIndex(static_cast<uint32_t>(s * 10 + i));
+            set->addChannel(item);
+        }
+        sets.addCurveSet(set);
+    }
+}
+
+TEST(TQHostProjectFileTest, roundTrip__everyChannelFieldTimeSettingAndBothTrees) {
+    TQHostAppDelegate host;
+    TQHostProject project(host);
+    makeDocument(host, project);
+    const std::string text = written(project);
+
+    TQHostAppDelegate other(TQHostObjectFamily::Other);
+    TQHostProject reopened(other);
+    const auto error = reopened.read(text);
+    ASSERT_FALSE(error) << error->text();
+
+    EXPECT_TRUE(other.isKestrel());
+    const auto a = host.scene().objects();
+    const auto b = other.scene().objects();
+    ASSERT_EQ(b.size(), a.size());
+    for (size_t i = 0; i < a.size(); ++i) {
+        EXPECT_TRUE(*b[i] == *a[i]) << "object " << a[i]->getName() << " changed on the way";
+        expectSameNode(*a[i], *b[i], a[i]->getName());
+    }
+    EXPECT_TRUE(CMTimeIdentical(other.getFrameDuration(), host.getFrameDuration()));
+    EXPECT_TRUE(CMTimeIdentical(other.displayRange().start, host.displayRange().start));
+    EXPECT_TRUE(CMTimeIdentical(other.displayRange().duration, host.displayRange().duration));
+    EXPECT_TRUE(CMTimeIdentical(other.currentTime(), host.currentTime()));
+    EXPECT_EQ(other.firstFrameNumber(), 1u);
+    EXPECT_EQ(other.startTimecode(), 86400u);
+    EXPECT_TRUE(CMTimeIdentical(other.secondsPerTextStep(), host.secondsPerTextStep()));
+    EXPECT_TRUE(other.shouldDisplayTimeAsFrames());
+    const auto selected = other.selectedObjectsRootChannels();
+    ASSERT_EQ(selected.size(), 2u);
+    EXPECT_EQ(selected[0]->getChannelId(), a[2]->getChannelId()) << "selection order is kept";
+    EXPECT_EQ(selected[1]->getChannelId(), a[0]->getChannelId());
+    EXPECT_EQ(other.version(), kTQHostProjectVersion);
+    EXPECT_EQ(other.getCurveSetListSerializer(), &reopened.curveSets());
+    EXPECT_FALSE(other.undoStack().canUndo()) << "loading is no undoable step";
+
+    const TQCurveEditorState& sa = project.editorState();
+    const TQCurveEditorState& sb = reopened.editorState();
+    EXPECT_EQ(sb.autoZoom(), sa.autoZoom());
+    EXPECT_EQ(sb.snapping(), sa.snapping());
+    EXPECT_EQ(sb.snapshotChannels(), sa.snapshotChannels());
+    EXPECT_EQ(sb.displayAudioWaveform(), sa.displayAudioWaveform());
+    EXPECT_EQ(sb.lockKeyframesInTime(), sa.lockKeyframesInTime());
+    // The range travels as start and end, so its duration comes back equal, in the end's
+    // timescale.
+    EXPECT_TRUE(CMTimeIdentical(sb.displayRange().start, host.displayRange().start));
+    EXPECT_EQ(sb.displayRange().duration, host.displayRange().duration);
+    // The top edge makes the trip as a sum: y comes back through (y + h) - h.
+    EXPECT_EQ(sb.currentViewVolume().x, -0.5);
+    EXPECT_EQ(sb.currentViewVolume().width, 0.1);
+    EXPECT_EQ(sb.currentViewVolume().height, 1e-9);
+    EXPECT_EQ(sb.currentViewVolume().y, (2.0 + 1e-9) - 1e-9);
+
+    const auto& la = project.curveSets();
+    const auto& lb = reopened.curveSets();
+    EXPECT_EQ(lb.getSelectedCurveSet(), 12u);
+    ASSERT_EQ(lb.curveSets().size(), la.curveSets().size());
+    for (size_t s = 0; s < la.curveSets().size(); ++s) {
+        SCOPED_TRACE(s);
+        const TQCurveSetSerializer& x = *la.curveSets()[s];
+        const TQCurveSetSerializer& y = *lb.curveSets()[s];
+        EXPECT_EQ(y._name, x._name);
+        EXPECT_EQ(y._shortcut, x._shortcut);
+        EXPECT_EQ(y._relative, x._relative);
+        ASSERT_EQ(y._channels.size(), x._channels.size());
+        for (size_t i = 0; i < x._channels.size(); ++i) {
+            EXPECT_EQ(y._channels[i]->getChannelRef(), x._channels[i]->getChannelRef());
+            EXPECT_EQ(y._channels[i]->getColorIndex(), x._channels[i]->getColorIndex());
+        }
+    }
+    EXPECT_EQ(written(reopened), text) << "a reopened project must save as it was read";
+}
+
+// Replaces the first `from` after `after` by `to`.
+std::string replaced(std::string text, const std::string& from, const std::string& to,
+                     const std::string& after = "") {
+    const size_t start = after.empty() ? 0 : text.find(after);
+    const size_t at = text.find(from, start == std::string::npos ? 0 : start);
+    if (at == std::string::npos) return "the mutation missed: " + from;
+    return text.replace(at, from.size(), to);
+}
+
+TEST(TQHostProjectFileTest, read__damagedFilesLoadNothing) {
+    TQHostAppDelegate source;
+    TQHostProject sourceProject(source);
+    makeDocument(source, sourceProject);
+    const std::string good = written(sourceProject);
+
+    std::string deep = good;
+    std::string nest;
+    for (int i = 0; i < 300; ++i) nest += "<x>";  // unknown in a tree, so only depth stops it
+    deep.insert(deep.find("<curveeditor>") + 13, nest);
+    const std::string laughs =
+        "<!DOCTYPE project [<!ENTITY a \"aaaaaaaaaa\"><!ENTITY b \"&a;&a;&a;&a;&a;&a;\">]>";
+
+    struct Case {
+        const char* what;
+        std::string text;
+        const char* message;  // a part of the message
+    };
+    const std::vector<Case> cases = {
+        {"truncated", good.substr(0, good.find("<curveeditor>")), "no element found"},
+        {"bad XML", replaced(good, "<key ", "<key <"), "not well-formed"},
+        {"foreign", "<svg width=\"10\"/>", "not a project"},
+        {"newer version", replaced(good, "version=\"5\"", "version=\"6\""), "newer"},
+        {"unknown element", replaced(good, "<key ", "<keyframe "), "\"keyframe\" is not expected"},
+        {"element out of place", replaced(good, "<key ", "<timing ", "<scene>"), "not expected"},
+        {"child of a leaf", replaced(good, "/>", "><key/></key>", "<key "), "not expected"},
+        {"section order", replaced(good, "<timing ", "<selection/><timing "), "out of place"},
+        {"missing attribute", replaced(good, " v=\"", " w=\"", "<key "),
+         "\"v\" of \"key\" is missing"},
+        {"number out of range", replaced(good, " i=\"", " i=\"99999999999", "<key "),
+         "out of range"},
+        {"double out of range", replaced(good, " v=\"", " v=\"1e400", "<key "), "out of range"},
+        {"zero timescale", replaced(good, "/262144\"", "/0\"", "<key "), "timescale"},
+        {"time that is no number",
+         replaced(good, "frameduration=\"1001/24000\"", "frameduration=\"indefinite\""),
+         "not a number"},
+        {"unknown class",
+         replaced(good, "factory=\"229211d70b00de81-", "factory=\"329211d70b00de81-"),
+         "unknown class"},
+        {"unknown interpolation", replaced(good, " i=\"", " i=\"2", "<key "),
+         "no interpolation code"},
+        {"keyframes out of order", replaced(good, "t=\"", "t=\"99999", "<key "), "earlier"},
+        {"unknown behaviour", replaced(good, "kind=\"Noise\"", "kind=\"Wobble\""), "unknown"},
+        {"selection names nothing", replaced(good, "ref=\"./", "ref=\"./99"), "no object"},
+        {"duplicate object id",
+         replaced(
+             good, "<scene>",
+             "<scene>" + good.substr(good.find("<channel "), good.find("</channel>\n    <channel") -
+                                                                 good.find("<channel ") + 10)),
+         "two objects"},
+        {"deep nesting", deep, "nested deeper"},
+        {"billion laughs", replaced(good, "<project", laughs + "<project"),
+         "document type declarations"},
+        {"bad value in a tree", replaced(good, "<autozoom>true", "<autozoom>perhaps"),
+         "not a value"},
+    };
+
+    TQHostAppDelegate host;
+    TQHostProject project(host);
+    TQHostLoadSampleScene(host, TQHostObjectFamily::Other);
+    project.editorState().setCurrentViewVolume(BNRect<double>(1, 2, 3, 4));
+    project.curveSets().addCurveSet(new TQCurveSetSerializer("Mine"));
+    const std::string before = written(project);
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.what);
+        ASSERT_EQ(c.text.find("the mutation missed"), std::string::npos) << c.text;
+        const auto error = project.read(c.text);
+        ASSERT_TRUE(error) << "a damaged project was read";
+        EXPECT_GT(error->line, 0u) << error->text();
+        EXPECT_GT(error->column, 0u) << error->text();
+        EXPECT_NE(error->message.find(c.message), std::string::npos) << error->text();
+        EXPECT_EQ(written(project), before) << "the open document changed";
+    }
+
+    // Unknown elements inside the editor's trees are skipped, not refused.
+    const std::string strange =
+        replaced(replaced(good, "<autozoom>", "<mystery a=\"1\"><deeper/></mystery><autozoom>"),
+                 "<channelref>", "<colour>red</colour><channelref>");
+    const auto error = project.read(strange);
+    EXPECT_FALSE(error) << error->text();
+    EXPECT_EQ(written(project), good);
+}
+
+TEST(TQHostProjectFileTest, save__replacesTheFileOnlyWhenComplete) {
+    TQHostAppDelegate host;
+    TQHostProject project(host);
+    makeDocument(host, project);
+    const std::string path = testing::TempDir() + "project_save_test.xml";
+    ASSERT_FALSE(project.save(path));
+
+    TQHostAppDelegate other;
+    TQHostProject reopened(other);
+    const auto error = reopened.open(path);
+    ASSERT_FALSE(error) << error->text();
+    EXPECT_EQ(written(reopened), written(project));
+
+    // A document the writer refuses (a behaviour it does not know) leaves the file alone.
+    struct Wobble final : TQChannelBehavior {
+        double apply(double, double value) const override { return value; }
+        std::unique_ptr<TQChannelBehavior> clone() const override {
+            return std::make_unique<Wobble>();
+        }
+        bool equals(const TQChannelBehavior& other) const override {
+            return dynamic_cast<const Wobble*>(&other) != nullptr;
+        }
+        BNString kindName() const override { return "Wobble"; }
+    };
+    std::vector<TQChannelBase*> all;
+    other.scene().objects().front()->getAllDescendantsFlattened(all, 0, false);
+    dynamic_cast<TQChannel*>(all.front())->addBehavior(std::make_unique<Wobble>());
+    const auto refused = reopened.save(path);
+    ASSERT_TRUE(refused);
+    EXPECT_NE(refused->message.find("Wobble"), std::string::npos);
+    TQHostAppDelegate third;
+    TQHostProject check(third);
+    EXPECT_FALSE(check.open(path));
+    EXPECT_EQ(written(check), written(project)) << "the old file must be intact";
+    std::remove(path.c_str());
+}
+
+}  // namespace

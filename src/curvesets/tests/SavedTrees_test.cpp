@@ -1,0 +1,221 @@
+// The editor's saved trees: what the state and the set list write, and how they read files
+// of this and of older versions.
+#include <gtest/gtest.h>
+
+#include <string>
+
+#include "host/TQHostProjectFile.h"
+#include "platform/support/BNSerializerWriteStream.h"
+#include "platform/ui/RWServices.h"
+#include "src/curvesets/TQCurveEditorState.h"
+#include "src/curvesets/TQCurveSetListSerializer.h"
+
+namespace {
+
+// Every test runs on user defaults of its own.
+class SavedTreesTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        RWServiceSet services;
+        services.userDefaults = &_defaults;
+        RWInstallServices(services);
+    }
+    void TearDown() override { RWResetServices(); }
+
+    template <class Tree>
+    static std::string write(Tree& tree) {
+        std::string text;
+        BNStringSink sink(text);
+        BNSerializerWriteStream stream(sink);
+        tree.writeHeader(stream, false);
+        tree.writeBody(stream, false, true, true);
+        stream.closeElement();
+        const auto error = stream.finish();
+        EXPECT_FALSE(error) << error->text();
+        return text;
+    }
+
+    static void read(const std::string& text, TQCurveEditorState& state, int32_t version = 5,
+                     CMTime frameDuration = CMTimeMake(1, 30)) {
+        TQCurveSetListSerializer unused;
+        const auto error = TQHostReadEditorTrees(text, state, unused, version, frameDuration);
+        EXPECT_FALSE(error) << error->text();
+    }
+    static void read(const std::string& text, TQCurveSetListSerializer& list) {
+        TQCurveEditorState unused;
+        const auto error = TQHostReadEditorTrees(text, unused, list, 5, CMTimeMake(1, 30));
+        EXPECT_FALSE(error) << error->text();
+    }
+
+    RWMemoryUserDefaults _defaults;
+};
+
+void expectRect(const BNRect<double>& r, double x, double y, double w, double h) {
+    EXPECT_EQ(r.x, x);
+    EXPECT_EQ(r.y, y);
+    EXPECT_EQ(r.width, w);
+    EXPECT_EQ(r.height, h);
+}
+
+TEST_F(SavedTreesTest, state__writesTopEdgeAndEndAndReadsThemBack) {
+    TQCurveEditorState state;
+    state.setCurrentViewVolume(BNRect<double>(1, 2, 3, 4));
+    state.setDisplayRange(CMTimeRangeMake(CMTimeMake(10, 30), CMTimeMake(5, 30)));
+    state.setSnapping(true);
+    const std::string text = write(state);
+
+    EXPECT_NE(text.find("originx=\"1\" originy=\"6\" width=\"3\" height=\"4\""), std::string::npos)
+        << "originy is the top edge:\n"
+        << text;
+    EXPECT_NE(text.find("in=\"10/30\" out=\"15/30\""), std::string::npos)
+        << "out is start plus duration:\n"
+        << text;
+    size_t last = 0;
+    for (const char* child :
+         {"<autozoom>", "<snapping>true", "<displayAudioWaveform>", "<lockKeyframesInTime>",
+          "<displayRange ", "<currentviewvolume ", "<snapshotChannels>"}) {
+        const size_t at = text.find(child);
+        ASSERT_NE(at, std::string::npos) << child;
+        EXPECT_GT(at, last) << child << " is out of order";
+        last = at;
+    }
+
+    TQCurveEditorState back;  // zeroed volume, unset range
+    read(text, back);
+    expectRect(back.currentViewVolume(), 1, 2, 3, 4);
+    EXPECT_TRUE(CMTimeIdentical(back.displayRange().start, CMTimeMake(10, 30)));
+    EXPECT_TRUE(CMTimeIdentical(back.displayRange().duration, CMTimeMake(5, 30)));
+    EXPECT_TRUE(back.snapping());
+}
+
+TEST_F(SavedTreesTest, state__partialViewVolumeKeepsTheOppositeEdges) {
+    {
+        TQCurveEditorState state;
+        state.setCurrentViewVolume(BNRect<double>(0, 0, 10, 5));
+        read("<curveeditor><currentviewvolume originx='2'/></curveeditor>", state);
+        expectRect(state.currentViewVolume(), 2, 0, 8, 5);  // the right edge stays at 10
+    }
+    {
+        TQCurveEditorState state;
+        state.setCurrentViewVolume(BNRect<double>(0, 1, 10, 5));
+        read("<curveeditor><currentviewvolume height='2'/></curveeditor>", state);
+        expectRect(state.currentViewVolume(), 0, 4, 10, 2);  // the top edge stays at 6
+    }
+    {
+        TQCurveEditorState state;
+        state.setCurrentViewVolume(BNRect<double>(0, 1, 10, 5));
+        read("<curveeditor><currentviewvolume originy='3'/></curveeditor>", state);
+        expectRect(state.currentViewVolume(), 0, -2, 10, 5);  // the top edge moves to 3
+    }
+}
+
+TEST_F(SavedTreesTest, state__olderVersionsReadTheRangeAsFrameNumbers) {
+    const std::string doc = "<curveeditor><displayRange in='10' out='20'/></curveeditor>";
+    {
+        TQCurveEditorState state;
+        read(doc, state, 4, CMTimeMake(1, 30));
+        // The duration is counted from frame 0, not from the start; old files read so.
+        EXPECT_EQ(state.displayRange().start, CMTimeMake(10, 30));
+        EXPECT_EQ(state.displayRange().duration, CMTimeMake(18, 30));
+    }
+    {
+        TQCurveEditorState state;
+        TQCurveSetListSerializer list;
+        const auto error = TQHostReadEditorTrees(doc, state, list, 5, CMTimeMake(1, 30));
+        ASSERT_TRUE(error) << "from version 5 on, the range holds times, not frame numbers";
+        EXPECT_NE(error->message.find("\"in\""), std::string::npos) << error->text();
+    }
+    {
+        TQCurveEditorState state;
+        read("<curveeditor><displayRange in='7/2'/></curveeditor>", state, 5);
+        EXPECT_EQ(state.displayRange().start, CMTimeMake(7, 2));
+        EXPECT_FALSE(CMTIME_IS_VALID(state.displayRange().duration))
+            << "without \"out\" the duration stays as it was";
+    }
+}
+
+TEST_F(SavedTreesTest, state__flagsFollowTheDefaultsAndCopiesLeaveTheRangeUnset) {
+    _defaults.setBool(true, kTQPreferenceCurveEditorAutoZoom);
+    _defaults.setBool(true, kTQPreferenceCurveEditorLockKeyframesInTime);
+    TQCurveEditorState state;
+    EXPECT_TRUE(state.autoZoom());
+    EXPECT_TRUE(state.lockKeyframesInTime());
+    EXPECT_FALSE(state.snapping());
+    EXPECT_FALSE(state.hasDisplayRange()) << "a new state's range is unset";
+
+    state.setSnapshotChannels(true);
+    state.setDisplayAudioWaveform(true);
+    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorSnapshotChannels));
+    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorDisplayAudioWaveform));
+
+    read("<curveeditor><autozoom>false</autozoom><snapping>true</snapping></curveeditor>", state);
+    EXPECT_FALSE(state.autoZoom());
+    EXPECT_TRUE(state.snapping());
+    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorAutoZoom))
+        << "a read changes the object, never the defaults";
+    EXPECT_FALSE(_defaults.boolForKey(kTQPreferenceCurveEditorSnapping));
+
+    state.setDisplayRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(4, 1)));
+    state.setCurrentViewVolume(BNRect<double>(1, 2, 3, 4));
+    const TQCurveEditorState copy(state);
+    EXPECT_FALSE(copy.hasDisplayRange()) << "a copy leaves the range unset";
+    EXPECT_TRUE(CMTimeIdentical(copy.displayRange().start, kCMTimeInvalid));
+    expectRect(copy.currentViewVolume(), 1, 2, 3, 4);
+    EXPECT_EQ(copy.autoZoom(), state.autoZoom());
+    EXPECT_EQ(copy.snapping(), state.snapping());
+    EXPECT_EQ(copy.snapshotChannels(), state.snapshotChannels());
+    EXPECT_EQ(copy.displayAudioWaveform(), state.displayAudioWaveform());
+    EXPECT_EQ(copy.lockKeyframesInTime(), state.lockKeyframesInTime());
+}
+
+TEST_F(SavedTreesTest, list__writesColourIndexAsItemsAndReadsItAsSets) {
+    TQCurveSetListSerializer list;
+    auto* set = new TQCurveSetSerializer("Arms");
+    auto* item = new TQCurveEditorItemSerializer;
+    item->setChannelRef(TQChannelRef("./1/100/101/2"));
+    item->setColorIndex(5);
+    set->addChannel(item);
+    list.addCurveSet(set);
+    list.setSelectedCurveSet(13);
+    const std::string text = write(list);
+    EXPECT_NE(text.find("<curvesets selected=\"13\">"), std::string::npos) << text;
+    EXPECT_NE(text.find("<curveset name=\"Arms\" shortcut=\"\" relative=\"false\">"),
+              std::string::npos)
+        << text;
+    EXPECT_NE(text.find("<channel colorindex=\"5\">"), std::string::npos) << text;
+    EXPECT_NE(text.find("<channelref>./1/100/101/2</channelref>"), std::string::npos) << text;
+
+    // Older files name the colour "enabled"; "colorindex" wins when both are there. Unknown
+    // elements are skipped at every level.
+    TQCurveSetListSerializer back;
+    read(
+        "<curvesets selected='4'>"
+        "  <curveset name='Old' shortcut='q' relative='true'>"
+        "    <channel enabled='1'><channelref>./2/7</channelref></channel>"
+        "    <channel enabled='1' colorindex='6'><extra/><channelref>./2/8</channelref></channel>"
+        "    <channel><channelref>not a path</channelref></channel>"
+        "    <unknown><channel colorindex='9'/></unknown>"
+        "  </curveset>"
+        "  <somethingelse name='x'/>"
+        "</curvesets>",
+        back);
+    EXPECT_EQ(back.getSelectedCurveSet(), 4u) << "the host reads \"selected\" and hands it on";
+    ASSERT_EQ(back.curveSets().size(), 1u);
+    const TQCurveSetSerializer& old = *back.curveSets()[0];
+    EXPECT_EQ(old._name, "Old");
+    EXPECT_EQ(old._shortcut, "q") << "reading takes the shortcut that writing never sets";
+    EXPECT_TRUE(old._relative);
+    ASSERT_EQ(old._channels.size(), 4u) << "a channel inside an unknown element still counts";
+    EXPECT_EQ(old._channels[0]->getColorIndex(), 1u);
+    EXPECT_EQ(old._channels[0]->getChannelRef(), "./2/7");
+    EXPECT_EQ(old._channels[1]->getColorIndex(), 6u);
+    EXPECT_EQ(old._channels[1]->getChannelRef(), "./2/8");
+    EXPECT_EQ(old._channels[2]->getChannelRef(), "not a path") << "kept as text";
+    EXPECT_EQ(old._channels[3]->getColorIndex(), 9u);
+
+    back.clear();
+    EXPECT_TRUE(back.curveSets().empty());
+    EXPECT_EQ(back.getSelectedCurveSet(), 4u) << "clear keeps the selected number";
+}
+
+}  // namespace
