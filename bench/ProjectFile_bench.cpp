@@ -34,12 +34,10 @@ std::atomic<int64_t> gPeak{0};
 void* counted(void* p) {
     if (!p) throw std::bad_alloc();
     if (gCounting.load(std::memory_order_relaxed)) {
-        const int64_t live =
-            gLive.fetch_add(static_cast<int64_t>(malloc_usable_size(p))) +
-            static_cast<int64_t>(malloc_usable_size(p));
+        const int64_t live = gLive.fetch_add(static_cast<int64_t>(malloc_usable_size(p))) +
+                             static_cast<int64_t>(malloc_usable_size(p));
         int64_t peak = gPeak.load(std::memory_order_relaxed);
-        while (live > peak && !gPeak.compare_exchange_weak(peak, live)) {
-        }
+        while (live > peak && !gPeak.compare_exchange_weak(peak, live)) {}
     }
     return p;
 }
@@ -86,17 +84,17 @@ void buildStressScene(TQHostAppDelegate& host) {
                                                                 static_cast<TQChannelId>(o + 1));
         for (size_t c = 0; c < kChannelsPerObject; ++c) {
             const size_t index = o * kChannelsPerObject + c;
-            auto* channel = static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannel>(
-                numbered("C", c), static_cast<TQChannelId>(100 + c))));
+            auto* channel = static_cast<TQChannel*>(object->addChild(
+                std::make_unique<TQChannel>(numbered("C", c), static_cast<TQChannelId>(100 + c))));
             const size_t count = kKeyframes / channels + (index < kKeyframes % channels ? 1 : 0);
             for (size_t k = 0; k < count; ++k) {
                 random ^= random << 13;
                 random ^= random >> 17;
                 random ^= random << 5;
                 const double seconds = 20.0 * static_cast<double>(k) / static_cast<double>(count);
-                channel->setKeyframe(TQTarnTimeForChannelSeconds(seconds, kTimescale),
-                                     std::sin(0.35 * static_cast<double>(k)) +
-                                         0.3 * (random / 4294967296.0 - 0.5));
+                channel->setKeyframe(
+                    TQTarnTimeForChannelSeconds(seconds, kTimescale),
+                    std::sin(0.35 * static_cast<double>(k)) + 0.3 * (random / 4294967296.0 - 0.5));
             }
         }
         host.scene().adoptObject(std::move(object));

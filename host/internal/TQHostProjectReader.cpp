@@ -465,8 +465,7 @@ private:
                     return true;
                 }
             }
-            node.release();
-            objects.emplace_back(object);
+            objects.emplace_back(static_cast<TQChannelObjectRootBase*>(node.release()));
             NodeHandler::push(stream, *object, element.depth(), _project._nodes);
             return false;
         }
