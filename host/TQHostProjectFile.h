@@ -76,9 +76,9 @@ public:
     std::optional<BNSerializerError> save(const std::string& path);
 
     // All or nothing: on success the host's scene, time settings, selection and document
-    // version, the state and the list are replaced, the undo history and the modified set
-    // are forgotten, and the host posts kTQNotifySceneReset, then kTQNotifySceneChanged; on
-    // failure nothing has changed.
+    // version, the state and the list are replaced, and the undo history and the modified
+    // set are forgotten; the host posts kTQNotifySceneReset first and kTQNotifySceneChanged
+    // last (with the range and selection words between). On failure nothing has changed.
     std::optional<BNSerializerError> read(std::string_view document);
     std::optional<BNSerializerError> open(const std::string& path);
 
