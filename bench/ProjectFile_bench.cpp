@@ -1,5 +1,5 @@
-// The project file with a million keyframes (100 objects of 30 animated channels): saving it,
-// opening it, and the memory an open takes beside the scene it builds.
+// The project file of the stress scene, a million keyframes (100 objects of 30 animated
+// channels): saving it, opening it, and the memory an open takes beside the scene it builds.
 //
 // Memory is measured two ways while an open runs into an empty host:
 //   - live heap bytes, counted by this binary's allocation functions (only while a
@@ -11,7 +11,6 @@
 #include <unistd.h>
 
 #include <atomic>
-#include <cmath>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -20,8 +19,8 @@
 #include <string>
 
 #include "host/TQHostAppDelegate.h"
+#include "host/TQHostDenseScene.h"
 #include "host/TQHostProjectFile.h"
-#include "platform/channels/TQChannel.h"
 
 // ---- Allocation counting ----------------------------------------------------------------
 
@@ -61,44 +60,10 @@ namespace {
 
 // ---- The scene --------------------------------------------------------------------------
 
-constexpr size_t kObjects = 100;
-constexpr size_t kChannelsPerObject = 30;
-constexpr size_t kKeyframes = 1'000'000;
-constexpr int kTimescale = 0x40000;
-
-// 100 objects of 30 channels, a million Bezier keyframes spread evenly over 20 s, values a
-// wave with a seeded random part (xorshift, the same on every machine).
-// Appended piece by piece: '"C" + to_string' trips a false -Wrestrict of GCC 12 at -O3.
-BNString numbered(const char* prefix, size_t number) {
-    BNString name = prefix;
-    name += std::to_string(number);
-    return name;
-}
-
+// The stress scene: 100 objects of the kestrel family with 30 animated channels each (the
+// modelled ones, then plain ones), a million keyframes in all.
 void buildStressScene(TQHostAppDelegate& host) {
-    host.resetScene(TQHostObjectFamily::Kestrel);
-    uint32_t random = 0x9e3779b9u;
-    const size_t channels = kObjects * kChannelsPerObject;
-    for (size_t o = 0; o < kObjects; ++o) {
-        auto object = std::make_unique<TQChannelObjectRootBase>(numbered("Dense ", o + 1),
-                                                                static_cast<TQChannelId>(o + 1));
-        for (size_t c = 0; c < kChannelsPerObject; ++c) {
-            const size_t index = o * kChannelsPerObject + c;
-            auto* channel = static_cast<TQChannel*>(object->addChild(
-                std::make_unique<TQChannel>(numbered("C", c), static_cast<TQChannelId>(100 + c))));
-            const size_t count = kKeyframes / channels + (index < kKeyframes % channels ? 1 : 0);
-            for (size_t k = 0; k < count; ++k) {
-                random ^= random << 13;
-                random ^= random >> 17;
-                random ^= random << 5;
-                const double seconds = 20.0 * static_cast<double>(k) / static_cast<double>(count);
-                channel->setKeyframe(
-                    TQTarnTimeForChannelSeconds(seconds, kTimescale),
-                    std::sin(0.35 * static_cast<double>(k)) + 0.3 * (random / 4294967296.0 - 0.5));
-            }
-        }
-        host.scene().adoptObject(std::move(object));
-    }
+    TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneSpec());
 }
 
 std::string projectPath() {
