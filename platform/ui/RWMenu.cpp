@@ -1,6 +1,7 @@
 #include "platform/ui/RWMenu.h"
 
 #include <algorithm>
+#include <cctype>
 
 std::shared_ptr<RWMenuItem> RWMenuItem::separatorItem() {
     auto item = std::make_shared<RWMenuItem>();
@@ -108,4 +109,40 @@ bool RWMenu::performActionForItemAtIndex(int64_t index) {
     // Held by a local reference: the action may remove the item from this menu.
     if (!item || !item->_enabled || item->_action.empty() || !item->_target) return false;
     return item->_target->performAction(item->_action, *item);
+}
+
+namespace {
+std::string lowered(const std::string& text) {
+    std::string out = text;
+    for (char& c : out) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    return out;
+}
+
+bool isUpperLetter(const std::string& text) {
+    return text.size() == 1 && std::isupper(static_cast<unsigned char>(text[0]));
+}
+
+constexpr uint64_t kKeyEquivalentModifiers = RWEventModifierFlagShift | RWEventModifierFlagControl |
+                                             RWEventModifierFlagOption | RWEventModifierFlagCommand;
+}  // namespace
+
+bool RWMenu::performKeyEquivalent(const RWEvent& event) {
+    if (event.type() != RWEventType::KeyDown) return false;
+    const std::string& typed = event.charactersIgnoringModifiers().empty()
+                                   ? event.characters()
+                                   : event.charactersIgnoringModifiers();
+    if (typed.empty()) return false;
+    const uint64_t modifiers = event.modifierFlags() & kKeyEquivalentModifiers;
+    // By index, each item held: an action may change this menu.
+    for (int64_t i = 0; i < numberOfItems(); ++i) {
+        const RWMenuItemPtr item = _items[static_cast<size_t>(i)];
+        if (item->_submenu && item->_submenu->performKeyEquivalent(event)) return true;
+        if (item->_keyEquivalent.empty() || !item->_enabled) continue;
+        const uint64_t wanted =
+            (item->_keyEquivalentModifierMask & kKeyEquivalentModifiers) |
+            (isUpperLetter(item->_keyEquivalent) ? uint64_t{RWEventModifierFlagShift} : 0);
+        if (wanted != modifiers || lowered(item->_keyEquivalent) != lowered(typed)) continue;
+        if (performActionForItemAtIndex(i)) return true;
+    }
+    return false;
 }

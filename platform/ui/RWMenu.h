@@ -1,7 +1,8 @@
 #pragma once
 // Menus as a toolkit-neutral model: a menu holds items; an item has a title, an action sent
-// to a target, a tag, a state mark, an enabled flag and maybe a submenu. The toolkit adapter
-// shows a menu and calls performActionForItemAtIndex for the chosen item; tests do the same.
+// to a target (RWAction.h), a tag, a state mark, an enabled flag, a key equivalent and maybe a
+// submenu. The toolkit adapter shows a menu and calls performActionForItemAtIndex for the
+// chosen item; tests do the same.
 //
 // Ownership: a menu owns its items and an item owns its submenu (shared); supermenu and menu
 // are back references, not owned. Targets are not owned either: a target outlives the menus
@@ -12,26 +13,14 @@
 #include <string>
 #include <vector>
 
-class RWMenu;
-class RWMenuItem;
+#include "platform/ui/RWAction.h"
+#include "platform/ui/RWEvent.h"
 
-// Whatever a menu item's action goes to. The action is the name of the operation
-// ("menuDeleteKeypoint:"); a target answers false for an action it does not know.
-class RWActionTarget {
-public:
-    virtual ~RWActionTarget() = default;
-    virtual bool performAction(const std::string& action, RWMenuItem& sender) = 0;
-    // Called before a menu shows when the menu validates its items: sets the state, may
-    // change the title, answers whether the item is enabled.
-    virtual bool validateMenuItem(RWMenuItem& item) {
-        (void)item;
-        return true;
-    }
-};
+class RWMenu;
 
 enum : int32_t { RWOffState = 0, RWOnState = 1, RWMixedState = -1 };
 
-class RWMenuItem {
+class RWMenuItem : public RWActionSender {
 public:
     RWMenuItem() = default;
     RWMenuItem(std::string title, std::string action, std::string keyEquivalent = {})
@@ -46,7 +35,7 @@ public:
     void setAction(const std::string& action) { _action = action; }
     RWActionTarget* target() const { return _target; }
     void setTarget(RWActionTarget* target) { _target = target; }
-    int64_t tag() const { return _tag; }
+    int64_t tag() const override { return _tag; }
     void setTag(int64_t tag) { _tag = tag; }
     int32_t state() const { return _state; }
     void setState(int32_t state) { _state = state; }
@@ -54,6 +43,7 @@ public:
     void setEnabled(bool enabled) { _enabled = enabled; }
     const std::string& keyEquivalent() const { return _keyEquivalent; }
     void setKeyEquivalent(const std::string& key) { _keyEquivalent = key; }
+    // Command unless set otherwise.
     uint64_t keyEquivalentModifierMask() const { return _keyEquivalentModifierMask; }
     void setKeyEquivalentModifierMask(uint64_t mask) { _keyEquivalentModifierMask = mask; }
     bool isSeparatorItem() const { return _separator; }
@@ -69,7 +59,7 @@ private:
     std::string _title;
     std::string _action;
     std::string _keyEquivalent;
-    uint64_t _keyEquivalentModifierMask = 0;
+    uint64_t _keyEquivalentModifierMask = RWEventModifierFlagCommand;
     RWActionTarget* _target = nullptr;
     int64_t _tag = 0;
     int32_t _state = RWOffState;
@@ -85,7 +75,7 @@ using RWMenuPtr = std::shared_ptr<RWMenu>;
 class RWMenu {
 public:
     explicit RWMenu(std::string title = {}) : _title(std::move(title)) {}
-    ~RWMenu();
+    virtual ~RWMenu();
     RWMenu(const RWMenu&) = delete;
     RWMenu& operator=(const RWMenu&) = delete;
 
@@ -125,6 +115,12 @@ public:
     // Sends the item's action to its target if the item is enabled; answers whether a target
     // took it.
     bool performActionForItemAtIndex(int64_t index);
+    // A key press offered to the menu before the focused view sees it: the first enabled item
+    // (submenus included) whose key equivalent is the event's characters, ignoring case, and
+    // whose modifier mask equals the event's device-independent modifiers (Shift counted
+    // only for a letter key equivalent, which stands for its own case) performs its action.
+    // Answers whether an item took the key.
+    virtual bool performKeyEquivalent(const RWEvent& event);
 
 private:
     friend class RWMenuItem;

@@ -24,6 +24,7 @@
 
 #include "platform/geometry/CGGeometry.h"
 #include "platform/ui/RWEvent.h"
+#include "platform/ui/RWWindow.h"
 
 // ---- View host --------------------------------------------------------------------------
 
@@ -94,17 +95,8 @@ inline constexpr RWModalResponse RWModalResponseStop = -1000;
 inline constexpr RWModalResponse RWModalResponseAbort = -1001;
 inline constexpr RWModalResponse RWModalResponseContinue = -1002;
 
-// A panel that can be run modally. The panels of the framework derive from it; the adapter
-// finds its widget through the panel.
-class RWWindow {
-public:
-    virtual ~RWWindow() = default;
-    const std::string& title() const { return _title; }
-    void setTitle(const std::string& title) { _title = title; }
-
-private:
-    std::string _title;
-};
+// A window can be run modally (RWWindow.h); the panels of the framework derive from it, and
+// the adapter finds its widget through the window.
 
 // runModalForWindow returns when the panel (or anything it calls) ends the run with
 // stopModal (answering RWModalResponseStop), stopModalWithCode, or abortModal

@@ -638,7 +638,7 @@ void TQCurveEditorCtrlBase::buildTangentMenu() {
 
 void TQCurveEditorCtrlBase::buildDefaultMenu() { _defaultMenu = std::make_shared<RWMenu>(""); }
 
-bool TQCurveEditorCtrlBase::performAction(const std::string& action, RWMenuItem& sender) {
+bool TQCurveEditorCtrlBase::performAction(const std::string& action, RWActionSender& sender) {
     void* from = &sender;
     if (action == "menuDelete:")
         menuDelete(from);

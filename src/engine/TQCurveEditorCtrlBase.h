@@ -346,7 +346,7 @@ public:
     virtual void buildTangentMenu();
     virtual void buildDefaultMenu();
     // Runs the menu... action named; false for an action this controller does not know.
-    bool performAction(const std::string& action, RWMenuItem& sender) override;
+    bool performAction(const std::string& action, RWActionSender& sender) override;
 
     // ---- Public fields ------------------------------------------------------------------
 

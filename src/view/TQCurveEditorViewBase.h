@@ -287,6 +287,18 @@ public:
     // A key equivalent before the menus see it: a space key-down arms the space bar at once.
     virtual bool customKeyEquivalent(const RWEvent& event);
     char space() const { return _space; }
+    // The view takes and gives up the keyboard focus (the host tells it); both answer true.
+    virtual bool becomeFirstResponder() {
+        _isInCurveEditor = 1;
+        return true;
+    }
+    virtual bool resignFirstResponder() {
+        _isInCurveEditor = 0;
+        return true;
+    }
+    // Whether the view has the keyboard focus.
+    char isInCurveEditor() const { return _isInCurveEditor; }
+    void setIsInCurveEditor(char inEditor) { _isInCurveEditor = inEditor; }
 
     // Horizontal or vertical constraint of a Shift drag: the first call with no direction
     // decides it from p - origin (a tie is vertical) and answers origin; later calls keep
@@ -590,7 +602,8 @@ protected:
     // reset at the release, or when the gesture is abandoned (a new press without a release,
     // a new controller, the view's end).
     std::optional<TQChangeBracket> _capturing;
-    char _mouseIsDown = 0;  // a gesture is under way
+    char _isInCurveEditor = 0;  // the view has the keyboard focus
+    char _mouseIsDown = 0;      // a gesture is under way
     char _snapCursor = 0;
     char _lockInU = 0;                   // keypoints keep their time in a drag unless Shift is down
     char _didAddPoint = 0;               // the mouse down added a keypoint

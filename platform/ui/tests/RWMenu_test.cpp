@@ -10,9 +10,10 @@ namespace {
 // Records the actions it receives; enables only the actions it is told to.
 class RecordingTarget : public RWActionTarget {
 public:
-    bool performAction(const std::string& action, RWMenuItem& sender) override {
+    bool performAction(const std::string& action, RWActionSender& sender) override {
         performed.push_back(action);
-        if (removeSenderOnAction && sender.menu()) sender.menu()->removeItem(sender);
+        auto* item = dynamic_cast<RWMenuItem*>(&sender);
+        if (removeSenderOnAction && item && item->menu()) item->menu()->removeItem(*item);
         return action != "unknown:";
     }
     bool validateMenuItem(RWMenuItem& item) override {
