@@ -61,7 +61,8 @@ public:
     virtual ~RWControlSuperview() = default;
     // Puts `replacement` where `control` is shown, at its place and size; `control` leaves.
     // The implementation sets both controls' superview.
-    virtual void replaceSubview(RWControl& control, const std::shared_ptr<RWControl>& replacement) = 0;
+    virtual void replaceSubview(RWControl& control,
+                                const std::shared_ptr<RWControl>& replacement) = 0;
 };
 
 // Bits of autoresizingMask: which margins and sizes follow the superview's size.

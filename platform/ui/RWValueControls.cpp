@@ -48,7 +48,8 @@ void RWSlider::setNumberOfTickMarks(int64_t count) {
 }
 
 double RWSlider::closestTickMarkValueToValue(double value) const {
-    if (_numberOfTickMarks < 2) return _numberOfTickMarks == 1 ? (minValue() + maxValue()) / 2 : value;
+    if (_numberOfTickMarks < 2)
+        return _numberOfTickMarks == 1 ? (minValue() + maxValue()) / 2 : value;
     const double step = (maxValue() - minValue()) / static_cast<double>(_numberOfTickMarks - 1);
     if (step <= 0.0) return minValue();
     const double index = std::round((value - minValue()) / step);

@@ -291,7 +291,8 @@ void TQCurveEditorCtrl::notifyChannelsChanged(bool stale) {
             TQChannelBase* root = delegate->sceneChannelRoot();
             for (const TQChannelRef& ref : delegate->modifiedChannels()) {
                 auto* channel = dynamic_cast<TQChannel*>(ref.getChannel(root));
-                if (!channel || channel->testFlag(kHiddenChannelFlags) || set->itemWithChannel(channel))
+                if (!channel || channel->testFlag(kHiddenChannelFlags) ||
+                    set->itemWithChannel(channel))
                     continue;
                 if (set != _curveSetAnimated || channel->isAnimated(false)) {
                     stale = true;
@@ -339,7 +340,8 @@ void TQCurveEditorCtrl::notifyTimeChanged() {
     if (const TQCurveSetPtr set = _selectedCurveSet) {
         for (const TQCurveEditorItemPtr& item : set->allItems()) {
             const TQChannel* channel = item ? item->channel() : nullptr;
-            if (channel && (channel->isAnimated(false) || channel->isChannelAffectedByBehaviors(true)))
+            if (channel &&
+                (channel->isAnimated(false) || channel->isChannelAffectedByBehaviors(true)))
                 refreshViewAndBrowserWithoutTitleForItem(item.get());
         }
     }
@@ -545,9 +547,10 @@ bool TQCurveEditorCtrl::shouldAutoZoom() const {
 CMTime TQCurveEditorCtrl::convertToCurveEditorAxis(CMTime time) const {
     const CMTime frame = _pAppDelegate ? _pAppDelegate->getFrameDuration() : CMTime{};
     // Half a frame exactly: at the frame's own timescale a half would be rounded.
-    const CMTime half = frame.timescale > 0 && frame.timescale <= std::numeric_limits<int32_t>::max() / 2
-                            ? CMTimeMake(frame.value, frame.timescale * 2)
-                            : frame * 0.5;
+    const CMTime half =
+        frame.timescale > 0 && frame.timescale <= std::numeric_limits<int32_t>::max() / 2
+            ? CMTimeMake(frame.value, frame.timescale * 2)
+            : frame * 0.5;
     return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, half), frame);
 }
 

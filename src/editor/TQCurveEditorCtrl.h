@@ -203,17 +203,25 @@ public:
 
     // Animated, Modified, All and Active, each with its localised name and the delegate.
     void createAutomaticCurveSets();
-    const std::shared_ptr<TQCurveSetAnimated>& curveSetAnimated() const { return _curveSetAnimated; }
+    const std::shared_ptr<TQCurveSetAnimated>& curveSetAnimated() const {
+        return _curveSetAnimated;
+    }
     const std::shared_ptr<TQCurveSetAll>& curveSetAll() const { return _curveSetAll; }
     const std::shared_ptr<TQCurveSetCurrent>& curveSetCurrent() const { return _curveSetCurrent; }
     const TQCurveSetPtr& curveSetModified() const { return _curveSetModified; }
-    const std::shared_ptr<TQCurveSetPosition>& curveSetPosition() const { return _curveSetPosition; }
+    const std::shared_ptr<TQCurveSetPosition>& curveSetPosition() const {
+        return _curveSetPosition;
+    }
     const std::shared_ptr<TQCurveSetScale>& curveSetScale() const { return _curveSetScale; }
-    const std::shared_ptr<TQCurveSetRotation>& curveSetRotation() const { return _curveSetRotation; }
+    const std::shared_ptr<TQCurveSetRotation>& curveSetRotation() const {
+        return _curveSetRotation;
+    }
     const std::shared_ptr<TQCurveSetShear>& curveSetShear() const { return _curveSetShear; }
     const std::shared_ptr<TQCurveSetPivot>& curveSetPivot() const { return _curveSetPivot; }
     const std::shared_ptr<TQCurveSetOpacity>& curveSetOpacity() const { return _curveSetOpacity; }
-    const std::shared_ptr<TQCurveSetRetiming>& curveSetRetiming() const { return _curveSetRetiming; }
+    const std::shared_ptr<TQCurveSetRetiming>& curveSetRetiming() const {
+        return _curveSetRetiming;
+    }
     // Whether the set is one of the eleven.
     bool isAutomaticCurveSet(const TQCurveSet* set) const;
     // The eleven, in the order they are made (null before setupController).
@@ -295,7 +303,7 @@ public:
 
     // Rebuilds the pop-up's menu: the automatic sets, the sets by property when offered, the
     // custom sets, New and Manage; the selected set's item selected and its title shown.
-    void refreshPopUp();
+    virtual void refreshPopUp();
 
     // ---- Target and action ----
 

@@ -352,6 +352,7 @@ void TQCurveEditorCtrl::refreshPopUp() {
         ->setEnabled(false);
     if (popUp->numberOfItems() > 0) {
         if (popUp->indexOfSelectedItem() == -1) popUp->selectItemAtIndex(0);
-        if (const RWMenuItemPtr selected = popUp->selectedItem()) popUp->setTitle(selected->title());
+        if (const RWMenuItemPtr selected = popUp->selectedItem())
+            popUp->setTitle(selected->title());
     }
 }

@@ -3,7 +3,8 @@
 #include "src/contract/TQCurveEditorAppDelegate.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
 
-TQCurveEditorView::TQCurveEditorView() : _timecodeFormatter(std::make_unique<RWTimecodeFormatter>()) {
+TQCurveEditorView::TQCurveEditorView()
+    : _timecodeFormatter(std::make_unique<RWTimecodeFormatter>()) {
     _lockInU = 0;
     _selectionViewVolume = CGRectZero;
     _currentViewVolume = kInitialViewVolume;

@@ -1,0 +1,194 @@
+#pragma once
+// The full editor on the sample project, as a host sets it up: the reference host with the
+// motion-graphics piece, a recording delegate in front of it, the controller with a timeline
+// view on a stub view host (800 x 400 points), a vertical scroller in a superview, a tool
+// switch and a curve set pop-up; setupController and viewDidLoad have run, and the controller
+// hears the host's words.
+//
+// One log takes, in order, what the tests of the update cycle watch: the controller's
+// refreshes, the view's tool and zoom calls, a few calls of the delegate, and what the
+// recording channel list is asked.
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "host/TQHostAppDelegate.h"
+#include "host/TQHostSampleScene.h"
+#include "platform/ui/testing/RWTestDoubles.h"
+#include "src/editor/TQCurveEditorCtrl.h"
+#include "src/editor/TQCurveEditorView.h"
+#include "tests/support/TQRecordingAppDelegate.h"
+
+namespace editor_test {
+
+using Log = std::vector<std::string>;
+
+class LoggingRecorder : public TQRecordingAppDelegate {
+public:
+    using TQRecordingAppDelegate::TQRecordingAppDelegate;
+    bool objectsSelectedInScene() override {
+        log->push_back("objectsSelectedInScene");
+        return TQRecordingAppDelegate::objectsSelectedInScene();
+    }
+    std::vector<TQChannelRef> modifiedChannels() override {
+        log->push_back("modifiedChannels");
+        return TQRecordingAppDelegate::modifiedChannels();
+    }
+    void resetModifiedChannels() override {
+        log->push_back("resetModifiedChannels");
+        TQRecordingAppDelegate::resetModifiedChannels();
+    }
+    Log* log = nullptr;
+};
+
+class LoggingView : public TQCurveEditorView {
+public:
+    void currentToolChanged() override {
+        log->push_back("currentToolChanged");
+        TQCurveEditorView::currentToolChanged();
+    }
+    void performAutoZoom(bool force) override {
+        if (force) log->push_back("performAutoZoom");
+        TQCurveEditorView::performAutoZoom(force);
+    }
+    Log* log = nullptr;
+};
+
+class LoggingCtrl : public TQCurveEditorCtrl {
+public:
+    void refreshSelectedCurveSet() override {
+        log->push_back("refreshSelectedCurveSet");
+        TQCurveEditorCtrl::refreshSelectedCurveSet();
+    }
+    void updateIfModifiedByBehaviors() override { log->push_back("updateIfModifiedByBehaviors"); }
+    void refreshPopUp() override {
+        log->push_back("refreshPopUp");
+        TQCurveEditorCtrl::refreshPopUp();
+    }
+    Log* log = nullptr;
+};
+
+// A channel list that shows every channel item of the selected set, one row each in order.
+class RecordingList : public TQEditorChannelListView, public TQEditorChannelListController {
+public:
+    explicit RecordingList(const TQCurveEditorCtrl& ctrl, Log& log) : _ctrl(ctrl), _log(log) {}
+    void setAllowsEmptySelection(bool) override {}
+    void setAllowsMultipleSelection(bool) override {}
+    void deselectAll() override { _log.push_back("deselectAll"); }
+    int64_t rowForItem(const TQCurveEditorItem* item) const override {
+        const TQCurveSetPtr& set = _ctrl.selectedCurveSet();
+        for (uint32_t i = 0; set && i < set->numberOfChannelItems(); ++i)
+            if (set->channeItemAtIndex(i).get() == item) return i;
+        return -1;
+    }
+    CGRect rectOfRow(int64_t row) const override { return CGRectMake(0, 20.0 * row, 300, 20); }
+    CGRect frameOfCellAtColumn(int64_t column, int64_t row) const override {
+        return CGRectMake(100.0 * column, 20.0 * row, 100, 20);
+    }
+    void selectRowIndexes(const std::vector<int64_t>& rows, bool extend) override {
+        for (int64_t row : rows)
+            _log.push_back("select row " + std::to_string(row) + (extend ? "+" : ""));
+    }
+    void setNeedsDisplay() override {}
+    void setNeedsDisplayInRect(const CGRect& rect) override {
+        _log.push_back("redraw row " + std::to_string(static_cast<int>(rect.origin.y / 20)));
+    }
+    void resetCursorRects() override {}
+    void update() override {}
+    void refreshRowWithoutTitle(int64_t row) override {
+        _log.push_back("refreshRowWithoutTitle " + std::to_string(row));
+    }
+
+private:
+    const TQCurveEditorCtrl& _ctrl;
+    Log& _log;
+};
+
+// Where the host shows the scroller; it records the replacement.
+class Superview : public RWControlSuperview {
+public:
+    void replaceSubview(RWControl& control, const std::shared_ptr<RWControl>& replacement) override {
+        control.setSuperview(nullptr);
+        replacement->setSuperview(this);
+        shown = replacement;
+    }
+    RWControlPtr shown;
+};
+
+class EditorFixture : public ::testing::Test {
+protected:
+    // Override to leave controls out or connect a list before setupController.
+    virtual void connect(TQCurveEditorOutlets& outlets) { (void)outlets; }
+
+    void SetUp() override {
+        TQHostLoadSampleScene(host, family());
+        recorder.forwardTo(&host);
+        recorder.log = &log;
+        view.log = &log;
+        ctrl.log = &log;
+        view.setViewHost(&viewHost);
+        view.setClock(&clock);
+        view.setTimer(&timer);
+        const CMTimeRange range = host.displayRange();
+        view.setTotalRange(&range.start, &range.duration);
+
+        ctrl.init();
+        ctrl.setAppDelegate(&recorder);
+        ctrl.setView(&view);
+        TQCurveEditorOutlets outlets;
+        outlets.verticalScroller = std::make_shared<RWZoomScroller>();
+        outlets.verticalScroller->setTarget(&ctrl);
+        outlets.verticalScroller->setAction("verticalZoomScroll:");
+        outlets.verticalScroller->setSuperview(&superview);
+        outlets.tools = std::make_shared<RWSegmentedControl>();
+        outlets.tools->setTarget(&ctrl);
+        outlets.tools->setAction("setCurrentTool:");
+        outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
+        connect(outlets);
+        ctrl.connectOutlets(outlets);
+        ctrl.setupController();
+        ctrl.viewDidLoad();
+        host.addNotificationReceiver(&ctrl);
+        view.drawProjection();
+        recorder.clearCalls();
+        log.clear();
+    }
+    void TearDown() override {
+        host.removeNotificationReceiver(&ctrl);
+        view.setViewHost(nullptr);
+    }
+    virtual TQHostObjectFamily family() const { return TQHostObjectFamily::Kestrel; }
+
+    TQChannelObjectRootBase* object(const char* name) { return host.scene().objectNamed(name); }
+    // The channels the selected set shows, in order.
+    std::vector<const TQChannelBase*> shownChannels() const {
+        std::vector<const TQChannelBase*> out;
+        if (const TQCurveSetPtr& set = ctrl.selectedCurveSet())
+            for (const TQCurveEditorItemPtr& item : set->allItems())
+                out.push_back(item->channelBase());
+        return out;
+    }
+    // The pop-up's item of that title, chosen as the user chooses it.
+    void choose(const std::string& title) {
+        ctrl.curveSetsPopUp()->userWillPopUp();
+        const int64_t index = ctrl.curveSetsPopUp()->menu()->indexOfItemWithTitle(title);
+        ASSERT_GE(index, 0) << "no item " << title;
+        ctrl.curveSetsPopUp()->userSelectItemAtIndex(index);
+    }
+
+    TQHostAppDelegate host;
+    Log log;
+    LoggingRecorder recorder;
+    RWStubViewHost viewHost{800.0, 400.0, 1.0};
+    RWManualClock clock;
+    RWManualTimer timer{clock};
+    Superview superview;
+    // Declared after the host and the view host, so that it goes first.
+    LoggingView view;
+    LoggingCtrl ctrl;
+};
+
+}  // namespace editor_test
