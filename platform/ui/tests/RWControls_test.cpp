@@ -56,8 +56,8 @@ TEST(RWZoomScroller, gestures_set_the_part_and_values_then_send_the_action) {
     scroller->userMoveKnob(2.0, kRWScrollerKnobSlot);
     EXPECT_EQ(scroller->floatValue(), 1.0) << "a value past the end is kept at the end";
     scroller->userResizeKnob(kRWScrollerKnobEndEdge, 0.4, 0.5);
-    EXPECT_EQ(target.actions, (std::vector<std::string>{"scroll:/5", "scroll:/2", "scroll:/6",
-                                                        "scroll:/8"}));
+    EXPECT_EQ(target.actions,
+              (std::vector<std::string>{"scroll:/5", "scroll:/2", "scroll:/6", "scroll:/8"}));
     EXPECT_EQ(scroller->knobProportion(), 0.4);
     EXPECT_EQ(scroller->floatValue(), 0.5);
     EXPECT_EQ(observer.changes, 4) << "the widget hears every gesture";

@@ -102,26 +102,33 @@ protected:
 TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
     using C = TQCurveEditorCtrl;
     TQChannel* logoPosition = channelOf(logo, TQHostProperty::Position, 1);  // the bounce
-    TQChannel* restingPivot = channelOf(title, TQHostProperty::Pivot);  // no keys, default
+    TQChannel* restingPivot = channelOf(title, TQHostProperty::Pivot);       // no keys, default
     const struct {
         const char* what;
         std::function<void()> prepare;
         TQNotificationWord word;
         Log expected;
     } rows[] = {
-        {"unknown bits only", [&] { state(&C::showAnimated, {title}); }, 0x40000140u,
+        {"unknown bits only",
+         [&] { state(&C::showAnimated, {title}); },
+         0x40000140u,
          {"resetModifiedChannels"}},
-        {"scene change, Animated", [&] { state(&C::showAnimated, {title}); },
-         kTQNotifySceneChanged, {"refreshSelectedCurveSet", "resetModifiedChannels"}},
+        {"scene change, Animated",
+         [&] { state(&C::showAnimated, {title}); },
+         kTQNotifySceneChanged,
+         {"refreshSelectedCurveSet", "resetModifiedChannels"}},
         {"scene change, Active, objects selected: nothing rebuilt",
-         [&] { state(&C::showActive, {title}); }, kTQNotifySceneChanged,
+         [&] { state(&C::showActive, {title}); },
+         kTQNotifySceneChanged,
          {"objectsSelectedInScene", "resetModifiedChannels"}},
-        {"scene change, Active, no object selected", [&] { state(&C::showActive, {}); },
+        {"scene change, Active, no object selected",
+         [&] { state(&C::showActive, {}); },
          kTQNotifySceneChanged,
          {"objectsSelectedInScene", "refreshSelectedCurveSet", "modifiedChannels",
           "resetModifiedChannels"}},
         {"scene reset, Active: cleared in both branches, tool refreshed",
-         [&] { state(&C::showActive, {title}); }, kTQNotifySceneReset,
+         [&] { state(&C::showActive, {title}); },
+         kTQNotifySceneReset,
          {"currentToolChanged", "resetModifiedChannels"}},
         {"changed channels and set content: stale from step 5 carried into step 7",
          [&] { state(&C::showAnimated, {title}); },
@@ -133,9 +140,11 @@ TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
          kTQNotifyChannelsChanged,
          {"modifiedChannels", "refreshSelectedCurveSet", "resetModifiedChannels"}},
         {"a channel without keys does not, for Animated",
-         [&] { state(&C::showAnimated, {title}, {restingPivot}); }, kTQNotifyChannelsChanging,
+         [&] { state(&C::showAnimated, {title}, {restingPivot}); },
+         kTQNotifyChannelsChanging,
          {"modifiedChannels", "updateIfModifiedByBehaviors", "resetModifiedChannels"}},
-        {"but does for Modified", [&] { state(&C::showModified, {title}, {restingPivot}); },
+        {"but does for Modified",
+         [&] { state(&C::showModified, {title}, {restingPivot}); },
          kTQNotifyChannelsChanging,
          {"modifiedChannels", "refreshSelectedCurveSet", "resetModifiedChannels"}},
         {"a hidden channel never does",
@@ -146,10 +155,13 @@ TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
          kTQNotifyChannelsChanged,
          {"modifiedChannels", "updateIfModifiedByBehaviors", "resetModifiedChannels"}},
         {"a set by property does not follow changes",
-         [&] { state(&C::showPosition, {title}, {logoPosition}); }, kTQNotifyChannelsChanged,
+         [&] { state(&C::showPosition, {title}, {logoPosition}); },
+         kTQNotifyChannelsChanged,
          {"updateIfModifiedByBehaviors", "resetModifiedChannels"}},
-        {"object selection", [&] { state(&C::showAll, {title}); },
-         kTQNotifyObjectSelectionChanged, {"refreshSelectedCurveSet", "resetModifiedChannels"}},
+        {"object selection",
+         [&] { state(&C::showAll, {title}); },
+         kTQNotifyObjectSelectionChanged,
+         {"refreshSelectedCurveSet", "resetModifiedChannels"}},
         {"tool change with set content",
          [&] { state(&C::showAll, {title}); },
          kTQNotifyToolChanged | kTQNotifyCurveSetContentChanged,
@@ -346,7 +358,7 @@ TEST_F(CurveEditorCtrl, frame_grid__nearest_frame_with_a_half_going_up) {
     const struct {
         CMTime frame, time, expected;
     } rows[] = {
-        {at(1, 30), at(1, 60), at(1, 30)},                  // exactly half a frame
+        {at(1, 30), at(1, 60), at(1, 30)},         // exactly half a frame
         {at(1, 30), at(9999, 600000), at(0, 30)},  // just below half
         {at(1, 30), at(3, 60), at(2, 30)},
         {at(1, 30), at(-1, 60), at(0, 30)},  // half below zero goes up to zero
@@ -438,7 +450,8 @@ TEST_F(CurveEditorCtrl, timeline__display_range_drives_the_horizontal_view) {
     EXPECT_EQ(view.getCurrentViewVolume().size.width, 2.0);
 
     const TQCurveEditorView fresh;
-    EXPECT_TRUE(CGRectEqualToRect(fresh.getCurrentViewVolume(), TQCurveEditorView::kInitialViewVolume));
+    EXPECT_TRUE(
+        CGRectEqualToRect(fresh.getCurrentViewVolume(), TQCurveEditorView::kInitialViewVolume));
     EXPECT_EQ(fresh.gridSpacingY(), 25.0);
     EXPECT_EQ(fresh.numberOfTickMarks(), 4u);
 }

@@ -31,7 +31,7 @@ protected:
 
 TEST_F(CurveSetRegistry, pop_up__each_automatic_set_shows_what_it_finds_for_the_selection) {
     host.setSelectedObjects(allObjects());
-    const char* automatic[] = {"All",   "Animated", "Modified", "Active", "Position", "Rotation",
+    const char* automatic[] = {"All",   "Animated", "Modified", "Active",  "Position", "Rotation",
                                "Scale", "Shear",    "Pivot",    "Opacity", "Retiming"};
     std::set<const TQCurveSet*> chosen;
     for (const char* title : automatic) {
@@ -71,11 +71,10 @@ TEST_F(CurveSetRegistry, pop_up__sections_in_order_with_custom_sets_and_the_pane
     ctrl.createCurveSetWithName("Bounce");
     ctrl.createCurveSetWithName("Fades");
     ctrl.refreshPopUp();
-    EXPECT_EQ(popUpTitles(),
-              (std::vector<std::string>{"All", "Animated", "Modified", "Active", "--", "Position",
-                                        "Rotation", "Scale", "Shear", "Pivot", "Opacity",
-                                        "Retiming", "--", "Bounce", "Fades", "--",
-                                        "New Curve Set…", "Manage Curve Sets…"}));
+    EXPECT_EQ(popUpTitles(), (std::vector<std::string>{
+                                 "All", "Animated", "Modified", "Active", "--", "Position",
+                                 "Rotation", "Scale", "Shear", "Pivot", "Opacity", "Retiming", "--",
+                                 "Bounce", "Fades", "--", "New Curve Set…", "Manage Curve Sets…"}));
     const RWMenu& menu = *ctrl.curveSetsPopUp()->menu();
     EXPECT_EQ(ctrl.curveSetsPopUp()->indexOfSelectedItem(), 1) << "Animated is selected";
     EXPECT_EQ(menu.itemAtIndex(14)->tag(), 1);
@@ -223,7 +222,8 @@ TEST_F(CurveSetRegistry, solo__one_channel_alone_then_all_again) {
     const TQCurveEditorItemPtr item = set->channeItemAtIndex(1);
     auto enabled = [&] {
         std::vector<bool> out;
-        for (const TQCurveEditorItemPtr& i : set->allItems()) out.push_back(i->isEnabledItem() != 0);
+        for (const TQCurveEditorItemPtr& i : set->allItems())
+            out.push_back(i->isEnabledItem() != 0);
         return out;
     };
     std::vector<bool> alone(set->numberOfChannelItems(), false);
@@ -246,9 +246,8 @@ TEST_F(CurveSetRegistry, window__closing_forgets_the_rebuilt_sets_and_a_resize_r
     choose("Animated");
     RWWindow window;
     EXPECT_TRUE(ctrl.windowShouldClose(window));
-    for (const TQCurveSetPtr& set :
-         {TQCurveSetPtr(ctrl.curveSetAnimated()), ctrl.curveSetModified(),
-          TQCurveSetPtr(ctrl.curveSetAll())})
+    for (const TQCurveSetPtr& set : {TQCurveSetPtr(ctrl.curveSetAnimated()),
+                                     ctrl.curveSetModified(), TQCurveSetPtr(ctrl.curveSetAll())})
         EXPECT_EQ(set->numberOfItems(), 0u) << set->curveSetName();
 
     viewHost.setBounds(CGRectMake(0, 0, 1200, 400));

@@ -110,7 +110,8 @@ private:
 // Where the host shows the scroller; it records the replacement.
 class Superview : public RWControlSuperview {
 public:
-    void replaceSubview(RWControl& control, const std::shared_ptr<RWControl>& replacement) override {
+    void replaceSubview(RWControl& control,
+                        const std::shared_ptr<RWControl>& replacement) override {
         control.setSuperview(nullptr);
         replacement->setSuperview(this);
         shown = replacement;

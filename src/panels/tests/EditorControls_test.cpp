@@ -26,8 +26,7 @@ public:
         calls.push_back("stroke " + rect(r) + (border ? " border" : " other") + " w" +
                         std::to_string(static_cast<int>(width)));
     }
-    void drawText(const std::string& text, const CGRect& frame, RWTextAlignment,
-                  bool) override {
+    void drawText(const std::string& text, const CGRect& frame, RWTextAlignment, bool) override {
         calls.push_back("text '" + text + "' " + rect(frame));
     }
     static RWColor toRW(const GDColor& c) { return {c.red, c.green, c.blue, c.alpha}; }

@@ -1,0 +1,50 @@
+#include "qt/TQQtTextField.h"
+
+#include <QSignalBlocker>
+
+QValidator::State TQQtFormatterValidator::validate(QString& input, int& pos) const {
+    if (!_formatter) return Acceptable;
+    std::string replacement;
+    if (!_formatter->isPartialStringValid(input.toStdString(), &replacement, nullptr))
+        return Invalid;
+    if (!replacement.empty() && replacement != input.toStdString()) {
+        input = QString::fromStdString(replacement);
+        pos = int(input.size());
+    }
+    return _formatter->getObjectValue(nullptr, input.toStdString(), nullptr) ? Acceptable
+                                                                             : Intermediate;
+}
+
+TQQtTextField::TQQtTextField(QWidget* parent) : QLineEdit(parent) {
+    connect(this, &QLineEdit::editingFinished, this, [this] { endEditing(); });
+    syncFromModel();
+}
+
+void TQQtTextField::syncFromModel() {
+    const QSignalBlocker blocker(this);
+    const RWTextField* m = model().get();
+    setEnabled(m && m->isEnabled());
+    setReadOnly(!m || !m->isEditable());
+    const RWFormatter* formatter = m ? m->formatter() : nullptr;
+    const auto* present = dynamic_cast<const TQQtFormatterValidator*>(validator());
+    if (!formatter && present) {
+        setValidator(nullptr);
+        delete present;
+    } else if (formatter && (!present || present->formatter() != formatter)) {
+        setValidator(new TQQtFormatterValidator(formatter, this));
+        delete present;
+    }
+    const QString text = m ? QString::fromStdString(m->stringValue()) : QString();
+    if (this->text() != text) setText(text);
+    setPlaceholderText(m ? QString::fromStdString(m->placeholderString()) : QString());
+}
+
+void TQQtTextField::endEditing() {
+    if (const std::shared_ptr<RWTextField> m = model()) m->userEndEditing(text().toStdString());
+}
+
+void TQQtTextField::focusOutEvent(QFocusEvent* event) {
+    QLineEdit::focusOutEvent(event);
+    // An edit that the validator holds back never ends: the model's value shows again.
+    if (!hasAcceptableInput()) syncFromModel();
+}
