@@ -47,8 +47,8 @@ void TQQtCellDrawing::drawText(const std::string& text, const CGRect& frame,
         case RWTextAlignment::Left:
         case RWTextAlignment::Natural: flags |= Qt::AlignLeft; break;
     }
-    _painter.setPen(_palette.color(enabled ? QPalette::Active : QPalette::Disabled,
-                                   QPalette::Text));
+    _painter.setPen(
+        _palette.color(enabled ? QPalette::Active : QPalette::Disabled, QPalette::Text));
     const QRectF rect(frame.origin.x, frame.origin.y, frame.size.width, frame.size.height);
     _painter.drawText(rect, int(flags),
                       _painter.fontMetrics().elidedText(QString::fromStdString(text),

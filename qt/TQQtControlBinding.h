@@ -41,7 +41,8 @@ public:
 
     void controlDidChange(RWControl&) override { syncFromModel(); }
     // A replacement of another class than this widget shows leaves it without a model.
-    void replaceSubview(RWControl& control, const std::shared_ptr<RWControl>& replacement) override {
+    void replaceSubview(RWControl& control,
+                        const std::shared_ptr<RWControl>& replacement) override {
         if (&control != _model.get()) return;
         setModel(std::dynamic_pointer_cast<Model>(replacement));
     }

@@ -41,8 +41,7 @@ void TQQtSegmentedControl::syncFromModel() {
         const QIcon icon = imageName.empty() ? QIcon() : TQQtIconForResource(imageName);
         button->setIcon(icon);
         button->setText(QString::fromStdString(m->labelForSegment(i)));
-        button->setToolButtonStyle(icon.isNull() ? Qt::ToolButtonTextOnly
-                                                 : Qt::ToolButtonIconOnly);
+        button->setToolButtonStyle(icon.isNull() ? Qt::ToolButtonTextOnly : Qt::ToolButtonIconOnly);
         const QString description =
             QString::fromStdString(m->accessibilityDescriptionForSegment(i));
         button->setToolTip(description);

@@ -4,8 +4,12 @@
 
 TQQtWindowBinding::TQQtWindowBinding(RWWindow& window, QWidget* widget)
     : QObject(widget), _window(window), _widget(widget) {
+    // The model starts from what the widget shows.
+    if (_widget) {
+        _window.setIsVisible(_widget->isVisible());
+        _widget->installEventFilter(this);
+    }
     _window.addObserver(this);
-    if (_widget) _widget->installEventFilter(this);
     windowDidChange(_window);
 }
 
@@ -20,6 +24,10 @@ void TQQtWindowBinding::windowDidChange(RWWindow& window) {
 }
 
 bool TQQtWindowBinding::eventFilter(QObject* watched, QEvent* event) {
+    // Shown or hidden by Qt (the application shows its main window): the model follows.
+    if (watched == _widget && (event->type() == QEvent::Show || event->type() == QEvent::Hide) &&
+        !_closing)
+        _window.setIsVisible(event->type() == QEvent::Show);
     if (watched == _widget && event->type() == QEvent::Close && !_closing) {
         _closing = true;
         const bool closed = _window.performClose();

@@ -1,8 +1,9 @@
 #pragma once
 // A window or panel of platform/ui (RWWindow) bound to a top-level widget (a QDialog, a
-// QMainWindow): the widget shows the model's title and is shown or hidden with the model; the
-// user's close is the model's performClose, so the model's delegate may refuse it, and a
-// refused close leaves the widget open.
+// QMainWindow): the widget shows the model's title and is shown or hidden with the model, and
+// the model follows when Qt shows or hides the widget; the user's close is the model's
+// performClose, so the model's delegate may refuse it, and a refused close leaves the widget
+// open.
 //
 // The binding watches the widget through an event filter and does not own it; it detaches
 // itself when either the widget or the binding goes first. The window is not owned either: it

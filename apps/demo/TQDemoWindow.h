@@ -1,22 +1,34 @@
 #pragma once
-// The demo's main window: a list of the scene's objects beside a curve view that shows the
-// curves of the object selected in the list (which is the scene's selected object). The
-// curves can be clicked, rubber-banded and dragged with the edit tool; the Edit menu undoes
+// The demo's main window: the full curve editor on the sample project. A list of the scene's
+// objects (the scene's selection: pick one or several) sits beside the curve view with its
+// vertical zoom scroller; the tool bar holds the tool switch (edit; sketch and box are shown,
+// disabled, as the view does not offer them) and the curve set pop-up, which lists every
+// automatic and custom set. The automatic sets follow the objects selected, through the
+// controller's notify. View > Frame All fits the shown curves; View > Auto Zoom lets the view
+// fit them vertically at every frame (the scroller is disabled meanwhile). The Edit menu undoes
 // and redoes through the host's history and names the step it would undo.
 //
-// The window owns the host (and so the scene), the controller and the view. Notification
-// words reach the controller first, then the window, which keeps the list and the Edit menu
-// in step.
+// The window owns the host (and so the scene), the controller, the view and the control
+// models; Qt owns the widgets. Notification words reach the controller first, then the
+// window, which keeps the list, the title and the menus in step.
 
 #include <QMainWindow>
+#include <QPalette>
+
+#include <memory>
 
 #include "apps/demo/TQDemoCurveEditorCtrl.h"
 #include "host/TQHostAppDelegate.h"
 #include "qt/TQQtEditMenu.h"
-#include "src/view/TQCurveEditorViewBase.h"
+#include "src/editor/TQCurveEditorView.h"
 
+class QAction;
 class QListWidget;
 class TQQtCurveViewWidget;
+class TQQtPopUpButton;
+class TQQtSegmentedControl;
+class TQQtWindowBinding;
+class TQQtZoomScroller;
 
 class TQDemoWindow final : public QMainWindow,
                            public TQNotificationReceiver,
@@ -27,13 +39,21 @@ public:
 
     TQHostAppDelegate& host() { return _host; }
     TQDemoCurveEditorCtrl& controller() { return _controller; }
-    TQCurveEditorViewBase& curveView() { return _view; }
+    TQCurveEditorView& curveView() { return _view; }
     TQQtCurveViewWidget* curveWidget() const { return _curveWidget; }
     TQQtEditMenu* editMenu() const { return _editMenu; }
     QListWidget* objectList() const { return _objectList; }
+    TQQtSegmentedControl* toolSwitch() const { return _toolSwitch; }
+    TQQtPopUpButton* curveSetPopUp() const { return _curveSetPopUp; }
+    TQQtZoomScroller* verticalScroller() const { return _scroller; }
+    QAction* autoZoomAction() const { return _autoZoom; }
 
     // Fits the shown curves into the view, in value and in time.
     void frameAll();
+
+    // The application's look: a dark palette that matches the curve view and its light tool
+    // icons (for the Fusion style).
+    static QPalette darkPalette();
 
     // TQNotificationReceiver
     void notify(TQNotificationWord word) override;
@@ -51,20 +71,30 @@ protected:
     void showEvent(QShowEvent* event) override;
 
 private:
+    void buildWidgets();
     void buildMenus();
-    // The list shows the scene's objects, the scene's selected object selected.
+    void setUpController();
+    // The list shows the scene's objects, the scene's selected objects selected.
     void refreshObjectList();
-    void objectChosen();
+    void objectsChosen();
+    void refreshTitle();
 
     // Declared first: everything below refers to it, so it dies last.
     TQHostAppDelegate _host;
+    TQCurveEditorView _view;
+    // The editor's window, with the controller as its delegate.
+    RWWindow _editorWindow;
     TQDemoCurveEditorCtrl _controller{_host};
-    TQCurveEditorViewBase _view;
 
     // Owned by the window as Qt children.
     QListWidget* _objectList = nullptr;
     TQQtCurveViewWidget* _curveWidget = nullptr;
+    TQQtZoomScroller* _scroller = nullptr;
+    TQQtSegmentedControl* _toolSwitch = nullptr;
+    TQQtPopUpButton* _curveSetPopUp = nullptr;
     TQQtEditMenu* _editMenu = nullptr;
+    QAction* _autoZoom = nullptr;
+    TQQtWindowBinding* _windowBinding = nullptr;
     bool _refreshingList = false;
     bool _framedOnce = false;
 };

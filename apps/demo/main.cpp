@@ -7,6 +7,8 @@
 #include <QElapsedTimer>
 #include <QPixmap>
 #include <QStringList>
+#include <QStyle>
+#include <QStyleFactory>
 
 #include <cstdio>
 #include <cstdlib>
@@ -53,6 +55,10 @@ int main(int argc, char** argv) {
 
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("VantaCurveEditor Demo"));
+    if (QStyle* fusion = QStyleFactory::create(QStringLiteral("Fusion"))) {
+        QApplication::setStyle(fusion);
+        QApplication::setPalette(TQDemoWindow::darkPalette());
+    }
     TQQtServiceInstaller services;
     // The number panel of a double-clicked keypoint.
     TQQtModalService modal;

@@ -1,23 +1,30 @@
-// The demo window end to end: the object chooser drives what the view shows, a drag through
-// the curve widget changes the shown object's channels as one named step that the Edit menu
-// offers, and the menu's Undo gives every channel back exactly.
+// The demo window end to end: the object list drives the automatic curve sets, the pop-up
+// chooses among every set, the tool switch and the vertical scroller work through their
+// models, a drag through the curve widget changes one channel as one named step that the Edit
+// menu offers, and the menu's Undo gives every channel back exactly.
 #include <gtest/gtest.h>
 
 #include <QDialogButtonBox>
 #include <QLineEdit>
 #include <QListWidget>
+#include <QMenu>
 #include <QPushButton>
 #include <QTest>
 #include <QTimer>
 
 #include <cmath>
 #include <memory>
+#include <set>
 #include <vector>
 
 #include "apps/demo/TQDemoWindow.h"
+#include "host/TQHostSampleScene.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "qt/TQQtCurveViewWidget.h"
 #include "qt/TQQtModal.h"
+#include "qt/TQQtPopUpButton.h"
+#include "qt/TQQtSegmentedControl.h"
+#include "qt/TQQtZoomScroller.h"
 
 namespace {
 
@@ -90,51 +97,87 @@ protected:
     TQDemoWindow window;
 };
 
-TEST_F(DemoWindowTest, choosing_an_object__selects_it_in_the_scene_and_shows_its_curves) {
+TEST_F(DemoWindowTest, object_list__drives_the_scene_selection_and_the_automatic_set) {
     const std::vector<TQChannelObjectRootBase*> objects = window.host().scene().objects();
-    ASSERT_GE(objects.size(), 2u);
     ASSERT_EQ(window.objectList()->count(), static_cast<int>(objects.size()))
         << "one row per object";
-    EXPECT_EQ(window.controller().shownObject(), objects.front())
-        << "the sample scene selects its first object";
-    window.objectList()->setCurrentRow(1);
-    EXPECT_TRUE(window.host().isObjectSelected(objects[1]))
-        << "the list must select the object in the scene";
-    EXPECT_EQ(window.controller().shownObject(), objects[1])
-        << "the view must follow the scene's selection";
-    for (TQChannel* channel : shownChannels())
-        EXPECT_EQ(window.host().scene().objectOf(channel), objects[1])
-            << "a curve of another object is shown";
+    EXPECT_EQ(window.controller().selectedCurveSet(), window.controller().curveSetAnimated());
+    window.objectList()->clearSelection();
+    window.objectList()->item(1)->setSelected(true);
+    window.objectList()->item(3)->setSelected(true);
+    EXPECT_TRUE(window.host().isObjectSelected(objects[1]));
+    EXPECT_TRUE(window.host().isObjectSelected(objects[3]));
+    EXPECT_FALSE(window.host().isObjectSelected(objects[0]));
+    std::set<const TQChannelBase*> roots;
+    for (TQChannel* channel : shownChannels()) roots.insert(channel->getChannelRoot());
+    EXPECT_EQ(roots, (std::set<const TQChannelBase*>{objects[1], objects[3]}))
+        << "the Animated set must follow the scene's selection";
 
     // And the other way: the scene selects, the list follows.
     window.host().selectObject(objects[0]);
-    EXPECT_EQ(window.controller().shownObject(), objects[0]);
-    EXPECT_TRUE(window.objectList()->item(0)->isSelected())
-        << "the list must show the scene's selection";
+    EXPECT_TRUE(window.objectList()->item(0)->isSelected());
+    EXPECT_FALSE(window.objectList()->item(1)->isSelected());
 }
 
-TEST_F(DemoWindowTest, shown_object_removed__the_view_empties_and_still_draws) {
-    TQChannelObjectRootBase* shown = window.controller().shownObject();
-    ASSERT_NE(shown, nullptr);
+TEST_F(DemoWindowTest, pop_up__lists_every_set_and_a_choice_shows_it) {
+    window.controller().createCurveSetWithName("My Set");
+    QMenu* menu = window.curveSetPopUp()->popUpMenu();
+    emit menu->aboutToShow();
+    QStringList titles;
+    for (QAction* action : menu->actions())
+        if (!action->isSeparator()) titles << action->text();
+    EXPECT_EQ(titles, (QStringList{"All", "Animated", "Modified", "Active", "Position", "Rotation",
+                                   "Scale", "Shear", "Pivot", "Opacity", "Retiming", "My Set",
+                                   "New Curve Set…", "Manage Curve Sets…"}));
+    for (QAction* action : menu->actions())
+        if (action->text() == "Position") action->trigger();
+    EXPECT_EQ(window.controller().selectedCurveSet(), window.controller().curveSetPosition());
+    EXPECT_EQ(window.curveSetPopUp()->text(), "Position");
+    EXPECT_EQ(window.windowTitle(), "VantaCurveEditor Demo - Position");
+    ASSERT_FALSE(shownChannels().empty());
+    for (TQChannel* channel : shownChannels())
+        EXPECT_EQ(channel->getParent()->getName(), "Position") << channel->getName();
+}
+
+TEST_F(DemoWindowTest, tool_switch_and_scroller__work_through_their_models) {
+    TQQtSegmentedControl* tools = window.toolSwitch();
+    ASSERT_EQ(tools->buttonCount(), 3);
+    EXPECT_TRUE(tools->button(0)->isChecked());
+    EXPECT_FALSE(tools->button(1)->isEnabled()) << "the sketch tool is not offered";
+    EXPECT_FALSE(tools->button(2)->isEnabled()) << "the box tool is not offered";
+    tools->button(2)->click();
+    EXPECT_EQ(window.controller().getCurrentTool(), TQTool::kEdit);
+
+    // Zoomed in, the knob is shorter than the scroller and a page click pans the view.
+    TQQtZoomScroller* scroller = window.verticalScroller();
+    ASSERT_TRUE(scroller->isEnabled());
+    window.curveView().zoomWithFactor(1.0, 4.0);
+    EXPECT_LT(scroller->pageStep(), TQQtZoomScroller::kResolution);
+    const double y = window.curveView().getCurrentViewVolume().origin.y;
+    scroller->triggerAction(QAbstractSlider::SliderPageStepAdd);
+    EXPECT_GT(window.curveView().getCurrentViewVolume().origin.y, y);
+
+    window.autoZoomAction()->trigger();
+    EXPECT_TRUE(window.curveView().autoZoom());
+    EXPECT_FALSE(scroller->isEnabled()) << "the view fits itself; the scroller waits";
+}
+
+TEST_F(DemoWindowTest, shown_object_removed__the_set_follows_and_the_view_still_draws) {
+    TQChannelObjectRootBase* title = window.host().scene().objectNamed(kTQHostSampleTitleObject);
+    ASSERT_NE(title, nullptr);
     const int rows = window.objectList()->count();
     // A keypoint of the object is selected when it goes.
     const QPoint at = keypointInWidget();
     QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
-    ASSERT_TRUE(window.host().removeObject(shown));
+    ASSERT_TRUE(window.host().removeObject(title));
 
-    EXPECT_EQ(window.controller().shownObject(), nullptr)
-        << "nothing is selected in the scene any more";
-    EXPECT_EQ(window.controller().numberOfChannelItems(), 0u)
-        << "curves of a removed object are still shown";
-    EXPECT_EQ(window.curveView().getSelection()->size(), 0u)
-        << "the selection still names the removed channels";
+    for (TQChannel* channel : shownChannels())
+        EXPECT_NE(channel->getChannelRoot(), title) << "a curve of a removed object is shown";
     EXPECT_EQ(window.objectList()->count(), rows - 1)
         << "the list must lose the removed object's row";
     const int frames = window.curveWidget()->framesDrawn();
     drawFrame();
-    EXPECT_GT(window.curveWidget()->framesDrawn(), frames) << "the empty view must still draw";
-    QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier,
-                      at);  // on nothing: no effect
+    EXPECT_GT(window.curveWidget()->framesDrawn(), frames) << "the view must still draw";
     EXPECT_FALSE(window.host().canUndo());
 }
 
