@@ -148,19 +148,13 @@ CMTime TQChannel::getKeyframeMaxTime() const {
 }
 
 double TQChannel::getKeyframeMinValue(bool enabledOnly) const {
-    double result = std::numeric_limits<double>::infinity();
-    for (const TQKeyframeRecord& k : _d->keys) {
-        if (!enabledOnly || k.enabled) result = std::min(result, k.value);
-    }
-    return std::isinf(result) ? _d->initialValue : result;
+    const tq_internal::TQChannelData::Extremes& e = _d->extremes();
+    return enabledOnly ? e.minEnabled : e.minAll;
 }
 
 double TQChannel::getKeyframeMaxValue(bool enabledOnly) const {
-    double result = -std::numeric_limits<double>::infinity();
-    for (const TQKeyframeRecord& k : _d->keys) {
-        if (!enabledOnly || k.enabled) result = std::max(result, k.value);
-    }
-    return std::isinf(result) ? _d->initialValue : result;
+    const tq_internal::TQChannelData::Extremes& e = _d->extremes();
+    return enabledOnly ? e.maxEnabled : e.maxAll;
 }
 
 bool TQChannel::getKeyframeLocked(TQKeyframeHandle handle) const {

@@ -125,6 +125,12 @@ public:
     // Null for a node that is not a folder, or a folder without children. Order is display
     // order; an element may be null.
     virtual const std::vector<TQChannelBase*>* getChildren() const { return nullptr; }
+    // The child with that id; none here (a leaf), folders look theirs up. One virtual call per
+    // step of a reference's walk, which runs at every access of an item to its channel.
+    virtual TQChannelBase* findChild(TQChannelId channelId) const {
+        (void)channelId;
+        return nullptr;
+    }
 
     TQChannelInfo* getInfo() { return &_info; }
     const TQChannelInfo* getInfo() const { return &_info; }

@@ -46,7 +46,7 @@ public:
     TQChannelBase* getChild(size_t index) const;
     // First child (in display order) with this id, or null. Cheap: folders with many children
     // keep an index by id, rebuilt on the first lookup after a change of the children.
-    virtual TQChannelBase* findChild(TQChannelId channelId) const;
+    TQChannelBase* findChild(TQChannelId channelId) const override;
     std::optional<size_t> indexOfChild(const TQChannelBase* child) const;
 
     // Appends a child (null appends an empty slot) and takes ownership; a child that still

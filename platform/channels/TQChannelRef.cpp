@@ -57,9 +57,7 @@ const TQChannelBase* TQChannelRef::getChannel(const TQChannelBase* root) const {
     if (!root || !_valid) return nullptr;
     const TQChannelBase* node = root;
     for (const TQChannelId id : _ids) {
-        const auto* folder = dynamic_cast<const TQChannelFolder*>(node);
-        if (!folder) return nullptr;
-        node = folder->findChild(id);
+        node = node->findChild(id);  // a leaf has no children
         if (!node) return nullptr;
     }
     return node;

@@ -388,8 +388,9 @@ void TQCurveEditorChannelItem::refreshProcessedCurve(const CMTime& start,
     _processedCurveDirty = 0;
 }
 
-bool TQCurveEditorChannelItem::drawProcessedCurve() const {
-    TQChannel* c = channel();
+bool TQCurveEditorChannelItem::drawProcessedCurve() const { return drawsProcessedCurve(channel()); }
+
+bool TQCurveEditorChannelItem::drawsProcessedCurve(const TQChannel* c) const {
     return c && _drawProcessedCurve && c->isChannelAffectedByBehaviors(true);
 }
 
@@ -401,18 +402,25 @@ std::vector<TQKeyframeHandle>* TQCurveEditorChannelItem::keypoints() {
     return &_keypoints;
 }
 
-double TQCurveEditorChannelItem::minY() { return extreme(_minY, -1); }
-double TQCurveEditorChannelItem::maxY() { return extreme(_maxY, +1); }
+double TQCurveEditorChannelItem::minY() { return extreme(channel(), _minY, -1); }
+double TQCurveEditorChannelItem::maxY() { return extreme(channel(), _maxY, +1); }
 
-double TQCurveEditorChannelItem::extreme(double& cached, int sign) {
+void TQCurveEditorChannelItem::extremes(double* minY, double* maxY) {
     TQChannel* c = channel();
+    const double top = extreme(c, _maxY, +1);
+    const double bottom = extreme(c, _minY, -1);
+    if (maxY) *maxY = top;
+    if (minY) *minY = bottom;
+}
+
+double TQCurveEditorChannelItem::extreme(TQChannel* c, double& cached, int sign) {
     if (!c) {
         cached = 0.0;
         return 0.0;
     }
     const bool wantMax = sign > 0;
     cached = wantMax ? c->getKeyframeMaxValue(true) : c->getKeyframeMinValue(true);
-    if (!drawProcessedCurve()) return cached;
+    if (!drawsProcessedCurve(c)) return cached;
 
     const bool absent = !_processedSamplesV;
     if (absent) {

@@ -217,6 +217,8 @@ public:
     // times the keyframe range.
     double minY();
     double maxY();
+    // Both, the channel resolved once: maxY, then minY.
+    void extremes(double* minY, double* maxY);
     void setMinY(double v) { _minY = v; }
     void setMaxY(double v) { _maxY = v; }
 
@@ -275,8 +277,11 @@ protected:
     }
 
 private:
-    // One walk for both extremes: `sign` is -1 for the minimum, +1 for the maximum.
-    double extreme(double& cached, int sign);
+    // One walk for both extremes: `sign` is -1 for the minimum, +1 for the maximum. `c` is
+    // the item's channel, resolved by the caller.
+    double extreme(TQChannel* c, double& cached, int sign);
+    // drawProcessedCurve for the channel the caller resolved.
+    bool drawsProcessedCurve(const TQChannel* c) const;
     // `count` bounded by the arrays present; with neither present, `count` (nothing to read).
     template <class U, class V>
     static uint32_t readable(uint32_t count, const TQSampleArray<U>& u, const TQSampleArray<V>& v) {

@@ -510,8 +510,11 @@ CGRect TQCurveEditorCtrlBase::getMaxViewVolume() const {
             for (const TQCurveEditorItemPtr& item : items) {
                 auto* c = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
                 if (!c) continue;
-                maximum = std::max(maximum, convertFromChannelCoords(c, c->maxY()));
-                minimum = std::min(minimum, convertFromChannelCoords(c, c->minY()));
+                double low = 0.0;
+                double high = 0.0;
+                c->extremes(&low, &high);
+                maximum = std::max(maximum, convertFromChannelCoords(c, high));
+                minimum = std::min(minimum, convertFromChannelCoords(c, low));
             }
         }
     }

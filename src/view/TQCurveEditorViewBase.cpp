@@ -280,12 +280,11 @@ void TQCurveEditorViewBase::performAutoZoom(bool force) {
             for (const TQCurveEditorItemPtr& item : set->allItems()) {
                 auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
                 if (!channelItem) continue;
-                const double lo =
-                    _controller->convertFromChannelCoords(channelItem, channelItem->minY());
-                const double hi =
-                    _controller->convertFromChannelCoords(channelItem, channelItem->maxY());
-                bottom = std::fmin(bottom, lo);
-                top = std::fmax(top, hi);
+                double lo = 0.0;
+                double hi = 0.0;
+                channelItem->extremes(&lo, &hi);
+                bottom = std::fmin(bottom, _controller->convertFromChannelCoords(channelItem, lo));
+                top = std::fmax(top, _controller->convertFromChannelCoords(channelItem, hi));
             }
         }
     } else {

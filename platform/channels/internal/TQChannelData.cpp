@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <atomic>
+#include <cmath>
+#include <limits>
 
 namespace tq_internal {
 
@@ -77,7 +79,7 @@ long TQChannelData::lastAt(const CMTime& time) const {
 size_t TQChannelData::insert(const TQKeyframeRecord& record) {
     const size_t position = upperBound(record.time);
     keys.insert(keys.begin() + long(position), record);
-    cacheValid = false;
+    curveChanged();
     // Keep the index in step for the keyframes that shifted: as cheap as the vector's own
     // shift, and O(1) for the common append at the end.
     if (indexValid) {
@@ -90,7 +92,7 @@ void TQChannelData::eraseAt(size_t position) {
     if (position >= keys.size()) return;
     if (indexValid) index.erase(keys[position].serial);
     keys.erase(keys.begin() + long(position));
-    cacheValid = false;
+    curveChanged();
     if (indexValid) {
         for (size_t i = position; i < keys.size(); ++i) index[keys[i].serial] = i;
     }
@@ -98,7 +100,7 @@ void TQChannelData::eraseAt(size_t position) {
 
 size_t TQChannelData::retime(size_t position, const CMTime& time) {
     if (position >= keys.size()) return position;
-    cacheValid = false;
+    curveChanged();
     // The new place: after every other keyframe at an equal or earlier time. Moving later,
     // the keyframe itself is among those counted by upperBound; moving earlier, it is not.
     const bool later = compareTimes(time, keys[position].time) >= 0;
@@ -123,6 +125,24 @@ size_t TQChannelData::retime(size_t position, const CMTime& time) {
         }
     }
     return target;
+}
+
+const TQChannelData::Extremes& TQChannelData::extremes() const {
+    if (extremesValid) return extremesCache;
+    constexpr double kInf = std::numeric_limits<double>::infinity();
+    double minAll = kInf, maxAll = -kInf, minEnabled = kInf, maxEnabled = -kInf;
+    for (const TQKeyframeRecord& k : keys) {
+        minAll = std::min(minAll, k.value);
+        maxAll = std::max(maxAll, k.value);
+        if (!k.enabled) continue;
+        minEnabled = std::min(minEnabled, k.value);
+        maxEnabled = std::max(maxEnabled, k.value);
+    }
+    auto orInitial = [&](double v) { return std::isinf(v) ? initialValue : v; };
+    extremesCache = {orInitial(minAll), orInitial(maxAll), orInitial(minEnabled),
+                     orInitial(maxEnabled)};
+    extremesValid = true;
+    return extremesCache;
 }
 
 const CurveCache& TQChannelData::curve() const {

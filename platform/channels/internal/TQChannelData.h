@@ -84,18 +84,35 @@ struct TQChannelData {
     // Last keyframe of the run exactly at `time`, or -1.
     long lastAt(const CMTime& time) const;
 
-    // Call after any change of the keyframes' order or membership / of anything evaluated.
+    // Call after any change of the keyframes' order or membership / of anything evaluated
+    // (values, enabled flags and the initial value included).
     void orderChanged() {
         indexValid = false;
-        cacheValid = false;
+        curveChanged();
     }
-    void curveChanged() { cacheValid = false; }
+    void curveChanged() {
+        cacheValid = false;
+        extremesValid = false;
+    }
     const CurveCache& curve() const;
+
+    // Least and greatest keyframe value, over every keyframe and over the enabled ones; with
+    // no keyframe counted, the initial value. Measured once after each edit: a view reads
+    // them for every curve at every update.
+    struct Extremes {
+        double minAll = 0.0;
+        double maxAll = 0.0;
+        double minEnabled = 0.0;
+        double maxEnabled = 0.0;
+    };
+    const Extremes& extremes() const;
 
     mutable std::unordered_map<uint64_t, size_t> index;
     mutable bool indexValid = false;
     mutable CurveCache cache;
     mutable bool cacheValid = false;
+    mutable Extremes extremesCache;
+    mutable bool extremesValid = false;
 };
 
 }  // namespace tq_internal

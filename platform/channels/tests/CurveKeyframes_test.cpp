@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <functional>
+
 #include "platform/channels/tests/CurveCatalogue.h"
 
 using namespace curve_catalogue;
@@ -270,6 +272,49 @@ TEST_F(CurveKeyframes, clone_assign_and_compare__round_trip_the_state) {
     EXPECT_EQ(c->numberOfKeyframes(), 0u);
     EXPECT_EQ(c->getInitialValue(), c->getDefaultValue());
     EXPECT_EQ(c->getExtrapolation(kTQExtrapolationAfter), kTQExtrapolationConstant);
+}
+
+}  // namespace
+
+namespace {
+
+// The extremes are kept from one read to the next; every edit must make them read anew.
+TEST_F(CurveKeyframes, extremes__follow_every_kind_of_edit) {
+    const struct {
+        const char* edit;
+        std::function<void()> apply;
+        double min, max, minEnabled, maxEnabled;
+    } steps[] = {
+        {"as set", [] {}, 10, 30, 10, 30},
+        {"a value", [&] { c->setKeyframeValue(d, 50.0); }, 10, 50, 10, 50},
+        {"disabled", [&] { c->setKeyframeEnabled(a, false); }, 10, 50, 20, 50},
+        {"a new keyframe", [&] { c->setKeyframe(seconds(4.0), -5.0); }, -5, 50, -5, 50},
+        {"a move",
+         [&] {
+             const CMTime later = seconds(2.5);
+             const double value = 100.0;
+             c->setKeyframeTime(b, &later, &value);
+         },
+         -5, 100, -5, 100},
+        {"an offset", [&] { c->offsetCurve(nullptr, 1.0); }, -4, 101, -4, 101},
+        {"a deletion", [&] { c->deleteKeyframe(b); }, -4, 51, -4, 51},
+        {"all gone: the initial value",
+         [&] {
+             c->deleteAllKeyframes(seconds(0.0));
+             c->setInitialValue(7.0);
+         },
+         7, 7, 7, 7},
+    };
+    for (const auto& step : steps) {
+        step.apply();
+        EXPECT_DOUBLE_EQ(c->getKeyframeMinValue(false), step.min) << step.edit;
+        EXPECT_DOUBLE_EQ(c->getKeyframeMaxValue(false), step.max) << step.edit;
+        EXPECT_DOUBLE_EQ(c->getKeyframeMinValue(true), step.minEnabled) << step.edit;
+        EXPECT_DOUBLE_EQ(c->getKeyframeMaxValue(true), step.maxEnabled) << step.edit;
+    }
+    auto copy = flat();
+    *copy = static_cast<const TQChannelBase&>(*c);
+    EXPECT_DOUBLE_EQ(copy->getKeyframeMaxValue(), 7.0) << "an assigned channel measures anew";
 }
 
 }  // namespace
