@@ -104,8 +104,6 @@ void BM_ObjectSelectionChange(benchmark::State& state) {
     }
     state.counters["items"] = static_cast<double>(e.ctrl.numberOfChannelItems());
 }
-BENCHMARK(BM_ObjectSelectionChange)
-    ->ArgsProduct({{0, 1}, {1, 10}})
-    ->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_ObjectSelectionChange)->ArgsProduct({{0, 1}, {1, 10}})->Unit(benchmark::kMillisecond);
 
 }  // namespace
