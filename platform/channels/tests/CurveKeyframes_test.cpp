@@ -296,7 +296,12 @@ TEST_F(CurveKeyframes, extremes__follow_every_kind_of_edit) {
              c->setKeyframeTime(b, &later, &value);
          },
          -5, 100, -5, 100},
-        {"an offset", [&] { c->offsetCurve(nullptr, 1.0); }, -4, 101, -4, 101},
+        {"an offset",
+         [&] {
+             const CMTime at = seconds(2.5);
+             c->offsetCurve(&at, 101.0);
+         },
+         -4, 101, -4, 101},
         {"a deletion", [&] { c->deleteKeyframe(b); }, -4, 51, -4, 51},
         {"all gone: the initial value",
          [&] {
