@@ -17,6 +17,10 @@ Edges edgesOf(const CGRect& rect) {
     return {s.origin.x, s.origin.y, s.origin.x + s.size.width, s.origin.y + s.size.height};
 }
 
+bool hasNaN(const Edges& e) {
+    return std::isnan(e.minX) || std::isnan(e.minY) || std::isnan(e.maxX) || std::isnan(e.maxY);
+}
+
 CGRect rectFromEdges(double minX, double minY, double maxX, double maxY) {
     return CGRectMake(minX, minY, maxX - minX, maxY - minY);
 }
@@ -108,10 +112,12 @@ bool CGRectIntersectsRect(const CGRect& a, const CGRect& b) {
 CGRect CGRectIntersection(const CGRect& a, const CGRect& b) {
     if (CGRectIsNull(a) || CGRectIsNull(b)) return CGRectNull;
     const Edges ea = edgesOf(a), eb = edgesOf(b);
+    // std::max and std::min keep a NaN in one order of their arguments only, so the edges are
+    // tested before they meet: a rectangle with a NaN edge shares no area with anything.
+    if (hasNaN(ea) || hasNaN(eb)) return CGRectNull;
     const double minX = std::max(ea.minX, eb.minX), maxX = std::min(ea.maxX, eb.maxX);
     const double minY = std::max(ea.minY, eb.minY), maxY = std::min(ea.maxY, eb.maxY);
-    // Negated tests so that NaN edges give null too.
-    if (!(maxX >= minX) || !(maxY >= minY)) return CGRectNull;
+    if (maxX < minX || maxY < minY) return CGRectNull;
     return rectFromEdges(minX, minY, maxX, maxY);
 }
 

@@ -99,8 +99,8 @@ bool CGRectContainsRect(const CGRect& container, const CGRect& rect);
 // True when the two share area. Rectangles that only touch along an edge do not intersect.
 bool CGRectIntersectsRect(const CGRect& a, const CGRect& b);
 
-// The common part. Null when the two are disjoint or either is null; rectangles that touch
-// along an edge give a rectangle of zero width or height there.
+// The common part. Null when the two are disjoint, either is null or either has a NaN edge;
+// rectangles that touch along an edge give a rectangle of zero width or height there.
 CGRect CGRectIntersection(const CGRect& a, const CGRect& b);
 // The least rectangle holding both. A null operand is ignored.
 CGRect CGRectUnion(const CGRect& a, const CGRect& b);
