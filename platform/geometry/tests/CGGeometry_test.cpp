@@ -4,137 +4,134 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <random>
 
-class RectQueries : public ::testing::Test {
-protected:
-    // The same area written three ways.
-    const CGRect positive = CGRectMake(1.0, 2.0, 4.0, 6.0);
-    const CGRect negativeWidth = CGRectMake(5.0, 2.0, -4.0, 6.0);
-    const CGRect negativeBoth = CGRectMake(5.0, 8.0, -4.0, -6.0);
-};
+namespace {
 
-TEST_F(RectQueries, edges__negativeSizesAnswerForStandardizedForm) {
-    for (const CGRect& r : {positive, negativeWidth, negativeBoth}) {
-        SCOPED_TRACE(testing::Message() << "size " << r.size.width << " x " << r.size.height);
-        EXPECT_EQ(CGRectGetMinX(r), 1.0);
-        EXPECT_EQ(CGRectGetMidX(r), 3.0);
-        EXPECT_EQ(CGRectGetMaxX(r), 5.0);
-        EXPECT_EQ(CGRectGetMinY(r), 2.0);
-        EXPECT_EQ(CGRectGetMidY(r), 5.0);
-        EXPECT_EQ(CGRectGetMaxY(r), 8.0);
-        EXPECT_EQ(CGRectGetWidth(r), 4.0);
-        EXPECT_EQ(CGRectGetHeight(r), 6.0);
-        EXPECT_EQ(CGRectStandardize(r), positive);
-        EXPECT_TRUE(CGRectEqualToRect(r, positive)) << "same area must compare equal";
+CGRect R(double x, double y, double w, double h) { return CGRectMake(x, y, w, h); }
+bool in(const CGRect& r, double x, double y) { return CGRectContainsPoint(r, CGPointMake(x, y)); }
+
+// Every operation that builds a rectangle, against the points it must and must not hold, for
+// random rectangles of both signs of size on a grid of half units.
+TEST(Rect, operations__agreeWithPointMembershipOnAGrid) {
+    std::mt19937 rng(5);
+    std::uniform_int_distribution<int> c(-4, 4);
+    for (int trial = 0; trial < 300; ++trial) {
+        const int ax = c(rng), ay = c(rng), aw = c(rng), ah = c(rng), bx = c(rng), by = c(rng),
+                  bw = c(rng), bh = c(rng);
+        const CGRect a = R(ax, ay, aw, ah), b = R(bx, by, bw, bh);
+        const BNRect<double> ba = BNRect<double>::fromCGRect(a), bb = BNRect<double>::fromCGRect(b);
+        const CGRect i = CGRectIntersection(a, b), u = CGRectUnion(a, b), s = CGRectStandardize(a);
+        const CGRect moved = CGRectOffset(a, 1, -2), inset = CGRectInset(a, 0.5, 0.5),
+                     whole = CGRectIntegral(R(ax + 0.2, ay - 0.3, aw, ah));
+        CGRect slice, rest;
+        CGRectDivide(a, &slice, &rest, 1.5, CGRectEdge(trial % 4));
+        SCOPED_TRACE(testing::Message()
+                     << "a " << ax << "," << ay << "," << aw << "," << ah << " b " << bx << ","
+                     << by << "," << bw << "," << bh << " edge " << trial % 4);
+        for (double x = -9.5; x <= 9.5; x += 0.5) {
+            for (double y = -9.5; y <= 9.5; y += 0.5) {
+                const bool inA = in(a, x, y), inB = in(b, x, y);
+                ASSERT_EQ(in(s, x, y), inA) << x << ", " << y;
+                ASSERT_EQ(ba.contains(x, y), inA) << x << ", " << y;
+                ASSERT_EQ(in(i, x, y), inA && inB) << x << ", " << y;
+                ASSERT_EQ(ba.intersected(bb).contains(x, y), inA && inB) << x << ", " << y;
+                ASSERT_TRUE(!(inA || inB) || (in(u, x, y) && ba.united(bb).contains(x, y)))
+                    << x << ", " << y;
+                ASSERT_EQ(in(moved, x + 1, y - 2), inA) << x << ", " << y;
+                ASSERT_EQ(in(inset, x, y), in(a, x - 0.5, y - 0.5) && in(a, x + 0.5, y + 0.5))
+                    << x << ", " << y;
+                ASSERT_EQ(in(slice, x, y) + in(rest, x, y), int(inA))
+                    << "slice and rest share nothing";
+                ASSERT_TRUE(!in(R(ax + 0.2, ay - 0.3, aw, ah), x, y) || in(whole, x, y))
+                    << x << ", " << y;
+            }
+        }
+        const bool shared = CGRectGetWidth(i) > 0 && CGRectGetHeight(i) > 0 && !CGRectIsNull(i);
+        EXPECT_EQ(CGRectIntersectsRect(a, b), shared);
+        EXPECT_EQ(ba.intersects(bb), shared);
+        EXPECT_EQ(CGRectContainsRect(a, b), !CGRectIsNull(i) && CGRectEqualToRect(i, b));
+        EXPECT_TRUE(CGRectEqualToRect(a, s));
+        // The union is the least rectangle: each of its edges is an edge of an operand.
+        for (const auto& [edge, of] :
+             {std::pair{CGRectGetMinX(u), std::min(CGRectGetMinX(a), CGRectGetMinX(b))},
+              {CGRectGetMaxY(u), std::max(CGRectGetMaxY(a), CGRectGetMaxY(b))}})
+            EXPECT_EQ(edge, of);
+        // The slice lies on its own side, as wide as the amount allows.
+        const double sliceSides[] = {CGRectGetMinX(slice), CGRectGetMinY(slice),
+                                     CGRectGetMaxX(slice), CGRectGetMaxY(slice)};
+        const double sides[] = {CGRectGetMinX(a), CGRectGetMinY(a), CGRectGetMaxX(a),
+                                CGRectGetMaxY(a)};
+        EXPECT_EQ(sliceSides[trial % 4], sides[trial % 4]);
+        EXPECT_EQ(trial % 2 ? CGRectGetHeight(slice) : CGRectGetWidth(slice),
+                  std::min(1.5, trial % 2 ? CGRectGetHeight(a) : CGRectGetWidth(a)));
     }
-    EXPECT_NE(negativeBoth, positive) << "operator== compares the stored fields";
 }
 
-TEST_F(RectQueries, containsPoint__halfOpenAndEmpty) {
-    EXPECT_TRUE(CGRectContainsPoint(negativeBoth, CGPointMake(1.0, 2.0)))
-        << "minimum corner is inside";
-    EXPECT_FALSE(CGRectContainsPoint(negativeBoth, CGPointMake(5.0, 3.0)))
-        << "right edge is outside";
-    EXPECT_FALSE(CGRectContainsPoint(negativeBoth, CGPointMake(2.0, 8.0))) << "top edge is outside";
-    EXPECT_TRUE(CGRectContainsPoint(negativeWidth, CGPointMake(4.999, 7.999)));
-    EXPECT_FALSE(CGRectContainsPoint(CGRectMake(0, 0, 0, 5), CGPointMake(0, 1)))
-        << "zero width holds nothing";
-    EXPECT_FALSE(CGRectContainsPoint(CGRectNull, CGPointMake(0, 0)));
-    EXPECT_TRUE(CGRectContainsPoint(CGRectInfinite, CGPointMake(-1e300, 1e300)));
-    EXPECT_FALSE(CGRectContainsPoint(positive, CGPointMake(std::nan(""), 3.0)));
-}
-
-TEST_F(RectQueries, nullAndEmpty__classification) {
-    EXPECT_TRUE(CGRectIsNull(CGRectNull));
-    EXPECT_TRUE(CGRectIsEmpty(CGRectNull)) << "null is also empty";
-    EXPECT_FALSE(CGRectIsNull(CGRectZero));
-    EXPECT_TRUE(CGRectIsEmpty(CGRectZero));
-    EXPECT_TRUE(CGRectIsEmpty(CGRectMake(3, 3, -2, 0)));
-    EXPECT_TRUE(CGRectIsEmpty(CGRectMake(0, 0, std::nan(""), 1)));
-    EXPECT_FALSE(CGRectIsEmpty(negativeBoth));
-    EXPECT_TRUE(CGRectIsInfinite(CGRectInfinite));
-    EXPECT_FALSE(CGRectIsInfinite(CGRectMake(-1e300, -1e300, 2e300, 2e300)));
-    EXPECT_TRUE(CGRectEqualToRect(CGRectNull, CGRectMake(HUGE_VAL, 0, 5, 5)))
-        << "any null equals null";
+TEST(Rect, edgeCases__nullEmptyInfiniteHalfOpenAndNaN) {
+    // The same area written three ways answers as its standardized form.
+    for (const CGRect& r : {R(1, 2, 4, 6), R(5, 2, -4, 6), R(5, 8, -4, -6)}) {
+        EXPECT_EQ(
+            (std::array{CGRectGetMinX(r), CGRectGetMidX(r), CGRectGetMaxX(r), CGRectGetMinY(r),
+                        CGRectGetMidY(r), CGRectGetMaxY(r), CGRectGetWidth(r), CGRectGetHeight(r)}),
+            (std::array{1.0, 3.0, 5.0, 2.0, 5.0, 8.0, 4.0, 6.0}));
+        const BNRect<double> b = BNRect<double>::fromCGRect(r);
+        EXPECT_EQ((std::array{b.minX(), b.maxX(), b.minY(), b.maxY()}),
+                  (std::array{1.0, 5.0, 2.0, 8.0}));
+        EXPECT_EQ(b.standardized(), BNRect<double>(1, 2, 4, 6));
+        EXPECT_EQ(b.toCGRect(), r) << "conversions carry the fields as they stand";
+    }
+    EXPECT_NE(R(5, 8, -4, -6), R(1, 2, 4, 6)) << "operator== compares the stored fields";
+    // Null is empty too, equals any null, holds nothing, and every operation on it gives null.
+    for (const CGRect& r : {CGRectNull, R(HUGE_VAL, 0, 5, 5)}) {
+        EXPECT_TRUE(CGRectIsNull(r) && CGRectIsEmpty(r) && !CGRectIsInfinite(r) &&
+                    CGRectEqualToRect(r, CGRectNull));
+        EXPECT_FALSE(in(r, 0, 0) || CGRectContainsRect(r, R(0, 0, 1, 1)) ||
+                     CGRectContainsRect(R(0, 0, 1, 1), r));
+        for (const CGRect& made :
+             {CGRectStandardize(r), CGRectInset(r, -5, -5), CGRectOffset(r, 1, 1),
+              CGRectIntegral(r), CGRectIntersection(r, R(0, 0, 1, 1)),
+              CGRectIntersection(R(0, 0, 1, 1), r), CGRectUnion(r, r)})
+            EXPECT_TRUE(CGRectIsNull(made));
+    }
+    EXPECT_EQ(CGRectUnion(R(4, 4, -2, -2), CGRectNull), R(2, 2, 2, 2)) << "null is ignored";
+    EXPECT_EQ(CGRectUnion(CGRectNull, R(4, 4, -2, -2)), R(2, 2, 2, 2));
+    EXPECT_EQ(CGRectUnion(R(4, 4, -2, -2), R(10, -1, 0, 0)), R(2, -1, 8, 5))
+        << "an empty operand counts";
+    EXPECT_EQ(CGRectGetMinX(CGRectNull), HUGE_VAL);
     EXPECT_FALSE(CGRectEqualToRect(CGRectNull, CGRectZero));
-}
-
-class RectOperations : public ::testing::Test {};
-
-TEST_F(RectOperations, intersection__disjointTouchingAndNull) {
-    const CGRect a = CGRectMake(0, 0, 10, 10);
-    {
-        const CGRect i = CGRectIntersection(a, CGRectMake(15, 5, -10, -10));  // x 5..15, y -5..5
-        EXPECT_EQ(i, CGRectMake(5, 0, 5, 5)) << "negative-size operand is standardized first";
-        EXPECT_TRUE(CGRectIntersectsRect(a, CGRectMake(15, 5, -10, -10)));
-    }
-    {
-        const CGRect touching = CGRectMake(10, 0, 5, 10);
-        EXPECT_EQ(CGRectIntersection(a, touching), CGRectMake(10, 0, 0, 10))
-            << "shared edge: zero width";
-        EXPECT_FALSE(CGRectIntersectsRect(a, touching)) << "a shared edge is not shared area";
-    }
-    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(a, CGRectMake(20, 20, 1, 1))))
-        << "disjoint gives null";
-    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(a, CGRectNull)));
-    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(CGRectNull, CGRectNull)));
-    EXPECT_FALSE(CGRectIntersectsRect(CGRectNull, CGRectInfinite));
-}
-
-TEST_F(RectOperations, union__nullIsIdentity) {
-    const CGRect a = CGRectMake(4, 4, -2, -2);
-    EXPECT_EQ(CGRectUnion(a, CGRectNull), CGRectMake(2, 2, 2, 2))
-        << "null is ignored; result standardized";
-    EXPECT_EQ(CGRectUnion(CGRectNull, a), CGRectMake(2, 2, 2, 2));
-    EXPECT_TRUE(CGRectIsNull(CGRectUnion(CGRectNull, CGRectNull)));
-    EXPECT_EQ(CGRectUnion(a, CGRectMake(10, -1, 0, 0)), CGRectMake(2, -1, 8, 5))
-        << "an empty rect still counts";
-}
-
-TEST_F(RectOperations, insetOffsetIntegral__standardizeAndCollapse) {
-    const CGRect r = CGRectMake(10, 10, -6, -4);  // 4..10 x 6..10
-    EXPECT_EQ(CGRectInset(r, 1, 1), CGRectMake(5, 7, 4, 2));
-    EXPECT_EQ(CGRectInset(r, -1, 0), CGRectMake(3, 6, 8, 4)) << "negative inset grows";
-    EXPECT_EQ(CGRectInset(r, 3, 2), CGRectMake(7, 8, 0, 0))
-        << "exactly used up is an empty rect, not null";
-    EXPECT_TRUE(CGRectIsNull(CGRectInset(r, 3.5, 0))) << "inset past the centre gives null";
-    EXPECT_TRUE(CGRectIsNull(CGRectInset(CGRectNull, -5, -5)));
-    EXPECT_EQ(CGRectOffset(r, 1, -1), CGRectMake(5, 5, 6, 4));
-    EXPECT_TRUE(CGRectIsNull(CGRectOffset(CGRectNull, 1, 1))) << "a null rectangle can't be moved";
-    EXPECT_EQ(CGRectIntegral(CGRectMake(0.5, -0.5, 1.2, 0.4)), CGRectMake(0, -1, 2, 1));
-    EXPECT_TRUE(CGRectContainsRect(r, CGRectInset(r, 1, 1)));
-    EXPECT_TRUE(CGRectContainsRect(CGRectMake(0.1, 0.1, 0.2, 0.2), CGRectMake(0.1, 0.1, 0.2, 0.2)))
-        << "a rectangle contains itself despite rounding of its edges";
-    EXPECT_FALSE(CGRectContainsRect(r, CGRectNull));
-}
-
-TEST_F(RectOperations, divide__edgesAndClamping) {
-    const CGRect r = CGRectMake(0, 0, 10, 4);
+    EXPECT_FALSE(CGRectIsNull(CGRectZero));
+    EXPECT_TRUE(CGRectIsEmpty(CGRectZero) && CGRectIsEmpty(R(3, 3, -2, 0)) &&
+                CGRectIsEmpty(R(0, 0, NAN, 1)));
+    EXPECT_TRUE(BNRect<double>(0, 0, 0, 3).isEmpty() && BNRect<double>(0, 0, NAN, 3).isEmpty());
+    EXPECT_TRUE(CGRectIsInfinite(CGRectInfinite) && in(CGRectInfinite, -1e300, 1e300));
+    EXPECT_FALSE(CGRectIsInfinite(R(-1e300, -1e300, 2e300, 2e300)));
+    // Touching along an edge: a zero-width intersection, no shared area; apart: null.
+    EXPECT_EQ(CGRectIntersection(R(0, 0, 10, 10), R(10, 0, 5, 10)), R(10, 0, 0, 10));
+    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(R(0, 0, 10, 10), R(2, 11, 1, 1))));
+    EXPECT_EQ(BNRect<double>(0, 0, 1, 1).intersected(BNRect<double>(5, 5, 1, 1)), BNRect<double>())
+        << "a zero rectangle";
+    // A NaN edge shares no area and holds no point.
+    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(R(0, 0, 10, 10), R(NAN, 0, 1, 1))));
+    EXPECT_TRUE(CGRectIsNull(CGRectIntersection(R(0, NAN, 1, 1), R(0, 0, 10, 10))));
+    EXPECT_FALSE(in(R(0, 0, 10, 10), NAN, 3));
+    // Inset: used up exactly is empty, past the centre null; a rectangle contains itself
+    // whatever rounding its edges see; a divide takes no more than there is, NaN as nothing.
+    EXPECT_EQ(CGRectInset(R(10, 10, -6, -4), 3, 2), R(7, 8, 0, 0));
+    EXPECT_EQ(CGRectInset(R(10, 10, -6, -4), -1, 0), R(3, 6, 8, 4));
+    EXPECT_EQ(CGRectIntegral(R(2.5, 1.5, -1, -1.2)), R(1, 0, 2, 2));
+    EXPECT_TRUE(CGRectIsNull(CGRectInset(R(10, 10, -6, -4), 3.5, 0)) &&
+                CGRectIsNull(CGRectInset(R(10, 10, -6, -4), 0, 2.5)));
+    EXPECT_TRUE(CGRectContainsRect(R(0.1, 0.1, 0.2, 0.2), R(0.1, 0.1, 0.2, 0.2)));
     CGRect slice, rest;
-    CGRectDivide(r, &slice, &rest, 3, CGRectMaxXEdge);
-    EXPECT_EQ(slice, CGRectMake(7, 0, 3, 4));
-    EXPECT_EQ(rest, CGRectMake(0, 0, 7, 4));
-    CGRectDivide(r, &slice, &rest, 99, CGRectMinYEdge);
-    EXPECT_EQ(slice, r) << "an amount beyond the extent takes everything";
-    EXPECT_EQ(rest, CGRectMake(0, 4, 10, 0));
-    CGRectDivide(CGRectNull, &slice, nullptr, 1, CGRectMinXEdge);
-    EXPECT_TRUE(CGRectIsNull(slice));
+    CGRectDivide(R(10, 4, -10, -4), &slice, &rest, 99, CGRectMaxYEdge);
+    EXPECT_EQ(slice, R(0, 0, 10, 4));
+    EXPECT_EQ(rest, R(0, 0, 10, 0));
+    CGRectDivide(R(10, 4, -10, -4), &slice, nullptr, NAN, CGRectMaxXEdge);
+    EXPECT_EQ(slice, R(10, 0, 0, 4));
+    CGRectDivide(CGRectNull, &slice, &rest, 1, CGRectMinXEdge);
+    EXPECT_TRUE(CGRectIsNull(slice) && CGRectIsNull(rest));
+    EXPECT_EQ(BNRect<float>::fromCGRect(R(0.5, 1, 2, 3)), BNRect<float>(0.5f, 1, 2, 3));
 }
 
-TEST(BNRect, conversions__keepFieldsAndAnswerStandardized) {
-    const BNRect<double> r = BNRect<double>::fromCGRect(CGRectMake(5, 8, -4, -6));
-    EXPECT_EQ(r, BNRect<double>(5, 8, -4, -6)) << "conversion keeps the stored sign";
-    EXPECT_EQ(r.toCGRect(), CGRectMake(5, 8, -4, -6));
-    EXPECT_EQ(r.standardized(), BNRect<double>(1, 2, 4, 6));
-    EXPECT_EQ(r.minX(), 1.0);
-    EXPECT_EQ(r.maxY(), 8.0);
-    EXPECT_TRUE(r.contains(1.0, 2.0));
-    EXPECT_FALSE(r.contains(5.0, 2.0)) << "maximum edge is outside";
-    EXPECT_TRUE(BNRect<double>(0, 0, 0, 3).isEmpty());
-    EXPECT_EQ(r.intersected(BNRect<double>(4, 7, 10, 10)), BNRect<double>(4, 7, 1, 1));
-    EXPECT_EQ(r.intersected(BNRect<double>(20, 20, 1, 1)), BNRect<double>())
-        << "disjoint gives zero";
-    EXPECT_FALSE(r.intersects(BNRect<double>(5, 2, 1, 1))) << "touching is not intersecting";
-    EXPECT_EQ(r.united(BNRect<double>(-1, 0, 1, 1)), BNRect<double>(-1, 0, 6, 8));
-    EXPECT_EQ(BNRect<float>::fromCGRect(CGRectMake(0.5, 1, 2, 3)), BNRect<float>(0.5f, 1, 2, 3));
-}
+}  // namespace
