@@ -7,63 +7,37 @@
 
 namespace {
 
-double angleOf(const BNVec2d& v) { return std::atan2(v.y, v.x); }
+using BNAlgorithm::findProjectionOn45DegreesDirection;
 
-// Angle between two vectors, folded into [0, pi].
-double angleBetween(const BNVec2d& a, const BNVec2d& b) {
-    return std::abs(std::remainder(angleOf(a) - angleOf(b), 2.0 * std::numbers::pi));
-}
+TEST(BNAlgorithmTest, findProjection__nearestStepOfTheFamilyAndExactOnAxes) {
+    // A reference on an axis (or none, which stands for the x axis) snaps exactly.
+    const struct {
+        BNVec2d vector, reference, expected;
+    } exact[] = {{{10.0, 1.0}, {0.0, 3.0}, {10.0, 0.0}},  {{-0.5, -7.0}, {0.0, 3.0}, {0.0, -7.0}},
+                 {{3.0, 0.4}, {0.0, 0.0}, {3.0, 0.0}},    {{3.0, 0.4}, {5e-8, 0.0}, {3.0, 0.0}},
+                 {{-2.0, 0.1}, {-1.0, 0.0}, {-2.0, 0.0}}, {{0.0, 0.0}, {1.0, 2.0}, {0.0, 0.0}}};
+    for (const auto& c : exact)
+        EXPECT_EQ(findProjectionOn45DegreesDirection(c.vector, c.reference, 0.0), c.expected)
+            << c.vector.x << ", " << c.vector.y;
+    const BNVec2d nan = findProjectionOn45DegreesDirection({NAN, 1.0}, {1.0, 2.0}, 0.0);
+    EXPECT_TRUE(std::isnan(nan.x) && std::isnan(nan.y))
+        << "non-finite input must not pass as a value";
 
-TEST(BNAlgorithmTest, findProjection__axisReferenceSnapsExactly) {
-    const BNVec2d vertical{0.0, 3.0};
-    {
-        const BNVec2d r =
-            BNAlgorithm::findProjectionOn45DegreesDirection({10.0, 1.0}, vertical, 0.0);
-        EXPECT_EQ(r.x, 10.0) << "a nearly horizontal drag must snap to exactly horizontal";
-        EXPECT_EQ(r.y, 0.0);
-    }
-    {
-        const BNVec2d r =
-            BNAlgorithm::findProjectionOn45DegreesDirection({-0.5, -7.0}, vertical, 0.0);
-        EXPECT_EQ(r.x, 0.0) << "a nearly downward drag must snap to exactly vertical";
-        EXPECT_EQ(r.y, -7.0);
-    }
-}
-
-TEST(BNAlgorithmTest, findProjection__familyFollowsAnArbitraryReference) {
-    const double refAngle = 0.3;
-    const BNVec2d reference{2.0 * std::cos(refAngle), 2.0 * std::sin(refAngle)};
-    for (int step = 0; step < 8; ++step) {
-        SCOPED_TRACE(step);
-        // A vector 10 degrees past each step of the family lands on that step.
-        const double a = refAngle + step * std::numbers::pi / 4.0 + 10.0 * std::numbers::pi / 180.0;
-        const BNVec2d v{5.0 * std::cos(a), 5.0 * std::sin(a)};
-        const BNVec2d r = BNAlgorithm::findProjectionOn45DegreesDirection(v, reference, 0.0);
-        const double stepAngle = refAngle + step * std::numbers::pi / 4.0;
-        EXPECT_NEAR(angleBetween(r, {std::cos(stepAngle), std::sin(stepAngle)}), 0.0, 1e-9)
-            << "result is not on the nearest 45-degree step";
-        EXPECT_NEAR(std::hypot(r.x, r.y), 5.0 * std::cos(10.0 * std::numbers::pi / 180.0), 1e-9)
-            << "result is not the orthogonal projection";
-    }
-}
-
-TEST(BNAlgorithmTest, findProjection__degenerateInputs) {
-    {
-        const BNVec2d r =
-            BNAlgorithm::findProjectionOn45DegreesDirection({3.0, 0.4}, {0.0, 0.0}, 0.0);
-        EXPECT_EQ(r.x, 3.0) << "a zero reference uses the x axis family";
-        EXPECT_EQ(r.y, 0.0);
-    }
-    {
-        const BNVec2d r =
-            BNAlgorithm::findProjectionOn45DegreesDirection({0.0, 0.0}, {1.0, 2.0}, 0.0);
-        EXPECT_EQ(r, (BNVec2d{0.0, 0.0}));
-    }
-    {
-        const BNVec2d r =
-            BNAlgorithm::findProjectionOn45DegreesDirection({NAN, 1.0}, {1.0, 2.0}, 0.0);
-        EXPECT_TRUE(std::isnan(r.x) && std::isnan(r.y))
-            << "non-finite input must not pass as a value";
+    // Any reference, any offset: a vector 10 degrees past a step of the family projects onto it.
+    for (const double offset : {0.0, 0.2}) {
+        const double base = 0.3 + offset;
+        for (int step = -8; step < 8; ++step) {
+            const double a = base + step * std::numbers::pi / 4.0 + 10.0 * std::numbers::pi / 180.0;
+            const BNVec2d r = findProjectionOn45DegreesDirection(
+                {5.0 * std::cos(a), 5.0 * std::sin(a)}, {2.0 * std::cos(0.3), 2.0 * std::sin(0.3)},
+                offset);
+            const double length = 5.0 * std::cos(10.0 * std::numbers::pi / 180.0);
+            const double stepAngle = base + step * std::numbers::pi / 4.0;
+            EXPECT_NEAR(r.x, length * std::cos(stepAngle), 1e-9)
+                << "step " << step << " offset " << offset;
+            EXPECT_NEAR(r.y, length * std::sin(stepAngle), 1e-9)
+                << "step " << step << " offset " << offset;
+        }
     }
 }
 
