@@ -3,6 +3,7 @@
 #include <functional>
 
 #include "platform/channels/tests/CurveCatalogue.h"
+#include "platform/channels/tests/KeyframeText.h"
 
 using namespace curve_catalogue;
 
@@ -10,6 +11,11 @@ namespace {
 
 constexpr double kTolerance = 1e-12;
 
+std::unique_ptr<TQChannel> copyOf(const TQChannel& c) {
+    return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
+}
+
+// Keyframes at 1, 2 and 3 s valued 10, 20 and 30, made in that order.
 class CurveKeyframes : public ::testing::Test {
 protected:
     void SetUp() override {
@@ -18,260 +24,374 @@ protected:
         b = c->setKeyframe(seconds(2.0), 20.0);
         d = c->setKeyframe(seconds(3.0), 30.0);
     }
-    double valueOf(TQKeyframeHandle h) const {
-        double v = 0.0;
-        c->getKeyframe(h, nullptr, &v);
-        return v;
-    }
+    bool live(TQKeyframeHandle h) const { return c->getKeyframe(h, nullptr, nullptr); }
     std::unique_ptr<TQChannel> c;
     TQKeyframeHandle a = nullptr, b = nullptr, d = nullptr;
 };
 
-TEST_F(CurveKeyframes, getKeyframe__answers_liveness_with_null_out_pointers) {
-    EXPECT_TRUE(c->getKeyframe(a, nullptr, nullptr));
-    EXPECT_FALSE(c->getKeyframe(nullptr, nullptr, nullptr));
-    auto other = flat();
-    EXPECT_FALSE(other->getKeyframe(a, nullptr, nullptr)) << "a handle of another channel";
+TEST_F(CurveKeyframes, reading__neighboursExtremesAndLookupsByTime) {
+    c->setKeyframeEnabled(b, false);
+    c->setKeyframeValue(b, 40.0);
+    // Neighbours strictly before and after a time, passing disabled keyframes over when asked;
+    // a lookup within a tolerance answers the nearest keyframe, on either side.
+    const auto found = [](bool ok, const CMTime& t) { return ok ? CMTimeGetSeconds(t) : -1.0; };
+    for (const auto& [at, previous, previousEnabled, next, near] :
+         {std::tuple{2.5, 2.0, 1.0, 3.0, -1.0},
+          {2.0, 1.0, 1.0, 3.0, 2.0},
+          {1.0, -1.0, -1.0, 3.0, 1.0},
+          {3.0, 2.0, 1.0, -1.0, 3.0},
+          {2.3, 2.0, 1.0, 3.0, 2.0},
+          {1.6, 1.0, 1.0, 3.0, 2.0}}) {
+        CMTime p = seconds(at), pe = p, n = p, h = p;
+        EXPECT_EQ(found(c->previousKeyframeTime(&p), p), previous) << at;
+        EXPECT_EQ(found(c->previousKeyframeTime(&pe, true), pe), previousEnabled) << at;
+        EXPECT_EQ(found(c->nextKeyframeTime(&n, at < 2.0), n), next) << at;
+        EXPECT_EQ(found(c->hasKeyframeAtTime(&h, 0.45), h), near) << at;
+        CMTime same = seconds(at);  // input and output may alias
+        EXPECT_EQ(found(c->getPreviousKeyframe(same, &same, nullptr), same), previous) << at;
+    }
+    CMTime t = seconds(2.01), invalid = kCMTimeInvalid;
+    EXPECT_FALSE(c->hasKeyframeAtTime(&t) || c->keyframeExistsAtTime(&t) ||
+                 c->nextKeyframeTime(&invalid) || c->previousKeyframeTime(nullptr) ||
+                 c->keyframeExistsAtTime(nullptr) || c->hasKeyframeAtTime(nullptr, 1.0));
+    EXPECT_EQ(c->getPreviousEnabledKeyframe(d), a);
+    EXPECT_EQ(c->getPreviousEnabledKeyframe(a), nullptr);
+    // Extremes over enabled keyframes unless told otherwise; the initial value without any.
+    EXPECT_EQ((std::array{c->getKeyframeMinValue(), c->getKeyframeMaxValue(),
+                          c->getKeyframeMaxValue(false)}),
+              (std::array{10.0, 30.0, 40.0}));
+    c->setKeyframeValue(b, 5.0);
+    EXPECT_EQ(c->getKeyframeMinValue(false), 5.0);
+    EXPECT_EQ(
+        CMTimeGetSeconds(c->getKeyframeMinTime()) + 10 * CMTimeGetSeconds(c->getKeyframeMaxTime()),
+        31.0);
+    auto empty = makeChannel("empty");
+    empty->setInitialValue(7.0);
+    EXPECT_EQ(empty->getKeyframeMinValue() + empty->getKeyframeMaxValue(), 14.0);
+    EXPECT_TRUE(CMTIME_IS_INVALID(empty->getKeyframeMinTime()) &&
+                CMTIME_IS_INVALID(empty->getKeyframeMaxTime()));
+    EXPECT_FALSE(empty->getFirstKeyframe(nullptr, nullptr) ||
+                 empty->getLastKeyframe(nullptr, nullptr));
+    CMTime first, last;
+    double value = 0;
+    ASSERT_TRUE(c->getFirstKeyframe(&first, &value) && c->getLastKeyframe(&last, nullptr));
+    EXPECT_EQ(CMTimeGetSeconds(first) + 10 * CMTimeGetSeconds(last) + 100 * value, 1031.0);
 }
 
-TEST_F(CurveKeyframes, delete__makes_handles_stale_and_never_reissues_them) {
+TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywhere) {
     c->deleteKeyframe(b);
-    EXPECT_FALSE(c->getKeyframe(b, nullptr, nullptr));
+    EXPECT_FALSE(live(b));
     TQKeyframeHandle again = c->setKeyframe(seconds(2.0), 20.0);
     EXPECT_NE(again, b) << "a new keyframe at the same place must get a new handle";
-    EXPECT_FALSE(c->getKeyframe(b, nullptr, nullptr));
-    // Every operation on the stale handle is a no-op.
-    c->setKeyframeValue(b, 99.0);
-    c->setKeyframeOutputTangents(b, 1.0, 1.0);
-    c->deleteKeyframe(b);
-    EXPECT_EQ(c->numberOfKeyframes(), 3u);
-    EXPECT_EQ(valueOf(again), 20.0);
+    auto other = flat();
+    EXPECT_FALSE(other->getKeyframe(a, nullptr, nullptr)) << "a handle of another channel";
+    EXPECT_FALSE(c->getKeyframe(nullptr, nullptr, nullptr));
+    const auto before = copyOf(*c);
+    for (TQKeyframeHandle h : {b, TQKeyframeHandle(nullptr)}) {
+        c->setKeyframeValue(h, 99.0);
+        c->setKeyframeOutputTangents(h, 1.0, 1.0);
+        c->setKeyframeInputTangents(h, -1.0, 1.0);
+        c->setKeyframeInterpolation(h, kTQInterpolationLinear);
+        c->setKeyframeEnabled(h, false);
+        c->setKeyframeLocked(h, true);
+        c->setKeyframeTangentsBroken(h, true);
+        c->setKeyframeTangentsScaled(h, true);
+        c->smoothKeyframe(h);
+        c->reverseKeyframes(h, a);
+        const CMTime to = seconds(5.0);
+        c->setKeyframeTime(h, &to);
+        c->deleteKeyframe(h);
+        EXPECT_EQ(c->cloneKeyframe(h, to), nullptr);
+        EXPECT_EQ(c->getKeyframeInterpolation(h), 0u);
+        EXPECT_FALSE(c->getKeyframeInterpolationUsesTangents(h) || c->getKeyframeEnabled(h) ||
+                     c->getKeyframeInputTangents(h, nullptr, nullptr));
+    }
+    EXPECT_TRUE(*c == *before) << keyText(*c, true);
+    // Non-numeric times and values that are not finite add nothing.
+    EXPECT_EQ(c->setKeyframe(kCMTimeInvalid, 1.0), nullptr);
+    EXPECT_EQ(c->setKeyframe(seconds(4.0), NAN), nullptr);
+    c->setKeyframeValue(a, INFINITY);
+    EXPECT_TRUE(*c == *before) << keyText(*c, true);
 }
 
-TEST_F(CurveKeyframes, meeting_keyframes__both_live_until_purge_keeps_the_arrival) {
-    const CMTime from = seconds(1.0), to = seconds(2.0);
-    c->moveKeyframe(&from, &to);
-    EXPECT_TRUE(c->getKeyframe(a, nullptr, nullptr));
-    EXPECT_TRUE(c->getKeyframe(b, nullptr, nullptr));
-    EXPECT_EQ(c->numberOfKeyframes(), 3u);
-    EXPECT_EQ(c->getKeyframe(to), a) << "lookup by time answers the keyframe that arrived";
-    EXPECT_NEAR(c->getCurveValue(to), 10.0, kTolerance) << "the arrival stands for the time";
+TEST_F(CurveKeyframes, setKeyframe__addsWithAutomaticHandlesOrReplacesTheValue) {
+    // A new keyframe between two takes the chord's slope, handles a third of each segment.
+    c->setKeyframe(seconds(2.5), 28.0);
+    EXPECT_EQ(
+        keyText(*c, true),
+        "1=10(0,0|0,0) 2=20(-0.333333,0|0.333333,0) 2.5=28(-0.166667,-1.66667|0.166667,1.66667) "
+        "3=30(-0.333333,0|0.333333,0)");
+    // At an extreme it is flat; at an end both handles take the one segment's third.
+    c->setKeyframe(seconds(1.5), 40.0);
+    c->setKeyframe(seconds(0.25), 5.0);
+    EXPECT_EQ(keyText(*c, true).substr(0, 58),
+              "0.25=5(-0.25,0|0.25,0) 1=10(0,0|0,0) 1.5=40(-0.166667,0|0.");
+    // An existing keyframe keeps its handles and interpolation, unless asked to take the
+    // channel's.
+    c->setKeyframeInterpolation(b, kTQInterpolationLinear);
+    EXPECT_EQ(c->setKeyframe(seconds(2.0), 21.0), b);
+    EXPECT_EQ(c->getKeyframeInterpolation(b), kTQInterpolationLinear);
+    c->setKeyframe(seconds(2.0), 22.0, true);
+    EXPECT_EQ(c->getKeyframeInterpolation(b), kTQInterpolationBezier);
+    EXPECT_EQ(c->numberOfKeyframes(), 6u);
+    // addKeyframe keeps what is there and otherwise values the new keyframe from the curve.
+    c->setInterpolation(kTQInterpolationLinear);
+    c->setTimeOffset(seconds(10.0));
+    const CMTime axis = seconds(12.5), channel = seconds(2.5), late = seconds(3.5);
+    EXPECT_EQ(c->addKeyframeAtAxisTime(&axis), c->getKeyframe(channel));
+    EXPECT_NE(c->addKeyframe(&late), nullptr);
+    EXPECT_EQ(c->addKeyframeAtAxisTime(nullptr), nullptr);
+    EXPECT_EQ(keyText(*c), "0.25=5/1 1=10/1 1.5=40/1 2=22/1 2.5=28/1 3=30/1 3.5=30/1");
+}
 
+TEST_F(CurveKeyframes, meetingKeyframes__bothLiveUntilPurgeKeepsTheArrival) {
+    const CMTime one = seconds(1.0), two = seconds(2.0), three = seconds(3.0);
+    c->moveKeyframe(&one, &two);
+    EXPECT_EQ(keyText(*c), "2=20 2=10 3=30") << "the arrival comes last";
+    EXPECT_EQ(c->getKeyframe(two), a) << "lookup by time answers the keyframe that arrived";
+    EXPECT_NEAR(c->getCurveValue(two), 10.0, kTolerance) << "the arrival stands for the time";
+    const auto copy = copyOf(*c);
     c->purgeKeyframes();
-    EXPECT_EQ(c->numberOfKeyframes(), 2u);
-    EXPECT_TRUE(c->getKeyframe(a, nullptr, nullptr)) << "the moved keyframe survives";
-    EXPECT_FALSE(c->getKeyframe(b, nullptr, nullptr)) << "the one it landed on goes stale";
+    EXPECT_EQ(keyText(*c), "2=10 3=30");
+    EXPECT_TRUE(live(a) && !live(b)) << "the moved keyframe survives, the one it landed on goes";
+    c->purgeKeyframes();
+    EXPECT_EQ(keyText(*c), "2=10 3=30");
+
+    // Replacing: every keyframe at the target goes at once.
+    copy->moveKeyframe(&three, &two, false);
+    EXPECT_EQ(keyText(*copy), "2=30");
+    EXPECT_EQ(copy->getKeyframe(two), d);
+    // A move to its own time, or from a time without keyframe, changes nothing.
+    const auto moved = copyOf(*copy);
+    const CMTime five = seconds(5.0);
+    copy->moveKeyframe(&two, &two, false);
+    copy->moveKeyframe(&five, &three);
+    copy->moveKeyframe(nullptr, &three);
+    EXPECT_TRUE(*copy == *moved);
+
+    // By handle: a collision is reported, the value set with the move.
+    auto e = makeChannel("e");
+    const TQKeyframeHandle x = e->setKeyframe(one, 1.0), y = e->setKeyframe(two, 2.0);
+    bool collided = false;
+    const double value = 5.0;
+    e->setKeyframeTime(x, &two, &value, &collided);
+    EXPECT_TRUE(collided);
+    EXPECT_EQ(keyText(*e), "2=2 2=5");
+    e->setKeyframeTime(y, &two, nullptr, &collided);
+    EXPECT_FALSE(collided) << "a keyframe set to its own time does not move";
+    EXPECT_EQ(keyText(*e), "2=2 2=5");
+    e->setKeyframeTime(x, &three, nullptr, &collided);
+    EXPECT_FALSE(collided);
+    const TQKeyframeHandle copied = e->cloneKeyframe(y, three);
+    EXPECT_EQ(e->getKeyframe(three), copied) << "a copy arrives after";
+    EXPECT_EQ(keyText(*e), "2=2 3=5 3=2");
+    const CMTime axisThree = seconds(3.0);
+    e->deleteKeyframeAtAxisTime(&axisThree, false);
+    EXPECT_EQ(keyText(*e), "2=2 3=5") << "only the last arrival";
+    e->cloneKeyframe(x, three);
+    e->deleteKeyframeAtAxisTime(&axisThree);
+    EXPECT_EQ(keyText(*e), "2=2") << "every keyframe at the time";
+    e->deleteKeyframeAtTime(&two);
+    EXPECT_EQ(e->numberOfKeyframes(), 0u);
 }
 
-TEST_F(CurveKeyframes, move_without_keeping_both__replaces_the_target_at_once) {
-    const CMTime from = seconds(1.0), to = seconds(3.0);
-    c->moveKeyframe(&from, &to, false);
-    EXPECT_EQ(c->numberOfKeyframes(), 2u);
-    EXPECT_FALSE(c->getKeyframe(d, nullptr, nullptr));
-    EXPECT_EQ(c->getKeyframe(to), a);
-}
-
-TEST_F(CurveKeyframes, move__takes_axis_times_and_keeps_handles_and_tangents) {
+TEST_F(CurveKeyframes, move__takesAxisTimesAndKeepsHandlesAndTangents) {
     c->setTimeOffset(seconds(10.0));
     c->setKeyframeOutputTangents(b, 0.25, 1.5);
     c->setKeyframeInputTangents(b, -0.4, -2.0);
     const CMTime from = seconds(12.0), to = seconds(12.5);
     c->moveKeyframe(&from, &to);
-    CMTime t;
-    ASSERT_TRUE(c->getKeyframe(b, &t, nullptr)) << "a move keeps the handle alive";
-    EXPECT_EQ(CMTimeCompare(t, seconds(2.5)), 0) << "the channel removes its time offset";
+    EXPECT_EQ(keyText(*c, true),
+              "1=10(0,0|0,0) 2.5=20(-0.4,-2|0.25,1.5) 3=30(-0.333333,0|0.333333,0)");
     double u = 0, v = 0;
-    c->getKeyframeOutputTangents(b, &u, &v);
-    EXPECT_EQ(u, 0.25);
-    EXPECT_EQ(v, 1.5);
     c->getKeyframeInputTangents(b, &u, &v, false);
     EXPECT_NEAR(u, 2.1, kTolerance) << "absolute handle position follows the keyframe";
     EXPECT_NEAR(v, 18.0, kTolerance);
+    c->getKeyframeOutputTangents(b, &u, &v, false);
+    EXPECT_NEAR(u, 2.75, kTolerance);
+    EXPECT_NEAR(v, 21.5, kTolerance);
+    c->setKeyframeOutputTangents(b, 3.0, 23.0, false);
+    c->setKeyframeInputTangents(b, 2.0, 19.0, false);
+    EXPECT_EQ(keyText(*c, true),
+              "1=10(0,0|0,0) 2.5=20(-0.5,-1|0.5,3) 3=30(-0.333333,0|0.333333,0)");
+    EXPECT_EQ(CMTimeGetSeconds(c->toChannelTime(&from)), 2.0);
+    EXPECT_TRUE(CMTIME_IS_INVALID(c->toChannelTime(nullptr)));
+    c->setRootCurrentTime(seconds(11.0));
+    EXPECT_EQ(CMTimeGetSeconds(c->getRootCurrentTime()), 1.0);
+    EXPECT_EQ(CMTimeGetSeconds(c->getRootCurrentTime(false)), 11.0);
 }
 
-TEST_F(CurveKeyframes, setKeyframeTime__reports_collisions_and_sets_value) {
-    bool collided = false;
-    const CMTime onto = seconds(3.0);
-    const double value = 5.0;
-    c->setKeyframeTime(a, &onto, &value, &collided);
-    EXPECT_TRUE(collided);
-    EXPECT_EQ(valueOf(a), 5.0);
-    c->setKeyframeTime(a, nullptr, nullptr, &collided);
-    EXPECT_FALSE(collided);
-}
-
-TEST_F(CurveKeyframes, neighbours__previous_next_and_enabled) {
-    CMTime t = seconds(2.5);
-    ASSERT_TRUE(c->previousKeyframeTime(&t));
-    EXPECT_EQ(CMTimeCompare(t, seconds(2.0)), 0);
-    ASSERT_TRUE(c->nextKeyframeTime(&t));
-    EXPECT_EQ(CMTimeCompare(t, seconds(3.0)), 0);
-    EXPECT_FALSE(c->nextKeyframeTime(&t));
-    EXPECT_FALSE(c->previousKeyframeTime(nullptr));
-
-    c->setKeyframeEnabled(b, false);
-    EXPECT_EQ(c->getPreviousEnabledKeyframe(d), a);
-    CMTime same = seconds(3.0);
-    ASSERT_TRUE(c->getPreviousKeyframe(same, &same, nullptr)) << "input and output may alias";
-    EXPECT_EQ(CMTimeCompare(same, seconds(2.0)), 0);
-
-    CMTime near = seconds(2.01);
-    EXPECT_FALSE(c->hasKeyframeAtTime(&near));
-    EXPECT_TRUE(c->hasKeyframeAtTime(&near, 0.02));
-    EXPECT_EQ(CMTimeCompare(near, seconds(2.0)), 0);
-}
-
-TEST_F(CurveKeyframes, tangents__follow_only_when_asked_and_unbroken) {
+TEST_F(CurveKeyframes, tangents__followOnlyWhenAskedAndUnbroken) {
     c->setKeyframeInputTangents(b, -0.5, -1.0);
-    c->setKeyframeOutputTangents(b, 0.5, 1.0);
-    double u = 0, v = 0;
-    {  // The editor's form: only the written side changes.
-        c->setKeyframeOutputTangents(b, 0.2, 3.0);
-        c->getKeyframeInputTangents(b, &u, &v);
-        EXPECT_EQ(u, -0.5);
-        EXPECT_EQ(v, -1.0);
-    }
-    {  // Aligned, unscaled: opposite direction, length scaled with the written handle.
-        c->setKeyframeOutputTangents(b, 1.0, 0.0);
-        c->setKeyframeInputTangents(b, -1.0, 0.0);
-        c->setKeyframeOutputTangents(b, 0.0, 2.0, true, true);
-        c->getKeyframeInputTangents(b, &u, &v);
-        EXPECT_NEAR(u, 0.0, kTolerance);
-        EXPECT_NEAR(v, -2.0, kTolerance);
-    }
-    {  // Scaled pair: the opposite handle keeps its length.
-        c->setKeyframeTangentsScaled(b, true);
-        c->setKeyframeOutputTangents(b, 3.0, 0.0, true, true);
-        c->getKeyframeInputTangents(b, &u, &v);
-        EXPECT_NEAR(u, -2.0, kTolerance);
-        EXPECT_NEAR(v, 0.0, kTolerance);
-    }
-    {  // Broken pair: never follows.
-        c->setKeyframeTangentsBroken(b, true);
-        c->setKeyframeOutputTangents(b, 0.0, 1.0, true, true);
-        c->getKeyframeInputTangents(b, &u, &v);
-        EXPECT_NEAR(u, -2.0, kTolerance);
-    }
+    c->setKeyframeOutputTangents(b, 0.2, 3.0);
+    const auto textOfB = [&] {
+        const std::string all = keyText(*c, true);
+        return all.substr(all.find("2=20"), all.find(" 3=") - all.find("2=20"));
+    };
+    EXPECT_EQ(textOfB(), "2=20(-0.5,-1|0.2,3)") << "only the written side";
+    // Aligned, unscaled: opposite direction, the length scaled with the written handle.
+    c->setKeyframeOutputTangents(b, 1.0, 0.0);
+    c->setKeyframeInputTangents(b, -2.0, 0.0);
+    c->setKeyframeOutputTangents(b, 0.0, 2.0, true, true);
+    EXPECT_EQ(textOfB(), "2=20(0,-4|0,2)");
+    c->setKeyframeInputTangents(b, 3.0, 0.0, true, true);
+    EXPECT_EQ(textOfB(), "2=20(3,0|-1.5,0)") << "an input handle leads too";
+    // Scaled: the opposite keeps its length. Broken: never follows.
+    c->setKeyframeTangentsScaled(b, true);
+    c->setKeyframeOutputTangents(b, 0.0, -7.0, true, true);
+    EXPECT_EQ(textOfB(), "2=20(0,3|0,-7)s");
+    c->setKeyframeTangentsBroken(b, true);
+    c->setKeyframeOutputTangents(b, 1.0, 1.0, true, true);
+    EXPECT_EQ(textOfB(), "2=20(0,3|1,1)bs");
+    c->setKeyframeTangentsBroken(b, false);
+    c->setKeyframeOutputTangents(b, 0.0, 0.0, true, true);
+    EXPECT_EQ(textOfB(), "2=20(0,3|0,0)s") << "a zero handle has no direction";
 }
 
-TEST_F(CurveKeyframes, smoothKeyframe__gives_catmull_rom_slope_and_bezier) {
+TEST_F(CurveKeyframes, smoothAndReverse__catmullRomHandlesAndMirroredRuns) {
     c->setKeyframeInterpolation(b, kTQInterpolationLinear);
     c->setKeyframeTangentsBroken(b, true);
+    c->setKeyframeInterpolation(d, kTQInterpolationLinear);
     c->smoothKeyframe(b);
-    double u = 0, v = 0;
-    c->getKeyframeOutputTangents(b, &u, &v);
-    EXPECT_NEAR(v / u, 10.0, kTolerance) << "slope of the chord through the neighbours";
-    EXPECT_NEAR(u, 1.0 / 3.0, kTolerance);
-    EXPECT_EQ(c->getKeyframeInterpolation(b), kTQInterpolationBezier);
-    EXPECT_FALSE(c->getKeyframeTangentsBroken(b));
+    c->smoothKeyframe(d, false);
+    EXPECT_EQ(
+        keyText(*c, true),
+        "1=10(0,0|0,0) 2=20(-0.333333,-3.33333|0.333333,3.33333) 3=30/1(-0.333333,0|0.333333,0)");
+    c->setKeyframeValue(b, 30.0);
+    c->smoothKeyframe(a);
+    c->smoothKeyframe(b);
+    EXPECT_EQ(
+        keyText(*c, true),
+        "1=10(-0.333333,0|0.333333,0) 2=30(-0.333333,0|0.333333,0) 3=30/1(-0.333333,0|0.333333,0)")
+        << "flat at an extreme, a level one too";
+
+    auto r = makeChannel("r");
+    const TQKeyframeHandle k0 = r->setKeyframe(seconds(0.0), 0.0),
+                           k1 = r->setKeyframe(seconds(1.0), 4.0);
+    const TQKeyframeHandle k2 = r->setKeyframe(seconds(3.0), 5.0),
+                           k3 = r->setKeyframe(seconds(4.0), 1.0);
+    r->setKeyframeInterpolation(k0, kTQInterpolationExp);
+    r->setKeyframeInterpolation(k1, kTQInterpolationEaseIn);
+    r->setKeyframeInterpolation(k2, kTQInterpolationLinear);
+    r->setKeyframeInterpolation(k3, kTQInterpolationConstant);
+    r->setKeyframeOutputTangents(k2, 0.3, 0.7);
+    const auto before = copyOf(*r);
+    r->reverseKeyframes(k2, k0);  // order of the arguments does not matter
+    EXPECT_EQ(keyText(*r, true),
+              "0=5/16(-0.3,0.7|0.666667,0) 2=4/14(-0.333333,0|0.333333,0) 3=0/1(0,0|0,0) "
+              "4=1/0(-0.333333,0|0.333333,0)")
+        << "mirrored in its span, each segment's shape run backwards, the one leaving as it was";
+    for (double t = 0.0; t <= 3.0; t += 0.1)
+        EXPECT_NEAR(r->getCurveValue(seconds(t)), before->getCurveValue(seconds(3.0 - t)), 1e-6)
+            << t;
+    r->reverseKeyframes(k1, k1);
+    EXPECT_EQ(keyText(*r).substr(0, 13), "0=5/16 2=4/14") << "one keyframe: nothing to reverse";
 }
 
-TEST_F(CurveKeyframes, reverseKeyframes__mirrors_times_handles_and_shapes) {
-    c->setKeyframeInterpolation(a, kTQInterpolationExp);
-    c->setKeyframeOutputTangents(d, 0.3, 0.7);
-    auto before = std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c->cloneChannel()));
-    c->reverseKeyframes(d, a);  // order of the arguments does not matter
-    for (double t = 1.0; t <= 3.0; t += 0.1) {
-        EXPECT_NEAR(c->getCurveValue(seconds(t)), before->getCurveValue(seconds(4.0 - t)), 1e-6)
-            << "reversed curve at " << t;
-    }
-    CMTime t;
-    c->getKeyframe(d, &t, nullptr);
-    EXPECT_EQ(CMTimeCompare(t, seconds(1.0)), 0);
-    double u = 0, v = 0;
-    c->getKeyframeInputTangents(d, &u, &v);
-    EXPECT_EQ(u, -0.3);
-    EXPECT_EQ(v, 0.7);
-}
-
-TEST_F(CurveKeyframes, segment_and_curve_offsets__move_the_right_keyframes) {
-    c->setInterpolation(kTQInterpolationLinear);
-    c->setCurveSegmentValue(seconds(1.5), 25.0);
-    EXPECT_NEAR(c->getCurveValue(seconds(1.5)), 25.0, kTolerance);
-    EXPECT_EQ(valueOf(d), 30.0) << "keyframes outside the segment stay";
-}
-
-TEST_F(CurveKeyframes, offsetCurve__puts_the_curve_through_the_target_at_axis_time) {
+TEST_F(CurveKeyframes, segmentAndCurveOffsets__moveTheRightKeyframes) {
     c->setInterpolation(kTQInterpolationLinear);
     c->setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter);
+    c->setCurveSegmentValue(seconds(1.5), 25.0);
+    EXPECT_EQ(keyText(*c), "1=20/1 2=30/1 3=30/1") << "both ends of the segment move";
+    c->setCurveSegmentValue(seconds(3.5), 35.0);
+    EXPECT_EQ(keyText(*c), "1=20/1 2=30/1 3=35/1") << "past the end: the last keyframe";
+    c->setCurveSegmentValue(seconds(2.0), 40.0);
+    EXPECT_EQ(keyText(*c), "1=20/1 2=40/1 3=45/1") << "on a keyframe: the segment it starts";
+    c->setCurveSegmentValue(seconds(0.0), NAN);
+    EXPECT_EQ(keyText(*c), "1=20/1 2=40/1 3=45/1");
+
     c->setTimeOffset(seconds(10.0));
-    const CMTime at = seconds(11.5);  // channel time 1.5, value 15
+    const CMTime at = seconds(11.5);  // channel time 1.5, value 30
     c->offsetCurve(&at, 40.0);
-    EXPECT_NEAR(c->getCurveValue(seconds(1.5)), 40.0, kTolerance);
-    EXPECT_NEAR(valueOf(a), 35.0, kTolerance) << "every keyframe moves by the same amount";
-    EXPECT_NEAR(valueOf(d), 55.0, kTolerance);
-    {
-        // The target is absolute: a repeated or skipped step lands in the same place.
-        auto once = std::unique_ptr<TQChannelBase>(c->cloneChannel());
-        c->offsetCurve(&at, 40.0);
-        EXPECT_TRUE(*c == *once);
-    }
-    {
-        // Past the last keyframe the extrapolated curve is what reaches the target.
-        const CMTime late = seconds(14.0);
-        c->offsetCurve(&late, 0.0);
-        EXPECT_NEAR(c->getCurveValue(seconds(4.0)), 0.0, kTolerance);
-        EXPECT_NEAR(valueOf(d), -10.0, kTolerance);
-    }
-    {
-        auto before = std::unique_ptr<TQChannelBase>(c->cloneChannel());
-        c->offsetCurve(nullptr, 5.0);
-        const CMTime invalid = kCMTimeInvalid;
-        c->offsetCurve(&invalid, 5.0);
-        c->offsetCurve(&at, NAN);
-        EXPECT_TRUE(*c == *before) << "no time, or no finite value: nothing moves";
-    }
-    {
-        auto empty = makeChannel("empty");
-        empty->setInitialValue(3.0);
-        empty->offsetCurve(&at, -2.0);
-        EXPECT_EQ(empty->getInitialValue(), -2.0) << "without keyframes the initial value moves";
-    }
+    EXPECT_EQ(keyText(*c), "1=30/1 2=50/1 3=55/1") << "every keyframe by the same amount";
+    const auto once = copyOf(*c);
+    c->offsetCurve(&at, 40.0);
+    EXPECT_TRUE(*c == *once) << "the target is absolute: a repeated step lands in the same place";
+    const CMTime late = seconds(14.0), invalid = kCMTimeInvalid;  // past the end, linear
+    c->offsetCurve(&late, 0.0);
+    EXPECT_EQ(keyText(*c), "1=-30/1 2=-10/1 3=-5/1");
+    const auto moved = copyOf(*c);
+    c->offsetCurve(nullptr, 5.0);
+    c->offsetCurve(&invalid, 5.0);
+    c->offsetCurve(&at, NAN);
+    EXPECT_TRUE(*c == *moved) << "no time, or no finite value: nothing moves";
+    auto empty = makeChannel("empty");
+    empty->setInitialValue(3.0);
+    empty->offsetCurve(&at, -2.0);
+    empty->setCurveSegmentValue(seconds(1.0), -4.0);
+    EXPECT_EQ(empty->getInitialValue(), -4.0) << "without keyframes the initial value moves";
 }
 
-TEST_F(CurveKeyframes, deleteAllKeyframes__keeps_the_value_shown_at_the_current_time) {
+TEST_F(CurveKeyframes, valuesAndAnimation__deleteAllKeepsWhatWasShownDisabledShowsTheInitialValue) {
     c->setInterpolation(kTQInterpolationLinear);
-    c->deleteAllKeyframes(seconds(2.5));
-    EXPECT_EQ(c->numberOfKeyframes(), 0u);
-    EXPECT_NEAR(c->getInitialValue(), 25.0, kTolerance);
-    EXPECT_FALSE(c->getKeyframe(a, nullptr, nullptr));
-}
-
-TEST_F(CurveKeyframes, animation_and_values__disabled_animation_shows_the_initial_value) {
     c->setInitialValue(-1.0);
     c->setAnimationEnabled(false);
     EXPECT_EQ(c->getValueAsDouble(seconds(2.0)), -1.0);
-    EXPECT_FALSE(c->canKeyframe());
-    EXPECT_FALSE(c->isAnimated());
-    c->setValue(nullptr, 4.0);
+    EXPECT_EQ(c->getCurveValue(seconds(2.0)), 20.0) << "the keyframed curve is still there";
+    EXPECT_FALSE(c->canKeyframe() || c->isAnimated());
+    const CMTime t = seconds(2.5);
+    c->setValue(&t, 4.0);
     EXPECT_EQ(c->getInitialValue(), 4.0) << "without animation a value edit sets the initial value";
     c->setAnimationEnabled(true);
-    const CMTime t = seconds(2.5);
+    EXPECT_TRUE(c->canKeyframe() && c->isAnimated());
     c->setValue(&t, 7.0);
-    EXPECT_TRUE(c->keyframeExistsAtTime(&t));
+    c->setValue(nullptr, 6.0);
+    EXPECT_EQ(keyText(*c), "1=10/1 2=20/1 2.5=7/1 3=30/1");
+    EXPECT_EQ(c->getInitialValue(), 6.0);
+    EXPECT_EQ(c->getValueAsDouble(seconds(2.0), 0.25), 13.5) << "the sub-frame offset counts";
+
+    c->deleteAllKeyframes(seconds(2.25));
+    EXPECT_EQ(c->numberOfKeyframes(), 0u);
+    EXPECT_NEAR(c->getInitialValue(), 13.5, kTolerance);
+    EXPECT_FALSE(live(a) || live(b) || live(d));
+    c->setValue(&t, 8.0);
+    EXPECT_EQ(c->getInitialValue(), 8.0) << "without keyframes a value edit sets the initial value";
+    c->deleteAllKeyframes(seconds(1.0));
+    EXPECT_EQ(c->getInitialValue(), 8.0);
 }
 
-TEST_F(CurveKeyframes, clone_assign_and_compare__round_trip_the_state) {
+TEST_F(CurveKeyframes, cloneAssignCompareAndReset__roundTripEveryPartOfTheState) {
     c->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
     c->setKeyframeLocked(a, true);
     c->addBehavior(std::make_unique<TQNoiseBehavior>(1.0, 2.0, 3));
-    std::unique_ptr<TQChannelBase> clone(c->cloneChannel());
+    const auto clone = copyOf(*c);
     EXPECT_TRUE(*clone == *c);
-    auto* copy = dynamic_cast<TQChannel*>(clone.get());
-    ASSERT_NE(copy, nullptr);
-    EXPECT_TRUE(copy->getKeyframeLocked(a)) << "a clone keeps the keyframes' serials";
-
-    copy->setKeyframeValue(a, 11.0);
-    EXPECT_FALSE(*clone == *c) << "a value change must be seen";
-    *copy = *c;
-    EXPECT_TRUE(*clone == *c);
-    copy->getBehavior(0)->setSelected(true);
-    EXPECT_FALSE(*clone == *c) << "behaviour flags are state";
-
+    EXPECT_TRUE(clone->getKeyframeLocked(a)) << "a clone keeps the keyframes' serials";
+    // Every part of the state is compared and carried by an assignment.
+    const std::function<void(TQChannel&)> edits[] = {
+        [&](TQChannel& x) { x.setKeyframeValue(a, 11.0); },
+        [&](TQChannel& x) { x.setKeyframeInputTangents(d, -0.5, 0.5); },
+        [&](TQChannel& x) { x.setKeyframeTangentsScaled(b, true); },
+        [&](TQChannel& x) { x.setKeyframe(seconds(4.0), 1.0); },
+        [&](TQChannel& x) { x.setInitialValue(2.0); },
+        [&](TQChannel& x) { x.setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationBefore); },
+        [&](TQChannel& x) { x.setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter); },
+        [&](TQChannel& x) { x.setAnimationEnabled(false); },
+        [&](TQChannel& x) {
+            x.deleteAllKeyframes(kCMTimeInvalid), x.setInterpolation(kTQInterpolationExp);
+        },
+        [&](TQChannel& x) { x.getBehavior(0)->setSelected(true); },
+        [&](TQChannel& x) { x.addBehavior(std::make_unique<TQOscillateBehavior>(1.0, 1.0)); },
+        [&](TQChannel& x) { x.setFlag(kTQChannelFlagHidden), x.setLocked(true); },
+        [&](TQChannel& x) { x.getInfo()->tickStep = 2.0, x.getImpl()->range().setRange(0.0, 1.0); },
+    };
+    for (size_t i = 0; i < std::size(edits); ++i) {
+        const auto changed = copyOf(*c);
+        edits[i](*changed);
+        EXPECT_FALSE(*changed == *c) << "edit " << i << " must be seen";
+        const auto restored = copyOf(*changed);
+        *restored = *c;
+        EXPECT_TRUE(*restored == *c) << "edit " << i << " must be undone by an assignment";
+        *restored = *changed;
+        EXPECT_TRUE(*restored == *changed) << "edit " << i << " must be carried by an assignment";
+    }
+    c->setInterpolation(kTQInterpolationLinear);
     c->reset();
     EXPECT_EQ(c->numberOfKeyframes(), 0u);
     EXPECT_EQ(c->getInitialValue(), c->getDefaultValue());
     EXPECT_EQ(c->getExtrapolation(kTQExtrapolationAfter), kTQExtrapolationConstant);
+    EXPECT_EQ(c->getInterpolation(), kTQInterpolationBezier);
+    EXPECT_EQ(c->numberOfBehaviors(), 1u) << "behaviours stay";
 }
 
 }  // namespace

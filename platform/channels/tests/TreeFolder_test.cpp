@@ -1,15 +1,16 @@
+// Channel trees: folders, object roots, compounds and the typed channels.
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <numbers>
 #include <type_traits>
 #include <typeinfo>
 #include <vector>
 
-#include "platform/channels/TQChannel.h"
-#include "platform/channels/TQChannelFolder.h"
 #include "platform/channels/TQChannelObjectRootBase.h"
 #include "platform/channels/TQChannelTypes.h"
 #include "platform/channels/TQFactory.h"
+#include "platform/channels/tests/KeyframeText.h"
 
 namespace {
 
@@ -61,194 +62,342 @@ protected:
 };
 
 TEST_F(TreeFolderTest, getAllDescendantsFlattened__exclusionNullsAndObjectRoots) {
-    {
-        std::vector<TQChannelBase*> out;
-        object.getAllDescendantsFlattened(out, 0, false);
-        ASSERT_EQ(out.size(), 8u) << "2 + 3 components, opacity, inner, visible";
-        EXPECT_EQ(out[0], position->getXChannel()) << "depth first in display order";
-        EXPECT_EQ(out[5], opacity);
-        EXPECT_EQ(out[6], inner);
-        EXPECT_EQ(out[7], visible);
-    }
-    {
-        std::vector<TQChannelBase*> out{visible};  // appends, does not clear
-        object.getAllDescendantsFlattened(out, kTQChannelFlagHidden, true);
-        ASSERT_EQ(out.size(), 7u);
-        for (const TQChannelBase* c : out) {
-            EXPECT_NE(c, opacity) << "a hidden folder hides what is below it";
-            EXPECT_NE(c, inner) << "other objects' trees are not entered";
-        }
-    }
-    {
-        visible->setFlag(kTQChannelFlagHiddenInCurveEditor, false);
-        std::vector<TQChannelBase*> out;
-        object.getAllDescendantsFlattened(out, 0x10002, true);
-        EXPECT_EQ(out.size(), 5u) << "either bit of the word excludes";
-    }
+    const auto flattened = [&](uint32_t excluded, bool stop) {
+        std::vector<TQChannelBase*> out{&object};  // appends, does not clear
+        object.getAllDescendantsFlattened(out, excluded, stop);
+        std::string names;
+        for (const TQChannelBase* c : out) names += c->getName() + " ";
+        return names;
+    };
+    EXPECT_EQ(flattened(0, false), "Object X Y X Y Z Opacity Inner Visible ")
+        << "depth first in display order";
+    EXPECT_EQ(flattened(kTQChannelFlagHidden, true), "Object X Y X Y Z Visible ")
+        << "a hidden folder hides what is below it; other objects' trees are not entered";
+    visible->setFlag(kTQChannelFlagHiddenInCurveEditor, false);
+    EXPECT_EQ(flattened(0x10002, false), "Object X Y X Y Z Inner ")
+        << "either bit of the word excludes";
+    EXPECT_TRUE(visible->testFlag(0x10000) && !visible->testFlag(0x2));
+    visible->resetFlag(0x10000);
+    EXPECT_FALSE(visible->testFlag(0x10000));
 }
 
-TEST_F(TreeFolderTest, clone__deepCopyKeepsClassesAndIsIndependent) {
+TEST_F(TreeFolderTest, cloneAssignCompare__deepCopiesOfTheSameClassesComparedByPosition) {
     rotation->setQuaternionMode(true, false);
     position->setLinked(false);
+    transform->setFoldFlag(kTQFoldFlagCollapsed);
     std::unique_ptr<TQChannelBase> copy(object.cloneChannel());
     const TQChannelBase& copied = *copy;
     ASSERT_EQ(typeid(copied), typeid(TQChannelObjectRootBase));
     EXPECT_TRUE(*copy == object) << "a fresh clone compares equal";
     EXPECT_EQ(copy->getParent(), nullptr);
-    EXPECT_EQ(copy->getName(), "Object");
+    EXPECT_NE(copy->getSerial(), object.getSerial()) << "a node's serial is its own";
     auto* copyFolder = static_cast<TQChannelFolder*>(copy.get());
     EXPECT_EQ(copyFolder->getChild(2), nullptr) << "a null slot stays null";
-    auto* copyPosition = dynamic_cast<TQChannel2D*>(
-        static_cast<TQChannelFolder*>(copyFolder->findChild(100))->findChild(101));
+    auto* copyTransform = static_cast<TQChannelFolder*>(copyFolder->findChild(100));
+    auto* copyPosition = dynamic_cast<TQChannel2D*>(copyTransform->findChild(101));
     ASSERT_NE(copyPosition, nullptr) << "the 2D channel clones as its own class";
     EXPECT_EQ(copyPosition->getParent()->getParent(), copy.get());
-    EXPECT_FALSE(copyPosition->isLinked());
-    EXPECT_EQ(copyPosition->getXChannel()->numberOfKeyframes(), 1u);
+    EXPECT_TRUE(copyTransform->testFoldFlag(kTQFoldFlagCollapsed) && !copyPosition->isLinked());
 
-    copyPosition->getXChannel()->setKeyframe(seconds(3), 1.0);
-    EXPECT_EQ(position->getXChannel()->numberOfKeyframes(), 1u) << "the clone shares nothing";
+    // Every part of the state is seen by the comparison and carried back by an assignment.
+    const std::function<void()> edits[] = {
+        [&] { copyPosition->getXChannel()->setKeyframe(seconds(3), 1.0); },
+        [&] { copyTransform->resetFoldFlag(kTQFoldFlagCollapsed); },
+        [&] { copyPosition->setLinked(true); },
+        [&] {
+            static_cast<TQChannelRotation3D*>(copyTransform->findChild(109))
+                ->setQuaternionMode(false);
+        },
+        [&] { copyFolder->findChild(200)->setFlag(kTQChannelFlagShowFlattened); },
+        [&] { copyFolder->findChild(300)->setLocked(true); },
+    };
+    for (size_t i = 0; i < std::size(edits); ++i) {
+        edits[i]();
+        EXPECT_FALSE(*copy == object) << "edit " << i;
+        *copy = object;  // a ghost backup restored the other way round
+        EXPECT_TRUE(*copy == object) << "edit " << i;
+    }
+    EXPECT_EQ(copyPosition->getXChannel()->numberOfKeyframes(), 1u);
+    // The shape matters: a slot fewer, a channel where the other has none, another class.
+    copyFolder->removeChildAt(2);
     EXPECT_FALSE(*copy == object);
-    *copy = object;  // restore from the live tree, as a ghost backup does the other way round
-    EXPECT_TRUE(*copy == object) << "assignment by position restores equality";
-    EXPECT_EQ(copyPosition->getXChannel()->numberOfKeyframes(), 1u);
-
-    rotation->setQuaternionMode(false, false);
-    EXPECT_FALSE(*copy == object) << "quaternion mode is part of a rotation's state";
-}
-
-TEST_F(TreeFolderTest, compare__shapeAndNullSlotsMatter) {
-    std::unique_ptr<TQChannelBase> copy(object.cloneChannel());
-    auto* copyFolder = static_cast<TQChannelFolder*>(copy.get());
-    copyFolder->removeChildAt(2);  // the null slot
-    EXPECT_FALSE(*copy == object) << "one slot fewer";
     copyFolder->insertChild(2, std::make_unique<TQChannel>("Filler", 9));
-    EXPECT_FALSE(*copy == object) << "a channel where the other has a null slot";
+    EXPECT_FALSE(*copy == object);
     TQChannel plain("Plain", 1);
-    TQChannelBool flag("Plain", 1);
-    EXPECT_FALSE(plain == flag) << "classes differ";
-    static_cast<TQChannelBase&>(plain) =
-        object;  // a folder's state can't be poured into a channel: nothing breaks
+    EXPECT_FALSE(plain == TQChannelBool("Plain", 1)) << "classes differ";
+    static_cast<TQChannelBase&>(plain) = object;  // a folder's state can't be poured into a channel
     EXPECT_EQ(plain.numberOfKeyframes(), 0u);
+    static_cast<TQChannelBase&>(*copyFolder->getChild(2)) = *transform;
+    EXPECT_EQ(copyFolder->getChild(2)->getName(), "Filler") << "identity is not state";
 }
 
-TEST_F(TreeFolderTest, lock__throughAncestors) {
-    EXPECT_FALSE(opacity->isAnyAncestorLocked());
+TEST_F(TreeFolderTest, ancestors__locksObserversTimeOffsetsAndRoots) {
     hidden->setLocked(true, false);
-    EXPECT_TRUE(opacity->isLocked(true));
-    EXPECT_TRUE(opacity->isAnyAncestorLocked());
+    EXPECT_TRUE(opacity->isLocked(true) && opacity->isAnyAncestorLocked());
     EXPECT_FALSE(opacity->isLocked(false)) << "its own lock is off";
-    EXPECT_FALSE(visible->isLocked(true)) << "siblings of the locked folder are free";
-}
+    EXPECT_FALSE(visible->isLocked(true) || visible->isAnyAncestorLocked()) << "siblings are free";
 
-TEST_F(TreeFolderTest, noteWillChange__reachesNearestObserver) {
     RecordingObserver sceneObserver, objectObserver;
     TQChannelFolder scene("Scene", 0);
     scene.setChangeObserver(&sceneObserver);
     TQChannelBase* x = position->getXChannel();
     x->noteWillChange(true);
-    EXPECT_TRUE(objectObserver.told.empty());
     object.setChangeObserver(&objectObserver);
     x->noteWillChange(true);
     x->noteWillChange(false);
-    ASSERT_EQ(objectObserver.told.size(), 1u) << "told once, and not for a silent change";
-    EXPECT_EQ(objectObserver.told[0], x) << "the observer hears which channel changes";
+    visible->setLocked(true);
+    visible->setLocked(true);  // no change, nothing told
+    visible->setFlag(0x4, true);
+    rotation->setQuaternionMode(true);
+    EXPECT_EQ(objectObserver.told, (std::vector<TQChannelBase*>{x, visible, visible, rotation}))
+        << "the nearest observer hears which channel changes, and not of a silent change";
     EXPECT_TRUE(sceneObserver.told.empty());
-}
 
-TEST_F(TreeFolderTest, timeOffset__sumsAncestors) {
     object.setTimeOffset(seconds(10));
     transform->setTimeOffset(seconds(-2));
     EXPECT_EQ(position->getXChannel()->timeOffset(), seconds(8));
     object.setRootCurrentTime(seconds(11));
     EXPECT_EQ(object.getRootCurrentTime(true), seconds(1)) << "in the object's channel time";
     EXPECT_EQ(object.getRootCurrentTime(false), seconds(11));
+    EXPECT_EQ(inner->getChannelRoot(), nested);
+    EXPECT_EQ(position->getXChannel()->getChannelRoot(), &object);
+    EXPECT_EQ(TQChannel("Loose", 1).getChannelRoot(), nullptr);
 }
 
-TEST_F(TreeFolderTest, children__ownershipAndBadIndices) {
+TEST_F(TreeFolderTest, children__ownershipMovesAndBadIndices) {
     EXPECT_EQ(object.getChild(99), nullptr);
     EXPECT_FALSE(object.removeChildAt(99));
     EXPECT_EQ(object.takeChildAt(2), nullptr) << "a null slot has nothing to hand over";
+    EXPECT_EQ(object.takeChildAt(99), nullptr);
     TQChannel stranger("Stranger", 5);
-    EXPECT_FALSE(object.removeChild(&stranger));
-    EXPECT_FALSE(object.removeChild(nullptr));
+    EXPECT_FALSE(object.removeChild(&stranger) || object.removeChild(nullptr) ||
+                 object.indexOfChild(opacity));
+    EXPECT_EQ(object.numberOfChildren(), 5u);
 
     std::unique_ptr<TQChannelBase> taken = object.takeChild(visible);
     ASSERT_NE(taken, nullptr);
     EXPECT_EQ(taken->getParent(), nullptr);
     EXPECT_EQ(object.findChild(1000), nullptr);
     hidden->insertChild(500, std::move(taken));  // past the end appends
-    EXPECT_EQ(hidden->getChild(1), visible);
+    EXPECT_EQ(hidden->indexOfChild(visible), 1u);
     EXPECT_EQ(visible->getParent(), hidden);
-
-    transform->addChild(std::unique_ptr<TQChannelBase>(visible));  // moves between folders
+    transform->insertChild(0, std::unique_ptr<TQChannelBase>(visible));  // moves between folders
     EXPECT_EQ(hidden->numberOfChildren(), 1u);
+    EXPECT_EQ(transform->getChild(0), visible);
     EXPECT_EQ(visible->getParent(), transform);
+    delete visible;  // deleted on its own: it leaves its folder first
+    EXPECT_EQ(transform->numberOfChildren(), 2u);
+    EXPECT_TRUE(object.removeChildAt(2)) << "an empty slot can be removed";
+    EXPECT_TRUE(object.removeChild(nested));
+    EXPECT_EQ(object.numberOfChildren(), 2u);
+
+    // Many siblings: lookups use an index that follows every change; of equal ids the first
+    // in display order wins.
+    TQChannelFolder wide("Wide", 0);
+    for (TQChannelId id = 1000; id > 0; id -= 10) add<TQChannel>(wide, "C", id);
+    wide.addChild(nullptr);
+    add<TQChannel>(wide, "Duplicate", 500);
+    TQChannelBase* first = wide.findChild(500);
+    ASSERT_NE(first, nullptr);
+    EXPECT_EQ(first->getName(), "C");
+    EXPECT_TRUE(wide.removeChild(first));
+    EXPECT_EQ(wide.findChild(500)->getName(), "Duplicate");
+    wide.insertChild(0, std::make_unique<TQChannel>("Inserted", 3));
+    EXPECT_EQ(wide.findChild(3)->getName(), "Inserted");
+    EXPECT_EQ(wide.findChild(4), nullptr);
+    EXPECT_EQ(wide.findChild(10)->getName(), "C");
 
     object.removeAllChildren();
     EXPECT_EQ(object.getChildren(), nullptr) << "no children: a null vector";
-    EXPECT_FALSE(object.isAnimated(true));
+    EXPECT_EQ(object.findChild(100), nullptr);
 }
 
-TEST_F(TreeFolderTest, animatedAndReset) {
+TEST_F(TreeFolderTest, animatedAndReset__aFolderAnswersForItsDescendants) {
     EXPECT_FALSE(transform->isAnimated(false)) << "a folder has no animation of its own";
     EXPECT_TRUE(transform->isAnimated(true));
     EXPECT_TRUE(position->isAnimated(false)) << "a compound answers for its components";
     EXPECT_FALSE(rotation->isAnimated(false));
+    hidden->setFoldFlag(kTQFoldFlagCollapsed);
     object.reset(false);
-    EXPECT_FALSE(object.isAnimated(true));
+    EXPECT_FALSE(object.isAnimated(true) || position->isAnimated());
     EXPECT_EQ(opacity->numberOfKeyframes(), 0u);
+    EXPECT_TRUE(hidden->testFlag(kTQChannelFlagHidden) &&
+                hidden->testFoldFlag(kTQFoldFlagCollapsed))
+        << "a folder's own flags and fold state stay";
 }
 
-TEST(TreeFactory, identifiersAndCreation) {
-    EXPECT_EQ(kTQChannelBoolFactoryId.word0, 0x229211d70b00de81u);
-    EXPECT_EQ(kTQChannelBoolFactoryId.word1, 0x9389b702ac3d0003u);
-    TQChannelBool flag("On", 1);
-    EXPECT_EQ(TQChannelFactoryIdOf(&flag), kTQChannelBoolFactoryId);
-    TQChannel plain("Plain", 1);
-    EXPECT_EQ(TQChannelFactoryIdOf(&plain), kTQChannelFactoryId);
+TEST(TreeTypes, factoriesCreateAndCloneEveryClassAsItself) {
+    EXPECT_EQ(kTQChannelBoolFactoryId, (TQFactoryId{0x229211d70b00de81u, 0x9389b702ac3d0003u}))
+        << "identifiers in saved data never change";
     EXPECT_TRUE(TQChannelFactoryIdOf(nullptr).isNull());
-
-    for (const TQFactoryId& id :
-         {kTQChannelFactoryId, kTQChannelFolderFactoryId, kTQChannelBoolFactoryId,
-          kTQChannelCurveFactoryId, kTQChannelBlindDataFactoryId, kTQChannelAngleFactoryId,
-          kTQChannelDecibelFactoryId, kTQCompoundChannelFactoryId, kTQChannel2DFactoryId,
-          kTQChannel2DOverRangeFactoryId, kTQChannelScaleOverRangeFactoryId,
-          kTQChannelRotation3DFactoryId, kTQChannelObjectRootFactoryId}) {
+    for (uint64_t word = 1; word <= 13; ++word) {
+        const TQFactoryId id{0x229211d70b00de81u, 0x9389b702ac3d0000u + word};
         const TQFactory* factory = TQFactory::find(id);
-        ASSERT_NE(factory, nullptr) << "no factory for word " << id.word1;
+        ASSERT_NE(factory, nullptr) << "no factory for word " << word;
         std::unique_ptr<TQChannelBase> made = factory->create("Made", 42);
         EXPECT_EQ(TQChannelFactoryIdOf(made.get()), id) << factory->getClassName();
         std::unique_ptr<TQChannelBase> copy(made->cloneChannel());
-        const TQChannelBase& copied = *copy;
-        const TQChannelBase& original = *made;
+        const TQChannelBase &copied = *copy, &original = *made;
         EXPECT_EQ(typeid(copied), typeid(original))
             << factory->getClassName() << " clones as itself";
-        EXPECT_TRUE(*copy == *made) << factory->getClassName();
+        EXPECT_TRUE(*copy == *made && copy->getName() == "Made" && copy->getChannelId() == 42u);
     }
     EXPECT_EQ(TQFactory::find(TQFactoryId{1, 2}), nullptr);
+    struct HostChannel : TQChannelFolder {
+        using TQChannelFolder::TQChannelFolder;
+        const TQFactory* getFactory() const override { return TQChannelBase::getFactory(); }
+    } host("Host", 1);
+    EXPECT_TRUE(TQChannelFactoryIdOf(&host).isNull()) << "a host's class without a factory";
 }
 
-TEST(TreeTypes, boolSnapsAndFixedInterpolationHolds) {
+TEST(TreeTypes, typedChannels__snapFixTheirInterpolationAndComeWithTheirComponents) {
     TQChannelBool flag("On", 1);
+    const CMTime t = seconds(1);
     flag.setKeyframe(seconds(0), 0.7);
-    double value = -1.0;
-    ASSERT_TRUE(flag.getKeyframe(flag.getKeyframe(seconds(0)), nullptr, &value));
-    EXPECT_EQ(value, 1.0) << "0.7 is on";
-    EXPECT_TRUE(flag.isDiscrete());
+    flag.setKeyframeValue(flag.setKeyframe(t, 1.0), 0.2);
+    flag.setValue(&t, 0.5);
+    flag.setInitialValue(0.49);
+    flag.setDefaultValue(0.9);
+    EXPECT_EQ(keyText(flag), "0=1/0 1=1/0") << "half and above is on";
+    EXPECT_EQ(flag.getInitialValue() + 10 * flag.getDefaultValue(), 10.0);
+    EXPECT_TRUE(flag.isDiscrete() && flag.getBoolValue(seconds(0.5)));
+    EXPECT_EQ(flag.curveMaximum() + flag.sliderMaximum() + flag.curveMinimum(), 2.0);
 
     TQChannelBlindData data("Data", 2);
+    TQChannelCurve curve("Curve", 3);
     TQKeyframeHandle h = data.setKeyframe(seconds(0), 3.0);
     data.setKeyframeInterpolation(h, kTQInterpolationLinear);
+    data.setInterpolation(kTQInterpolationLinear);
+    curve.setInterpolation(kTQInterpolationLinear);
     EXPECT_EQ(data.getKeyframeInterpolation(h), kTQInterpolationConstant);
-    EXPECT_TRUE(data.testFlag(kTQChannelFlagNoInterpolationChange));
+    EXPECT_EQ(curve.getInterpolation(), kTQInterpolationBezier);
+    EXPECT_TRUE(data.testFlag(kTQChannelFlagNoInterpolationChange) &&
+                curve.testFlag(kTQChannelFlagNoInterpolationChange));
+
+    TQChannelAngle angle("Angle", 4, 1.0);
+    EXPECT_NEAR(angle.getInfo()->displayScale * std::numbers::pi, 180.0, 1e-12);
+    EXPECT_NEAR(angle.getInfo()->valueStep * 180.0, std::numbers::pi, 1e-12)
+        << "a nudge moves a degree";
+    TQChannelDecibel gain("Gain", 5, -2.0);
+    EXPECT_EQ(gain.getInitialValue(), 2.0) << "an amplitude is never negative";
+    EXPECT_EQ(gain.curveMinimum(), 0.0);
+    EXPECT_NEAR(gain.getDecibels(seconds(0)), 6.0206, 1e-4);
+    EXPECT_NEAR(TQChannelDecibel::decibelsToAmplitude(-20.0), 0.1, 1e-12);
+
+    TQChannel2D pair("Pair", 6, 3.0, 4.0);
+    TQChannelScaleOverRange scale("Scale", 7);
+    TQChannel2DOverRange gradient("Gradient", 8);
+    static_assert(!std::is_base_of_v<TQChannel2DOverRange, TQChannelScaleOverRange>,
+                  "told apart by downcast");
+    EXPECT_EQ(pair.getXChannel()->getName() + pair.getYChannel()->getName(), "XY");
+    EXPECT_EQ(pair.getXChannel()->getInitialValue() * 10 + pair.getYChannel()->getInitialValue(),
+              34.0);
+    EXPECT_EQ(scale.getXChannel()->getInitialValue() + scale.getYChannel()->getInitialValue(), 2.0);
+    EXPECT_TRUE(pair.isLinked() && scale.isLinked() && pair.numberOfComponents() == 2);
+    EXPECT_TRUE(scale.timeExtent() == TQOverRangePositionRange() &&
+                gradient.timeExtent() == TQOverRangePositionRange());
+    EXPECT_EQ(CMTimeGetSeconds(TQOverRangePositionRange().end()), 1.0);
+    EXPECT_FALSE(pair.timeExtent() == TQOverRangePositionRange());
+    pair.removeChild(pair.getXChannel());
+    EXPECT_EQ(pair.getXChannel(), nullptr) << "a component the host removed";
 
     TQChannelRotation3D rotation("Rotation", 9);
     EXPECT_NE(rotation.getAngleChannel(kTQComponentZ), nullptr);
-    EXPECT_TRUE(rotation.isLinked());
-    TQChannelScaleOverRange scale("Scale", 3);
-    static_assert(!std::is_base_of_v<TQChannel2DOverRange, TQChannelScaleOverRange>,
-                  "pair classes must be told apart by downcast");
-    EXPECT_EQ(scale.getXChannel()->getInitialValue(), 1.0);
+    EXPECT_EQ(rotation.getAngleChannel(4), nullptr);
+    EXPECT_TRUE(rotation.isLinked() && rotation.numberOfComponents() == 3 &&
+                !rotation.isQuaternionMode());
+}
+
+// A compound of three components, each keyed at 1 s (value 10 * id) and 2 s, and shifted by
+// one second on the editor's axis.
+class TreeCompoundTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        for (TQChannelId id : {1u, 2u, 3u}) {
+            auto* c = add<TQChannel>(compound, "C", id);
+            c->setKeyframe(seconds(1), 10.0 * id);
+            c->setKeyframe(seconds(2), 0.0);
+            components.push_back(c);
+        }
+        compound.addChild(nullptr);
+        add<TQChannelFolder>(compound, "Not a component", 4);
+        compound.setTimeOffset(seconds(1));
+        compound.setChangeObserver(&observer);
+    }
+    std::string keys() const {
+        return keyText(*components[0]) + " | " + keyText(*components[1]) + " | " +
+               keyText(*components[2]);
+    }
+    TQCompoundChannel compound{"Position", 101};
+    std::vector<TQChannel*> components;
+    RecordingObserver observer;
+};
+
+TEST_F(TreeCompoundTest, linkedEdits__reachEveryComponentInChildOrderUnlinkedOnlyTheTouchedOne) {
+    EXPECT_EQ(compound.getComponents(), components);
+    EXPECT_EQ(compound.numberOfComponents(), 3u);
+    compound.addKeyframe(components[1], seconds(4), true);  // axis 4 s = channel 3 s
+    EXPECT_EQ(keys(), "1=10 2=0 3=0 | 1=20 2=0 3=0 | 1=30 2=0 3=0") << "valued from each curve";
+    EXPECT_EQ(observer.told,
+              (std::vector<TQChannelBase*>{components[0], components[1], components[2]}))
+        << "each component is announced, in child order";
+    compound.addKeyframe(components[1], seconds(5.5), false);
+    compound.addKeyframe(components[0], seconds(2), true);  // channel 1 s: taken everywhere
+    EXPECT_EQ(observer.told.size(), 4u) << "nothing to add, nothing announced";
+    EXPECT_EQ(keys(), "1=10 2=0 3=0 | 1=20 2=0 3=0 4.5=0 | 1=30 2=0 3=0");
+
+    const double newValue = 99.0;
+    bool collided = true;
+    compound.moveKeyframe(components[0], seconds(2), seconds(2.5), &newValue, &collided, true);
+    EXPECT_FALSE(collided);
+    EXPECT_EQ(keys(), "1.5=99 2=0 3=0 | 1.5=20 2=0 3=0 4.5=0 | 1.5=30 2=0 3=0")
+        << "each found at the target, the touched one with the new value";
+    compound.moveKeyframe(components[2], seconds(2.5), seconds(3), nullptr, &collided, false);
+    EXPECT_TRUE(collided) << "moved onto the keyframe at channel 2 s";
+    EXPECT_EQ(keys(), "1.5=99 2=0 3=0 | 1.5=20 2=0 3=0 4.5=0 | 2=0 2=30 3=0")
+        << "both stay until a purge";
+    compound.deleteKeyframe(components[0], seconds(2), false);
+    compound.deleteKeyframe(components[1], seconds(3), true);
+    EXPECT_EQ(keys(), "1.5=99 | 1.5=20 2=0 4.5=0 | 2=0 2=30") << "deletes take channel times";
+
+    // The compound's own link flag links whatever the caller asks.
+    compound.setLinked(true);
+    compound.addKeyframe(components[1], seconds(7), false);
+    compound.deleteKeyframe(components[0], seconds(1.5), false);
+    EXPECT_EQ(keys(), "6=99 | 2=0 4.5=0 6=0 | 2=0 2=30 6=30");
+}
+
+TEST_F(TreeCompoundTest,
+       interpolationAndStrangers__lockedOutComponentsAndForeignOrNullOnesChangeNothing) {
+    components[2]->setFlag(kTQChannelFlagNoInterpolationChange, false);
+    components[1]->setTimeOffset(
+        seconds(0.5));  // its own offset: the same instant is 0.5 s earlier
+    components[1]->setKeyframe(seconds(0.5), 7.0);
+    TQKeyframeHandle h = components[0]->getKeyframe(seconds(1));
+    compound.setLinkedInterpolation(components[0], h, kTQInterpolationExp, true);
+    EXPECT_EQ(keys(), "1=10/13 2=0 | 0.5=7/13 1=20 2=0 | 1=30 2=0") << "the same instant in each";
+    compound.setLinkedInterpolation(components[1], components[1]->getKeyframe(seconds(1)),
+                                    kTQInterpolationLinear, false);
+    compound.deleteKeyframe(components[1], seconds(0.5), true);
+    EXPECT_EQ(keys(), "2=0 | 1=20/1 2=0 | 2=0") << "its 0.5 s is the others' 1 s";
+    compound.setLinkedCurveInterpolation(kTQInterpolationCatmullRom);
+    EXPECT_EQ(keys(), "2=0/6 | 1=20/6 2=0/6 | 2=0") << "except where changes are refused";
+
+    observer.told.clear();
+    components[0]->deleteKeyframe(h);
+    compound.setLinkedInterpolation(components[0], h, kTQInterpolationConstant, true);
+    TQChannel stranger("Stranger", 1);
+    stranger.setKeyframe(seconds(1), 1.0);
+    compound.deleteKeyframe(&stranger, seconds(1), true);
+    compound.addKeyframe(nullptr, seconds(4), true);
+    compound.moveKeyframe(&stranger, seconds(2), seconds(4), nullptr, nullptr, true);
+    compound.setLinkedInterpolation(&stranger, stranger.getKeyframe(seconds(1)),
+                                    kTQInterpolationLinear, true);
+    compound.addKeyframe(components[0], kCMTimeInvalid, true);
+    EXPECT_TRUE(observer.told.empty()) << "a stale handle, a stranger or no time changes nothing";
+    EXPECT_EQ(keyText(stranger), "1=1");
+    EXPECT_EQ(keys(), "2=0/6 | 1=20/6 2=0/6 | 2=0");
+    EXPECT_TRUE(compound.isCompoundChannel() && !TQChannelFolder("F", 1).isCompoundChannel());
 }
 
 }  // namespace
