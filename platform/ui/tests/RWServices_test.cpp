@@ -8,18 +8,13 @@
 
 namespace {
 
-class RWUserDefaultsTest : public ::testing::Test {
-protected:
+TEST(RWUserDefaultsTest, readers__convertBetweenNumbersBooleansAndTextsOverRegisteredDefaults) {
     RWMemoryUserDefaults defaults;
-};
-
-TEST_F(RWUserDefaultsTest, readers__convertBetweenNumbersBooleansAndTexts) {
     defaults.setObject(std::string("YES"), "text-yes");
     defaults.setObject(std::string("2.5"), "text-number");
     defaults.setObject(std::string("abc"), "text-word");
     defaults.setDouble(3.75, "double");
     defaults.setBool(true, "bool");
-
     EXPECT_TRUE(defaults.boolForKey("text-yes"));
     EXPECT_DOUBLE_EQ(defaults.doubleForKey("text-number"), 2.5);
     EXPECT_EQ(defaults.integerForKey("double"), 3) << "doubles truncate to integers";
@@ -27,9 +22,7 @@ TEST_F(RWUserDefaultsTest, readers__convertBetweenNumbersBooleansAndTexts) {
     EXPECT_FALSE(defaults.boolForKey("text-word")) << "a text that is no number reads as false";
     EXPECT_EQ(defaults.stringForKey("double"), "") << "numbers are not formatted as texts";
     EXPECT_FALSE(defaults.boolForKey("missing"));
-}
-
-TEST_F(RWUserDefaultsTest, registeredDefaults__standBelowStoredValuesAndComeBackOnRemoval) {
+    // Registered defaults stand below stored values and come back when those are removed.
     defaults.registerDefaults({{"TQPreferenceManager::flag", RWDefaultsValue{true}}});
     EXPECT_TRUE(defaults.boolForKey("TQPreferenceManager::flag"));
     defaults.setBool(false, "TQPreferenceManager::flag");
@@ -48,46 +41,28 @@ TEST(RWPasteboardTest, clearContents__dropsEveryTypeAndCountsChanges) {
     EXPECT_EQ(board.stringForType("public.text"), "c");
     EXPECT_EQ(board.availableTypeFromArray({"x", "TQCurveEditorPrivateDrag"}),
               "TQCurveEditorPrivateDrag");
-
     EXPECT_EQ(board.clearContents(), before + 1);
     EXPECT_TRUE(board.types().empty());
     EXPECT_FALSE(board.dataForType("public.text").has_value());
 }
 
-TEST(RWTimerTest, manualTimer__runsBlocksInDueOrderOnlyWhenTheClockPassesThem) {
+TEST(RWServicesTest, queuedTimer__runsBlocksInDueOrderWhenTheirTimeHasCome) {
     RWManualClock clock;
-    RWManualTimer timer(clock);
+    RWQueuedTimer timer(clock);
     std::vector<int> ran;
     timer.dispatchAfter(33333333, [&] { ran.push_back(2); });
     timer.dispatchAfter(10000000, [&] { ran.push_back(1); });
     timer.dispatchAfter(33333333, [&] {
         ran.push_back(3);
-        // Added while running; due at once, so it runs in the same drain.
-        timer.dispatchAfter(0, [&] { ran.push_back(4); });
+        timer.dispatchAfter(0, [&] { ran.push_back(4); });  // due at once: runs in the same drain
+        timer.dispatchAfter(1000000000, [&] { ran.push_back(5); });
     });
-
-    EXPECT_EQ(timer.advance(0.005), 0u) << "nothing is due after 5 ms";
-    EXPECT_EQ(timer.advance(0.030), 4u);
+    clock.advance(0.005);
+    EXPECT_EQ(timer.runDueBlocks(), 0u) << "nothing is due after 5 ms";
+    clock.advance(0.030);
+    EXPECT_EQ(timer.runDueBlocks(), 4u);
     EXPECT_EQ(ran, (std::vector<int>{1, 2, 3, 4})) << "equal due times run in dispatch order";
-    EXPECT_EQ(timer.pendingCount(), 0u);
-    EXPECT_EQ(timer.requests().front(), 33333333u);
-}
-
-TEST(RWModalTest, scriptedModal__answersWhatTheScriptEndsWithAndNests) {
-    RWScriptedModal modal;
-    RWWindow outer;
-    outer.setTitle("outer");
-    RWWindow inner;
-    inner.setTitle("inner");
-    modal.pushScript([&](RWWindow&, RWModalService& m) {
-        EXPECT_EQ(m.runModalForWindow(inner), RWModalResponseAbort)
-            << "the inner run has no script left";
-        m.stopModalWithCode(RWModalResponseOK);
-        m.abortModal();  // too late: the first end wins
-    });
-
-    EXPECT_EQ(modal.runModalForWindow(outer), RWModalResponseOK);
-    EXPECT_EQ(modal.runs(), (std::vector<std::string>{"outer", "inner"}));
+    EXPECT_EQ(timer.pendingCount(), 1u);
 }
 
 TEST(RWServicesTest, install__replacesOnlyTheGivenServicesUntilReset) {
@@ -96,28 +71,13 @@ TEST(RWServicesTest, install__replacesOnlyTheGivenServicesUntilReset) {
     RWInstallServices({&clock, nullptr, &modal, nullptr, nullptr});
     EXPECT_DOUBLE_EQ(RWApplicationServices().clock->now(), 42.0);
     EXPECT_EQ(RWApplicationServices().modal, &modal);
-    EXPECT_NE(RWApplicationServices().timer, nullptr) << "unset services keep the headless ones";
+    EXPECT_EQ(RWApplicationServices().timer, &RWHeadlessTimer())
+        << "unset services keep the headless ones";
     RWResetServices();
     EXPECT_NE(RWApplicationServices().clock, &clock);
     RWWindow window;
     EXPECT_EQ(RWApplicationServices().modal->runModalForWindow(window), RWModalResponseAbort)
         << "headless modal runs abort at once";
-}
-
-TEST(RWStubViewHostTest, nextEventMatchingMask__takesOnlyMatchingEventsInOrder) {
-    RWStubViewHost host;
-    host.queueEvent(RWEvent::scrollWheelEvent(1, 2));
-    host.queueEvent(RWEvent::keyEvent(RWEventType::KeyDown, "a"));
-    host.queueEvent(RWEvent::scrollWheelEvent(3, 4));
-    EXPECT_EQ(RWEventMaskScrollWheel, 0x400000u);
-
-    auto first = host.nextEventMatchingMask(RWEventMaskScrollWheel);
-    auto second = host.nextEventMatchingMask(RWEventMaskScrollWheel);
-    ASSERT_TRUE(first && second);
-    EXPECT_DOUBLE_EQ(first->deltaX(), 1.0);
-    EXPECT_DOUBLE_EQ(second->deltaY(), 4.0);
-    EXPECT_FALSE(host.nextEventMatchingMask(RWEventMaskScrollWheel).has_value());
-    EXPECT_EQ(host.queuedCount(), 1u) << "the key event stays queued";
 }
 
 }  // namespace

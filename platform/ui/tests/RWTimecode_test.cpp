@@ -32,45 +32,39 @@ std::string text(const CMTime& time, const CMTime& duration, bool drop) {
 
 TEST(Timecode, text__aroundTheMinuteMarksAtEveryRate) {
     struct Case {
-        const char* what;
         CMTime time;
         CMTime duration;
         bool drop;
         const char* expected;
     };
+    // Around the minute marks: 29.97 drop frame skips ;00 and ;01 but in every tenth minute;
+    // 59.94 skips four numbers; other rates never drop; hours do not wrap; negatives count down.
     const Case cases[] = {
-        {"29.97 drop: last frame of minute 0", frameStart(1799, k2997), k2997, true, "00:00:59;29"},
-        {"29.97 drop: ;00 and ;01 are skipped", frameStart(1800, k2997), k2997, true,
-         "00:01:00;02"},
-        {"29.97 drop: minute 2", frameStart(3598, k2997), k2997, true, "00:02:00;02"},
-        {"29.97 drop: before the tenth minute", frameStart(17981, k2997), k2997, true,
-         "00:09:59;29"},
-        {"29.97 drop: the tenth minute keeps ;00", frameStart(17982, k2997), k2997, true,
-         "00:10:00;00"},
-        {"29.97 drop: minute 11 drops again", frameStart(19782, k2997), k2997, true, "00:11:00;02"},
-        {"29.97 drop: one hour", frameStart(107892, k2997), k2997, true, "01:00:00;00"},
-        {"29.97 drop: 60.06 s in another timescale", CMTimeMake(6006, 100), k2997, true,
-         "00:01:00;02"},
-        {"29.97 drop: inside a frame", CMTimeMake(1801800 + 500, 30000), k2997, true,
-         "00:01:00;02"},
-        {"29.97 drop: 100/2997 s is the same rate", CMTimeMake(18, 1), CMTimeMake(100, 2997), true,
-         "00:00:17;29"},
-        {"29.97 non-drop", frameStart(1800, k2997), k2997, false, "00:01:00:00"},
-        {"59.94 drop: last frame of minute 0", frameStart(3599, k5994), k5994, true, "00:00:59;59"},
-        {"59.94 drop: four numbers skipped", frameStart(3600, k5994), k5994, true, "00:01:00;04"},
-        {"25: drop asked, none at this rate", frameStart(49, k25), k25, true, "00:00:01:24"},
-        {"25: one hour", frameStart(90000, k25), k25, false, "01:00:00:00"},
-        {"24: hours do not wrap", frameStart(24 * 3600 * 25, k24), k24, false, "25:00:00:00"},
-        {"23.976: never drop", frameStart(1440, k23976), k23976, true, "00:01:00:00"},
-        {"120: three frame digits", frameStart(119, CMTimeMake(1, 120)), CMTimeMake(1, 120), false,
-         "00:00:00:119"},
-        {"negative: a sixtieth before zero is frame -1", CMTimeMake(-1, 60), k30, false,
-         "-00:00:00:01"},
-        {"negative: drop frame", frameStart(-1800, k2997), k2997, true, "-00:01:00;02"},
-        {"invalid time", kCMTimeInvalid, k30, false, "nil"},
-        {"zero frame duration", CMTimeMake(1, 1), CMTimeMake(0, 30), false, "nil"},
+        {frameStart(1799, k2997), k2997, true, "00:00:59;29"},
+        {frameStart(1800, k2997), k2997, true, "00:01:00;02"},
+        {frameStart(3598, k2997), k2997, true, "00:02:00;02"},
+        {frameStart(17981, k2997), k2997, true, "00:09:59;29"},
+        {frameStart(17982, k2997), k2997, true, "00:10:00;00"},
+        {frameStart(19782, k2997), k2997, true, "00:11:00;02"},
+        {frameStart(107892, k2997), k2997, true, "01:00:00;00"},
+        {CMTimeMake(6006, 100), k2997, true, "00:01:00;02"},
+        {CMTimeMake(1801800 + 500, 30000), k2997, true, "00:01:00;02"},
+        {CMTimeMake(18, 1), CMTimeMake(100, 2997), true, "00:00:17;29"},
+        {frameStart(1800, k2997), k2997, false, "00:01:00:00"},
+        {frameStart(3599, k5994), k5994, true, "00:00:59;59"},
+        {frameStart(3600, k5994), k5994, true, "00:01:00;04"},
+        {frameStart(49, k25), k25, true, "00:00:01:24"},
+        {frameStart(90000, k25), k25, false, "01:00:00:00"},
+        {frameStart(24 * 3600 * 25, k24), k24, false, "25:00:00:00"},
+        {frameStart(1440, k23976), k23976, true, "00:01:00:00"},
+        {frameStart(119, CMTimeMake(1, 120)), CMTimeMake(1, 120), false, "00:00:00:119"},
+        {CMTimeMake(-1, 60), k30, false, "-00:00:00:01"},
+        {frameStart(-1800, k2997), k2997, true, "-00:01:00;02"},
+        {kCMTimeInvalid, k30, false, "nil"},
+        {CMTimeMake(1, 1), CMTimeMake(0, 30), false, "nil"},
     };
-    for (const Case& c : cases) EXPECT_EQ(text(c.time, c.duration, c.drop), c.expected) << c.what;
+    for (const Case& c : cases)
+        EXPECT_EQ(text(c.time, c.duration, c.drop), c.expected) << c.time.value;
 }
 
 TEST(Timecode, readBack__everyFrameOfElevenMinutesRoundTrips) {
