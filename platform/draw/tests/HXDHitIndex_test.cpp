@@ -192,80 +192,59 @@ TEST_F(HitIndexFixture, index__columnsCutTheListAndFindOnlyWhatIsNear) {
         << "candidates come in list order";
 }
 
-TEST_F(HitIndexFixture, list__aNewFrameInTheSameVectorIsSeen) {
+TEST_F(HitIndexFixture, changes__aNewFrameInTheSameVectorAndGeometryChangedAfterATestAreSeen) {
     HXDPrimitiveArray list = frame(3);
     const CGPoint high = pixel(5.0, 4.8);
-    const auto before = pick(list, high, false);
-
+    pick(list, high, false);
     // The next frame refills the same vector: same size, same buffer, other primitives.
     const size_t size = list.size();
     list.clear();
-    list.push_back(curve(4.8, 0.0, 1.0f, 50));
-    while (list.size() < size)
-        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, -5, 0.1, 0.1), 1));
-    const auto after = pick(list, high);
-    ASSERT_EQ(after.size(), 1u) << "the new curve through the point is found";
-    EXPECT_EQ(after[0].primitive(), list[0]);
-
-    // One entry replaced in place.
-    list[size / 2] = std::make_shared<HXDScreenspaceQuad>(CGRectMake(4.9, 4.7, 0.2, 0.2), 42);
-    const auto replaced = pick(list, high);
-    ASSERT_EQ(replaced.size(), 1u);
-    EXPECT_EQ(replaced[0].hitID(), 42u)
-        << "a filled shape on the curve wins, once the index sees it";
-}
-
-TEST_F(HitIndexFixture, primitive__geometryChangedAfterATestIsSeen) {
-    HXDPrimitiveArray list = frame(4);
     auto line = curve(4.8, 0.0, 1.0f, 50);
     list.push_back(line);
-    const CGPoint p = pixel(5.0, 4.8);
-    const CGPoint off = CGPointMake(p.x, p.y + 6.0);
-    EXPECT_TRUE(pick(list, off).empty()) << "6 px off a 1 pt line is beyond its reach";
+    while (list.size() < size)
+        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, -5, 0.1, 0.1), 1));
+    EXPECT_EQ(pick(list, high).at(0).primitive(), line)
+        << "the new curve through the point is found";
+    // 6 px off a 1 pt line is beyond its reach; a wider line reaches further.
+    const CGPoint off = CGPointMake(high.x, high.y + 6.0);
+    EXPECT_TRUE(pick(list, off).empty());
     line->setWidth(8.0f);
-    EXPECT_EQ(pick(list, off).size(), 1u) << "a wider line reaches further";
-
-    // Left of where the curves start, clear of everything else.
+    EXPECT_EQ(pick(list, off).size(), 1u);
+    // One entry replaced in place: a filled shape on the curve wins, once the index sees it.
+    list[size / 2] = std::make_shared<HXDScreenspaceQuad>(CGRectMake(4.9, 4.7, 0.2, 0.2), 42);
+    EXPECT_EQ(pick(list, high).at(0).hitID(), 42u);
+    // Left of where the curves start: outside a filled polygon, then on its outline.
     auto mesh = std::make_shared<HXDMesh>(
         5, HXDBrush{},
         std::vector<HXDSubmesh>{HXDSubmesh({{-0.9f, 2}, {-0.5f, 2}, {-0.5f, 2.5f}})});
     list.push_back(mesh);
     const CGPoint below = pixel(-0.6, 1.8);  // 2 px below the bottom edge
-    EXPECT_TRUE(pick(list, below).empty()) << "outside a filled polygon";
+    EXPECT_TRUE(pick(list, below).empty());
     mesh->setWireframe(true);
     EXPECT_EQ(pick(list, below).size(), 1u) << "the outline takes the line tolerance";
 }
 
 // Quads reject far tests in world space before mapping themselves: the edges must still
-// decide as the pixel test does.
+// decide as the pixel test does. Points go through single precision on the way in: a
+// thousandth of a pixel inside a corner is on the quad, a hundredth outside is not.
 TEST_F(HitIndexFixture, quad__edgesDecideAsInPixels) {
     const auto quad =
         std::make_shared<HXDScreenspaceQuad>(CGRectMake(6, 1, -2, 2), 1);  // negative width
     const CGPoint lo = pixel(4, 1), hi = pixel(6, 3);
-    // Points go through single precision on the way in: a thousandth of a pixel inside a
-    // corner is on the quad, a hundredth outside is not.
-    constexpr double kJustIn = 0.001, kJustOff = 0.01;
     for (const CGPoint edge : {lo, hi, CGPointMake(lo.x, hi.y), CGPointMake(hi.x, lo.y)}) {
-        const CGPoint in = CGPointMake(edge.x + (edge.x == lo.x ? kJustIn : -kJustIn),
-                                       edge.y + (edge.y == lo.y ? kJustIn : -kJustIn));
-        EXPECT_EQ(pick({quad}, in).size(), 1u)
-            << "inside the corner at " << edge.x << ", " << edge.y;
-        const CGPoint off = CGPointMake(edge.x + (edge.x == lo.x ? -kJustOff : kJustOff), edge.y);
-        EXPECT_TRUE(pick({quad}, off).empty())
-            << "just beside the corner at " << edge.x << ", " << edge.y;
-        const CGRect band = CGRectMake(off.x, off.y, edge.x == lo.x ? -5.0 : 5.0, 1.0);
-        EXPECT_TRUE(controller
-                        .newHitTestResultForPrimitives(
-                            {quad}, controller.renderingContextForHitTestInRect(band), false)
-                        .empty())
-            << "a band just beside the edge";
-        const CGRect touching = CGRectMake(edge.x, edge.y, edge.x == lo.x ? -5.0 : 5.0, 1.0);
-        EXPECT_EQ(controller
-                      .newHitTestResultForPrimitives(
-                          {quad}, controller.renderingContextForHitTestInRect(touching), false)
-                      .size(),
-                  1u)
-            << "a band touching the edge";
+        const double out = edge.x == lo.x ? -1.0 : 1.0, up = edge.y == lo.y ? -1.0 : 1.0;
+        EXPECT_EQ(pick({quad}, CGPointMake(edge.x - 0.001 * out, edge.y - 0.001 * up)).size(), 1u)
+            << edge.x << ", " << edge.y;
+        EXPECT_TRUE(pick({quad}, CGPointMake(edge.x + 0.01 * out, edge.y)).empty())
+            << edge.x << ", " << edge.y;
+        const auto band = [&](double x) {
+            return controller.newHitTestResultForPrimitives(
+                {quad},
+                controller.renderingContextForHitTestInRect(CGRectMake(x, edge.y, 5.0 * out, 1.0)),
+                false);
+        };
+        EXPECT_TRUE(band(edge.x + 0.01 * out).empty()) << "a band just beside the edge";
+        EXPECT_EQ(band(edge.x).size(), 1u) << "a band touching the edge";
     }
 }
 

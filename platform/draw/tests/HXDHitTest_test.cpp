@@ -4,6 +4,7 @@
 #include <limits>
 #include <memory>
 #include <random>
+#include <sstream>
 
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/draw/internal/HXDGeometry2D.h"
@@ -37,6 +38,20 @@ protected:
     std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p,
                                    bool closest = true) const {
         return controller.newHitTestResultForPrimitives(list, at(p), closest);
+    }
+    std::vector<HXDHitRecord> inBand(const HXDPrimitiveArray& list, CGRect band) const {
+        return controller.newHitTestResultForPrimitives(
+            list, controller.renderingContextForHitTestInRect(band), false);
+    }
+    // The records in order, each as its hit id in hex and, for a keypoint, "/" and its handle.
+    static std::string found(const std::vector<HXDHitRecord>& hits) {
+        std::ostringstream out;
+        for (const HXDHitRecord& h : hits) {
+            out << (out.tellp() > 0 ? " " : "") << std::hex << h.hitID() << std::dec;
+            if (const HXDNumber* handle = h.extraInfo().objectForKey("Handle"))
+                out << "/" << handle->unsignedLongLongValue();
+        }
+        return out.str();
     }
 
     // A keypoint image of 8 x 8 texels (2x, so 4 x 4 points): opaque except a transparent
@@ -84,46 +99,25 @@ TEST_F(HitTestFixture, mapping__agreesWithTheViewConversion) {
     }
 }
 
-TEST_F(HitTestFixture, context__beforeAnyFrameFindsNothing) {
+TEST_F(HitTestFixture, multiline__hitOnTheLineWithinTheToleranceAndOnlyAfterAFrame) {
+    const HXDPrimitiveArray list{nullptr,
+                                 curve({{{0, 0, 0}, {}}, {{5, 2, 0}, {}}, {{10, 2, 0}, {}}})};
     HXDRenderController fresh(nullptr, 1.0f);
-    const HXDPrimitiveArray list{curve({{{0, 0, 0}, {}}, {{10, 0, 0}, {}}})};
-    const HXDHitTestContext c = fresh.renderingContextForHitTestAtCoords(HXDFloat2{100, 50});
-    EXPECT_FALSE(c.isValid());
-    EXPECT_TRUE(fresh.newHitTestResultForPrimitives(list, c, true).empty())
-        << "no frame: no projection to test with";
-
-    HXDPrimitiveArray withNull{nullptr, list[0]};
-    EXPECT_EQ(pick(withNull, pixel(5, 0)).size(), 1u)
-        << "a null entry is skipped, not dereferenced";
-}
-
-TEST_F(HitTestFixture, multiline__hitOnTheLineAndWithinTheToleranceOnly) {
-    const HXDPrimitiveArray list{curve({{{0, 0, 0}, {}}, {{5, 2, 0}, {}}, {{10, 2, 0}, {}}})};
-    {
-        const auto hits = pick(list, pixel(7.5, 2));
-        ASSERT_EQ(hits.size(), 1u);
-        EXPECT_EQ(hits[0].hitID(), kCurveID);
-        EXPECT_FLOAT_EQ(hits[0].distance(), 0.0f) << "a point on the drawn line lies at distance 0";
+    const HXDHitTestContext none = fresh.renderingContextForHitTestAtCoords(HXDFloat2{100, 50});
+    EXPECT_FALSE(none.isValid());
+    EXPECT_TRUE(fresh.newHitTestResultForPrimitives(list, none, true).empty())
+        << "no frame: no projection";
+    // On the line: distance 0 (a null entry is skipped). 2 px above a 1 px line: 1.5 px beyond
+    // its edge, inside the 3 px tolerance; 4 px is beyond it.
+    const CGPoint p = pixel(7.5, 2);
+    for (const auto& [dy, distance] : {std::pair{0.0, 0.0}, {2.0, 1.5}, {-2.0, 1.5}, {4.0, -1.0}}) {
+        const auto hits = pick(list, CGPointMake(p.x, p.y + dy));
+        EXPECT_NEAR(hits.empty() ? -1.0 : hits[0].distance(), distance, kPixelTolerance) << dy;
+        EXPECT_EQ(found(hits), hits.empty() ? "" : "10000000") << dy;
     }
-    {
-        // 2 px above a 1 px line: 1.5 px beyond its edge, inside the 3 px tolerance.
-        const CGPoint p = pixel(7.5, 2);
-        const auto hits = pick(list, CGPointMake(p.x, p.y + 2));
-        ASSERT_EQ(hits.size(), 1u);
-        EXPECT_NEAR(hits[0].distance(), 1.5, kPixelTolerance);
-    }
-    {
-        const CGPoint p = pixel(7.5, 2);
-        EXPECT_TRUE(pick(list, CGPointMake(p.x, p.y + 4)).empty())
-            << "4 px off a 1 px line is beyond the tolerance";
-    }
-    {
-        // On a backing scale of 2, width 1 covers 2 px and the tolerance 6 px.
-        installFrame(2.0f);
-        const CGPoint p = pixel(7.5, 2);
-        EXPECT_EQ(pick(list, CGPointMake(p.x, p.y + 6.5)).size(), 1u)
-            << "tolerance follows the backing scale";
-    }
+    installFrame(2.0f);  // width 1 covers 2 px and the tolerance 6 px
+    EXPECT_EQ(pick(list, CGPointMake(pixel(7.5, 2).x, pixel(7.5, 2).y + 6.5)).size(), 1u)
+        << "the tolerance follows the backing scale";
 }
 
 // The index must find what a walk over every segment finds, for points and bands, for curves
@@ -216,16 +210,11 @@ TEST_F(HitTestFixture, multiline__segmentsWithGapsMakeRunsAndLoopsClose) {
 TEST_F(HitTestFixture, keypointQuad__transparentCornerDoesNotHitButTheImageDoes) {
     auto key = keypoint(5, 0, 0xFFFFFFFF12345678ull);
     const CGPoint centre = pixel(5, 0);
-    {
-        const auto hits = pick({key}, centre);
-        ASSERT_EQ(hits.size(), 1u);
-        EXPECT_EQ(hits[0].hitID(), kKeypointID);
-        const HXDNumber* handle = hits[0].extraInfo().objectForKey("Handle");
-        ASSERT_NE(handle, nullptr);
-        EXPECT_EQ(handle->unsignedLongLongValue(), 0xFFFFFFFF12345678ull)
-            << "a 64-bit handle survives the record";
-        EXPECT_EQ(hits[0].extraInfo().objectForKey("ID")->unsignedLongValue(), 7u);
-    }
+    const auto hits = pick({key}, centre);
+    EXPECT_EQ(found(hits), "20000000/18446744069720004216")
+        << "a 64-bit handle survives the record";
+    ASSERT_EQ(hits.size(), 1u);
+    EXPECT_EQ(hits[0].extraInfo().objectForKey("ID")->unsignedLongValue(), 7u);
     // The quad spans centre +- 8 px; its 2 x 2 texel corners are the outer 4 px.
     const CGPoint corner = CGPointMake(centre.x + 7, centre.y + 7);
     EXPECT_TRUE(pick({key}, corner).empty()) << "a transparent texel is not the keypoint";
@@ -240,87 +229,47 @@ TEST_F(HitTestFixture, closest__keypointOverCurveOverlapsToTheTopOneAndLinesByDi
     auto line = curve({{{0, 0, 0}, {}}, {{10, 0, 0}, {}}});
     auto first = keypoint(5, 0, 1);
     auto second = keypoint(5.2, 0, 2);  // overlaps the first by 12 px
-    {
-        const auto hits = pick({first, line}, pixel(5, 0));
-        ASSERT_EQ(hits.size(), 1u) << "closest answers at most one record";
-        EXPECT_EQ(hits[0].hitID(), kKeypointID)
-            << "the keypoint wins over the curve through it, drawn later or not";
-    }
-    {
-        const auto hits = pick({line, first, second}, pixel(5.1, 0));
-        ASSERT_EQ(hits.size(), 1u);
-        EXPECT_EQ(hits[0].extraInfo().objectForKey("Handle")->unsignedLongLongValue(), 2u)
-            << "of two overlapping keypoints the one drawn on top is hit";
-        EXPECT_EQ(pick({line, first, second}, pixel(5.1, 0), false).size(), 3u)
-            << "without the flag every primitive under the point answers, in order";
-    }
-    {
-        // A tangent handle near a curve: on the handle it wins; 2 px off the curve and
-        // outside the handle, the curve does.
-        auto handle = std::make_shared<HXDQuadTexture>(kOutTangentID, nullptr,
-                                                       CGRectMake(1, 0.5, 0.5, 1.0), 1.0f);
-        const auto on = pick({line, handle}, pixel(1.25, 1.0));
-        ASSERT_EQ(on.size(), 1u);
-        EXPECT_EQ(on[0].hitID(), kOutTangentID);
-        const auto off = pick({line, handle}, pixel(3, 0.2));
-        ASSERT_EQ(off.size(), 1u);
-        EXPECT_EQ(off[0].hitID(), kCurveID);
-    }
+    EXPECT_EQ(found(pick({first, line}, pixel(5, 0))), "20000000/1")
+        << "the keypoint wins over the curve through it, drawn later or not";
+    EXPECT_EQ(found(pick({line, first, second}, pixel(5.1, 0))), "20000000/2")
+        << "of two overlapping keypoints the one drawn on top is hit";
+    EXPECT_EQ(found(pick({line, first, second}, pixel(5.1, 0), false)),
+              "10000000 20000000/1 20000000/2")
+        << "without the flag every primitive under the point answers, in order";
+    // A tangent handle near a curve: on the handle it wins; 2 px off the curve and outside the
+    // handle, the curve does.
+    auto handle = std::make_shared<HXDQuadTexture>(kOutTangentID, nullptr,
+                                                   CGRectMake(1, 0.5, 0.5, 1.0), 1.0f);
+    EXPECT_EQ(found(pick({line, handle}, pixel(1.25, 1.0))), "40000000");
+    EXPECT_EQ(found(pick({line, handle}, pixel(3, 0.2))), "10000000");
 }
 
 TEST_F(HitTestFixture, rectangle__findsKeypointsByTheirOpaqueTexelsAndCurvesThatCross) {
-    auto a = keypoint(2, 0, 1);
-    auto b = keypoint(5, 2, 2);
-    auto c = keypoint(8, -2, 3);
-    const CGPoint pa = pixel(2, 0), pb = pixel(5, 2);
-    {
-        const CGRect band =
-            CGRectMake(pb.x + 1, pb.y + 1, pa.x - pb.x - 2, pa.y - pb.y - 2);  // negative size
-        const auto hits = controller.newHitTestResultForPrimitives(
-            {a, b, c}, controller.renderingContextForHitTestInRect(band), false);
-        ASSERT_EQ(hits.size(), 2u) << "the band from b's centre to a's covers both, not c";
-        EXPECT_EQ(hits[0].extraInfo().objectForKey("Handle")->unsignedLongLongValue(), 1u)
-            << "records keep array order";
-    }
-    {
-        // A small band over a's transparent top-right corner only.
-        const CGRect corner = CGRectMake(pa.x + 6.5, pa.y + 6.5, 1, 1);
-        EXPECT_TRUE(controller
-                        .newHitTestResultForPrimitives(
-                            {a}, controller.renderingContextForHitTestInRect(corner), false)
-                        .empty())
-            << "a band over a transparent corner does not select the keypoint";
-    }
-    {
-        auto line = curve({{{0, -4, 0}, {}}, {{10, 4, 0}, {}}});
-        const CGPoint mid = pixel(5, 0);
-        const auto crossing =
-            controller.renderingContextForHitTestInRect(CGRectMake(mid.x - 3, mid.y - 3, 6, 6));
-        EXPECT_EQ(controller.newHitTestResultForPrimitives({line}, crossing, false).size(), 1u);
-        const auto beside =
-            controller.renderingContextForHitTestInRect(CGRectMake(mid.x + 20, mid.y - 3, 6, 6));
-        EXPECT_TRUE(controller.newHitTestResultForPrimitives({line}, beside, false).empty());
-    }
+    auto a = keypoint(2, 0, 1), b = keypoint(5, 2, 2), c = keypoint(8, -2, 3);
+    const CGPoint pa = pixel(2, 0), pb = pixel(5, 2), mid = pixel(5, 0);
+    EXPECT_EQ(
+        found(inBand({a, b, c}, CGRectMake(pb.x + 1, pb.y + 1, pa.x - pb.x - 2, pa.y - pb.y - 2))),
+        "20000000/1 20000000/2")
+        << "a band of negative size from b's centre to a's covers both, not c, in array order";
+    EXPECT_EQ(found(inBand({a}, CGRectMake(pa.x + 6.5, pa.y + 6.5, 1, 1))), "")
+        << "a band over a transparent corner does not select the keypoint";
+    auto line = curve({{{0, -4, 0}, {}}, {{10, 4, 0}, {}}});
+    EXPECT_EQ(inBand({line}, CGRectMake(mid.x - 3, mid.y - 3, 6, 6)).size(), 1u);
+    EXPECT_TRUE(inBand({line}, CGRectMake(mid.x + 20, mid.y - 3, 6, 6)).empty());
 }
 
 TEST_F(HitTestFixture, meshAndFlatQuad__insideHitsOutsideDoesNot) {
     auto mesh = std::make_shared<HXDMesh>(
         9, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{2, -2}, {2, 2}, {8, 2}, {8, -2}})});
     auto handle = std::make_shared<HXDScreenspaceQuad>(CGRectMake(7.9, 1.8, 0.2, 0.4), 3);
-    {
-        const auto hits = pick({mesh, handle}, pixel(5, 0));
-        ASSERT_EQ(hits.size(), 1u);
-        EXPECT_EQ(hits[0].hitID(), 9u);
-    }
-    {
-        const auto hits = pick({mesh, handle}, pixel(8, 2));
-        ASSERT_EQ(hits.size(), 1u);
-        EXPECT_EQ(hits[0].hitID(), 3u) << "a box handle drawn over the box's inside wins";
-    }
-    EXPECT_TRUE(pick({mesh, handle}, pixel(9, 0)).empty());
+    EXPECT_EQ(found(pick({mesh, handle}, pixel(5, 0))), "9");
+    EXPECT_EQ(found(pick({mesh, handle}, pixel(8, 2))), "3")
+        << "a box handle drawn over the box's inside wins";
+    EXPECT_EQ(found(pick({mesh, handle}, pixel(9, 0))), "");
     mesh->setWireframe(true);
-    EXPECT_TRUE(pick({mesh}, pixel(5, 0)).empty()) << "a wireframe mesh is hit on its outline only";
-    EXPECT_EQ(pick({mesh}, pixel(2, 0)).size(), 1u);
+    EXPECT_EQ(found(pick({mesh}, pixel(5, 0))), "")
+        << "a wireframe mesh is hit on its outline only";
+    EXPECT_EQ(found(pick({mesh}, pixel(2, 0))), "9");
 }
 
 TEST_F(HitTestFixture, text__boxFollowsTheAnchorAndTheBackingScale) {

@@ -10,15 +10,19 @@ namespace {
 
 using Kind = HXDRecordingEncoder::Kind;
 
-TEST(HXDPrimitivesTest, encode__eachPrimitiveReachesItsOwnEncoderOperationInOrder) {
-    HXDRenderController controller(nullptr, 1.0f);
+TEST(HXDPrimitivesTest,
+     frame__eachPrimitiveReachesItsOwnEncoderOperationAndTheProjectionOutlivesIt) {
+    HXDRenderController controller(nullptr, 2.0f);
+    EXPECT_EQ(controller.renderingContext(), nullptr)
+        << "no frame yet: conversions must see no context";
     HXDRecordingEncoder encoder(100, 50);
     HXDTexture* target = encoder.nextDrawable();
     ASSERT_NE(target, nullptr);
-    controller.updateTexture(target, 1.0f, BNViewVolumeProjection(CGRectMake(0, 0, 10, 5)),
-                             HXDFloat2{0.1f, 0.1f});
-    EXPECT_EQ(controller.renderingContext()->drawableSize(), CGSizeMake(100, 50))
-        << "the target gives the size";
+    const BNMatrix44f projection = BNViewVolumeProjection(CGRectMake(0, 0, 10, 5));
+    controller.updateTexture(target, 2.0f, projection, HXDFloat2{0.125f, 0.25f});
+    const HXDRenderingContext& context = *controller.renderingContext();
+    EXPECT_TRUE(context.texture() == target && context.drawableSize() == CGSizeMake(100, 50));
+    EXPECT_EQ(context.pixelScale(), (HXDFloat2{0.125f, 0.25f}));
 
     const HXDLineVertex v[] = {{{0, 0, 0}, {}}, {{1, 1, 0}, {}}};
     const HXDPrimitiveArray frame{
@@ -31,49 +35,48 @@ TEST(HXDPrimitivesTest, encode__eachPrimitiveReachesItsOwnEncoderOperationInOrde
                                   CGPointZero),
     };
     encoder.beginEncoding(*target, HXDColor{0.1f, 0.1f, 0.1f, 1.0f});
-    for (const auto& p : frame) p->encodeWithEncoder(encoder, *controller.renderingContext());
+    for (const auto& p : frame) p->encodeWithEncoder(encoder, context);
     encoder.endEncoding();
-
     const Kind expected[] = {Kind::Multiline,       Kind::Line, Kind::QuadTexture,
                              Kind::ScreenspaceQuad, Kind::Mesh, Kind::Text};
     ASSERT_EQ(encoder.entries.size(), std::size(expected));
-    for (size_t i = 0; i < std::size(expected); ++i) {
-        EXPECT_EQ(encoder.entries[i].kind, expected[i])
-            << "primitive " << i << " went to the wrong operation";
-        EXPECT_EQ(encoder.entries[i].primitive, frame[i].get());
-    }
+    for (size_t i = 0; i < std::size(expected); ++i)
+        EXPECT_TRUE(encoder.entries[i].kind == expected[i] &&
+                    encoder.entries[i].primitive == frame[i].get())
+            << i;
 
     controller.releaseTexture();
-    EXPECT_EQ(controller.renderingContext()->drawableSize(), CGSizeMake(100, 50))
-        << "the size outlives the target, for hit tests between frames";
+    ASSERT_NE(controller.renderingContext(), nullptr);
+    EXPECT_EQ(controller.renderingContext()->texture(), nullptr) << "the frame's target is gone";
+    EXPECT_EQ(controller.renderingContext()->projection(), projection)
+        << "the last projection stays for hit tests";
+    EXPECT_EQ(controller.renderingContext()->drawableSize(), CGSizeMake(100, 50)) << "and the size";
     encoder.setDrawableAvailable(false);
     EXPECT_EQ(encoder.nextDrawable(), nullptr);
 }
 
-TEST(HXDPrimitivesTest, defaults__lineJoinNumbersAndBlending) {
+TEST(HXDPrimitivesTest, values__joinsTexturesNumbersAndExtraInfoTakeBadInputSafely) {
     HXDMultiline line(std::vector<HXDLineVertex>{});
     EXPECT_EQ(line.blendingInfo(), HXDDataType::sourceOneMinusSourceBlendingInfo())
-        << "primitives blend 'over' by default";
+        << "'over' by default";
+    EXPECT_FALSE(HXDDataType::opaqueBlendingInfo().enabled);
     line.setLineJoin(1);
     EXPECT_EQ(line.lineJoin(), HXDLineJoin::Round);
     line.setLineJoin(42);
     EXPECT_EQ(line.lineJoin(), HXDLineJoin::Miter) << "an unknown join number falls back to join 0";
-    EXPECT_FALSE(HXDDataType::opaqueBlendingInfo().enabled);
     EXPECT_EQ(line.numberOfRuns(), 0u);
     EXPECT_EQ(line.runRange(3), (std::pair<uint32_t, uint32_t>{0, 0}))
-        << "a run past the end is empty, not a read";
-}
+        << "a run past the end is empty";
 
-TEST(HXDPrimitivesTest, textureAndNumbers__badInputIsSafe) {
     EXPECT_EQ(HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::vector<uint8_t>(10))->width(), 0u)
         << "a buffer of the wrong size gives an empty texture, not a read past its end";
     const auto t = HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {255, 128, 0, 128});
     EXPECT_EQ(t->rgba(), (std::vector<uint8_t>{128, 64, 0, 128}))
-        << "an image's straight pixels are stored premultiplied";
+        << "straight pixels are stored premultiplied";
     EXPECT_EQ(HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {64, 32, 16, 128}, true)->rgba(),
               (std::vector<uint8_t>{64, 32, 16, 128}))
         << "premultiplied input is kept";
-    EXPECT_EQ(t->alphaAt(-1, 0), 0.0f);
+    EXPECT_EQ(t->alphaAt(-1, 0) + t->alphaAt(1, 0), 0.0f);
     EXPECT_NE(t->textureID(),
               HXDPixelTexture::textureWithRGBA(1, 1, 1.0f, {0, 0, 0, 0})->textureID());
 
@@ -82,7 +85,6 @@ TEST(HXDPrimitivesTest, textureAndNumbers__badInputIsSafe) {
     EXPECT_EQ(HXDNumber::numberWithDouble(std::nan("")).unsignedLongLongValue(), 0u);
     EXPECT_EQ(HXDNumber::numberWithInteger(3), HXDNumber::numberWithUnsignedLongLong(3));
     EXPECT_FALSE(HXDNumber::numberWithInteger(-1) == HXDNumber::numberWithUnsignedLongLong(~0ull));
-
     HXDExtraInfo info;
     info.setObject("ID", HXDNumber::numberWithInteger(1));
     info.setObject("ID", HXDNumber::numberWithInteger(2));
