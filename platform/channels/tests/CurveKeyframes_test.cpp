@@ -115,211 +115,142 @@ TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywher
 }
 
 TEST_F(CurveKeyframes, setKeyframe__addsWithAutomaticHandlesOrReplacesTheValue) {
-    // A new keyframe between two takes the chord's slope, handles a third of each segment.
-    c->setKeyframe(seconds(2.5), 28.0);
-    EXPECT_EQ(
-        keyText(*c, true),
-        "1=10(0,0|0,0) 2=20(-0.333333,0|0.333333,0) 2.5=28(-0.166667,-1.66667|0.166667,1.66667) "
-        "3=30(-0.333333,0|0.333333,0)");
-    // At an extreme it is flat; at an end both handles take the one segment's third.
-    c->setKeyframe(seconds(1.5), 40.0);
-    c->setKeyframe(seconds(0.25), 5.0);
-    EXPECT_EQ(keyText(*c, true).substr(0, 58),
-              "0.25=5(-0.25,0|0.25,0) 1=10(0,0|0,0) 1.5=40(-0.166667,0|0.");
-    // An existing keyframe keeps its handles and interpolation, unless asked to take the
-    // channel's.
-    c->setKeyframeInterpolation(b, kTQInterpolationLinear);
-    EXPECT_EQ(c->setKeyframe(seconds(2.0), 21.0), b);
-    EXPECT_EQ(c->getKeyframeInterpolation(b), kTQInterpolationLinear);
-    c->setKeyframe(seconds(2.0), 22.0, true);
-    EXPECT_EQ(c->getKeyframeInterpolation(b), kTQInterpolationBezier);
-    EXPECT_EQ(c->numberOfKeyframes(), 6u);
-    // addKeyframe keeps what is there and otherwise values the new keyframe from the curve.
-    c->setInterpolation(kTQInterpolationLinear);
-    c->setTimeOffset(seconds(10.0));
-    const CMTime axis = seconds(12.5), channel = seconds(2.5), late = seconds(3.5);
-    EXPECT_EQ(c->addKeyframeAtAxisTime(&axis), c->getKeyframe(channel));
-    EXPECT_NE(c->addKeyframe(&late), nullptr);
+    editScript(
+        *c,
+        // A new keyframe between two takes the chord's slope, handles a third of each
+        // segment; at an extreme it is flat; at an end both handles take the one
+        // segment's third. An existing keyframe keeps its handles and interpolation,
+        // unless asked to take the channel's.
+        "key 2.5 28; =>h 1=10(0,0|0,0) 2=20(-0.333333,0|0.333333,0) "
+        "2.5=28(-0.166667,-1.66667|0.166667,1.66667) "
+        "3=30(-0.333333,0|0.333333,0); key 1.5 40; key 0.25 5; interp 2 1; key 2 21; key 3 31 r; "
+        "=>h 0.25=5(-0.25,0|0.25,0) 1=10(0,0|0,0) 1.5=40(-0.166667,0|0.166667,0) "
+        "2=21/1(-0.333333,0|0.333333,0) "
+        "2.5=28(-0.166667,-1.66667|0.166667,1.66667) 3=31(-0.333333,0|0.333333,0); "
+        // Added from the curve, what is there kept: in channel time or on the axis.
+        "interpall 1; shift 10; addaxis 12.5; add 3.5; addaxis 10.75; add 4.5; "
+        "=> 0.25=5/1 0.75=8.33333/1 1=10/1 1.5=40/1 2=21/1 2.5=28/1 3=31/1 3.5=31/1 4.5=31/1");
+    EXPECT_EQ(c->setKeyframe(seconds(2.0), 21.0), b) << "the same keyframe";
     EXPECT_EQ(c->addKeyframeAtAxisTime(nullptr), nullptr);
-    EXPECT_EQ(keyText(*c), "0.25=5/1 1=10/1 1.5=40/1 2=22/1 2.5=28/1 3=30/1 3.5=30/1");
 }
 
 TEST_F(CurveKeyframes, meetingKeyframes__bothLiveUntilPurgeKeepsTheArrival) {
-    const CMTime one = seconds(1.0), two = seconds(2.0), three = seconds(3.0);
-    c->moveKeyframe(&one, &two);
-    EXPECT_EQ(keyText(*c), "2=20 2=10 3=30") << "the arrival comes last";
+    const CMTime two = seconds(2.0);
+    editScript(*c, "move 1 2; => 2=20 2=10 3=30");  // the arrival comes last
     EXPECT_EQ(c->getKeyframe(two), a) << "lookup by time answers the keyframe that arrived";
     EXPECT_NEAR(c->getCurveValue(two), 10.0, kTolerance) << "the arrival stands for the time";
     const auto copy = copyOf(*c);
-    c->purgeKeyframes();
-    EXPECT_EQ(keyText(*c), "2=10 3=30");
+    editScript(*c, "purge; => 2=10 3=30; purge; => 2=10 3=30");
     EXPECT_TRUE(live(a) && !live(b)) << "the moved keyframe survives, the one it landed on goes";
-    c->purgeKeyframes();
-    EXPECT_EQ(keyText(*c), "2=10 3=30");
-
-    // Replacing: every keyframe at the target goes at once.
-    copy->moveKeyframe(&three, &two, false);
-    EXPECT_EQ(keyText(*copy), "2=30");
+    // Replacing, every keyframe at the target goes at once; a move to its own time, or from a
+    // time without a keyframe, changes nothing.
+    editScript(*copy, "move 3 2 replace; => 2=30; move 2 2 replace; move 5 3; => 2=30");
     EXPECT_EQ(copy->getKeyframe(two), d);
-    // A move to its own time, or from a time without keyframe, changes nothing.
-    const auto moved = copyOf(*copy);
-    const CMTime five = seconds(5.0);
-    copy->moveKeyframe(&two, &two, false);
-    copy->moveKeyframe(&five, &three);
-    copy->moveKeyframe(nullptr, &three);
-    EXPECT_TRUE(*copy == *moved);
 
-    // By handle: a collision is reported, the value set with the move.
     auto e = makeChannel("e");
-    const TQKeyframeHandle x = e->setKeyframe(one, 1.0), y = e->setKeyframe(two, 2.0);
+    const TQKeyframeHandle x = e->setKeyframe(seconds(1.0), 1.0), y = e->setKeyframe(two, 2.0);
     bool collided = false;
     const double value = 5.0;
     e->setKeyframeTime(x, &two, &value, &collided);
-    EXPECT_TRUE(collided);
-    EXPECT_EQ(keyText(*e), "2=2 2=5");
+    EXPECT_TRUE(collided) << "and the value set with the move";
     e->setKeyframeTime(y, &two, nullptr, &collided);
     EXPECT_FALSE(collided) << "a keyframe set to its own time does not move";
-    EXPECT_EQ(keyText(*e), "2=2 2=5");
-    e->setKeyframeTime(x, &three, nullptr, &collided);
-    EXPECT_FALSE(collided);
-    const TQKeyframeHandle copied = e->cloneKeyframe(y, three);
-    EXPECT_EQ(e->getKeyframe(three), copied) << "a copy arrives after";
-    EXPECT_EQ(keyText(*e), "2=2 3=5 3=2");
-    const CMTime axisThree = seconds(3.0);
-    e->deleteKeyframeAtAxisTime(&axisThree, false);
-    EXPECT_EQ(keyText(*e), "2=2 3=5") << "only the last arrival";
-    e->cloneKeyframe(x, three);
-    e->deleteKeyframeAtAxisTime(&axisThree);
-    EXPECT_EQ(keyText(*e), "2=2") << "every keyframe at the time";
-    e->deleteKeyframeAtTime(&two);
+    editScript(*e, "=> 2=2 2=5; retime 2 3; => 2=2 3=5; clone 2 3; => 2=2 3=5 3=2");
+    EXPECT_EQ(e->getKeyframe(seconds(3.0)), e->getKeyframes(false).back())
+        << "a copy arrives after";
+    editScript(*e, "delaxis 3 last; => 2=2 3=5; clone 2 3; delaxis 3; => 2=2; del 2; => ");
     EXPECT_EQ(e->numberOfKeyframes(), 0u);
+    e->setKeyframe(two, 1.0);
+    e->cloneKeyframe(e->getKeyframe(two), two);
+    e->deleteKeyframeAtTime(&two);
+    EXPECT_EQ(e->numberOfKeyframes(), 0u) << "every keyframe at the time";
 }
 
-TEST_F(CurveKeyframes, move__takesAxisTimesAndKeepsHandlesAndTangents) {
-    c->setTimeOffset(seconds(10.0));
-    c->setKeyframeOutputTangents(b, 0.25, 1.5);
-    c->setKeyframeInputTangents(b, -0.4, -2.0);
-    const CMTime from = seconds(12.0), to = seconds(12.5);
-    c->moveKeyframe(&from, &to);
-    EXPECT_EQ(keyText(*c, true),
-              "1=10(0,0|0,0) 2.5=20(-0.4,-2|0.25,1.5) 3=30(-0.333333,0|0.333333,0)");
+TEST_F(CurveKeyframes, handlesAndTangents__followTheKeyframeAndEachOtherOnlyWhenAsked) {
+    editScript(
+        *c,
+        // A move takes axis times and keeps the handles; absolute handles are given
+        // where they lie.
+        "shift 10; out 2 0.25 1.5; in 2 -0.4 -2; move 12 12.5; "
+        "=>h 1=10(0,0|0,0) 2.5=20(-0.4,-2|0.25,1.5) 3=30(-0.333333,0|0.333333,0); "
+        "out 2.5 3 23 abs; in 2.5 2 19 abs; =>h 1=10(0,0|0,0) 2.5=20(-0.5,-1|0.5,3) "
+        "3=30(-0.333333,0|0.333333,0); "
+        // Aligned, unscaled: opposite direction, the length scaled with the written
+        // handle, from either side; scaled: the opposite keeps its length; broken or
+        // without a direction: never follows.
+        "out 2.5 1 0; in 2.5 -2 0; out 2.5 0 2 aligned; =>h 1=10(0,0|0,0) 2.5=20(0,-4|0,2) "
+        "3=30(-0.333333,0|0.333333,0); "
+        "in 2.5 3 0 aligned; =>h 1=10(0,0|0,0) 2.5=20(3,0|-1.5,0) 3=30(-0.333333,0|0.333333,0); "
+        "scaled 2.5 1; out 2.5 0 -7 aligned; =>h 1=10(0,0|0,0) 2.5=20(0,3|0,-7)s "
+        "3=30(-0.333333,0|0.333333,0); "
+        "broken 2.5 1; out 2.5 1 1 aligned; =>h 1=10(0,0|0,0) 2.5=20(0,3|1,1)bs "
+        "3=30(-0.333333,0|0.333333,0); "
+        "broken 2.5 0; out 2.5 0 0 aligned; =>h 1=10(0,0|0,0) 2.5=20(0,3|0,0)s "
+        "3=30(-0.333333,0|0.333333,0)");
     double u = 0, v = 0;
-    c->getKeyframeInputTangents(b, &u, &v, false);
-    EXPECT_NEAR(u, 2.1, kTolerance) << "absolute handle position follows the keyframe";
-    EXPECT_NEAR(v, 18.0, kTolerance);
-    c->getKeyframeOutputTangents(b, &u, &v, false);
-    EXPECT_NEAR(u, 2.75, kTolerance);
-    EXPECT_NEAR(v, 21.5, kTolerance);
-    c->setKeyframeOutputTangents(b, 3.0, 23.0, false);
-    c->setKeyframeInputTangents(b, 2.0, 19.0, false);
-    EXPECT_EQ(keyText(*c, true),
-              "1=10(0,0|0,0) 2.5=20(-0.5,-1|0.5,3) 3=30(-0.333333,0|0.333333,0)");
+    ASSERT_TRUE(c->getKeyframeInputTangents(b, &u, &v, false));
+    EXPECT_EQ(u * 100 + v, 250.0 + 23.0)
+        << "the absolute position of a handle follows the keyframe";
+    ASSERT_TRUE(c->getKeyframeOutputTangents(b, &u, &v, false));
+    EXPECT_EQ(u * 100 + v, 250.0 + 20.0) << "in the keyframe's own units";
+    const CMTime from = seconds(12.0);
     EXPECT_EQ(CMTimeGetSeconds(c->toChannelTime(&from)), 2.0);
     EXPECT_TRUE(CMTIME_IS_INVALID(c->toChannelTime(nullptr)));
     c->setRootCurrentTime(seconds(11.0));
-    EXPECT_EQ(CMTimeGetSeconds(c->getRootCurrentTime()), 1.0);
-    EXPECT_EQ(CMTimeGetSeconds(c->getRootCurrentTime(false)), 11.0);
-}
-
-TEST_F(CurveKeyframes, tangents__followOnlyWhenAskedAndUnbroken) {
-    c->setKeyframeInputTangents(b, -0.5, -1.0);
-    c->setKeyframeOutputTangents(b, 0.2, 3.0);
-    const auto textOfB = [&] {
-        const std::string all = keyText(*c, true);
-        return all.substr(all.find("2=20"), all.find(" 3=") - all.find("2=20"));
-    };
-    EXPECT_EQ(textOfB(), "2=20(-0.5,-1|0.2,3)") << "only the written side";
-    // Aligned, unscaled: opposite direction, the length scaled with the written handle.
-    c->setKeyframeOutputTangents(b, 1.0, 0.0);
-    c->setKeyframeInputTangents(b, -2.0, 0.0);
-    c->setKeyframeOutputTangents(b, 0.0, 2.0, true, true);
-    EXPECT_EQ(textOfB(), "2=20(0,-4|0,2)");
-    c->setKeyframeInputTangents(b, 3.0, 0.0, true, true);
-    EXPECT_EQ(textOfB(), "2=20(3,0|-1.5,0)") << "an input handle leads too";
-    // Scaled: the opposite keeps its length. Broken: never follows.
-    c->setKeyframeTangentsScaled(b, true);
-    c->setKeyframeOutputTangents(b, 0.0, -7.0, true, true);
-    EXPECT_EQ(textOfB(), "2=20(0,3|0,-7)s");
-    c->setKeyframeTangentsBroken(b, true);
-    c->setKeyframeOutputTangents(b, 1.0, 1.0, true, true);
-    EXPECT_EQ(textOfB(), "2=20(0,3|1,1)bs");
-    c->setKeyframeTangentsBroken(b, false);
-    c->setKeyframeOutputTangents(b, 0.0, 0.0, true, true);
-    EXPECT_EQ(textOfB(), "2=20(0,3|0,0)s") << "a zero handle has no direction";
+    EXPECT_EQ(
+        CMTimeGetSeconds(c->getRootCurrentTime()) + CMTimeGetSeconds(c->getRootCurrentTime(false)),
+        12.0);
 }
 
 TEST_F(CurveKeyframes, smoothAndReverse__catmullRomHandlesAndMirroredRuns) {
-    c->setKeyframeInterpolation(b, kTQInterpolationLinear);
-    c->setKeyframeTangentsBroken(b, true);
-    c->setKeyframeInterpolation(d, kTQInterpolationLinear);
-    c->smoothKeyframe(b);
-    c->smoothKeyframe(d, false);
-    EXPECT_EQ(
-        keyText(*c, true),
-        "1=10(0,0|0,0) 2=20(-0.333333,-3.33333|0.333333,3.33333) 3=30/1(-0.333333,0|0.333333,0)");
-    c->setKeyframeValue(b, 30.0);
-    c->smoothKeyframe(a);
-    c->smoothKeyframe(b);
-    EXPECT_EQ(
-        keyText(*c, true),
-        "1=10(-0.333333,0|0.333333,0) 2=30(-0.333333,0|0.333333,0) 3=30/1(-0.333333,0|0.333333,0)")
-        << "flat at an extreme, a level one too";
-
+    editScript(*c,
+               // The chord's slope through the neighbours, unbroken, Bezier unless kept; flat at
+               // an extreme, a level one too.
+               "interp 2 1; broken 2 1; interp 3 1; smooth 2; smooth 3 keep; "
+               "=>h 1=10(0,0|0,0) 2=20(-0.333333,-3.33333|0.333333,3.33333) "
+               "3=30/1(-0.333333,0|0.333333,0); "
+               "value 2 30; smooth 1; smooth 2; "
+               "=>h 1=10(-0.333333,0|0.333333,0) 2=30(-0.333333,0|0.333333,0) "
+               "3=30/1(-0.333333,0|0.333333,0)");
     auto r = makeChannel("r");
-    const TQKeyframeHandle k0 = r->setKeyframe(seconds(0.0), 0.0),
-                           k1 = r->setKeyframe(seconds(1.0), 4.0);
-    const TQKeyframeHandle k2 = r->setKeyframe(seconds(3.0), 5.0),
-                           k3 = r->setKeyframe(seconds(4.0), 1.0);
-    r->setKeyframeInterpolation(k0, kTQInterpolationExp);
-    r->setKeyframeInterpolation(k1, kTQInterpolationEaseIn);
-    r->setKeyframeInterpolation(k2, kTQInterpolationLinear);
-    r->setKeyframeInterpolation(k3, kTQInterpolationConstant);
-    r->setKeyframeOutputTangents(k2, 0.3, 0.7);
+    editScript(*r,
+               "key 0 0; key 1 4; key 3 5; key 4 1; interp 0 13; interp 1 17; interp 3 1; interp 4 "
+               "0; out 3 0.3 0.7");
     const auto before = copyOf(*r);
-    r->reverseKeyframes(k2, k0);  // order of the arguments does not matter
-    EXPECT_EQ(keyText(*r, true),
-              "0=5/16(-0.3,0.7|0.666667,0) 2=4/14(-0.333333,0|0.333333,0) 3=0/1(0,0|0,0) "
-              "4=1/0(-0.333333,0|0.333333,0)")
-        << "mirrored in its span, each segment's shape run backwards, the one leaving as it was";
+    // Mirrored in its span, each segment's shape run backwards, the one leaving as it was; the
+    // order of the ends does not matter, and one keyframe has nothing to reverse.
+    editScript(*r,
+               "reverse 3 0; =>h 0=5/16(-0.3,0.7|0.666667,0) 2=4/14(-0.333333,0|0.333333,0) "
+               "3=0/1(0,0|0,0) "
+               "4=1/0(-0.333333,0|0.333333,0); reverse 2 2; => 0=5/16 2=4/14 3=0/1 4=1/0");
     for (double t = 0.0; t <= 3.0; t += 0.1)
         EXPECT_NEAR(r->getCurveValue(seconds(t)), before->getCurveValue(seconds(3.0 - t)), 1e-6)
             << t;
-    r->reverseKeyframes(k1, k1);
-    EXPECT_EQ(keyText(*r).substr(0, 13), "0=5/16 2=4/14") << "one keyframe: nothing to reverse";
 }
 
 TEST_F(CurveKeyframes, segmentAndCurveOffsets__moveTheRightKeyframes) {
-    c->setInterpolation(kTQInterpolationLinear);
-    c->setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter);
-    c->setCurveSegmentValue(seconds(1.5), 25.0);
-    EXPECT_EQ(keyText(*c), "1=20/1 2=30/1 3=30/1") << "both ends of the segment move";
-    c->setCurveSegmentValue(seconds(3.5), 35.0);
-    EXPECT_EQ(keyText(*c), "1=20/1 2=30/1 3=35/1") << "past the end: the last keyframe";
-    c->setCurveSegmentValue(seconds(2.0), 40.0);
-    EXPECT_EQ(keyText(*c), "1=20/1 2=40/1 3=45/1") << "on a keyframe: the segment it starts";
-    c->setCurveSegmentValue(seconds(0.0), NAN);
-    EXPECT_EQ(keyText(*c), "1=20/1 2=40/1 3=45/1");
-
-    c->setTimeOffset(seconds(10.0));
-    const CMTime at = seconds(11.5);  // channel time 1.5, value 30
-    c->offsetCurve(&at, 40.0);
-    EXPECT_EQ(keyText(*c), "1=30/1 2=50/1 3=55/1") << "every keyframe by the same amount";
-    const auto once = copyOf(*c);
-    c->offsetCurve(&at, 40.0);
-    EXPECT_TRUE(*c == *once) << "the target is absolute: a repeated step lands in the same place";
-    const CMTime late = seconds(14.0), invalid = kCMTimeInvalid;  // past the end, linear
-    c->offsetCurve(&late, 0.0);
-    EXPECT_EQ(keyText(*c), "1=-30/1 2=-10/1 3=-5/1");
+    editScript(
+        *c,
+        // Both ends of the segment; past the end the last keyframe; on a keyframe the
+        // segment it starts; nothing for a value that is not finite.
+        "interpall 1; extrap 1 after; segment 1.5 25; => 1=20/1 2=30/1 3=30/1; segment 3.5 35; "
+        "=> 1=20/1 2=30/1 3=35/1; segment 2 40; => 1=20/1 2=40/1 3=45/1; segment 0 nan; "
+        "=> 1=20/1 2=40/1 3=45/1; "
+        // Every keyframe by the same amount, to an absolute target on the axis, past the
+        // end along the extrapolation.
+        "shift 10; offset 11.5 40; => 1=30/1 2=50/1 3=55/1; offset 11.5 40; => 1=30/1 2=50/1 "
+        "3=55/1; "
+        "offset 14 0; => 1=-30/1 2=-10/1 3=-5/1; offset 11.5 nan; => 1=-30/1 2=-10/1 3=-5/1");
     const auto moved = copyOf(*c);
+    const CMTime invalid = kCMTimeInvalid;
     c->offsetCurve(nullptr, 5.0);
     c->offsetCurve(&invalid, 5.0);
-    c->offsetCurve(&at, NAN);
-    EXPECT_TRUE(*c == *moved) << "no time, or no finite value: nothing moves";
+    EXPECT_TRUE(*c == *moved) << "no time: nothing moves";
     auto empty = makeChannel("empty");
-    empty->setInitialValue(3.0);
-    empty->offsetCurve(&at, -2.0);
-    empty->setCurveSegmentValue(seconds(1.0), -4.0);
-    EXPECT_EQ(empty->getInitialValue(), -4.0) << "without keyframes the initial value moves";
+    editScript(*empty, "initial 3; offset 1 -2");
+    EXPECT_EQ(empty->getInitialValue(), -2.0) << "without keyframes the initial value moves";
+    editScript(*empty, "segment 1 -4");
+    EXPECT_EQ(empty->getInitialValue(), -4.0);
 }
 
 TEST_F(CurveKeyframes, valuesAndAnimation__deleteAllKeepsWhatWasShownDisabledShowsTheInitialValue) {

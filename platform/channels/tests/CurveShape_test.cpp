@@ -14,7 +14,9 @@ using namespace curve_catalogue;
 namespace {
 
 // Finer than the editor's timescale resolves (4e-6 s), so nanosecond times.
-double at(const TQChannel& c, double t) { return c.getCurveValue(CMTimeMakeWithSeconds(t, 1000000000)); }
+double at(const TQChannel& c, double t) {
+    return c.getCurveValue(CMTimeMakeWithSeconds(t, 1000000000));
+}
 
 // Two keyframes, 0 -> 10 over one second, the first with the given interpolation.
 std::unique_ptr<TQChannel> segment(unsigned interpolation) {
@@ -32,11 +34,13 @@ TEST(CurveShape, everyCode__theShapeOfItsSegment) {
     } shapes[] = {
         {kTQInterpolationConstant, 0.0, 0.0, 0.0},
         {kTQInterpolationLinear, 2.5, 5.0, 7.5},
-        {kTQInterpolationEaseBoth, 1.5625, 5.0, 8.4375},  // flat at both ends
+        {kTQInterpolationEaseBoth, 1.5625, 5.0, 8.4375},    // flat at both ends
         {kTQInterpolationEaseOut, 1.09375, 3.75, 7.03125},  // flat at the start
         {kTQInterpolationEaseIn, 2.96875, 6.25, 8.90625},   // flat at the end
-        {kTQInterpolationExp, 10 * std::expm1(1.0) / e, 10 * std::expm1(2.0) / e, 10 * std::expm1(3.0) / e},
-        {kTQInterpolationLog, 10 - 10 * std::expm1(3.0) / e, 10 - 10 * std::expm1(2.0) / e, 10 - 10 * std::expm1(1.0) / e},
+        {kTQInterpolationExp, 10 * std::expm1(1.0) / e, 10 * std::expm1(2.0) / e,
+         10 * std::expm1(3.0) / e},
+        {kTQInterpolationLog, 10 - 10 * std::expm1(3.0) / e, 10 - 10 * std::expm1(2.0) / e,
+         10 - 10 * std::expm1(1.0) / e},
     };
     for (const auto& s : shapes) {
         auto c = segment(s.code);
@@ -44,7 +48,8 @@ TEST(CurveShape, everyCode__theShapeOfItsSegment) {
         EXPECT_NEAR(at(*c, 0.5), s.half, 1e-9) << "code " << s.code;
         EXPECT_NEAR(at(*c, 0.75), s.threeQuarters, 1e-9) << "code " << s.code;
         EXPECT_EQ(at(*c, 1.0), 10.0) << "code " << s.code;
-        EXPECT_EQ(at(*c, 0.999999), s.code == kTQInterpolationConstant ? 0.0 : at(*c, 0.999999)) << "holds";
+        EXPECT_EQ(at(*c, 0.999999), s.code == kTQInterpolationConstant ? 0.0 : at(*c, 0.999999))
+            << "holds";
     }
     // Catmull-Rom: through every keyframe with the slope of the chord through its neighbours.
     auto cr = makeChannel("cr");
@@ -108,8 +113,12 @@ TEST(CurveShape, bezier__matchesAnIndependentBisectionOnItsControlPoints) {
         c->getKeyframe(keys[k], &ta, nullptr);
         c->getKeyframe(keys[k + 1], &tb, nullptr);
         for (double f : fractions) {
-            const double t = CMTimeGetSeconds(ta) + f * (CMTimeGetSeconds(tb) - CMTimeGetSeconds(ta));
-            EXPECT_NEAR(at(*c, t), referenceBezier(*c, keys[k], keys[k + 1], CMTimeGetSeconds(CMTimeMakeWithSeconds(t, 1000000000))), 1e-7)
+            const double t =
+                CMTimeGetSeconds(ta) + f * (CMTimeGetSeconds(tb) - CMTimeGetSeconds(ta));
+            EXPECT_NEAR(at(*c, t),
+                        referenceBezier(*c, keys[k], keys[k + 1],
+                                        CMTimeGetSeconds(CMTimeMakeWithSeconds(t, 1000000000))),
+                        1e-7)
                 << "segment " << k << " at fraction " << f;
         }
     }
@@ -121,22 +130,27 @@ TEST(CurveShape, keyframes__disabledOnesAndCodesOfTheChannel) {
     c->setKeyframeInterpolation(mid, kTQInterpolationLinear);
     EXPECT_NEAR(at(*c, 0.5), 100.0, kValueTolerance);
     c->setKeyframeEnabled(mid, false);
-    EXPECT_NEAR(at(*c, 0.5), 5.0, kValueTolerance) << "a disabled keyframe no longer shapes the curve";
+    EXPECT_NEAR(at(*c, 0.5), 5.0, kValueTolerance)
+        << "a disabled keyframe no longer shapes the curve";
     EXPECT_EQ(c->getKeyframes(true).size() * 10 + c->getKeyframes(false).size(), 23u);
     c->setKeyframe(seconds(2.0), 3.0);
     EXPECT_EQ(c->getInterpolation(), kTQInterpolationMixed);
-    EXPECT_TRUE(c->hasInterpolation(kTQInterpolationLinear) && c->hasInterpolation(kTQInterpolationBezier));
+    EXPECT_TRUE(c->hasInterpolation(kTQInterpolationLinear) &&
+                c->hasInterpolation(kTQInterpolationBezier));
     EXPECT_FALSE(c->hasInterpolation(kTQInterpolationExp));
     // The handles of a keyframe matter when a Bezier segment leaves or arrives at it.
     const std::vector<TQKeyframeHandle> k = c->getKeyframes(false);
-    EXPECT_EQ((std::array{c->getKeyframeInterpolationUsesTangents(k[0]), c->getKeyframeInterpolationUsesTangents(k[2]),
-                          c->getKeyframeInterpolationUsesTangents(k[3]), c->getKeyframeInterpolationUsesTangents(nullptr)}),
+    EXPECT_EQ((std::array{c->getKeyframeInterpolationUsesTangents(k[0]),
+                          c->getKeyframeInterpolationUsesTangents(k[2]),
+                          c->getKeyframeInterpolationUsesTangents(k[3]),
+                          c->getKeyframeInterpolationUsesTangents(nullptr)}),
               (std::array{false, true, true, false}));
     c->setInterpolation(kTQInterpolationEaseBoth);
     c->setInterpolation(3);  // no such code
     c->setKeyframeInterpolation(k[0], 99);
     EXPECT_EQ(c->getInterpolation(), kTQInterpolationEaseBoth);
-    EXPECT_EQ(makeChannel("empty")->getInterpolation(), kTQInterpolationBezier) << "what new keyframes get";
+    EXPECT_EQ(makeChannel("empty")->getInterpolation(), kTQInterpolationBezier)
+        << "what new keyframes get";
 }
 
 // The "overshoot" curve moved to start at 1 s and end at 4 above where it starts: span
@@ -162,13 +176,16 @@ protected:
 };
 
 TEST_F(CurveExtrapolation, cycles__repeatPingPongAndProgressiveOnBothSides) {
-    for (const unsigned code : {kTQExtrapolationRepeat, kTQExtrapolationPingPong, kTQExtrapolationProgressive}) {
+    for (const unsigned code :
+         {kTQExtrapolationRepeat, kTQExtrapolationPingPong, kTQExtrapolationProgressive}) {
         extrapolate(code);
         for (double u = 0.05; u < 1.9; u += 0.15) {
             for (const int k : {-3, -2, -1, 1, 2, 5}) {
                 const bool mirrored = code == kTQExtrapolationPingPong && k % 2 != 0;
-                const double expected = at(*c, mirrored ? 3.0 - u : 1.0 + u) + (code == kTQExtrapolationProgressive ? 4.0 * k : 0.0);
-                EXPECT_NEAR(at(*c, 1.0 + u + 2.0 * k), expected, kValueTolerance) << "code " << code << " cycle " << k << " u " << u;
+                const double expected = at(*c, mirrored ? 3.0 - u : 1.0 + u) +
+                                        (code == kTQExtrapolationProgressive ? 4.0 * k : 0.0);
+                EXPECT_NEAR(at(*c, 1.0 + u + 2.0 * k), expected, kValueTolerance)
+                    << "code " << code << " cycle " << k << " u " << u;
             }
         }
     }
@@ -184,7 +201,9 @@ TEST_F(CurveExtrapolation, endsHoldOrContinueTheirTangents) {
     EXPECT_EQ(c->getCurveValue(seconds(0.0), false), 0.0);
     c->setExtrapolation(9, kTQExtrapolationAfter);   // no such code: ignored
     c->setExtrapolation(kTQExtrapolationRepeat, 5);  // no such direction: ignored
-    EXPECT_EQ(c->getExtrapolation(kTQExtrapolationAfter) * 10 + c->getExtrapolation(kTQExtrapolationBefore), 11u);
+    EXPECT_EQ(c->getExtrapolation(kTQExtrapolationAfter) * 10 +
+                  c->getExtrapolation(kTQExtrapolationBefore),
+              11u);
     EXPECT_EQ(c->getExtrapolation(5), kTQExtrapolationConstant);
     // A single keyframe holds for every code.
     auto one = makeChannel("one");

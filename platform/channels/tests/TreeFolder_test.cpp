@@ -271,6 +271,11 @@ TEST(TreeTypes, typedChannels__snapFixTheirInterpolationAndComeWithTheirComponen
     curve.setInterpolation(kTQInterpolationLinear);
     EXPECT_EQ(data.getKeyframeInterpolation(h), kTQInterpolationConstant);
     EXPECT_EQ(curve.getInterpolation(), kTQInterpolationBezier);
+    struct Stepped : TQChannel {
+        Stepped() : TQChannel("Stepped", 1) { setDiscrete(true); }
+    } stepped;
+    EXPECT_EQ(stepped.getInterpolation(), kTQInterpolationConstant)
+        << "a discrete kind starts stepped";
     EXPECT_TRUE(data.testFlag(kTQChannelFlagNoInterpolationChange) &&
                 curve.testFlag(kTQChannelFlagNoInterpolationChange));
 
