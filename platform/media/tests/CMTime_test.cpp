@@ -22,7 +22,8 @@ const CMTime kNamed[] = {kCMTimePositiveInfinity, kCMTimeNegativeInfinity, kCMTi
 CMTime timeOf(std::string s) {
     for (const auto& [word, digits] :
          {std::pair{"MAX", "9223372036854775807"}, {"MIN", "-9223372036854775808"}})
-        if (const size_t at = s.find(word); at != s.npos) s.replace(at, 3, digits);
+        if (const size_t at = s.find(word); at != s.npos)
+            s = s.substr(0, at) + digits + s.substr(at + 3);
     for (size_t i = 0; i < 4; ++i)
         if (s == kNames[i]) return kNamed[i];
     CMTime t{0, 0, kCMTimeFlags_Valid, 0};
@@ -38,12 +39,11 @@ CMTime timeOf(std::string s) {
 std::string text(const CMTime& t) {
     for (size_t i = 0; i < 4; ++i)
         if (CMTimeIdentical(t, kNamed[i])) return kNames[i];
-    const bool rounded = t.flags == (kCMTimeFlags_Valid | kCMTimeFlags_HasBeenRounded);
-    return std::to_string(t.value) + "/" + std::to_string(t.timescale) +
-           (rounded                         ? "~"
-            : t.flags == kCMTimeFlags_Valid ? ""
-                                            : "?flags") +
-           (t.epoch ? "@" + std::to_string(t.epoch) : "");
+    std::ostringstream out;
+    out << t.value << "/" << t.timescale;
+    if (t.flags != kCMTimeFlags_Valid) out << (t.flags == 3 ? "~" : "?flags");
+    if (t.epoch) out << "@" << t.epoch;
+    return out.str();
 }
 
 std::string text(double v) { return (std::ostringstream() << v).str(); }
@@ -87,7 +87,7 @@ void expectCases(const std::string& cases) {
         std::string a, op, b, eq, want, token;
         in >> a >> op >> b >> eq;
         while (in >> token)
-            want += (want.empty() ? "" : " ") + (isTime(token) ? text(T(token)) : token);
+            (want += want.empty() ? "" : " ") += isTime(token) ? text(T(token)) : token;
         if (op == "of") std::swap(a, op);
         EXPECT_EQ(ops.at(op)(a, b), want) << line;
     }
