@@ -385,8 +385,10 @@ TEST_F(TreeCompoundTest,
                                     kTQInterpolationLinear, false);
     compound.deleteKeyframe(components[1], seconds(0.5), true);
     EXPECT_EQ(keys(), "2=0 | 1=20/1 2=0 | 2=0") << "its 0.5 s is the others' 1 s";
+    observer.told.clear();
     compound.setLinkedCurveInterpolation(kTQInterpolationCatmullRom);
     EXPECT_EQ(keys(), "2=0/6 | 1=20/6 2=0/6 | 2=0") << "except where changes are refused";
+    EXPECT_EQ(observer.told, (std::vector<TQChannelBase*>{components[0], components[1]}));
 
     observer.told.clear();
     components[0]->deleteKeyframe(h);
