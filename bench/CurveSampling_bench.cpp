@@ -15,47 +15,16 @@
 #include <cstdint>
 #include <memory>
 #include <numbers>
+#include <string>
 #include <vector>
 
 #include "platform/channels/TQChannel.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 
 namespace {
 
 constexpr int kTimescale = 0x40000;
 constexpr unsigned kSamples = 2000;
-
-struct Lcg {
-    uint64_t state;
-    double next() {
-        state = state * 6364136223846793005ull + 1442695040888963407ull;
-        return double(state >> 11) / 9007199254740992.0;
-    }
-};
-
-// Random values and spacing; handles reach 10% to 90% of their segment at random angles.
-std::unique_ptr<TQChannel> makeBezierChannel(int keyframes) {
-    auto channel = std::make_unique<TQChannel>("bench", 1, 0.0);
-    Lcg rng{0x5eed + uint64_t(keyframes)};
-    std::vector<double> times(static_cast<size_t>(keyframes));
-    double t = 0.0;
-    for (double& time : times) {
-        time = t;
-        t += 0.05 + rng.next() * 0.2;
-    }
-    for (int i = 0; i < keyframes; ++i) {
-        const CMTime time = TQTarnTimeForChannelSeconds(times[size_t(i)], kTimescale);
-        TQKeyframeHandle h = channel->setKeyframe(time, rng.next() * 100.0 - 50.0);
-        const double before = i > 0 ? times[size_t(i)] - times[size_t(i) - 1] : 0.1;
-        const double after = i + 1 < keyframes ? times[size_t(i) + 1] - times[size_t(i)] : 0.1;
-        channel->setKeyframeTangentsBroken(h, true);
-        const double reachIn = before * (0.1 + 0.8 * rng.next());
-        const double reachOut = after * (0.1 + 0.8 * rng.next());
-        channel->setKeyframeInputTangents(h, -reachIn, reachIn * (rng.next() * 200.0 - 100.0));
-        channel->setKeyframeOutputTangents(h, reachOut, reachOut * (rng.next() * 200.0 - 100.0));
-    }
-    channel->setInterpolation(kTQInterpolationBezier);
-    return channel;
-}
 
 struct Span {
     CMTime start;
@@ -71,7 +40,7 @@ Span samplingSpan(const TQChannel& channel) {
 }
 
 void BM_GetSamples(benchmark::State& state) {
-    const auto channel = makeBezierChannel(int(state.range(0)));
+    const auto channel = curve_catalogue::make("steep-" + std::to_string(state.range(0)));
     const Span span = samplingSpan(*channel);
     std::vector<CMTime> times(kSamples + 1);
     std::vector<double> values(kSamples + 1);
@@ -159,7 +128,7 @@ double solveCubicInUnitInterval(double a, double b, double c, double d) {
 }
 
 void BM_ClosedFormSamples(benchmark::State& state) {
-    const auto channel = makeBezierChannel(int(state.range(0)));
+    const auto channel = curve_catalogue::make("steep-" + std::to_string(state.range(0)));
     const Span span = samplingSpan(*channel);
     const ControlPoints cp = controlPointsOf(*channel);
     std::vector<CMTime> times(kSamples + 1);

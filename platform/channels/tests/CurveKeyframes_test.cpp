@@ -2,7 +2,7 @@
 
 #include <functional>
 
-#include "platform/channels/tests/CurveCatalogue.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 #include "platform/channels/tests/KeyframeText.h"
 
 using namespace curve_catalogue;

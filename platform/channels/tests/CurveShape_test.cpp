@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "platform/channels/TQChannelTypes.h"
-#include "platform/channels/tests/CurveCatalogue.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 
 using namespace curve_catalogue;
 

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <vector>
 
-#include "platform/channels/tests/CurveCatalogue.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 
 using namespace curve_catalogue;
 

@@ -6,7 +6,7 @@
 #include <numbers>
 #include <vector>
 
-#include "platform/channels/tests/CurveCatalogue.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 
 using namespace curve_catalogue;
 
