@@ -12,14 +12,17 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <initializer_list>
 #include <memory>
+#include <stdexcept>
 #include <string>
 #include <utility>
 #include <vector>
 
 #include "host/TQHostAppDelegate.h"
 #include "platform/channels/TQChannelObjectRootBase.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
 #include "src/view/TQCurveEditorViewBase.h"
@@ -41,6 +44,45 @@ public:
                                               CMTimeMake(1, 30));
     }
 };
+
+// The channel named `name` anywhere under `root` (a snapshot, say).
+inline TQChannel& named(TQChannelBase& root, const std::string& name) {
+    std::vector<TQChannelBase*> all;
+    static_cast<TQChannelFolder&>(root).getAllDescendantsFlattened(all, 0, true);
+    for (TQChannelBase* c : all)
+        if (c->getName() == name) return static_cast<TQChannel&>(*c);
+    throw std::invalid_argument("no channel " + name);
+}
+
+// Every channel under `root`: name (initial value), then each keyframe as time=value
+// [interpolation, Locked, Disabled, Broken, handles], for failure messages.
+inline std::string describe(const TQChannelBase& root) {
+    std::vector<TQChannelBase*> all;
+    static_cast<const TQChannelFolder&>(root).getAllDescendantsFlattened(all, 0, true);
+    std::string out;
+    for (const TQChannelBase* node : all) {
+        const auto* c = dynamic_cast<const TQChannel*>(node);
+        if (!c) continue;
+        out += "\n  " + c->getName() + " (" + std::to_string(c->getInitialValue()) + "):";
+        for (TQKeyframeHandle h : c->getKeyframes(false)) {
+            CMTime t = kCMTimeInvalid;
+            double v = 0.0;
+            c->getKeyframe(h, &t, &v);
+            double iu = 0, iv = 0, ou = 0, ov = 0;
+            c->getKeyframeInputTangents(h, &iu, &iv);
+            c->getKeyframeOutputTangents(h, &ou, &ov);
+            char text[200];
+            std::snprintf(text, sizeof text, " %lld/%d%s=%g[%u%s%s%s (%g,%g) (%g,%g)]",
+                          static_cast<long long>(t.value), t.timescale,
+                          t.flags == kCMTimeFlags_Valid ? "" : "~", v,
+                          c->getKeyframeInterpolation(h), c->getKeyframeLocked(h) ? "L" : "",
+                          c->getKeyframeEnabled(h) ? "" : "D",
+                          c->getKeyframeTangentsBroken(h) ? "B" : "", iu, iv, ou, ov);
+            out += text;
+        }
+    }
+    return out;
+}
 
 class EngineFixture : public ::testing::Test {
 protected:
@@ -92,6 +134,14 @@ protected:
         auto* c = static_cast<TQChannel*>(
             into->addChild(std::make_unique<TQChannel>(name, nextChannelId++)));
         for (const auto& [t, v] : keys) c->setKeyframe(seconds(t), v);
+        return c;
+    }
+
+    // A plain channel under the object holding the catalogue's curve `curve`.
+    TQChannel* addCurve(const char* name, const char* curve) {
+        auto* c = static_cast<TQChannel*>(
+            object->addChild(std::make_unique<TQChannel>(name, nextChannelId++)));
+        curve_catalogue::fill(*c, curve);
         return c;
     }
 
@@ -173,6 +223,18 @@ protected:
             out.push_back("didChangeChannel(" + *c + ")");
         out.insert(out.end(), {"endCaptureModifiedChannels()", "postNotification(0x8)"});
         return out;
+    }
+
+    // The object's whole tree as it stands now, to compare with operator== later.
+    std::unique_ptr<TQChannelBase> snapshot() const {
+        return std::unique_ptr<TQChannelBase>(object->cloneChannel());
+    }
+
+    // The object's tree equals `want` in its whole animation state.
+    ::testing::AssertionResult sceneIs(const TQChannelBase& want) const {
+        if (*object == want) return ::testing::AssertionSuccess();
+        return ::testing::AssertionFailure()
+               << "scene differs:" << describe(*object) << "\nwanted:" << describe(want);
     }
 
     // The view's own selection, filled with the entries.
