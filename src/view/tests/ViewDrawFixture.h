@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "platform/draw/testing/HXDRecordingEncoder.h"
+#include "src/view/tests/FrameBaseline.h"
 #include "src/view/tests/ViewFixture.h"
 
 namespace view_test {
@@ -55,6 +56,22 @@ protected:
         TQChannel* c = addChannel(name, keys);
         c->setInterpolation(kTQInterpolationLinear);
         return addItem(c);
+    }
+
+    // The last frame as text (FrameBaseline.h); keyframes are numbered over every channel of
+    // the object in order.
+    std::string frameText() const {
+        std::vector<TQChannelBase*> channels;
+        object->getAllDescendantsFlattened(channels, 0, true);
+        std::vector<TQKeyframeHandle> handles;
+        for (TQChannelBase* c : channels)
+            for (TQKeyframeHandle h : static_cast<TQChannel*>(c)->getKeyframes(false))
+                handles.push_back(h);
+        const auto nameOf = [this](int64_t id) -> std::string {
+            const auto item = controllerPtr->channelItemWithIdentifier(static_cast<uint32_t>(id));
+            return item && item->channelBase() ? item->channelBase()->getName() : "?";
+        };
+        return view_test::frameText(view, nameOf, handles);
     }
 
     HXDRecordingEncoder encoder{800, 400};
