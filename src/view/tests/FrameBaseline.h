@@ -56,7 +56,8 @@ inline std::string frameText(const TQCurveEditorViewBase& view,
         std::snprintf(buf, sizeof buf, "hit=%x", p->hitInfo().hitID());
         out << buf;
         const HXDExtraInfo& extra = p->hitInfo().extraInfo();
-        if (const HXDNumber* id = extra.objectForKey("ID")) out << " " << nameOfId(id->integerValue());
+        if (const HXDNumber* id = extra.objectForKey("ID"))
+            out << " " << nameOfId(id->integerValue());
         if (const HXDNumber* h = extra.objectForKey("Handle")) {
             const auto key = reinterpret_cast<TQKeyframeHandle>(h->unsignedLongLongValue());
             for (size_t i = 0; i < handles.size(); ++i)

@@ -31,7 +31,8 @@ TEST_F(ViewFrame, frame__order_pieces_and_dimmed_ends) {
     EXPECT_TRUE(matchesBaseline("frame-order-and-ends", frameText()));
     ASSERT_EQ(encoder.entries.size(), view.primitives().size());
     for (size_t i = 0; i < encoder.entries.size(); ++i)
-        ASSERT_EQ(encoder.entries[i].primitive, view.primitives()[i].get()) << "encoded out of order";
+        ASSERT_EQ(encoder.entries[i].primitive, view.primitives()[i].get())
+            << "encoded out of order";
     const GDColor bg = view.backgroundColor();
     EXPECT_EQ(encoder.clearColor, HXD_sRGBA(bg.red, bg.green, bg.blue, bg.alpha));
     ASSERT_TRUE(frame());

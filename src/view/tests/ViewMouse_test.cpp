@@ -1,10 +1,12 @@
-// Gestures of the edit tool through the view: which keypoint a drag moves, the Shift axis
-// constraint, one undo step per drag and none for a click, Command-drags that pull tangents,
-// the 1/30 s gate on drag steps, the clicks that add, flatten and break, and the space-bar
-// navigation.
+// Gestures of the edit tool through the view on the reference host: each gesture of the table
+// leaves the curve where the user put it as one undo step that gives it back exactly; then the
+// abandoned drag, the 1/30 s gate, the typed value, the axis rules, the edge bands and the
+// space-bar navigation.
 
+#include <cctype>
 #include <cmath>
 #include <memory>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -17,64 +19,174 @@ class ViewMouseEdit : public ViewMouseFixture {};
 // Where a real undo is the point: the reference host behind the recorder.
 class ViewMouseUndo : public WithReferenceHost<ViewMouseFixture> {};
 
-TEST_F(ViewMouseEdit, drag__fromAnUnselectedKeypointMovesItAlone) {
-    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
-    const TQKeyframeHandle k2 = keyAt(item, 2.0);
-    const TQKeyframeHandle k5 = keyAt(item, 5.0);
-    selectInView({keypointEntry(item, 2.0)});
+// One gesture as a script: "d t v", "m t v" (a drag step past the gate), "q t v" (one inside
+// it), "u t v", "c t v" (a click); after the point, modifiers: s Shift, o Option, c Command.
+struct Gesture {
+    const char* what;
+    unsigned interpolation;
+    const char* script;
+    std::vector<std::pair<double, double>> want;  // the keys after it, (time, value)
+    const char* undoStep;
+    size_t steps;  // undo steps the gesture leaves
+};
+
+void PrintTo(const Gesture& g, std::ostream* os) { *os << g.what; }
+
+class ViewGestures : public WithReferenceHost<ViewMouseFixture>,
+                     public ::testing::WithParamInterface<Gesture> {
+protected:
+    void run(const std::string& script) {
+        std::istringstream in(script);
+        std::string step;
+        while (std::getline(in, step, '|')) {
+            std::istringstream words(step);
+            char op = 0;
+            double t = 0, v = 0;
+            std::string mods;
+            words >> op >> t >> v >> mods;
+            uint64_t m = 0;
+            for (char c : mods)
+                m |= c == 's' ? kShift : c == 'o' ? kOption : c == 'c' ? kCommand : 0;
+            if (op == 'd') down(t, v, m);
+            if (op == 'm') dragTo(t, v, m);
+            if (op == 'q') dragTo(t, v, m, 0.01);
+            if (op == 'u') up(t, v, m);
+            if (op == 'c') click(t, v, m);
+        }
+    }
+};
+
+TEST_P(ViewGestures, gesture__lands_as_one_undo_step_that_gives_the_curve_back) {
+    const Gesture& g = GetParam();
+    TQChannel* c = addCurve("A", "bump");
+    c->setInterpolation(g.interpolation);
+    auto item = addItem(c);
+    selectInView({keypointEntry(item, 2.0)});  // a click elsewhere replaces it
+    const auto before = snapshot();
     ASSERT_TRUE(frame());
+    run(g.script);
 
-    down(5.0, 0.0);
-    ASSERT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{k5})
-        << "the click replaces the selection";
-    dragTo(5.25, 0.2);
-    dragTo(5.5, 0.5);
-    up(5.5, 0.5);
-
-    const auto [t5, v5] = keyOf(item, k5);
-    EXPECT_NEAR(t5, 5.5, kDragTolerance) << "the picked keypoint follows the pointer in time";
-    EXPECT_NEAR(v5, 0.5, kDragTolerance) << "and in value";
-    const auto [t2, v2] = keyOf(item, k2);
-    EXPECT_EQ(t2, 2.0) << "the keypoint selected before the click stays";
-    EXPECT_EQ(v2, 0.0);
-    EXPECT_FALSE(view.getCapturing()) << "mouse up closes the capture";
-    EXPECT_FALSE(view.mouseIsDown());
+    std::vector<std::pair<double, double>> keys;
+    for (double t : keyTimes(c)) keys.emplace_back(t, keyValueAt(c, t));
+    ASSERT_EQ(keys.size(), g.want.size()) << describe(*object);
+    for (size_t i = 0; i < keys.size(); ++i) {
+        EXPECT_NEAR(keys[i].first, g.want[i].first, kDragTolerance) << "time of key " << i;
+        EXPECT_NEAR(keys[i].second, g.want[i].second, kDragTolerance) << "value of key " << i;
+    }
+    EXPECT_EQ(recorder.captureBalance(), 0);
+    EXPECT_FALSE(view.getCapturing() || view.mouseIsDown());
+    EXPECT_EQ(host.undoStack().undoCount(), g.steps);
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString(g.undoStep));
+    const auto after = snapshot();
+    while (host.canUndo()) ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(sceneIs(*before)) << "undo";
+    while (host.canRedo()) ASSERT_TRUE(host.redo());
+    EXPECT_TRUE(sceneIs(*after)) << "redo";
 }
 
-TEST_F(ViewMouseEdit, drag__shiftInMidDragDecidesTheAxisFromTheWholeMovement) {
-    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
+constexpr unsigned kLinear = kTQInterpolationLinear;
+INSTANTIATE_TEST_SUITE_P(
+    Edit, ViewGestures,
+    ::testing::Values(
+        Gesture{"a picked keypoint follows the pointer alone",
+                kLinear,
+                "d 5 .5|m 5.25 .6|m 5.5 .7|u 5.5 .7",
+                {{2, 0}, {5.5, .7}, {8, 0}},
+                "Undo Move Keypoint",
+                1},
+        // Mostly sideways since the origin: the value stays where Shift found it.
+        Gesture{"shift in mid-drag holds the value",
+                kLinear,
+                "d 5 .5|m 5.1 .6|m 5.5 .65 s|m 5.75 .8 s|u 5.75 .8 s",
+                {{2, 0}, {5.75, .6}, {8, 0}},
+                "Undo Move Keypoint",
+                1},
+        Gesture{"shift upward holds the time",
+                kLinear,
+                "d 5 .5|m 5.05 .7 s|m 6 .8 s|u 6 .8 s",
+                {{2, 0}, {5, .8}, {8, 0}},
+                "Undo Move Keypoint",
+                1},
+        // A segment moves its two keypoints, only vertically.
+        Gesture{"a curve segment moves only vertically",
+                kLinear,
+                "d 3.5 .25|m 4.5 .55|u 4.5 .55",
+                {{2, .3}, {5, .8}, {8, 0}},
+                "Undo Move Curve",
+                1},
+        // The curve passes through the pointer at each step; a step the gate drops loses
+        // nothing. From a keypoint the time follows too (at 6 the curve was at 1/3).
+        Gesture{"option-command from a keypoint",
+                kLinear,
+                "d 5 .5 oc|m 5.5 .6 oc|q 5.75 .9 oc|m 6 .63333333 oc|u 6 .63333333 oc",
+                {{2, .3}, {5, .8}, {8, .3}},
+                "Undo Move Keypoint",
+                1},
+        Gesture{"option-command from the curve keeps the press time",
+                kLinear,
+                "d 3.5 .25 oc|m 4 .35 oc|q 4 .45 oc|m 4 .55 oc|u 4 .55 oc",
+                {{2, .3}, {5, .8}, {8, .3}},
+                "Undo Move Curve",
+                1},
+        Gesture{"option-click on the curve adds a keypoint",
+                kLinear,
+                "c 6.5 .25 o",
+                {{2, 0}, {5, .5}, {6.5, .25}, {8, 0}},
+                "Undo Add keypoint",
+                1},
+        Gesture{"command-click flattens",
+                kTQInterpolationBezier,
+                "c 5 .5 c",
+                {{2, 0}, {5, .5}, {8, 0}},
+                "Undo Flatten Keypoint",
+                1},
+        // The Command press flattens first, then the drag pulls the output handle.
+        Gesture{"command-drag pulls a handle",
+                kTQInterpolationBezier,
+                "d 5 .5 c|m 6 .7 c|u 6 .7 c",
+                {{2, 0}, {5, .5}, {8, 0}},
+                "Undo Set Tangents",
+                2}),
+    [](const auto& p) {
+        std::string name;
+        for (const char* w = p.param.what; *w; ++w)
+            if (std::isalnum(static_cast<unsigned char>(*w))) name += *w;
+        return name;
+    });
+
+TEST_F(ViewMouseEdit, tangent__optionClickBreaksAndShiftDragStepsBy45DegreesFromTheOriginalAngle) {
+    TQChannel* c = addCurve("A", "level");
+    c->setInterpolation(kTQInterpolationBezier);
+    auto item = addItem(c);
     const TQKeyframeHandle k = keyAt(item, 5.0);
+    c->setKeyframeOutputTangents(k, 1.0, 0.2);
+    c->setKeyframeInputTangents(k, -1.0, -0.2);
+    selectInView({keypointEntry(item, 5.0)});
     ASSERT_TRUE(frame());
-    {
-        // Mostly sideways since the origin (40 px right, 30 px up): horizontal, and the value
-        // is held where the keypoint is at that moment, not where the gesture began.
-        down(5.0, 0.0);
-        dragTo(5.1, 0.1);
-        dragTo(5.5, 0.15, kShift);
-        EXPECT_EQ(view.constrainMoveDirection(), TQConstrainDirection::kHorizontal);
-        dragTo(5.75, 0.6, kShift);
-        const auto [t, v] = keyOf(item, k);
-        EXPECT_NEAR(t, 5.75, kDragTolerance) << "time follows the pointer";
-        EXPECT_NEAR(v, 0.1, kDragTolerance) << "value stays at its position when Shift came";
-        // Releasing Shift clears the axis; pressing it again decides afresh.
-        dragTo(5.8, 0.2);
-        EXPECT_EQ(view.constrainMoveDirection(), TQConstrainDirection::kUndecided);
-        up(5.8, 0.2);
-    }
-    {
-        // Mostly upward since the origin: vertical. The pick needs a frame that shows the
-        // keypoint where the first gesture left it.
-        ASSERT_TRUE(frame());
-        const auto [t0, v0] = keyOf(item, k);
-        down(t0, v0);
-        dragTo(t0 + 0.05, v0 + 0.5, kShift);
-        EXPECT_EQ(view.constrainMoveDirection(), TQConstrainDirection::kVertical);
-        dragTo(t0 + 1.0, v0 + 0.6, kShift);
-        const auto [t, v] = keyOf(item, k);
-        EXPECT_NEAR(t, t0, kDragTolerance) << "a vertical constraint keeps the time";
-        EXPECT_NEAR(v, v0 + 0.6, kDragTolerance);
-        up(t0 + 1.0, v0 + 0.6);
-    }
+    // On screen (80 px a second, 200 px a unit) the handle points at atan(40 / 80).
+    const double original = std::atan2(0.2 * 200.0, 1.0 * 80.0);
+
+    click(6.0, 0.2, kOption);
+    EXPECT_TRUE(c->getKeyframeTangentsBroken(k));
+    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Break Tangents"));
+    ASSERT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionOutTangent);
+
+    down(6.0, 0.2, kShift);
+    dragTo(6.0, 0.6, kShift);
+    dragTo(5.9, 0.7, kShift);
+    up(5.9, 0.7, kShift);
+    double u = 0.0;
+    double v = 0.0;
+    c->getKeyframeOutputTangents(k, &u, &v);
+    const double steps = (std::atan2(v * 200.0, u * 80.0) - original) / (M_PI / 4.0);
+    EXPECT_NEAR(steps, std::round(steps), 1e-3)
+        << "the handle turned by whole 45-degree steps on screen";
+    EXPECT_NE(std::round(steps), 0.0) << "and followed the pointer upward";
+    double inU = 0.0;
+    double inV = 0.0;
+    c->getKeyframeInputTangents(k, &inU, &inV);
+    EXPECT_NEAR(inV, -0.2, kValueTolerance) << "broken: the input handle stays";
+    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Set Tangents"));
 }
 
 TEST_F(ViewMouseEdit, constrainMove__aTieIsVertical) {
@@ -96,39 +208,6 @@ TEST_F(ViewMouseEdit, constrainTime__clampsToTotalStartAndTheLaterEnd) {
     view.setTotalRange(nullptr, &longer);
     EXPECT_NEAR(view.constrainTime(CGPointMake(40.0, 0.0)).x, 31.0, kWorldTolerance);
     EXPECT_NEAR(view.constrainTime(CGPointMake(12.0, 0.0)).x, 12.0, kWorldTolerance);
-}
-
-TEST_F(ViewMouseEdit, click__withoutADragOpensNoCapture) {
-    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.0}});
-    ASSERT_TRUE(frame());
-    click(5.0, 0.0);
-    EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 0u);
-    EXPECT_EQ(countCalls("endCaptureModifiedChannels"), 0u);
-    EXPECT_EQ(countCalls("suppressEventCoalescing"), 1u);
-    EXPECT_EQ(countCalls("unsuppressEventCoalescing"), 1u);
-    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyChannelsChanged});
-    EXPECT_EQ(selectedHandles(), std::vector<TQKeyframeHandle>{keyAt(item, 5.0)});
-}
-
-TEST_F(ViewMouseUndo, drag__tenStepsAreOneUndoStepThatRestoresExactly) {
-    auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.25}, {8.0, 0.0}});
-    const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
-    ASSERT_TRUE(frame());
-
-    down(5.0, 0.25);
-    for (int i = 1; i <= 10; ++i) dragTo(5.0 + 0.1 * i, 0.25 + 0.05 * i);
-    up(6.0, 0.75);
-
-    EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 1u);
-    EXPECT_EQ(countCalls("endCaptureModifiedChannels"), 1u);
-    EXPECT_EQ(countCalls("willSetChannelValue"), 10u) << "each step announces its value change";
-    ASSERT_EQ(host.undoStack().undoCount(), 1u);
-    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Keypoint"));
-    EXPECT_NEAR(keyValueAt(item->channel(), 6.0), 0.75, kDragTolerance);
-
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(*item->channel() == *before) << "undo restores the channel exactly";
-    EXPECT_FALSE(host.canUndo());
 }
 
 TEST_F(ViewMouseUndo, drag__abandonedClosesItsStepInReverseOrderAndUndoesWhole) {
@@ -210,69 +289,6 @@ TEST_F(ViewMouseEdit, mouseDragged__stepsAreGatedToThirtyASecondWithoutLosingMov
     up(6.0, 0.0);
 }
 
-TEST_F(ViewMouseEdit, drag__commandPullsTangentsOnTheSideOfTheMovement) {
-    auto bezierItem = [&](const char* name) {
-        TQChannel* c = addChannel(name, {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
-        c->setInterpolation(kTQInterpolationBezier);
-        return addItem(c);
-    };
-    {
-        auto item = bezierItem("Right");
-        ASSERT_TRUE(frame());
-        down(5.0, 0.0, kCommand);
-        dragTo(6.0, 0.4, kCommand);
-        ASSERT_EQ(view.getSelection()->size(), 1u);
-        EXPECT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionOutTangent)
-            << "dragging right turns the entry into the output handle";
-        double u = 0.0;
-        double v = 0.0;
-        item->channel()->getKeyframeOutputTangents(keyAt(item, 5.0), &u, &v);
-        EXPECT_GT(u, 0.0) << "the output handle leads toward the pointer";
-        EXPECT_GT(v, 0.0);
-        EXPECT_EQ(recorder.captureBalance(), 1) << "the drag's step stays open until mouse up";
-        up(6.0, 0.4, kCommand);
-        EXPECT_EQ(recorder.captureBalance(), 0);
-        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Set Tangents"));
-        EXPECT_EQ(countCalls("startCaptureModifiedChannels"), 2u)
-            << "the Command click's flatten, then the pull";
-        ctrl().removeChannelWithIdentifier(item->channelId(), set);
-    }
-    {
-        auto item = bezierItem("Left");
-        ASSERT_TRUE(frame());
-        down(5.0, 0.0, kCommand);
-        dragTo(4.0, 0.4, kCommand);
-        EXPECT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionInTangent)
-            << "dragging left turns it into the input handle";
-        up(4.0, 0.4, kCommand);
-    }
-}
-
-TEST_F(ViewMouseEdit, click__commandFlattensOptionOnACurveAddsAKeypoint) {
-    TQChannel* c = addChannel("A", {{2.0, 0.0}, {5.0, 0.5}, {8.0, 0.0}});
-    c->setInterpolation(kTQInterpolationLinear);
-    auto item = addItem(c);
-    ASSERT_TRUE(frame());
-    {
-        // Option-click on the curve between two keypoints: a keypoint there, selected.
-        const double y = 0.5 * (6.5 - 5.0) / 3.0 * -1.0 + 0.5;  // on the segment 5..8
-        click(6.5, y, kOption);
-        EXPECT_EQ(keyTimes(c).size(), 4u) << "a keypoint was added on the curve";
-        ASSERT_EQ(view.getSelection()->size(), 1u);
-        EXPECT_TRUE(view.getSelection()->selectionAtIndex(0)->isKeypoint())
-            << "the new keypoint is selected";
-        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Add keypoint"));
-    }
-    {
-        c->setInterpolation(kTQInterpolationBezier);
-        ASSERT_TRUE(frame());
-        click(5.0, 0.5, kCommand);
-        EXPECT_EQ(c->getKeyframeInterpolation(keyAt(item, 5.0)), kTQInterpolationLinear)
-            << "Command-click flattens the keypoint into a linear one";
-        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Flatten Keypoint"));
-    }
-}
-
 TEST_F(ViewMouseUndo, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
     auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.25}});
     const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
@@ -297,91 +313,6 @@ TEST_F(ViewMouseUndo, doubleClick__onAKeypointTypesItsValueInsideOneUndoStep) {
     EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Keypoint"));
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(*item->channel() == *before) << "the step holds what was typed";
-}
-
-TEST_F(ViewMouseEdit, tangent__optionClickBreaksAndShiftDragStepsBy45DegreesFromTheOriginalAngle) {
-    TQChannel* c = addChannel("A", {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
-    c->setInterpolation(kTQInterpolationBezier);
-    auto item = addItem(c);
-    const TQKeyframeHandle k = keyAt(item, 5.0);
-    c->setKeyframeOutputTangents(k, 1.0, 0.2);
-    c->setKeyframeInputTangents(k, -1.0, -0.2);
-    selectInView({keypointEntry(item, 5.0)});
-    ASSERT_TRUE(frame());
-    // On screen (80 px a second, 200 px a unit) the handle points at atan(40 / 80).
-    const double original = std::atan2(0.2 * 200.0, 1.0 * 80.0);
-
-    click(6.0, 0.2, kOption);
-    EXPECT_TRUE(c->getKeyframeTangentsBroken(k));
-    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Break Tangents"));
-    ASSERT_EQ(view.getSelection()->selectionAtIndex(0)->getFlags(), TQSelectionOutTangent);
-
-    down(6.0, 0.2, kShift);
-    dragTo(6.0, 0.6, kShift);
-    dragTo(5.9, 0.7, kShift);
-    up(5.9, 0.7, kShift);
-    double u = 0.0;
-    double v = 0.0;
-    c->getKeyframeOutputTangents(k, &u, &v);
-    const double steps = (std::atan2(v * 200.0, u * 80.0) - original) / (M_PI / 4.0);
-    EXPECT_NEAR(steps, std::round(steps), 1e-3)
-        << "the handle turned by whole 45-degree steps on screen";
-    EXPECT_NE(std::round(steps), 0.0) << "and followed the pointer upward";
-    double inU = 0.0;
-    double inV = 0.0;
-    c->getKeyframeInputTangents(k, &inU, &inV);
-    EXPECT_NEAR(inV, -0.2, kValueTolerance) << "broken: the input handle stays";
-    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Set Tangents"));
-}
-
-TEST_F(ViewMouseEdit, drag__aCurveMovesOnlyVertically) {
-    auto item = linearItem("A", {{2.0, 0.0}, {8.0, 0.0}});
-    ASSERT_TRUE(frame());
-    down(5.0, 0.0);
-    ASSERT_TRUE(view.getSelection()->selectionAtIndex(0)->isCurve());
-    dragTo(6.0, 0.3);
-    up(6.0, 0.3);
-    EXPECT_EQ(keyTimes(item->channel()), (std::vector<double>{2.0, 8.0})) << "times stay";
-    EXPECT_NEAR(keyValueAt(item->channel(), 2.0), 0.3, kDragTolerance);
-    EXPECT_NEAR(keyValueAt(item->channel(), 8.0), 0.3, kDragTolerance);
-    EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Curve"));
-}
-
-TEST_F(ViewMouseEdit, optionCommandDrag__keepsTheWholeCurveUnderThePointerThroughDroppedSteps) {
-    // Each step moves the curve so that it passes through the pointer; a step the gate
-    // drops must not change where the curve ends up.
-    const auto expectShiftedBy = [](const TQCurveEditorChannelItemPtr& item, double delta) {
-        EXPECT_EQ(keyTimes(item->channel()), (std::vector<double>{2.0, 5.0, 8.0}));
-        EXPECT_NEAR(keyValueAt(item->channel(), 2.0), delta, kDragTolerance);
-        EXPECT_NEAR(keyValueAt(item->channel(), 5.0), 0.3 + delta, kDragTolerance);
-        EXPECT_NEAR(keyValueAt(item->channel(), 8.0), delta, kDragTolerance);
-    };
-    const uint64_t mods = kOption | kCommand;
-    {
-        // From a keypoint the curve follows the pointer in time too: at t = 6 the original
-        // curve is at 0.2, the pointer ends at 0.5.
-        auto item = linearItem("A", {{2.0, 0.0}, {5.0, 0.3}, {8.0, 0.0}});
-        ASSERT_TRUE(frame());
-        down(5.0, 0.3, mods);
-        dragTo(5.5, 0.4, mods);
-        dragTo(5.75, 0.9, mods, 0.01);  // dropped by the gate
-        dragTo(6.0, 0.5, mods);
-        up(6.0, 0.5, mods);
-        expectShiftedBy(item, 0.3);
-        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Keypoint"));
-        ASSERT_TRUE(set->removeItemWithIdentifier(item->channelId()));
-    }
-    {
-        // From the curve the time stays that of the press, at 3.5 (value 0.15).
-        auto item = linearItem("B", {{2.0, 0.0}, {5.0, 0.3}, {8.0, 0.0}});
-        ASSERT_TRUE(frame());
-        down(3.5, 0.15, mods);
-        ASSERT_TRUE(view.getSelection()->selectionAtIndex(0)->isCurve());
-        for (int i = 1; i <= 4; ++i) dragTo(4.0, 0.15 + 0.1 * i, mods, i % 2 ? kStepSeconds : 0.01);
-        up(4.0, 0.55, mods);
-        expectShiftedBy(item, 0.3);
-        EXPECT_EQ(lastUndoStep(), TQLocalizedString("Undo Move Curve"));
-    }
 }
 
 TEST_F(ViewMouseEdit, drag__intoTheEdgeBandZoomsOrPans) {
