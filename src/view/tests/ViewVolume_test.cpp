@@ -2,6 +2,7 @@
 // framing and the resets, with the words they post.
 
 #include <cmath>
+#include <functional>
 
 #include "src/view/tests/ViewFixture.h"
 
@@ -55,75 +56,23 @@ TEST_F(ViewMappingTest, conversions__beforeTheFirstFrameAreNotNumbers) {
         << "snapping a NaN pixel must neither crash nor invent a number";
 }
 
-class ViewZoomTest : public ViewFixture {};
+// One operation on the volume from the fixture's 0..10 s by -1..1 on 800 x 400 pixels: the
+// volume it leaves (to the projection's precision), the zoom factors, and the words posted.
+struct VolumeCase {
+    const char* what;
+    std::function<void()> run;
+    CGRect want;
+    double zoomX, zoomY;
+    std::vector<TQNotificationWord> words;
+};
 
-TEST_F(ViewZoomTest, zoomWithFactor__clampsTheVerticalFactorAndLeavesFactorOneAlone) {
-    {
-        view.zoomWithFactor(1.0, 1000.0);
-        EXPECT_DOUBLE_EQ(view.zoomY(), 128.0);
-        EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().size.height, 2.0 / 128.0);
-        EXPECT_DOUBLE_EQ(view.gridZoomY(), 1.0 / 128.0);
-        EXPECT_EQ(range().originRequests, 0) << "a factor of 1 leaves the time axis alone";
-    }
-    {
-        view.zoomWithFactor(1.0, 0.001);
-        EXPECT_DOUBLE_EQ(view.zoomY(), 0.0078125);
-        EXPECT_DOUBLE_EQ(view.gridZoomY(), 128.0);
-        EXPECT_NEAR(
-            view.getCurrentViewVolume().origin.y + view.getCurrentViewVolume().size.height * 0.5,
-            0.0, kValueTolerance)
-            << "the vertical zoom is about the centre";
-    }
-    {
-        view.zoomWithFactor(2.0, 1.0);
-        expectRectNear(view.getCurrentViewVolume(), CGRectMake(2.5, -128.0, 5.0, 256.0),
-                       kWorldTolerance, "x zoom by 2 about the reference centre");
-        EXPECT_NEAR(view.zoomX(), 2.0, kWorldTolerance);
-    }
-    EXPECT_EQ(postedWords(), (std::vector<TQNotificationWord>(3, kTQNotifyViewVolumeChanged)));
-}
-
-TEST_F(ViewZoomTest, zoom__keepsTheAnchorUnderThePointerAndRoundTrips) {
-    const CGPoint anchorPixel = CGPointMake(200.0, 100.0);
-    view.setMouseOrigin(anchorPixel);
-    const CGPoint anchor = view.getPointWorld(anchorPixel);
-
-    view.zoom(40.0, -40.0);  // wider in time, taller in value
-    view.drawProjection();
-    const CGRect& v = view.getCurrentViewVolume();
-    EXPECT_NEAR(v.size.width, 10.0 / 1.1, kWorldTolerance);
-    EXPECT_NEAR(v.size.height, 2.0 / 1.2, kWorldTolerance);
-    EXPECT_NEAR(view.zoomY(), 1.2, kWorldTolerance);
-    EXPECT_DOUBLE_EQ(view.gridZoomY(), 1.0);
-    const CGPoint anchorAfter = view.getPointScreen(anchor);
-    EXPECT_NEAR(anchorAfter.x, anchorPixel.x, kPixelTolerance)
-        << "the anchor must stay under the pointer";
-    EXPECT_NEAR(anchorAfter.y, anchorPixel.y, kPixelTolerance);
-    for (const CGPoint p : {CGPointMake(0, 0), CGPointMake(123.5, 377.25), CGPointMake(800, 400)}) {
-        const CGPoint back = view.getPointScreen(view.getPointWorld(p));
-        EXPECT_NEAR(back.x, p.x, kPixelTolerance) << "screen -> world -> screen at " << p.x;
-        EXPECT_NEAR(back.y, p.y, kPixelTolerance) << "screen -> world -> screen at " << p.y;
-    }
-    EXPECT_EQ(range().volumeChanges, 1);
-    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged});
-}
-
-TEST_F(ViewZoomTest, zoom__pastTheLimitKeepsTheHeightAndTheAnchorFraction) {
-    view.zoomWithFactor(1.0, 100.0);
-    view.drawProjection();
-    const CGRect before = view.getCurrentViewVolume();
-    view.setMouseOrigin(CGPointMake(200.0, 100.0));
-
-    view.zoom(0.0, -200.0);  // would take the factor to 200
-    EXPECT_DOUBLE_EQ(view.zoomY(), 128.0);
-    EXPECT_DOUBLE_EQ(view.gridZoomY(), 1.0 / 128.0);
-    EXPECT_NEAR(view.getCurrentViewVolume().size.height, before.size.height, kValueTolerance);
-    EXPECT_NEAR(view.getCurrentViewVolume().origin.y, before.origin.y, kWorldTolerance)
-        << "the anchor keeps its fraction of the unchanged height";
-}
-
-class ViewPanTest : public ViewFixture {
+class ViewVolume : public ViewFixture {
 protected:
+    // An enabled item with its mapping, as the draw pass leaves it.
+    void enabled(const char* name, std::initializer_list<std::pair<double, double>> keys) {
+        addItem(addChannel(name, keys))->enableItem(1);
+        view.computeVerticalTickMarks();
+    }
     void startAt(double x) {
         const CMTime start = seconds(x);
         view.setDisplayRange(&start, nullptr);
@@ -134,136 +83,183 @@ protected:
     }
 };
 
-TEST_F(ViewPanTest, pan__roundTripsBetweenScreenAndWorld) {
-    startAt(2.0);
-    view.pan(-80.0, -40.0);  // content moves left and down: the view goes right and up
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(3.0, -1.2, 10.0, 2.0), kWorldTolerance,
-                   "first pan");
-    view.drawProjection();
-    view.pan(80.0, 40.0);
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(2.0, -1.0, 10.0, 2.0), kWorldTolerance,
-                   "panning back returns to the start");
-    EXPECT_EQ(range().offsets.size(), 2u);
+constexpr TQNotificationWord kVolume = kTQNotifyViewVolumeChanged;
+
+TEST_F(ViewVolume, operations__table) {
+    const VolumeCase cases[] = {
+        {"vertical zoom clamps at 128, about the centre",
+         [this] { view.zoomWithFactor(1.0, 1000.0); },
+         CGRectMake(0, -1.0 / 128, 10, 2.0 / 128),
+         1,
+         128,
+         {kVolume}},
+        {"and at 1/128",
+         [this] { view.zoomWithFactor(1.0, 0.001); },
+         CGRectMake(0, -128, 10, 256),
+         1,
+         1.0 / 128,
+         {kVolume}},
+        {"x zoom about the reference centre",
+         [this] { view.zoomWithFactor(2.0, 1.0); },
+         CGRectMake(2.5, -1, 5, 2),
+         2,
+         1,
+         {kVolume}},
+        // Wider in time, taller in value, about the pointer at (200, 100) px = (2.5, -0.5).
+        {"zoom keeps the anchor under the pointer",
+         [this] {
+             view.setMouseOrigin(CGPointMake(200.0, 100.0));
+             view.zoom(40.0, -40.0);
+         },
+         CGRectMake(2.5 - 2.5 / 1.1, -0.5 - 0.5 / 1.2, 10 / 1.1, 2 / 1.2),
+         1.1,
+         1.2,
+         {kVolume}},
+        // The factor would reach 200: the height stays, the anchor keeps its fraction.
+        {"zoom past the limit",
+         [this] {
+             view.zoomWithFactor(1.0, 100.0);
+             view.drawProjection();
+             view.setMouseOrigin(CGPointMake(200.0, 100.0));
+             view.zoom(0.0, -200.0);
+         },
+         CGRectMake(0, -0.01, 10, 0.02),
+         1,
+         128,
+         {kVolume, kVolume}},
+        {"pan and back",
+         [this] {
+             startAt(2.0);
+             view.pan(-80.0, -40.0);
+             EXPECT_EQ(view.getCurrentViewVolume().origin.y, -1.2);
+             view.drawProjection();
+             view.pan(80.0, 40.0);
+             EXPECT_EQ(range().offsets, (std::vector<double>{1.0, -1.0}));
+         },
+         CGRectMake(2, -1, 10, 2),
+         1,
+         1,
+         {kVolume, kVolume}},
+        {"a pan that would reach time zero moves only y",
+         [this] {
+             startAt(0.0);
+             view.pan(80.0, 40.0);
+             EXPECT_TRUE(range().offsets.empty());
+         },
+         CGRectMake(0, -0.8, 10, 2),
+         1,
+         1,
+         {kVolume}},
+        // Four events of a line, four pixels a line: 16 px of 400; one scroller update.
+        {"queued wheel events fold into one pan",
+         [this] {
+             for (int i = 0; i < 3; ++i) viewHost.queueEvent(RWEvent::scrollWheelEvent(0, 1));
+             viewHost.queueEvent(RWEvent::keyEvent(RWEventType::KeyDown, "x"));
+             view.scrollWheel(RWEvent::scrollWheelEvent(0.0, 1.0));
+             EXPECT_EQ(range().panned, std::vector<double>{8.0});
+             EXPECT_EQ(viewHost.queuedCount(), 1u) << "only wheel events are taken";
+         },
+         CGRectMake(0, -0.92, 10, 2),
+         1,
+         1,
+         {kVolume, kTQNotifyChannelsChanging}},
+        // One keypoint each at 2 s: the display range widened by 5 % on each side; the
+        // factor is taken before the padding.
+        {"frame all on single keypoints",
+         [this] {
+             enabled("A", {{2.0, 3.0}});
+             enabled("B", {{2.0, 5.0}});
+             view.zoomWithFactor(1.0, 4.0);
+             recorder.clearCalls();
+             view.frameAll(1);
+         },
+         CGRectMake(-0.5, 2.9, 11, 2.2),
+         10.0 / 11,
+         1,
+         {kVolume}},
+        {"frame all spans enabled items only",
+         [this] {
+             enabled("A", {{1.0, 0.0}, {2.0, 1.0}});
+             enabled("B", {{3.0, 0.0}});
+             addItem(addChannel("Disabled", {{9.0, 0.0}}))->enableItem(0);
+             view.frameAll(1);
+         },
+         CGRectMake(0.9, -0.05, 2.2, 1.1),
+         10 / 2.2,
+         2,
+         {kVolume}},
+        {"frame all never changes the height for one flat curve",
+         [this] {
+             enabled("Flat", {{1.0, 0.5}, {4.0, 0.5}});
+             view.frameAll(0);
+         },
+         CGRectMake(0, -1, 10, 2),
+         1,
+         1,
+         {kVolume}},
+        // 0..100 needs a factor of 1/50, short of the limit; the draw pass calls it: no word.
+        {"auto-zoom only when due",
+         [this] {
+             enabled("A", {{1.0, 0.0}, {2.0, 100.0}});
+             view.performAutoZoom(false);
+             EXPECT_EQ(view.getCurrentViewVolume(), CGRectMake(0, -1, 10, 2));
+             view.setNeedsAutoZoom(1);
+             view.performAutoZoom(false);
+             EXPECT_EQ(view.gridZoomY(), 32.0);
+         },
+         CGRectMake(0, -5, 10, 110),
+         1,
+         0.02,
+         {}},
+        {"reset zoom",
+         [this] {
+             view.zoomWithFactor(2.0, 4.0);
+             view.drawProjection();
+             view.pan(-80.0, -40.0);
+             recorder.clearCalls();
+             view.resetZoom();
+         },
+         CGRectMake(0, -1, 10, 2),
+         1,
+         1,
+         {kVolume}},
+    };
+    for (const VolumeCase& c : cases) {
+        SCOPED_TRACE(c.what);
+        TearDown();
+        SetUp();
+        view.resetZoom();  // the view outlives the fixture's set-up
+        recorder.clearCalls();
+        c.run();
+        const CGRect& v = view.getCurrentViewVolume();
+        EXPECT_NEAR(v.origin.x, c.want.origin.x, kWorldTolerance);
+        EXPECT_NEAR(v.origin.y, c.want.origin.y, kWorldTolerance);
+        EXPECT_NEAR(v.size.width, c.want.size.width, kWorldTolerance);
+        EXPECT_NEAR(v.size.height, c.want.size.height, kWorldTolerance);
+        EXPECT_NEAR(view.zoomX(), c.zoomX, kWorldTolerance);
+        EXPECT_NEAR(view.zoomY(), c.zoomY, kWorldTolerance);
+        EXPECT_EQ(postedWords(), c.words);
+    }
 }
 
-TEST_F(ViewPanTest, pan__thatWouldReachTimeZeroChangesOnlyY) {
-    startAt(0.0);
-    view.pan(80.0, 40.0);
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(0.0, -0.8, 10.0, 2.0), kWorldTolerance,
-                   "the horizontal part is dropped");
-    EXPECT_TRUE(range().offsets.empty()) << "the controller must not be asked to go below zero";
-    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged});
-}
-
-TEST_F(ViewPanTest, scrollWheel__foldsQueuedWheelEventsIntoOnePan) {
-    for (int i = 0; i < 3; ++i) viewHost.queueEvent(RWEvent::scrollWheelEvent(0.0, 1.0));
-    viewHost.queueEvent(RWEvent::keyEvent(RWEventType::KeyDown, "x"));
-
-    view.scrollWheel(RWEvent::scrollWheelEvent(0.0, 1.0));
-    // Four events of 1 line each, four pixels a line: 16 px of a 400 px, 2-unit view.
-    EXPECT_NEAR(view.getCurrentViewVolume().origin.y, -1.0 + 0.08, kWorldTolerance);
-    EXPECT_EQ(range().panned, std::vector<double>{8.0})
-        << "one scroller update for the whole batch";
-    EXPECT_EQ(postedWords(), (std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged,
-                                                              kTQNotifyChannelsChanging}));
-    EXPECT_EQ(viewHost.queuedCount(), 1u) << "only wheel events are taken off the queue";
-}
-
-TEST_F(ViewPanTest, setVerticalZoom__withZoomOneShowsTheWholeRangeWhateverThePercentage) {
-    TQChannel* c = addChannel("A", {{1.0, -3.0}, {2.0, 5.0}});
-    addItem(c);
+TEST_F(ViewVolume, setVerticalZoom__with_zoom_one_shows_the_whole_range_whatever_the_percentage) {
+    addItem(addChannel("A", {{1.0, -3.0}, {2.0, 5.0}}));
     view.computeVerticalTickMarks();
     for (double p : {0.0, 0.3, 1.0}) {
         // The range grows with the view's padding, so it is taken anew before each call.
         const CGRect max = ctrl().getMaxViewVolume();
         view.setVerticalZoom(1.0, p);
         EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().origin.y, max.origin.y) << "p = " << p;
-        EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().size.height, max.size.height) << "p = " << p;
+        EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().size.height, max.size.height) << p;
     }
     const CGRect max = ctrl().getMaxViewVolume();
     view.setVerticalZoom(0.5, 0.0);
-    EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().origin.y + view.getCurrentViewVolume().size.height,
-                     max.origin.y + max.size.height)
+    EXPECT_DOUBLE_EQ(CGRectGetMaxY(view.getCurrentViewVolume()), CGRectGetMaxY(max))
         << "p = 0 is the top of the range";
     EXPECT_DOUBLE_EQ(view.zoomY(), 1.0) << "the scroller does not touch the zoom factor";
 }
 
-class ViewFramingTest : public ViewFixture {
-protected:
-    TQCurveEditorChannelItemPtr enabledItem(TQChannel* channel) {
-        auto item = addItem(channel);
-        item->enableItem(1);
-        view.computeVerticalTickMarks();  // as the draw pass does: the item gets its mapping
-        return item;
-    }
-};
-
-TEST_F(ViewFramingTest, frameAll__onCurvesWithOneKeypointFallsBackToTheDisplayRange) {
-    enabledItem(addChannel("A", {{2.0, 3.0}}));
-    enabledItem(addChannel("B", {{2.0, 5.0}}));
-    view.zoomWithFactor(1.0, 4.0);
-    recorder.clearCalls();
-
-    view.frameAll(1);
-    // Both keypoints at 2 s: the display range 0..10 widened by 5 percent on each side.
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(-0.5, 2.9, 11.0, 2.2), kWorldTolerance,
-                   "framed volume");
-    EXPECT_NEAR(view.zoomX(), 10.0 / 11.0, kWorldTolerance);
-    EXPECT_DOUBLE_EQ(view.zoomY(), 1.0) << "the factor is taken before the padding";
-    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged});
-    EXPECT_GE(viewHost.redrawRequests(), 1);
-}
-
-TEST_F(ViewFramingTest, frameAll__spansTheKeypointsOfEnabledItemsWithTheirTimeOffset) {
-    enabledItem(addChannel("A", {{1.0, 0.0}, {2.0, 1.0}}));
-    enabledItem(addChannel("B", {{3.0, 0.0}}));
-    addItem(addChannel("Disabled", {{9.0, 0.0}}))->enableItem(0);  // not framed
-
-    view.frameAll(1);
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(0.9, -0.05, 2.2, 1.1), kWorldTolerance,
-                   "framed volume");
-}
-
-TEST_F(ViewFramingTest, frameAll__withOneFlatCurveNeverChangesTheHeight) {
-    enabledItem(addChannel("Flat", {{1.0, 0.5}, {4.0, 0.5}}));
-    view.frameAll(0);
-    // Flat: the value 0.5 lies inside the horizontal edges 0..10, so nothing moves.
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(0.0, -1.0, 10.0, 2.0), kWorldTolerance,
-                   "flat curve");
-}
-
-TEST_F(ViewFramingTest, performAutoZoom__onlyWhenDueOrForced) {
-    enabledItem(addChannel("A", {{1.0, 0.0}, {2.0, 100.0}}));
-    const CGRect before = view.getCurrentViewVolume();
-    const int changesBefore = range().volumeChanges;
-    view.performAutoZoom(false);
-    EXPECT_EQ(view.getCurrentViewVolume(), before) << "not due, not forced: nothing changes";
-    EXPECT_EQ(range().volumeChanges, changesBefore);
-
-    view.setNeedsAutoZoom(1);
-    view.performAutoZoom(false);
-    EXPECT_EQ(view.needsAutoZoom(), 0);
-    // 0..100 would need a factor of 1/50; the limit 1/128 is not reached.
-    EXPECT_NEAR(view.zoomY(), 0.02, kValueTolerance);
-    EXPECT_DOUBLE_EQ(view.gridZoomY(), 32.0);
-    expectRectNear(view.getCurrentViewVolume(), CGRectMake(0.0, -5.0, 10.0, 110.0), kWorldTolerance,
-                   "padded fit");
-    EXPECT_TRUE(postedWords().empty()) << "the draw pass calls it: no word";
-}
-
-TEST_F(ViewFramingTest, resets__restoreTheReferenceVolumeAndPostOnce) {
-    view.zoomWithFactor(2.0, 4.0);
-    view.drawProjection();
-    view.pan(-80.0, -40.0);
-    recorder.clearCalls();
-
-    view.resetZoom();
-    expectRectNear(view.getCurrentViewVolume(), view.getOriginalViewVolume(), kWorldTolerance,
-                   "reset zoom");
-    EXPECT_DOUBLE_EQ(view.zoomX(), 1.0);
-    EXPECT_DOUBLE_EQ(view.zoomY(), 1.0);
-    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyViewVolumeChanged});
-}
+class ViewFramingTest : public ViewFixture {};
 
 TEST_F(ViewFramingTest, currentToolChanged__forgetsTheBoxAndPostsTheToolWord) {
     viewHost.resetRedrawRequests();
