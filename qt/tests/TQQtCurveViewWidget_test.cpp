@@ -1,68 +1,102 @@
+// The curve view through Qt itself: QTest presses, moves and releases reach the view as one
+// drag of the edit tool, one undo step of the host that gives the channel back exactly; a lost
+// release, the space bar, the frame gate and the folding of wheel bursts.
 #include <gtest/gtest.h>
 
-#include <QApplication>
+#include <QTest>
 #include <QWheelEvent>
 
-#include "host/TQHostAppDelegate.h"
-#include "platform/ui/testing/RWTestDoubles.h"
-#include "qt/TQQtCurveViewWidget.h"
-#include "src/engine/TQCurveEditorCtrlBase.h"
-#include "src/view/TQCurveEditorViewBase.h"
+#include "qt/tests/QtViewFixture.h"
 
+namespace qt_test {
 namespace {
 
-// A view without curves on a shown widget, with a clock and a timer the test moves.
-class CurveViewWidgetTest : public ::testing::Test {
+class QtCurveViewWidget : public QtViewFixture {
 protected:
     void SetUp() override {
-        controller.init();
-        controller.setAppDelegate(&host);
-        view.setClock(&clock);
-        view.setTimer(&timer);
-        view.setController(&controller);
-        controller.setView(&view);
-        view.setCurrentViewVolume(CGRectMake(0.0, -1.0, 10.0, 2.0));
-        widget.resize(320, 160);
-        widget.setView(&view);
-        widget.show();
-        settle();
+        QtViewFixture::SetUp();
+        channel = addCurve("A", "bump");
+        item = addItem(channel);
+        item->setScaleY(1.0);
+        item->setOffsetY(0.0);
+        drawFrame();
+        ASSERT_GE(widget.framesDrawn(), 1) << "the widget drew no frame: picks would find nothing";
     }
-    void TearDown() override {
-        widget.setView(nullptr);
-        view.setController(nullptr);
-        controller.setView(nullptr);
-    }
-    // Runs posted updates and zero-delay calls; bounded, it never waits on the clock.
-    static void settle() {
-        for (int i = 0; i < 20; ++i) QCoreApplication::processEvents();
-    }
-
-    TQHostAppDelegate host;
-    RWManualClock clock;
-    RWManualTimer timer{clock};
-    TQCurveEditorCtrlBase controller;
-    TQCurveEditorViewBase view;
-    TQQtCurveViewWidget widget;
+    TQChannel* channel = nullptr;
+    TQCurveEditorChannelItemPtr item;
 };
 
-TEST_F(CurveViewWidgetTest, repaints_inside_the_gate__one_frame_and_one_delayed_redraw) {
+TEST_F(QtCurveViewWidget, drag__one_undo_step_ending_under_the_pointer_after_a_dropped_move) {
+    const TQKeyframeHandle key = channel->getKeyframe(seconds(5));
+    const auto before = snapshot();
+    const QPoint start = widgetPoint(5, 0.5);
+    QTest::mousePress(&widget, Qt::LeftButton, Qt::NoModifier, start);
+    clock.advance(kStepSeconds);
+    QTest::mouseMove(&widget, start + QPoint(4, -10));
+    // Inside the gate: the view drops this move, and the pointer then rests.
+    const QPoint rest = start + QPoint(8, -40);
+    QTest::mouseMove(&widget, rest);
+    clock.advance(kStepSeconds);
+    QTest::qWait(100);  // the widget hands the last move over again
+    QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, rest);
+    drawFrame();
+
+    CMTime t = kCMTimeInvalid;
+    double v = 0.0;
+    ASSERT_TRUE(channel->getKeyframe(key, &t, &v)) << "the dragged keyframe's handle went stale";
+    const QPoint landed = widgetPoint(CMTimeGetSeconds(t), v);
+    EXPECT_NEAR(landed.x(), rest.x(), 2) << "the keypoint stopped short of the pointer";
+    EXPECT_NEAR(landed.y(), rest.y(), 2);
+    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "one drag must be one undo step";
+    EXPECT_EQ(host.undoDescription(), "Move Keypoint");
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(sceneIs(*before)) << "undo must give back the channel exactly";
+}
+
+TEST_F(QtCurveViewWidget, press_while_a_gesture_is_open__ends_it_first) {
+    // The release of a drag can go astray (to a window that was modal meanwhile); the next
+    // press must not find the view still dragging with its undo step open.
+    const QPoint start = widgetPoint(5, 0.5);
+    QTest::mousePress(&widget, Qt::LeftButton, Qt::NoModifier, start);
+    clock.advance(kStepSeconds);
+    QTest::mouseMove(&widget, start + QPoint(0, -20));
+    ASSERT_TRUE(host.undoStack().isStepOpen()) << "the drag should have opened its step";
+    QMouseEvent press(QEvent::MouseButtonPress, QPointF(start), widget.mapToGlobal(QPointF(start)),
+                      Qt::LeftButton, Qt::LeftButton, Qt::NoModifier);
+    QCoreApplication::sendEvent(&widget, &press);
+    EXPECT_FALSE(host.undoStack().isStepOpen());
+    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "the first drag is one step";
+    QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, start);
+}
+
+TEST_F(QtCurveViewWidget, space_bar__arms_on_the_first_press_and_ends_on_release) {
+    // Shortcut overrides go to the focus object of the active window.
+    widget.activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&widget));
+    widget.setFocus();
+    QTest::keyPress(&widget, Qt::Key_Space);
+    EXPECT_EQ(view.space(), 1) << "the first space press must reach the view as a key equivalent";
+    QTest::keyRelease(&widget, Qt::Key_Space);
+    EXPECT_EQ(view.space(), 0);
+}
+
+TEST_F(QtCurveViewWidget, repaints_inside_the_gate__one_frame_and_one_delayed_redraw) {
     timer.advance(1.0);
     widget.repaint();
     const int before = widget.framesDrawn();
-    ASSERT_GE(before, 1);
     const qreal ratio = widget.devicePixelRatioF();
-    EXPECT_EQ(widget.encoder().image().size(), QSize(qRound(320 * ratio), qRound(160 * ratio)));
+    EXPECT_EQ(widget.encoder().image().size(), QSize(qRound(800 * ratio), qRound(400 * ratio)));
     const size_t pending = timer.pendingCount();
     widget.repaint();
     widget.repaint();
     EXPECT_EQ(widget.framesDrawn(), before) << "repaints inside 1/30 s must show the last frame";
     EXPECT_EQ(timer.pendingCount(), pending + 1) << "exactly one delayed redraw is scheduled";
-    timer.advance(0.034);  // the delayed redraw asks the widget for an update
+    timer.advance(0.034);
     settle();
     EXPECT_EQ(widget.framesDrawn(), before + 1) << "the delayed redraw must draw once";
 }
 
-TEST_F(CurveViewWidgetTest, wheel__a_burst_is_folded_into_one_delivery) {
+TEST_F(QtCurveViewWidget, wheel__a_burst_is_folded_into_one_delivery) {
     const QPointF at(100.0, 80.0);
     for (int i = 0; i < 3; ++i) {
         QWheelEvent e(at, widget.mapToGlobal(at), QPoint(), QPoint(120, 0), Qt::NoButton,
@@ -71,8 +105,8 @@ TEST_F(CurveViewWidgetTest, wheel__a_burst_is_folded_into_one_delivery) {
     }
     EXPECT_EQ(widget.viewHost().pendingEventCount(), 3u) << "wheel events wait for one delivery";
     settle();
-    EXPECT_EQ(widget.viewHost().pendingEventCount(), 0u)
-        << "the view's scrollWheel takes the waiting ones";
+    EXPECT_EQ(widget.viewHost().pendingEventCount(), 0u);
 }
 
 }  // namespace
+}  // namespace qt_test
