@@ -40,8 +40,8 @@ protected:
     double columnShare(const QImage& image, int x, int y, const QColor& want) const {
         double sum = 0.0;
         for (int dy = -2; dy <= 2; ++dy)
-            sum += std::max(0.0, share(image.pixelColor(x, image.height() - 1 - (y + dy)),
-                                       background(), want));
+            sum += std::max(
+                0.0, share(image.pixelColor(x, image.height() - 1 - (y + dy)), background(), want));
         return sum;
     }
     QColor background() const {

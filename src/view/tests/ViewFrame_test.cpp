@@ -5,15 +5,15 @@
 #include "platform/channels/TQChannelTypes.h"
 #include "src/resources/BNImage.h"
 #include "src/resources/TQKeyframeImages.h"
-#include "src/view/tests/ViewDrawFixture.h"
+#include "src/view/tests/ViewMouseFixture.h"
 
 namespace view_test {
 namespace {
 
-class ViewFrame : public ViewDrawFixture {
+class ViewFrame : public ViewMouseFixture {
 protected:
     void SetUp() override {
-        ViewDrawFixture::SetUp();
+        ViewMouseFixture::SetUp();
         TQCurveEditorItem::resetColorIndex();  // colours as the baselines hold them
     }
 };
@@ -68,25 +68,28 @@ TEST_F(ViewFrame, frame__keypoint_states_handles_and_label) {
         << "a locked channel shows no handles";
 }
 
-// A gesture's ghost (only for a selected item), the processed curve, and the rubber band.
+// A drag's ghost (only of a curve selected in the list), the processed curve hidden while the
+// mouse is down and back after, then the rubber band.
 TEST_F(ViewFrame, frame__ghost_processed_curve_and_band) {
     auto item = linearItem("Ramp", {{2.0, 0.0}, {6.0, 0.5}});
-    auto other = linearItem("Other", {{2.0, 0.2}, {6.0, 0.7}});
-    ASSERT_TRUE(frame());
-    for (const auto& i : {item, other}) {
-        i->takeCurveSnapshot(0);
-        i->setDrawGhost(1);
-    }
-    item->select(1);
-    view.setMouseIsDown(1);
+    linearItem("Other", {{2.0, 0.2}, {6.0, 0.7}});
     item->channel()->addBehavior(std::make_unique<TQOscillateBehavior>(0.1, 1.0, 0.0));
     item->setDrawProcessedCurve(1);
     item->setNumberOfProcessedSamples(100);
     item->setProcessedCurveDirty(1);
-    view.setSelecting(1);
-    view.setSelectionViewVolume(CGRectMake(2.0, -0.5, 3.0, 1.0));
+    item->select(1);
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(matchesBaseline("frame-gesture", frameText()));
+    down(6.0, 0.5);
+    dragTo(6.5, 0.7);
+    ASSERT_TRUE(frame());
+    std::string text = frameText();
+    up(6.5, 0.7);
+    ASSERT_TRUE(frame());
+    down(1.0, 0.9);
+    dragTo(3.0, 0.6);
+    ASSERT_TRUE(frame());
+    EXPECT_TRUE(matchesBaseline("frame-gesture", text + "--\n" + frameText()));
+    up(3.0, 0.6);
 }
 
 // Selected keypoints are merged into a coarse sampling, once each.
