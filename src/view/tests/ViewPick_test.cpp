@@ -1,5 +1,7 @@
-// Picking and the rubber band through the view: what a click and a band take into the
-// selection, what the other tools take, and the selection repairs and commands.
+// Picking: what the hit test of a frame answers at a point, what a click and a band take into
+// the selection, what the other tools take, and the selection repairs and commands.
+
+#include <string>
 
 #include "src/view/tests/ViewMouseFixture.h"
 
@@ -20,6 +22,68 @@ protected:
     TQKeyframeHandle k5 = nullptr;
     TQKeyframeHandle k8 = nullptr;
 };
+
+// The one record the hit test answers at a point of the last frame, as "kind name#key", or
+// "none". Keys are numbered per channel in time order.
+std::string hitAt(const TQCurveEditorViewBase& view, const TQCurveEditorCtrlBase& ctrl,
+                  const CGPoint& screen) {
+    const HXDRenderController* rc = view.renderController();
+    const auto context = rc->renderingContextForHitTestAtCoords(
+        HXDFloat2{static_cast<float>(screen.x), static_cast<float>(screen.y)});
+    const auto hits = rc->newHitTestResultForPrimitives(view.selectionPrimitives(), context, true);
+    if (hits.empty()) return "none";
+    if (hits.size() > 1) return "several";
+    const auto item = ctrl.channelItemWithIdentifier(
+        static_cast<uint32_t>(hits[0].extraInfo().objectForKey("ID")->unsignedLongValue()));
+    const TQChannel* c = item ? dynamic_cast<const TQChannel*>(item->channelBase()) : nullptr;
+    std::string out = hits[0].hitID() == TQSelectionKeypoint     ? "key "
+                      : hits[0].hitID() == TQSelectionOutTangent ? "out "
+                      : hits[0].hitID() == TQSelectionInTangent  ? "in "
+                                                                 : "curve ";
+    out += c ? c->getName() : "?";
+    if (const HXDNumber* h = hits[0].extraInfo().objectForKey("Handle")) {
+        const auto keys = c ? c->getKeyframes(false) : std::vector<TQKeyframeHandle>{};
+        for (size_t k = 0; k < keys.size(); ++k)
+            if (reinterpret_cast<uintptr_t>(keys[k]) == h->unsignedLongLongValue())
+                out += "#" + std::to_string(k);
+    }
+    return out;
+}
+
+TEST_F(ViewPick, hitTest__the_closest_thing_under_the_pointer_is_the_only_record) {
+    // A: 2, 5, 8 at 0 (the fixture's); B through A's keypoint at 5 two pixels below it; C with
+    // broken handles at its middle keypoint, selected; D and E sharing a keypoint, E primary.
+    linearItem("B", {{0.5, -0.01}, {9.5, -0.01}});
+    TQChannel* c = addChannel("C", {{1.0, -0.6}, {5.0, -0.6}, {9.0, -0.6}});
+    c->setInterpolation(kTQInterpolationBezier);
+    c->setKeyframeTangentsBroken(c->getKeyframe(seconds(5.0)), true);
+    c->setKeyframeOutputTangents(c->getKeyframe(seconds(5.0)), 1.5, 0.2);
+    c->setKeyframeInputTangents(c->getKeyframe(seconds(5.0)), -1.5, 0.2);
+    auto ci = addItem(c);
+    linearItem("D", {{2.0, 0.6}, {7.0, 0.6}});
+    linearItem("E", {{2.0, 0.6}, {8.0, 0.6}})->select(1);
+    selectInView({keypointEntry(ci, 5.0)});
+    ASSERT_TRUE(frame());
+    const double corner = view.keyframeAsset(item->colorIndex(), 0, 0).size.width * 0.5 - 0.5;
+    ASSERT_EQ(view.keyframeAsset(item->colorIndex(), 0, 0).texture->alphaAt(0, 0), 0.0f);
+    const struct {
+        double t, v, dx, dy;  // a world point and a pixel offset from it
+        const char* want;
+    } cases[] = {
+        {5.0, 0.0, 0, 0, "key A#1"},         // the image beats the lines through it
+        {5.0, 0.0, corner, corner, "none"},  // a transparent corner takes no click
+        {3.0, 0.0, 0, 3, "curve A"},         // three pixels from the line is on it
+        {3.0, 0.0, 0, 12, "none"},           // twelve are not
+        {6.5, -0.4, 0, 0, "out C#1"},        // a handle answers with its keypoint
+        {3.5, -0.4, 0, 0, "in C#1"},
+        {2.0, 0.6, 0, 0, "key E#0"},  // the primary channel's, drawn on top
+    };
+    for (const auto& k : cases)
+        EXPECT_EQ(hitAt(view, ctrl(),
+                        view.getPointScreen(CGPointMake(k.t, k.v)) + CGPointMake(k.dx, k.dy)),
+                  k.want)
+            << "at " << k.t << ", " << k.v << " + " << k.dx << ", " << k.dy;
+}
 
 TEST_F(ViewPick, rubberBand__selectsTheKeypointsItCoversAndNothingElse) {
     selectInView({keypointEntry(item, 8.0)});
