@@ -162,6 +162,12 @@ TEST_P(AutomaticSets, rules__behavioursToleranceEnableStatesAndTheOddRoot) {
         EXPECT_EQ(refreshed<TQCurveSetModified>({title})->itemWithChannel(retime) != nullptr, shown)
             << value;
     }
+    {  // All opens every root it filters.
+        auto all = refreshed<TQCurveSetAll>({title});
+        all->rootItemAtIndex(0)->collapse(true);
+        all->filterList();
+        EXPECT_FALSE(all->rootItemAtIndex(0)->isCollapsed());
+    }
     // A disabled curve stays disabled through a refresh of Animated, not of All.
     TQChannel* x = at(title, P::Position);
     for (const TQCurveSetPtr& set : std::initializer_list<TQCurveSetPtr>{

@@ -80,6 +80,7 @@ TEST_F(CurveSetFixture, absoluteRefresh__dropsItemsWhoseChannelWent) {
 TEST_F(CurveSetFixture, mutable__appendInsertAndRemoval) {
     auto set = std::make_shared<TQCurveSetMutable>();
     set->initWithName("Mine", &host);
+    EXPECT_FALSE(set->removeItemWithIdentifier(1)) << "nothing to remove from an empty set";
     auto x = itemFor(cube, "./1/100/101/1"), z = itemFor(cube, "./1/100/101/3");
     set->appendItem(x);
     set->appendItem(z);

@@ -127,6 +127,15 @@ TEST_F(CtrlCore, sets__append_remove_and_first_channel) {
     EXPECT_EQ(ctrl().numberOfChannelItems(), 3u);
     EXPECT_EQ(recorder.count("postNotification"), 2u)
         << "once per level of the recursion, nothing per item";
+    EXPECT_EQ(ctrl().appendFolder(nullptr, set), nullptr);
+    {
+        // A refresh drops the items of channels that went, and the view's selection.
+        selectInView({keypointEntry(std::dynamic_pointer_cast<TQCurveEditorChannelItem>(last), 1)});
+        folder->removeChild(folder->getChild(1));
+        ctrl().refreshSelectedCurveSet();
+        EXPECT_EQ(ctrl().numberOfChannelItems(), 2u);
+        EXPECT_TRUE(view.getSelection()->empty());
+    }
 
     {
         // Selected but disabled items are passed over.

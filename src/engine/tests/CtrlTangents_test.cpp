@@ -157,6 +157,29 @@ TEST_F(CtrlTangentsTest, setTangents45__snapsToScreenMultiplesOf45) {
     }
 }
 
+// The first entry's handle goes to the pointer; selected keypoints copy its movement on its
+// side, in the world; handle entries after the first are left alone.
+TEST_F(CtrlTangentsTest, setTangentsSelected__keypoints_copy_the_first_handles_movement) {
+    Key a = makeKey("A", 2.0, 0.2, {-0.5, -0.1}, {0.5, 0.1}, true);
+    Key b = makeKey("B", 4.0, 0.5, {-0.2, -0.3}, {0.2, 0.3}, true, false, 2.0);
+    Key c = makeKey("C", 6.0, -0.1, {-0.4, 0.0}, {0.4, 0.0}, true);
+    const CGPoint bBefore = handleWorld(b, true);
+    const CGPoint cIn = handleOffset(c, false), cOut = handleOffset(c, true);
+    const CGPoint target = handleWorld(a, true) + CGPointMake(0.3, 0.1);
+    ctrl().setTangentsSelected(
+        selectInView({tangentEntry(a.item, 2.0, true), keypointEntry(b.item, 4.0),
+                      tangentEntry(c.item, 6.0, false)}),
+        target.x, target.y);
+    for (const auto& [got, want] : {std::pair{handleWorld(a, true), target},
+                                    {handleWorld(b, true), bBefore + CGPointMake(0.3, 0.1)}}) {
+        EXPECT_NEAR(got.x, want.x, kOffsetTolerance);
+        EXPECT_NEAR(got.y, want.y, kOffsetTolerance);
+    }
+    EXPECT_EQ(handleOffset(c, false), cIn);
+    EXPECT_EQ(handleOffset(c, true), cOut);
+    ctrl().setTangentsSelected(nullptr, 0.0, 0.0);
+}
+
 TEST_F(CtrlTangentsTest, setTangents45Selected__sameScreenHandleOnCurvesOfDifferentScale) {
     Key a = makeKey("A", 2.0, 0.2, {-0.5, -0.1}, {0.5, 0.1}, false, false, 1.0);
     Key b = makeKey("B", 4.0, 0.5, {-0.2, -0.3}, {0.2, 0.3}, false, false, 2.0);
