@@ -71,6 +71,11 @@ TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
     EXPECT_EQ(channelItem(deep)->simpleName(), "Extra.Deep");
     EXPECT_EQ(channelItem(x)->simpleName(), "Cube.Transform.Position.X")
         << "a flagged root above the parent takes part";
+    auto* sized = transform->addChild(std::make_unique<TQChannel>("Cube Size", 5));
+    EXPECT_EQ(channelItem(sized)->simpleName(), "Cube Size") << "a name holding its root's stays";
+    auto* loose = scene->addChild(std::make_unique<TQChannel>("Loose", 900));
+    EXPECT_EQ(channelItem(loose)->simpleName(), "Loose") << "outside any object";
+    EXPECT_EQ(channelItem(loose)->rootName(), std::nullopt);
 }
 
 TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
@@ -202,6 +207,7 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     EXPECT_TRUE(item->isHidden());
     EXPECT_EQ(item->numberOfKeypoints(), 0u);
     EXPECT_EQ(item->minY(), 0.0);
+    EXPECT_TRUE(item->compoundChannelComponents().empty());
     item->refreshOriginalCurve(kCMTimeZero, sec(1));
     EXPECT_EQ(item->numberOfSamples(), 0u);
     item->takeCurveSnapshot(1);
