@@ -25,12 +25,16 @@ struct Gesture {
     const char* what;
     unsigned interpolation;
     const char* script;
-    std::vector<std::pair<double, double>> want;  // the keys after it, (time, value)
+    const char* want;  // the keys after it: "time value, ..."
     const char* undoStep;
     size_t steps;  // undo steps the gesture leaves
 };
 
 void PrintTo(const Gesture& g, std::ostream* os) { *os << g.what; }
+Gesture gesture(const char* what, unsigned interpolation, const char* script, const char* want,
+                const char* undoStep, size_t steps) {
+    return {what, interpolation, script, want, undoStep, steps};
+}
 
 class ViewGestures : public WithReferenceHost<ViewMouseFixture>,
                      public ::testing::WithParamInterface<Gesture> {
@@ -66,13 +70,16 @@ TEST_P(ViewGestures, gesture__lands_as_one_undo_step_that_gives_the_curve_back) 
     ASSERT_TRUE(frame());
     run(g.script);
 
-    std::vector<std::pair<double, double>> keys;
-    for (double t : keyTimes(c)) keys.emplace_back(t, keyValueAt(c, t));
-    ASSERT_EQ(keys.size(), g.want.size()) << describe(*object);
-    for (size_t i = 0; i < keys.size(); ++i) {
-        EXPECT_NEAR(keys[i].first, g.want[i].first, kDragTolerance) << "time of key " << i;
-        EXPECT_NEAR(keys[i].second, g.want[i].second, kDragTolerance) << "value of key " << i;
+    std::istringstream want(g.want);
+    const std::vector<double> times = keyTimes(c);
+    for (size_t i = 0; i < times.size(); ++i) {
+        double t = NAN, v = NAN;
+        char comma = 0;
+        want >> t >> v >> comma;
+        EXPECT_NEAR(times[i], t, kDragTolerance) << "time of key " << i << describe(*object);
+        EXPECT_NEAR(keyValueAt(c, times[i]), v, kDragTolerance) << "value of key " << i;
     }
+    EXPECT_TRUE(want.eof()) << "fewer keys than wanted:" << describe(*object);
     EXPECT_EQ(recorder.captureBalance(), 0);
     EXPECT_FALSE(view.getCapturing() || view.mouseIsDown());
     EXPECT_EQ(host.undoStack().undoCount(), g.steps);
@@ -88,65 +95,32 @@ constexpr unsigned kLinear = kTQInterpolationLinear;
 INSTANTIATE_TEST_SUITE_P(
     Edit, ViewGestures,
     ::testing::Values(
-        Gesture{"a picked keypoint follows the pointer alone",
-                kLinear,
-                "d 5 .5|m 5.25 .6|m 5.5 .7|u 5.5 .7",
-                {{2, 0}, {5.5, .7}, {8, 0}},
-                "Undo Move Keypoint",
-                1},
+        gesture("a picked keypoint follows the pointer alone", kLinear,
+                "d 5 .5|m 5.25 .6|m 5.5 .7|u 5.5 .7", "2 0, 5.5 .7, 8 0", "Undo Move Keypoint", 1),
         // Mostly sideways since the origin: the value stays where Shift found it.
-        Gesture{"shift in mid-drag holds the value",
-                kLinear,
-                "d 5 .5|m 5.1 .6|m 5.5 .65 s|m 5.75 .8 s|u 5.75 .8 s",
-                {{2, 0}, {5.75, .6}, {8, 0}},
-                "Undo Move Keypoint",
-                1},
-        Gesture{"shift upward holds the time",
-                kLinear,
-                "d 5 .5|m 5.05 .7 s|m 6 .8 s|u 6 .8 s",
-                {{2, 0}, {5, .8}, {8, 0}},
-                "Undo Move Keypoint",
-                1},
+        gesture("shift in mid-drag holds the value", kLinear,
+                "d 5 .5|m 5.1 .6|m 5.5 .65 s|m 5.75 .8 s|u 5.75 .8 s", "2 0, 5.75 .6, 8 0",
+                "Undo Move Keypoint", 1),
+        gesture("shift upward holds the time", kLinear, "d 5 .5|m 5.05 .7 s|m 6 .8 s|u 6 .8 s",
+                "2 0, 5 .8, 8 0", "Undo Move Keypoint", 1),
         // A segment moves its two keypoints, only vertically.
-        Gesture{"a curve segment moves only vertically",
-                kLinear,
-                "d 3.5 .25|m 4.5 .55|u 4.5 .55",
-                {{2, .3}, {5, .8}, {8, 0}},
-                "Undo Move Curve",
-                1},
+        gesture("a curve segment moves only vertically", kLinear, "d 3.5 .25|m 4.5 .55|u 4.5 .55",
+                "2 .3, 5 .8, 8 0", "Undo Move Curve", 1),
         // The curve passes through the pointer at each step; a step the gate drops loses
         // nothing. From a keypoint the time follows too (at 6 the curve was at 1/3).
-        Gesture{"option-command from a keypoint",
-                kLinear,
+        gesture("option-command from a keypoint", kLinear,
                 "d 5 .5 oc|m 5.5 .6 oc|q 5.75 .9 oc|m 6 .63333333 oc|u 6 .63333333 oc",
-                {{2, .3}, {5, .8}, {8, .3}},
-                "Undo Move Keypoint",
-                1},
-        Gesture{"option-command from the curve keeps the press time",
-                kLinear,
-                "d 3.5 .25 oc|m 4 .35 oc|q 4 .45 oc|m 4 .55 oc|u 4 .55 oc",
-                {{2, .3}, {5, .8}, {8, .3}},
-                "Undo Move Curve",
-                1},
-        Gesture{"option-click on the curve adds a keypoint",
-                kLinear,
-                "c 6.5 .25 o",
-                {{2, 0}, {5, .5}, {6.5, .25}, {8, 0}},
-                "Undo Add keypoint",
-                1},
-        Gesture{"command-click flattens",
-                kTQInterpolationBezier,
-                "c 5 .5 c",
-                {{2, 0}, {5, .5}, {8, 0}},
-                "Undo Flatten Keypoint",
-                1},
+                "2 .3, 5 .8, 8 .3", "Undo Move Keypoint", 1),
+        gesture("option-command from the curve keeps the press time", kLinear,
+                "d 3.5 .25 oc|m 4 .35 oc|q 4 .45 oc|m 4 .55 oc|u 4 .55 oc", "2 .3, 5 .8, 8 .3",
+                "Undo Move Curve", 1),
+        gesture("option-click on the curve adds a keypoint", kLinear, "c 6.5 .25 o",
+                "2 0, 5 .5, 6.5 .25, 8 0", "Undo Add keypoint", 1),
+        gesture("command-click flattens", kTQInterpolationBezier, "c 5 .5 c", "2 0, 5 .5, 8 0",
+                "Undo Flatten Keypoint", 1),
         // The Command press flattens first, then the drag pulls the output handle.
-        Gesture{"command-drag pulls a handle",
-                kTQInterpolationBezier,
-                "d 5 .5 c|m 6 .7 c|u 6 .7 c",
-                {{2, 0}, {5, .5}, {8, 0}},
-                "Undo Set Tangents",
-                2}),
+        gesture("command-drag pulls a handle", kTQInterpolationBezier, "d 5 .5 c|m 6 .7 c|u 6 .7 c",
+                "2 0, 5 .5, 8 0", "Undo Set Tangents", 2)),
     [](const auto& p) {
         std::string name;
         for (const char* w = p.param.what; *w; ++w)
