@@ -156,6 +156,7 @@ TEST_F(CtrlCore, sets__append_remove_and_first_channel) {
         EXPECT_EQ(recorder.count("postNotification"), 0u) << "a set without removal posts nothing";
         EXPECT_EQ(ctrl().appendChannel(static_cast<TQChannel*>(folder->getChild(0)), plain),
                   nullptr);
+        EXPECT_EQ(recorder.count("postNotification"), 0u) << "nothing appended, nothing posted";
     }
 }
 
