@@ -75,6 +75,8 @@ TEST_F(CurveSetFixture, absoluteRefresh__dropsItemsWhoseChannelWent) {
     set->refresh(10, false);
     EXPECT_EQ(set->numberOfItems(), 1u);
     EXPECT_EQ(set->numberOfChannelItems(), 1u);
+    EXPECT_TRUE(set->removeItemWithIdentifier(set->channeItemAtIndex(0)->channelId()));
+    EXPECT_EQ(set->numberOfItems(), 0u) << "the root left empty is filtered out";
 }
 
 TEST_F(CurveSetFixture, mutable__appendInsertAndRemoval) {
@@ -179,6 +181,7 @@ TEST_F(CurveSetFixture, enabling__validateCarriesStatesAndDeselectSparesDisabled
     set->disableAll();
     EXPECT_EQ(set->numberOfEnabledItems(), 0u);
     set->channeItemAtIndex(0)->select(true);
+    EXPECT_EQ(set->selectedItem(), set->channeItemAtIndex(0));
     set->deselectAll();
     EXPECT_TRUE(set->channeItemAtIndex(0)->isSelected()) << "a disabled item keeps its selection";
     set->enableAll(true, set->channeItemAtIndex(2).get());

@@ -228,3 +228,12 @@ TEST_F(CtrlValuePanel, showValue__writes_the_accepted_value_in_channel_units) {
     ctrl().showValueAtPoint(CGPointMake(10, 10), nullptr, CGRectMake(0, 0, 5, 5));
     EXPECT_NEAR(keyValueAt(a, 1), 0.25, kValueTolerance) << "a cancelled panel changes nothing";
 }
+
+TEST_F(CtrlValuePanel, showValue__a_boolean_channel_opens_no_panel) {
+    auto item = addItem(
+        static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannelBool>("On", 77))));
+    item->channel()->setKeyframe(seconds(1), 1.0);
+    selectInView({keypointEntry(item, 1)});
+    ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);
+    EXPECT_TRUE(modal.runs().empty());
+}

@@ -19,13 +19,14 @@ protected:
 };
 
 // Items drawn from the last to the first with the primary one on top, a disabled one not at
-// all; the ends dimmed and stippled; a curve that starts after the view puts every sample in
+// all, a channel that takes no keypoints without them; the ends dimmed and stippled; a curve that starts after the view puts every sample in
 // its first piece.
 TEST_F(ViewFrame, frame__order_pieces_and_dimmed_ends) {
     auto a = linearItem("A", {{2.0, 0.0}, {6.0, 0.5}});
     auto b = linearItem("B", {{1.0, 0.1}, {5.0, 0.6}});
     linearItem("C", {{20.0, 0.0}, {30.0, 1.0}});
     linearItem("Hidden", {{1.0, 0.3}, {5.0, 0.8}})->enableItem(0);
+    linearItem("Still", {{3.0, -0.5}, {7.0, -0.5}})->channel()->setAnimationEnabled(false);
     b->select(1);
     ASSERT_TRUE(frame());
     EXPECT_TRUE(matchesBaseline("frame-order-and-ends", frameText()));
