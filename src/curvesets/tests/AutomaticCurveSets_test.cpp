@@ -147,6 +147,9 @@ TEST_P(AutomaticSets, rules__behavioursToleranceEnableStatesAndTheOddRoot) {
     sway->setRigged(true);
     EXPECT_EQ(refreshed<TQCurveSetAnimated>({logo})->itemWithChannel(sway), nullptr) << "rigged";
     sway->setRigged(false);
+    sway->setFlag(kTQChannelFlagHiddenInCurveEditor);
+    EXPECT_EQ(refreshed<TQCurveSetAnimated>({logo})->itemWithChannel(sway), nullptr) << "hidden";
+    sway->resetFlag(kTQChannelFlagHiddenInCurveEditor);
     {  // The object leaves the selection: only a channel of a selected behaviour stays.
         auto animated = refreshed<TQCurveSetAnimated>({logo});
         sway->getBehavior(0)->setSelected(true);

@@ -159,6 +159,13 @@ INSTANTIATE_TEST_SUITE_P(
                     for (double when : {0.0, 4.0}) wb.setKeyframeLocked(at(wb, when), true);
                     forXyz(w, [](TQChannel& c) { c.setKeyframeLocked(at(c, 1), true); });
                 }},
+        // One state for all, the opposite of the primary entry's; no linked siblings here.
+        Command{"menuBreakTangent:", "Undo Break Tangents", "ABX",
+                [](TQChannelBase& w) {
+                    for (auto [n, when] :
+                         {std::pair{"A", 2.0}, {"A", 1.0}, {"B", 4.0}, {"B", 0.0}, {"X", 1.0}})
+                        named(w, n).setKeyframeTangentsBroken(at(named(w, n), when), true);
+                }},
         Command{"menuDisableSelected:", "Undo Disable Keypoint", "ABX",
                 [](TQChannelBase& w) {
                     for (const char* n : {"A", "B"})

@@ -2,6 +2,7 @@
 // view volume, sampling, the value panel and the menus.
 
 #include <cfloat>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -9,6 +10,7 @@
 #include "src/engine/TQEditBrackets.h"
 #include "src/engine/tests/EngineFixture.h"
 #include "src/resources/TQStrings.h"
+#include "src/view/tests/FrameBaseline.h"
 
 using namespace engine_test;
 using Seq = std::vector<std::string>;
@@ -87,6 +89,10 @@ TEST_F(CtrlCore, queries__selected_bounds_skip_the_primary_entry) {
     }
     {
         list.addSelection(keypointEntry(ia, 3));
+        list.addSelection(curveEntry(ia));  // a curve entry and a stale one are not measured
+        auto stale = keypointEntry(ia, 1);
+        stale->setHandle(reinterpret_cast<TQKeyframeHandle>(uintptr_t{0xdead}));
+        list.addSelection(stale);
         EXPECT_TRUE(ctrl().getSelected(&list, &minX, &maxX, nullptr, &maxY));
         EXPECT_NEAR(minX, 3.0, kValueTolerance) << "only the second keypoint is measured";
         EXPECT_NEAR(maxX, 3.0, kValueTolerance);
@@ -236,4 +242,22 @@ TEST_F(CtrlValuePanel, showValue__a_boolean_channel_opens_no_panel) {
     selectInView({keypointEntry(item, 1)});
     ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);
     EXPECT_TRUE(modal.runs().empty());
+}
+
+// The three context menus as a user opens them: titles, actions and tags, submenus indented.
+TEST_F(CtrlCore, menus__as_recorded) {
+    std::string text;
+    const std::function<void(const RWMenu&, int)> walk = [&](const RWMenu& menu, int depth) {
+        for (const auto& item : menu.itemArray()) {
+            text += std::string(2 * depth, ' ') + item->title() + " | " + item->action() + " | " +
+                    std::to_string(item->tag()) + "\n";
+            if (item->hasSubmenu()) walk(*item->submenu(), depth + 1);
+        }
+    };
+    for (const RWMenuPtr& menu :
+         {ctrl().getKeyframeMenu(), ctrl().getCurveMenu(), ctrl().getTangentMenu()}) {
+        walk(*menu, 0);
+        text += "--\n";
+    }
+    EXPECT_TRUE(view_test::matchesBaseline("menus", text, "src/engine/tests/baselines"));
 }

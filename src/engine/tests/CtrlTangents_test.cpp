@@ -4,6 +4,7 @@
 
 #include <cmath>
 #include <numbers>
+#include <string>
 
 #include "src/engine/tests/EngineFixture.h"
 
@@ -202,16 +203,34 @@ TEST_F(CtrlTangentsTest, setTangents45Selected__sameScreenHandleOnCurvesOfDiffer
         << "the entry's word is restored";
 }
 
-TEST_F(CtrlTangentsTest, breakTangentsSelected__allTakeOppositeOfFirst) {
+// The list forms take one state for all and mark the curves for a redraw; the single forms
+// (break toggles) leave no mark, kept so.
+TEST_F(CtrlTangentsTest, break_and_weight__list_forms_agree_and_mark_single_forms_do_not) {
     Key a = makeKey("A", 2.0, 0.0, {-0.5, 0.0}, {0.5, 0.0}, /*broken*/ true);
     Key b = makeKey("B", 4.0, 0.0, {-0.5, 0.0}, {0.5, 0.0}, /*broken*/ false);
     TQCurveSelectionList* list =
         selectInView({keypointEntry(a.item, 2.0), tangentEntry(b.item, 4.0, true)});
+    const auto marks = [&] {
+        const std::string m = std::string(a.item->originalCurveDirty() ? "A" : "") +
+                              (b.item->originalCurveDirty() ? "B" : "");
+        a.item->setOriginalCurveDirty(0);
+        b.item->setOriginalCurveDirty(0);
+        return m;
+    };
+    marks();
     ctrl().breakTangentsSelected(list);
     EXPECT_FALSE(a.channel->getKeyframeTangentsBroken(a.handle));
     EXPECT_FALSE(b.channel->getKeyframeTangentsBroken(b.handle)) << "not toggled one by one";
+    EXPECT_EQ(marks(), "AB");
     ctrl().breakTangents(list->selectionAtIndex(0).get());
     EXPECT_TRUE(a.channel->getKeyframeTangentsBroken(a.handle)) << "the single form toggles";
+    ctrl().weightTangents(list->selectionAtIndex(0).get(), 1);
+    EXPECT_TRUE(a.channel->getKeyframeTangentsScaled(a.handle));
+    EXPECT_EQ(marks(), "");
+    ctrl().weightTangentsSelected(list, 0);
+    EXPECT_FALSE(a.channel->getKeyframeTangentsScaled(a.handle));
+    EXPECT_FALSE(b.channel->getKeyframeTangentsScaled(b.handle));
+    EXPECT_EQ(marks(), "AB");
 }
 
 TEST_F(CtrlTangentsTest, setTangents__withoutUsableScreen) {

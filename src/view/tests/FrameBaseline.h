@@ -63,6 +63,12 @@ inline std::string frameText(const TQCurveEditorViewBase& view,
             for (size_t i = 0; i < handles.size(); ++i)
                 if (handles[i] == key) out << " key#" << i;
         }
+        if (const HXDBlendingInfo& b = p->blendingInfo(); !(b == HXDBlendingInfo{})) {
+            std::snprintf(buf, sizeof buf, " blend(%d %d%d %d%d %d%d)", b.enabled,
+                          int(b.rgbOperation), int(b.alphaOperation), int(b.sourceRGB),
+                          int(b.destinationRGB), int(b.sourceAlpha), int(b.destinationAlpha));
+            out << buf;
+        }
         if (const auto* m = dynamic_cast<const HXDMultiline*>(p.get())) {
             const auto& v = m->vertices();
             out << (dynamic_cast<const HXDLine*>(p.get()) ? " line" : " multiline")
@@ -94,12 +100,13 @@ inline std::string frameText(const TQCurveEditorViewBase& view,
     return out.str();
 }
 
-// Compares `text` with the baseline `name`, or records it (see the top of this file).
-inline ::testing::AssertionResult matchesBaseline(const std::string& name,
-                                                  const std::string& text) {
+// Compares `text` with the baseline `name` in `folder` of the repository, or records it (see
+// the top of this file).
+inline ::testing::AssertionResult matchesBaseline(
+    const std::string& name, const std::string& text,
+    const std::string& folder = "src/view/tests/baselines") {
     const char* root = std::getenv("VCE_SOURCE_DIR");
-    const std::string path =
-        std::string(root ? root : ".") + "/src/view/tests/baselines/" + name + ".txt";
+    const std::string path = std::string(root ? root : ".") + "/" + folder + "/" + name + ".txt";
     if (std::getenv("VCE_RECORD_BASELINES")) {
         std::ofstream(path) << text;
         return ::testing::AssertionSuccess() << "recorded " << path;

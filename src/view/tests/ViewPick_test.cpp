@@ -207,6 +207,7 @@ TEST_F(ViewPick, selectAllFromTheController__skipsDisabledItemsAndTakesLockedKey
     other->resetFlag(kTQChannelFlagEnabledInCurveEditor);
     item->channel()->setFlag(kTQChannelFlagEnabledInCurveEditor);
     item->channel()->setKeyframeLocked(k5, true);
+    object->removeChild(addItem(addChannel("Gone", {{1.0, 0.0}}))->channel());
 
     // The channel list reaches the view's selection through the controller.
     ctrl().selectAll(nullptr);

@@ -172,6 +172,7 @@ TEST_F(ViewVolume, operations__table) {
              view.zoomWithFactor(1.0, 4.0);
              recorder.clearCalls();
              view.frameAll(1);
+             EXPECT_GE(viewHost.redrawRequests(), 1);
          },
          CGRectMake(-0.5, 2.9, 11, 2.2),
          10.0 / 11,
