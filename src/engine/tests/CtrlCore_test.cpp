@@ -213,6 +213,7 @@ TEST_F(CtrlValuePanel, showValue__writes_the_accepted_value_in_channel_units) {
     TQChannel* a = addChannel("A", {{1, 0.5}});
     a->getInfo()->displayScale = 100.0;
     auto item = addItem(a);
+    item->setOriginalCurveDirty(0);
     selectInView({keypointEntry(item, 1)});
     double shown = 0.0;
     modal.pushScript([&](RWWindow& window, RWModalService& m) {
@@ -226,6 +227,7 @@ TEST_F(CtrlValuePanel, showValue__writes_the_accepted_value_in_channel_units) {
     EXPECT_NEAR(shown, 50.0, kValueTolerance) << "the panel shows the value times displayScale";
     EXPECT_NEAR(keyValueAt(a, 1), 0.25, kValueTolerance);
     EXPECT_TRUE(recorder.bracketSequence().empty()) << "the value panel opens no bracket";
+    EXPECT_FALSE(item->originalCurveDirty()) << "nor marks the curve, as it always has";
 
     modal.pushScript([](RWWindow& window, RWModalService& m) {
         static_cast<TQCurveEditorValueWindow&>(window).value = 99.0;

@@ -198,12 +198,16 @@ protected:
 TEST_F(CtrlMovesOnGrid, moveSelected__the_anchor_lands_on_a_frame_and_the_group_keeps_spacing) {
     const double f = 1.0 / 30.0;
     auto single = logged("A", {{1, 0}});
-    ctrl().moveSelected(selectInView({keypointEntry(single, 1)}), seconds(1 + 1.4 * f), 0, 1, 0);
+    const auto entry = keypointEntry(single, 1);
+    ctrl().moveSelected(selectInView({entry}), seconds(1 + 1.4 * f), 0, 1, 0);
     expectKeys(single->channel(), {{1 + f, 0}});
     auto group = logged("C", {{1, 0}, {1 + 0.5 * f, 0}});
     ctrl().moveSelected(selectInView({keypointEntry(group, 1), keypointEntry(group, 1 + 0.5 * f)}),
                         seconds(1 + 2.2 * f), 0, 1, 0);
     expectKeys(group->channel(), {{1 + 2 * f, 0}, {1 + 2.5 * f, 0}});
+    // A nudge is put on whole frames too.
+    ctrl().offsetSelected(selectInView({entry}), seconds(1.4 * f), 0.0);
+    expectKeys(single->channel(), {{1 + 2 * f, 0}});
 }
 
 }  // namespace

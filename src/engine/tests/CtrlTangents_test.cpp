@@ -102,7 +102,7 @@ TEST_F(CtrlTangentsTest, setTangents__brokenPairMovesAlone) {
 
 // The pair is not straight: turning both by the same angle keeps the angle between them.
 TEST_F(CtrlTangentsTest, setTangents__unscaledPairKeepsRatioAndTurnsAlike) {
-    Key k = makeKey("A", 5.0, 0.0, {-0.3, 0.2}, {0.5, 0.1});
+    Key k = makeKey("A", 5.0, 0.3, {-0.3, 0.2}, {0.5, 0.1});
     const CGPoint d = screenVector(k, true);
     const CGPoint o = screenVector(k, false);
     const double turn = 0.4;

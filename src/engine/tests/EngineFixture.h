@@ -43,6 +43,7 @@ public:
         return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, CMTimeMake(1, 60)),
                                               CMTimeMake(1, 30));
     }
+    bool shouldConstrainToFrames() const override { return true; }
 };
 
 // The channel named `name` anywhere under `root` (a snapshot, say).

@@ -61,6 +61,10 @@ TEST_F(ViewFrame, frame__keypoint_states_handles_and_label) {
     selectInView({keypointEntry(corner, 9.95), keypointEntry(states, 1), keypointEntry(states, 3),
                   keypointEntry(states, 5), keypointEntry(handles, 5), keypointEntry(handles, 8)});
     view.setPrintText(1);
+    // A mapping of its own, which the frame keeps: V = (value * 2 + 0.4) / 1.
+    states->setScaleY(0.5);
+    states->setOffsetY(-0.2);
+    states->setUpdateScale(0);
     ASSERT_TRUE(frame());
     EXPECT_TRUE(matchesBaseline("frame-keypoints", frameText()));
     bez->setLocked(true);

@@ -224,6 +224,18 @@ TEST_F(ViewVolume, operations__table) {
          1,
          1,
          {kVolume}},
+        {"reset pan keeps the zoom",
+         [this] {
+             view.zoomWithFactor(1.0, 2.0);
+             view.drawProjection();
+             view.pan(0.0, -40.0);
+             recorder.clearCalls();
+             view.resetPan();
+         },
+         CGRectMake(0, -1, 10, 1),
+         1,
+         2,
+         {kVolume}},
     };
     for (const VolumeCase& c : cases) {
         SCOPED_TRACE(c.what);
