@@ -160,6 +160,9 @@ TEST_F(CurveSetFixture, identity__namesShortcutsIdsAndCopies) {
     EXPECT_EQ(*copy->references(), position) << "the source's paths survive, unmatched ones too";
     EXPECT_EQ(copy->curveSetShortcut(), "u");
     EXPECT_EQ(copy->numberOfChannelItems(), 2u);
+    EXPECT_TRUE(copy->isRelative());
+    copy->setRelative(false);
+    EXPECT_FALSE(copy->hasReferences()) << "an absolute set keeps no paths";
     EXPECT_NE(copy->channeItemAtIndex(0)->channelId(), a->channeItemAtIndex(0)->channelId());
 
     TQCurveSetMutable fromSet;

@@ -185,6 +185,8 @@ TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
     root->childrenAtIndex(0)->enableItem(0);
     EXPECT_EQ(root->isEnabledItem(), -1) << "children that disagree";
     EXPECT_EQ(root->childrenAtIndex(99), nullptr);
+    root->select(1);
+    EXPECT_TRUE(root->childrenAtIndex(3)->isSelected()) << "a folder selects its children";
 }
 
 TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {

@@ -202,12 +202,13 @@ TEST_F(CtrlMovesOnGrid, moveSelected__the_anchor_lands_on_a_frame_and_the_group_
     ctrl().moveSelected(selectInView({entry}), seconds(1 + 1.4 * f), 0, 1, 0);
     expectKeys(single->channel(), {{1 + f, 0}});
     auto group = logged("C", {{1, 0}, {1 + 0.5 * f, 0}});
-    ctrl().moveSelected(selectInView({keypointEntry(group, 1), keypointEntry(group, 1 + 0.5 * f)}),
-                        seconds(1 + 2.2 * f), 0, 1, 0);
+    TQCurveSelectionList* both =
+        selectInView({keypointEntry(group, 1), keypointEntry(group, 1 + 0.5 * f)});
+    ctrl().moveSelected(both, seconds(1 + 2.2 * f), 0, 1, 0);
     expectKeys(group->channel(), {{1 + 2 * f, 0}, {1 + 2.5 * f, 0}});
     // A nudge is put on whole frames too.
-    ctrl().offsetSelected(selectInView({entry}), seconds(1.4 * f), 0.0);
-    expectKeys(single->channel(), {{1 + 2 * f, 0}});
+    ctrl().offsetSelected(both, seconds(1.4 * f), 0.0);
+    expectKeys(group->channel(), {{1 + 3 * f, 0}, {1 + 3.5 * f, 0}});
 }
 
 }  // namespace
