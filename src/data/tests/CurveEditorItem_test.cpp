@@ -187,6 +187,15 @@ TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
     EXPECT_EQ(root->childrenAtIndex(99), nullptr);
     root->select(1);
     EXPECT_TRUE(root->childrenAtIndex(3)->isSelected()) << "a folder selects its children";
+    {
+        // A folder added to a folder comes in once per valid child of it not there yet: merged
+        // roots rely on it, kept so.
+        auto merged = std::make_shared<TQCurveEditorFolderItem>();
+        merged->initWithRoot(cube, 0, &host, 1);
+        merged->addChild(root->childrenAtIndex(0));
+        merged->addChild(root);
+        EXPECT_EQ(merged->numberOfChildren(), 4u);
+    }
 }
 
 TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {

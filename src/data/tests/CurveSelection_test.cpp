@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <vector>
+
 namespace {
 
 TQKeyframeHandle handle(uintptr_t n) { return reinterpret_cast<TQKeyframeHandle>(n); }
@@ -35,7 +37,7 @@ TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
     EXPECT_FALSE(tangent->setKeypointTangents(1, 2, 3, 4));
     double t[4] = {};
     tangent->getKeypointTangents(&t[0], &t[1], &t[2], &t[3]);
-    EXPECT_EQ(t[3], 4.0);
+    EXPECT_EQ(std::vector<double>(t, t + 4), (std::vector<double>{1, 2, 3, 4}));
 }
 
 TEST(TQCurveSelection, compare__usesStoredTimes) {
