@@ -333,6 +333,11 @@ TEST_F(ViewMouseEdit, spaceDrag__pansOrWithCommandZoomsShowingWhichInTheCursor) 
     const auto lastCursor = [&] {
         return viewHost.cursors().empty() ? RWCursor::Arrow : viewHost.cursors().back();
     };
+    down(4.0, 0.5);
+    dragTo(3.0, 0.5);
+    EXPECT_TRUE(view.selecting()) << "without the space bar a drag on nothing is a band";
+    up(3.0, 0.5);
+    ASSERT_TRUE(frame());
     ASSERT_TRUE(view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " ")));
 
     down(4.0, 0.5);
