@@ -128,6 +128,22 @@ CMTime CMTimeMultiply(const CMTime& time, int32_t multiplier) {
     return r;
 }
 
+namespace {
+// `time` with its value replaced by `value` on the same timescale: rounded to the nearest
+// integer (and marked so), out of range saturating to an infinity, not a number indefinite.
+CMTime withScaledValue(const CMTime& time, long double value) {
+    if (std::isnan(value)) return kCMTimeIndefinite;  // zero times infinity
+    constexpr long double kLimit = 9.2233720368547758e18L;
+    if (!std::isfinite(value) || value >= kLimit || value <= -kLimit)
+        return value > 0 ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
+    const long double rounded = std::round(value);
+    CMTime r = CMTimeMake(static_cast<CMTimeValue>(rounded), time.timescale);
+    if (rounded != value) r.flags |= kCMTimeFlags_HasBeenRounded;
+    r.flags |= time.flags & kCMTimeFlags_HasBeenRounded;
+    return r;
+}
+}  // namespace
+
 CMTime CMTimeMultiplyByFloat64(const CMTime& time, double multiplier) {
     if (std::isnan(multiplier)) return kCMTimeInvalid;
     if (!CMTIME_IS_NUMERIC(time)) {
@@ -137,16 +153,7 @@ CMTime CMTimeMultiplyByFloat64(const CMTime& time, double multiplier) {
         return positive ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
     }
     if (multiplier == 1.0) return time;
-    const long double product = static_cast<long double>(time.value) * multiplier;
-    if (std::isnan(product)) return kCMTimeIndefinite;  // zero times infinity
-    if (!std::isfinite(product) || product >= 9.2233720368547758e18L)
-        return product > 0 ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
-    if (product <= -9.2233720368547758e18L) return kCMTimeNegativeInfinity;
-    const long double rounded = std::round(product);
-    CMTime r = CMTimeMake(static_cast<CMTimeValue>(rounded), time.timescale);
-    if (rounded != product) r.flags |= kCMTimeFlags_HasBeenRounded;
-    r.flags |= time.flags & kCMTimeFlags_HasBeenRounded;
-    return r;
+    return withScaledValue(time, static_cast<long double>(time.value) * multiplier);
 }
 
 CMTime CMTimeConvertScale(const CMTime& time, CMTimeScale newTimescale) {
@@ -259,17 +266,8 @@ CMTime operator*(const CMTime& time, const CMTime& factor) {
 
 CMTime operator/(const CMTime& time, double divisor) {
     if (divisor == 0.0 || std::isnan(divisor)) return kCMTimeInvalid;
-    if (CMTIME_IS_NUMERIC(time)) {
-        const long double q = static_cast<long double>(time.value) / divisor;
-        if (!std::isfinite(q) || q >= 9.2233720368547758e18L)
-            return q > 0 ? kCMTimePositiveInfinity : kCMTimeNegativeInfinity;
-        if (q <= -9.2233720368547758e18L) return kCMTimeNegativeInfinity;
-        const long double rounded = std::round(q);
-        CMTime r = CMTimeMake(static_cast<CMTimeValue>(rounded), time.timescale);
-        if (rounded != q) r.flags |= kCMTimeFlags_HasBeenRounded;
-        r.flags |= time.flags & kCMTimeFlags_HasBeenRounded;
-        return r;
-    }
+    if (CMTIME_IS_NUMERIC(time))
+        return withScaledValue(time, static_cast<long double>(time.value) / divisor);
     return CMTimeMultiplyByFloat64(time, 1.0 / divisor);
 }
 
