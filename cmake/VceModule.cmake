@@ -15,11 +15,16 @@ function(vce_warnings target)
   endif()
 endfunction()
 
-# vce_module(<target> [DIRS extra folders...] [DEPS libs...] [TEST_DEPS libs...])
+# vce_module(<target> [INTERNAL] [COMPONENT Core|Qt] [DIRS extra folders...] [DEPS libs...]
+#            [TEST_DEPS libs...])
 # DIRS adds sibling folders whose code is one library with this one (two halves that call
-# each other, such as the editing engine and its view).
+# each other, such as the editing engine and its view). Every module ships in the installed
+# package (component Core unless named) with its headers, except an INTERNAL one.
 function(vce_module target)
-  cmake_parse_arguments(M "" "" "DIRS;DEPS;TEST_DEPS" ${ARGN})
+  cmake_parse_arguments(M "INTERNAL" "COMPONENT" "DIRS;DEPS;TEST_DEPS" ${ARGN})
+  if(NOT M_COMPONENT)
+    set(M_COMPONENT Core)
+  endif()
   set(dirs ${CMAKE_CURRENT_SOURCE_DIR})
   foreach(d ${M_DIRS})
     get_filename_component(abs ${d} ABSOLUTE BASE_DIR ${CMAKE_CURRENT_SOURCE_DIR})
@@ -36,17 +41,35 @@ function(vce_module target)
     list(APPEND hdrs ${h})
     list(APPEND tests ${t})
   endforeach()
+  # Includes are written from the root in the tree and from the package's include folder
+  # once installed.
+  set(include_dirs $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>
+                   $<INSTALL_INTERFACE:${VCE_INSTALL_INCLUDEDIR}>)
   if(srcs)
     add_library(${target} STATIC ${srcs} ${hdrs})
-    target_include_directories(${target} PUBLIC ${PROJECT_SOURCE_DIR})
+    target_include_directories(${target} PUBLIC ${include_dirs})
     target_link_libraries(${target} PUBLIC ${M_DEPS})
     vce_warnings(${target})
   else()
     add_library(${target} INTERFACE ${hdrs})
-    target_include_directories(${target} INTERFACE ${PROJECT_SOURCE_DIR})
+    target_include_directories(${target} INTERFACE ${include_dirs})
     target_link_libraries(${target} INTERFACE ${M_DEPS})
   endif()
   add_library(vce::${target} ALIAS ${target})
+
+  if(NOT M_INTERNAL)
+    set_property(GLOBAL APPEND PROPERTY VCE_PACKAGE_${M_COMPONENT}_TARGETS ${target})
+    foreach(d ${dirs})
+      file(RELATIVE_PATH rel ${PROJECT_SOURCE_DIR} ${d})
+      file(GLOB h CONFIGURE_DEPENDS ${d}/*.h)
+      file(GLOB hi CONFIGURE_DEPENDS ${d}/internal/*.h)
+      install(FILES ${h} DESTINATION ${VCE_INSTALL_INCLUDEDIR}/${rel} COMPONENT ${M_COMPONENT})
+      if(hi)
+        install(FILES ${hi} DESTINATION ${VCE_INSTALL_INCLUDEDIR}/${rel}/internal
+                COMPONENT ${M_COMPONENT})
+      endif()
+    endforeach()
+  endif()
 
   if(VCE_BUILD_TESTS)
     if(tests)
