@@ -78,8 +78,14 @@ void BM_NotifyAfterDragStep(benchmark::State& state) {
     e.ctrl.showAll();
     // A channel of the first object, as a drag step announces it.
     TQChannel* dragged = nullptr;
-    for (const TQCurveEditorItemPtr& item : e.ctrl.selectedCurveSet()->allItems())
-        if ((dragged = item->channel())) break;
+    for (const TQCurveEditorItemPtr& item : e.ctrl.selectedCurveSet()->allItems()) {
+        dragged = item->channel();
+        if (dragged) break;
+    }
+    if (!dragged) {
+        state.SkipWithError("the set shows no channel");
+        return;
+    }
     for (auto _ : state) {
         dragged->noteWillChange(true);
         e.ctrl.notify(kTQNotifyChannelsChanged);
