@@ -32,6 +32,24 @@ void TQChannelBool::setValue(const CMTime* time, double value) {
     TQChannel::setValue(time, snap(value));
 }
 
+void TQChannelBool::setCurveSegmentValue(const CMTime& time, double value, bool notify) {
+    TQChannel::setCurveSegmentValue(time, snap(value), notify);
+    snapAll();
+}
+
+void TQChannelBool::offsetCurve(const CMTime* time, double value) {
+    TQChannel::offsetCurve(time, value);
+    snapAll();
+}
+
+void TQChannelBool::snapAll() {
+    TQChannel::setInitialValue(snap(getInitialValue()));
+    for (TQKeyframeHandle handle : getKeyframes(false)) {
+        double v = 0.0;
+        if (getKeyframe(handle, nullptr, &v)) TQChannel::setKeyframeValue(handle, snap(v));
+    }
+}
+
 TQChannelBase* TQChannelBool::cloneChannel() const {
     auto* copy = new TQChannelBool(getName(), getChannelId());
     copyConfigurationTo(*copy);

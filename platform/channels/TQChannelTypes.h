@@ -39,9 +39,17 @@ public:
     void setInitialValue(double value, bool notify = false) override;
     void setDefaultValue(double value) override;
     void setValue(const CMTime* time, double value) override;
+    // The shift of the whole curve or of a segment, then every value snapped: a curve dragged
+    // half way up turns on, and nothing is left between off and on (a saved project keeps
+    // booleans, so a value between would not come back).
+    void setCurveSegmentValue(const CMTime& time, double value, bool notify = false) override;
+    void offsetCurve(const CMTime* time, double value) override;
 
     TQChannelBase* cloneChannel() const override;
     const TQFactory* getFactory() const override;
+
+private:
+    void snapAll();
 };
 
 // A channel whose interpolation belongs to its class: the interpolation setters do nothing,
