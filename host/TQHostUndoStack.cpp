@@ -49,8 +49,21 @@ void TQHostUndoStack::announceChannel(const TQChannelBase* channel) {
 }
 
 void TQHostUndoStack::channelWillChange(const TQChannelBase& channel) {
-    if (_applying || !_open) return;
-    captureBefore(*_open, channel);
+    if (_applying) return;
+    if (_open) {
+        captureBefore(*_open, channel);
+        return;
+    }
+    // A change announced with no bracket around it (a Control band's flatten, the value
+    // panel's write) is still the user's edit: it joins the step waiting for its "after"
+    // state, or becomes a step of its own, which the channels announced after it join until
+    // the history is next read or changed.
+    if (!_pending) {
+        _pending = std::make_unique<Step>();
+        _pending->description = kImplicitStepDescription;
+    }
+    captureBefore(*_pending, channel);
+    if (_pending->parts.empty()) _pending.reset();
 }
 
 void TQHostUndoStack::addChannelStep(const TQChannelBase* channel, const BNString& description) {

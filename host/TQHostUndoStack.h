@@ -17,7 +17,9 @@
 //     ignored.
 //   - While a step is open, announceChannel (the framework's will... calls) and
 //     channelWillChange (a channel's own noteWillChange) capture the "before" state of a
-//     channel the first time it is seen. Outside a step they do nothing.
+//     channel the first time it is seen. Outside a step announceChannel does nothing, and
+//     channelWillChange joins the step addChannelStep left waiting, or starts one of its own,
+//     described kImplicitStepDescription, which later announcements outside a step join.
 //   - addChannelStep outside a step records the channel as a step of its own; its "after"
 //     state is taken lazily, just before the history is next read or changed, since the
 //     change it stands for follows the call with no bracket around it.
@@ -54,6 +56,9 @@ public:
 
 class TQHostUndoStack {
 public:
+    // The description of a step made of changes announced outside any bracket.
+    static constexpr const char* kImplicitStepDescription = "Change";
+
     // Resolves references at capture and restore time; it may answer a different root each
     // time, or null (then channel parts are skipped).
     using SceneRootProvider = std::function<TQChannelBase*()>;
@@ -134,7 +139,7 @@ private:
 
     SceneRootProvider _sceneRoot;
     std::unique_ptr<Step> _open;     // the step between the outermost begin and end
-    std::unique_ptr<Step> _pending;  // an addChannelStep waiting for its "after" state
+    std::unique_ptr<Step> _pending;  // a step waiting for its "after" state
     int _depth = 0;
     bool _applying = false;
     size_t _levels = kDefaultLevelsOfUndo;

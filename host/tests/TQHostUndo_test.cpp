@@ -142,6 +142,23 @@ TEST_F(HostUndo, capture__anUnannouncedChangeAndAChannelAddedLaterAreTakenWhenTh
     EXPECT_EQ(host.undoStack().undoCount(), 2u) << "recorded but never changed: dropped";
 }
 
+// A change announced with no bracket (a Control band's flatten) is a step of its own; the
+// channels announced after it join it until the history is read.
+TEST_F(HostUndo, unbracketedChanges__becomeOneStepThatUndoes) {
+    const auto before = scene();
+    for (TQChannel* c : {x, y}) {
+        c->noteWillChange(true);
+        c->setKeyframe(CMTimeMake(1, 1), -3.0);
+    }
+    const auto changed = scene();
+    EXPECT_EQ(host.undoDescription(), TQHostUndoStack::kImplicitStepDescription);
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(sceneIs(before));
+    EXPECT_FALSE(host.canUndo()) << "both channels in one step";
+    ASSERT_TRUE(host.redo());
+    EXPECT_TRUE(sceneIs(changed));
+}
+
 TEST_F(HostUndo, replacedChannel__isFoundByItsReferenceAndAVanishedOneIsSkipped) {
     const std::unique_ptr<TQChannelBase> before(object->cloneChannel());
     bracketedEdit("Edit", {x}, 77.0);
