@@ -8,31 +8,7 @@ std::shared_ptr<RWTextFieldCell> RWTextFieldCell::copy() const {
     return cell;
 }
 
-void RWTextFieldCell::copySettingsTo(RWTextFieldCell& copy) const {
-    copy._objectValue = _objectValue;
-    copy._formatter = _formatter;
-    copy._editable = _editable;
-    copy._enabled = _enabled;
-    copy._alignment = _alignment;
-    copy._wraps = _wraps;
-}
-
-std::string RWTextFieldCell::stringValue() const {
-    if (!_formatter) return _objectValue.stringValue();
-    return _formatter->stringForObjectValue(_objectValue).value_or(std::string());
-}
-
-void RWTextFieldCell::setStringValue(const std::string& text) {
-    RWObjectValue value;
-    if (_formatter && _formatter->getObjectValue(&value, text, nullptr))
-        _objectValue = value;
-    else
-        _objectValue = RWObjectValue(text);
-}
-
-void RWTextFieldCell::drawWithFrame(const CGRect& frame, RWCellDrawing& drawing) const {
-    drawing.drawText(stringValue(), frame, _alignment, _enabled);
-}
+void RWTextFieldCell::copySettingsTo(RWTextFieldCell& copy) const { copyCellTo(copy); }
 
 // ---- Field ---------------------------------------------------------------------------------
 
