@@ -186,8 +186,7 @@ public:
     // state and sends the action.
     bool trackMouse(const RWEvent& event, const CGPoint& point, const CGRect& frame,
                     RWOutlineView& view, bool untilMouseUp) override;
-    void continueTracking(const RWEvent& event, const CGPoint& point,
-                          RWOutlineView& view) override;
+    void continueTracking(const RWEvent& event, const CGPoint& point, RWOutlineView& view) override;
     void stopTracking(const CGPoint& point, RWOutlineView& view, bool mouseIsUp) override;
     bool commitsTrackedValue() const override { return _clicked; }
 

@@ -88,7 +88,8 @@ void RWOutlineView::loadChildren(RWOutlineNode& node) {
     if (node._loaded) return;
     node._loaded = true;
     if (!_dataSource) return;
-    const int64_t count = std::max<int64_t>(0, _dataSource->numberOfChildrenOfItem(*this, node._item));
+    const int64_t count =
+        std::max<int64_t>(0, _dataSource->numberOfChildrenOfItem(*this, node._item));
     node._children.reserve(static_cast<size_t>(count));
     for (int64_t i = 0; i < count; ++i) {
         auto child = std::make_unique<RWOutlineNode>();
@@ -139,8 +140,8 @@ void RWOutlineView::reloadData() {
     for (bool opened = true; opened;) {
         opened = false;
         for (const RWOutlineItem& item : expanded)
-            if (RWOutlineNode* node = findNode(item.get()); node && !node->_expanded &&
-                                                           node->_expandable) {
+            if (RWOutlineNode* node = findNode(item.get());
+                node && !node->_expanded && node->_expandable) {
                 loadChildren(*node);
                 node->_expanded = true;
                 opened = true;
@@ -270,8 +271,7 @@ void RWOutlineView::expandItem(const void* item, bool expandChildren) {
     setExpanded(*node, true);
     if (expandChildren) {
         for (size_t i = 0; i < node->_children.size(); ++i)
-            if (node->_children[i]->_expandable)
-                expandItem(node->_children[i]->_item.get(), true);
+            if (node->_children[i]->_expandable) expandItem(node->_children[i]->_item.get(), true);
     }
     setNeedsDisplay();
     updateTrackingAreas();
@@ -294,7 +294,8 @@ void RWOutlineView::collapseItem(const void* item, bool collapseChildren) {
 void RWOutlineView::setSelection(RWIndexSet rows) {
     if (rows == _selection) return;
     _selection = std::move(rows);
-    if (_anchorRow >= 0 && !_selection.containsIndex(_anchorRow)) _anchorRow = _selection.lastIndex();
+    if (_anchorRow >= 0 && !_selection.containsIndex(_anchorRow))
+        _anchorRow = _selection.lastIndex();
     setNeedsDisplay();
     tellObservers([&](RWOutlineViewObserver& o) { o.outlineDidChangeSelection(*this); });
     if (_delegate) _delegate->selectionDidChange(*this);
@@ -400,9 +401,8 @@ int64_t RWOutlineView::rowAtPoint(const CGPoint& point) const {
 std::pair<int64_t, int64_t> RWOutlineView::rowsInRect(const CGRect& rect) const {
     if (CGRectIsEmpty(rect) || numberOfRows() == 0) return {0, 0};
     const CGRect r = CGRectStandardize(rect);
-    const int64_t first =
-        std::clamp<int64_t>(static_cast<int64_t>(std::floor(r.origin.y / _rowHeight)), 0,
-                            numberOfRows());
+    const int64_t first = std::clamp<int64_t>(
+        static_cast<int64_t>(std::floor(r.origin.y / _rowHeight)), 0, numberOfRows());
     const int64_t end = std::clamp<int64_t>(
         static_cast<int64_t>(std::ceil((r.origin.y + r.size.height) / _rowHeight)), 0,
         numberOfRows());
@@ -412,8 +412,8 @@ std::pair<int64_t, int64_t> RWOutlineView::rowsInRect(const CGRect& rect) const 
 // ---- Window coordinates ---------------------------------------------------------------------
 
 CGPoint RWOutlineView::convertPointFromWindow(const CGPoint& pointInWindow) const {
-    const CGPoint local = _viewHost ? _viewHost->convertPointFromWindow(pointInWindow)
-                                    : pointInWindow;
+    const CGPoint local =
+        _viewHost ? _viewHost->convertPointFromWindow(pointInWindow) : pointInWindow;
     const CGRect visible = _visibleRectSet ? _visibleRect : bounds();
     return CGPointMake(local.x + visible.origin.x,
                        visible.size.height - local.y + visible.origin.y);
@@ -421,8 +421,8 @@ CGPoint RWOutlineView::convertPointFromWindow(const CGPoint& pointInWindow) cons
 
 CGPoint RWOutlineView::convertPointToWindow(const CGPoint& point) const {
     const CGRect visible = _visibleRectSet ? _visibleRect : bounds();
-    const CGPoint local = CGPointMake(point.x - visible.origin.x,
-                                      visible.size.height - (point.y - visible.origin.y));
+    const CGPoint local =
+        CGPointMake(point.x - visible.origin.x, visible.size.height - (point.y - visible.origin.y));
     if (!_viewHost) return local;
     // The host converts window points to its own; its origin's window point gives the way back.
     const CGPoint origin = _viewHost->convertPointFromWindow(CGPointZero);
@@ -470,8 +470,7 @@ void RWOutlineView::displayIfNeeded(const CellVisitor& draw) {
 // ---- Editing --------------------------------------------------------------------------------
 
 bool RWOutlineView::canEditCell(int64_t column, int64_t row) {
-    if (column < 0 || column >= numberOfColumns() || row < 0 || row >= numberOfRows())
-        return false;
+    if (column < 0 || column >= numberOfColumns() || row < 0 || row >= numberOfRows()) return false;
     const RWTableColumn& c = *_columns[static_cast<size_t>(column)];
     const RWCellPtr cell = c.dataCellForRow(row);
     if (!c.isEditable() || !cell || !cell->isEditable()) return false;
@@ -542,8 +541,7 @@ std::optional<std::string> RWOutlineView::toolTipAtPoint(const CGPoint& point) {
     RWCell* cell = preparedCellAtColumn(column, row);
     if (!cell) return std::nullopt;
     return _delegate->toolTipForCell(*this, *cell, frameOfCellAtColumn(column, row),
-                                     *_columns[static_cast<size_t>(column)], itemAtRow(row),
-                                     point);
+                                     *_columns[static_cast<size_t>(column)], itemAtRow(row), point);
 }
 
 uint64_t RWOutlineView::addTrackingArea(RWTrackingArea area) {
@@ -644,8 +642,8 @@ void RWOutlineView::endTracking(const CGPoint& point, bool mouseIsUp) {
     _tracking->stopped = true;
     const Tracking t = *_tracking;
     t.cell->stopTracking(point, *this, mouseIsUp);
-    if (mouseIsUp && t.cell->commitsTrackedValue() && _dataSource &&
-        t.column < numberOfColumns() && _columns[static_cast<size_t>(t.column)]->isEditable())
+    if (mouseIsUp && t.cell->commitsTrackedValue() && _dataSource && t.column < numberOfColumns() &&
+        _columns[static_cast<size_t>(t.column)]->isEditable())
         _dataSource->setObjectValue(*this, t.cell->objectValue(),
                                     *_columns[static_cast<size_t>(t.column)], t.item);
     const int64_t row = rowForItem(t.item);
@@ -690,9 +688,9 @@ void RWOutlineView::mouseUp(const RWEvent& event) {
     if (_dragging) {
         _dragging = false;
         const uint64_t offered = draggingSourceOperationMaskForLocal(false);
-        const uint64_t operation =
-            _dropProvider ? _dropProvider(event.locationInWindow(), offered) & offered
-                          : RWDragOperationNone;
+        const uint64_t operation = _dropProvider
+                                       ? _dropProvider(event.locationInWindow(), offered) & offered
+                                       : RWDragOperationNone;
         tellObservers([&](RWOutlineViewObserver& o) { o.outlineDidChangeDrag(*this); });
         draggedImageEndedAt(event.locationInWindow(), operation);
         _draggedRows.removeAllIndexes();
@@ -705,7 +703,9 @@ void RWOutlineView::mouseUp(const RWEvent& event) {
     }
 }
 
-void RWOutlineView::rightMouseDown(const RWEvent& event) { _mouseLocation = event.locationInWindow(); }
+void RWOutlineView::rightMouseDown(const RWEvent& event) {
+    _mouseLocation = event.locationInWindow();
+}
 
 void RWOutlineView::mouseMoved(const RWEvent& event) {
     _mouseLocation = event.locationInWindow();

@@ -363,8 +363,8 @@ public:
     const CGRect& needsDisplayRect() const { return _dirty; }
     // Prepares every cell of the visible rows that wait for a redraw and hands each to
     // `draw` with its frame, then forgets the wait: a headless drawing pass.
-    using CellVisitor = std::function<void(RWCell& cell, const CGRect& frame, int64_t column,
-                                           int64_t row)>;
+    using CellVisitor =
+        std::function<void(RWCell& cell, const CGRect& frame, int64_t column, int64_t row)>;
     void displayIfNeeded(const CellVisitor& draw);
 
     // ---- Text editing ----
@@ -434,8 +434,8 @@ public:
     const RWIndexSet& draggedRows() const { return _draggedRows; }
     bool dragSlidesBack() const { return _slideBack; }
     // What a destination at a window point takes of the offered operations; none without it.
-    using DropOperationProvider = std::function<uint64_t(const CGPoint& pointInWindow,
-                                                         uint64_t offered)>;
+    using DropOperationProvider =
+        std::function<uint64_t(const CGPoint& pointInWindow, uint64_t offered)>;
     void setDropOperationProvider(DropOperationProvider provider) {
         _dropProvider = std::move(provider);
     }

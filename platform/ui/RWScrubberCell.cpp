@@ -27,8 +27,8 @@ double RWScrubberCell::shownValue() const {
     return value.doubleValue();
 }
 
-bool RWScrubberCell::trackMouse(const RWEvent&, const CGPoint& point, const CGRect&,
-                                RWOutlineView&, bool) {
+bool RWScrubberCell::trackMouse(const RWEvent&, const CGPoint& point, const CGRect&, RWOutlineView&,
+                                bool) {
     _clickedWithoutScrub = false;
     _scrubbing = false;
     if (!isEnabled()) return false;

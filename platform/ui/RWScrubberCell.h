@@ -39,8 +39,7 @@ public:
 
     bool trackMouse(const RWEvent& event, const CGPoint& point, const CGRect& frame,
                     RWOutlineView& view, bool untilMouseUp) override;
-    void continueTracking(const RWEvent& event, const CGPoint& point,
-                          RWOutlineView& view) override;
+    void continueTracking(const RWEvent& event, const CGPoint& point, RWOutlineView& view) override;
     void stopTracking(const CGPoint& point, RWOutlineView& view, bool mouseIsUp) override;
     bool wantsEditingAfterTracking() const override { return _clickedWithoutScrub; }
     bool prefersTrackingUntilMouseUp() const override { return true; }

@@ -172,17 +172,16 @@ void TQCurveEditorChannelList::updateTrackingAreas() {
             area.userInfo = {{"index", row}, {"Location", location}};
             _pTrackingAreas.push_back(addTrackingArea(std::move(area)));
         };
-        add(CGRectMake(rowRect.origin.x, y, keyRect.origin.x - rowRect.origin.x, h),
-            kPartOutside);
+        add(CGRectMake(rowRect.origin.x, y, keyRect.origin.x - rowRect.origin.x, h), kPartOutside);
         add(CGRectMake(CGRectGetMaxX(keyRect), y, CGRectGetMaxX(rowRect) - CGRectGetMaxX(keyRect),
                        h),
             kPartOutside);
         const CGRect shown = CGRectIntersection(keyRect, visible);
         if (CGRectIsNull(shown)) continue;
         const double x = shown.origin.x;
-        for (const auto& [offset, location] :
-             {std::pair{0.0, kPartPrevious}, {2 * kPartWidth, kPartAddOrDelete},
-              {kPartWidth, kPartNext}}) {
+        for (const auto& [offset, location] : {std::pair{0.0, kPartPrevious},
+                                               {2 * kPartWidth, kPartAddOrDelete},
+                                               {kPartWidth, kPartNext}}) {
             const CGRect part = CGRectMake(x + offset, y, kPartWidth, h);
             if (!CGRectIsEmpty(part)) add(part, location);
         }

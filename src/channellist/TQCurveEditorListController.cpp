@@ -128,8 +128,8 @@ void TQCurveEditorListController::refreshRowWithoutTitle(int64_t row) {
 
 int64_t TQCurveEditorListController::numberOfChildrenOfItem(RWOutlineView&,
                                                             const RWOutlineItem& item) {
-    if (!item) return _mainCurveEditorController ? _mainCurveEditorController->numberOfRootItems()
-                                                 : 0;
+    if (!item)
+        return _mainCurveEditorController ? _mainCurveEditorController->numberOfRootItems() : 0;
     if (auto* folder = dynamic_cast<TQCurveEditorFolderItem*>(editorItem(item)))
         return folder->numberOfChildren();
     return 0;
@@ -202,8 +202,7 @@ void TQCurveEditorListController::setObjectValue(RWOutlineView&, const RWObjectV
     const double value = typed.doubleValue() / channelItem->conversionFactor();
     // The present value is in display units and the new one in channel units: the two have
     // always been compared so, and a factor other than 1 keeps that difference.
-    if (!std::isfinite(value) || std::fabs(value - present.doubleValue()) < kValueTolerance)
-        return;
+    if (!std::isfinite(value) || std::fabs(value - present.doubleValue()) < kValueTolerance) return;
     TQCurveEditorAppDelegate* delegate = editor ? editor->appDelegate() : nullptr;
     channel->beginValueEdit(TQLocalizedString("Undo Set Value"));
     {
@@ -265,7 +264,8 @@ void TQCurveEditorListController::willDisplayCell(RWOutlineView&, RWCell& cell,
         if (auto* name = dynamic_cast<TQColoredTextFieldCell*>(&cell)) {
             name->setDisplayBox(channelItem != nullptr);
             if (channelItem) {
-                const GDColor c = TQCurveEditorViewBase::getColorForIndex(channelItem->colorIndex());
+                const GDColor c =
+                    TQCurveEditorViewBase::getColorForIndex(channelItem->colorIndex());
                 name->setFillColor(c.red, c.green, c.blue, c.alpha);
             }
         }
@@ -275,8 +275,7 @@ void TQCurveEditorListController::willDisplayCell(RWOutlineView&, RWCell& cell,
     }
 }
 
-bool TQCurveEditorListController::shouldEditTableColumn(RWOutlineView&,
-                                                        const RWTableColumn& column,
+bool TQCurveEditorListController::shouldEditTableColumn(RWOutlineView&, const RWTableColumn& column,
                                                         const RWOutlineItem& item) {
     const TQCurveEditorItem* editor = editorItem(item);
     return column.identifier() == kValueColumn && editor && editor->channel();
@@ -291,9 +290,11 @@ bool TQCurveEditorListController::shouldShowCellExpansion(RWOutlineView&, const 
     return false;
 }
 
-std::optional<std::string> TQCurveEditorListController::toolTipForCell(
-    RWOutlineView&, RWCell&, const CGRect&, const RWTableColumn& column, const RWOutlineItem& item,
-    const CGPoint&) {
+std::optional<std::string> TQCurveEditorListController::toolTipForCell(RWOutlineView&, RWCell&,
+                                                                       const CGRect&,
+                                                                       const RWTableColumn& column,
+                                                                       const RWOutlineItem& item,
+                                                                       const CGPoint&) {
     const TQCurveEditorItem* editor = editorItem(item);
     if (column.identifier() != kNameColumn || !editor || !editor->channelBase())
         return std::nullopt;
@@ -424,8 +425,7 @@ void TQCurveEditorListController::deleteSelected() {
         update();
 }
 
-bool TQCurveEditorListController::performAction(const std::string& action,
-                                                RWActionSender& sender) {
+bool TQCurveEditorListController::performAction(const std::string& action, RWActionSender& sender) {
     if (action == "startScrubberAction:") {
         startScrubberAction(&sender);
         return true;

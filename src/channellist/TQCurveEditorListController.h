@@ -105,8 +105,8 @@ public:
     bool shouldSelectItem(RWOutlineView& view, const RWOutlineItem& item) override;
     bool shouldShowCellExpansion(RWOutlineView& view, const RWTableColumn& column,
                                  const RWOutlineItem& item) override;
-    std::optional<std::string> toolTipForCell(RWOutlineView& view, RWCell& cell,
-                                              const CGRect& rect, const RWTableColumn& column,
+    std::optional<std::string> toolTipForCell(RWOutlineView& view, RWCell& cell, const CGRect& rect,
+                                              const RWTableColumn& column,
                                               const RWOutlineItem& item,
                                               const CGPoint& mouseLocation) override;
     // The folder's collapsed mark follows the list.

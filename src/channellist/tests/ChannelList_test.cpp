@@ -1,0 +1,332 @@
+// The channel list beside the full editor on the sample project, driven as a user drives it:
+// presses and drags at points of the list's cells, typed text, hovering; checked against what
+// the editor's items, the channels, the curve sets and the host's undo then hold.
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <string>
+
+#include "host/TQHostAppDelegate.h"
+#include "host/TQHostSampleScene.h"
+#include "platform/ui/RWCommandsController.h"
+#include "platform/ui/testing/RWTestDoubles.h"
+#include "src/channellist/TQCurveEditorChannelList.h"
+#include "src/channellist/TQCurveEditorListController.h"
+#include "src/channellist/TQCurveEditorScrubberCell.h"
+#include "src/editor/TQCurveEditorCtrl.h"
+#include "src/editor/TQCurveEditorView.h"
+#include "src/resources/TQStrings.h"
+
+namespace {
+
+using Ctrl = TQCurveEditorListController;
+
+// The host's undo hears a value edit through the channel's manipulator, as a host that groups
+// value edits into steps does.
+class UndoingManipulator : public TQObjectManipulator {
+public:
+    explicit UndoingManipulator(TQHostAppDelegate& host) : _host(host) {}
+    void beginValueEdit(TQChannelBase& channel, const BNString& undoText) override {
+        _host.addChannelToUndo(&channel, undoText);
+        ++edits;
+    }
+    int edits = 0;
+
+private:
+    TQHostAppDelegate& _host;
+};
+
+class ChannelListTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
+        view.setViewHost(&viewHost);
+        const CMTimeRange range = host.displayRange();
+        view.setTotalRange(&range.start, &range.duration);
+        list.addStandardColumns();
+        controller.setMainCurveEditorController(&ctrl);
+        controller.setOutlineView(&list);
+        list.setCurveListController(&controller);
+        controller.awakeFromNib();
+        ctrl.init();
+        ctrl.setAppDelegate(&host);
+        ctrl.setView(&view);
+        TQCurveEditorOutlets outlets;
+        outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
+        outlets.channels = &list;
+        outlets.channelsList = &controller;
+        ctrl.connectOutlets(outlets);
+        ctrl.setupController();
+        ctrl.viewDidLoad();
+        host.addNotificationReceiver(&ctrl);
+        list.setVisibleRect(CGRectMake(0, 0, list.bounds().size.width, 400));
+        ctrl.updateUI();
+    }
+    void TearDown() override {
+        host.removeNotificationReceiver(&ctrl);
+        view.setViewHost(nullptr);
+    }
+
+    // The row of the first channel item whose name holds `name`, -1 when the list shows none.
+    int64_t rowOf(const std::string& name) {
+        for (int64_t row = 0; row < list.numberOfRows(); ++row) {
+            auto* item = Ctrl::editorItem(list.itemAtRow(row));
+            if (item && dynamic_cast<TQCurveEditorChannelItem*>(item) && item->simpleName().find(name) != std::string::npos)
+                return row;
+        }
+        return -1;
+    }
+    TQCurveEditorItem* itemAt(int64_t row) { return Ctrl::editorItem(list.itemAtRow(row)); }
+    // A window point in the middle of a cell (a little right of its left edge for Name).
+    CGPoint at(const char* column, int64_t row) {
+        const CGRect f = list.frameOfCellAtColumn(list.columnWithIdentifier(column), row);
+        return list.convertPointToWindow(CGPointMake(f.origin.x + f.size.width / 2,
+                                                     f.origin.y + f.size.height / 2));
+    }
+    void click(const char* column, int64_t row, uint64_t flags = 0) {
+        list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, at(column, row), flags));
+        list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, at(column, row), flags));
+    }
+    void moveTo(const CGPoint& point) {
+        list.mouseMoved(RWEvent::mouseEvent(RWEventType::MouseMoved, point));
+    }
+    std::vector<std::string> selectedNames() const {
+        std::vector<std::string> names;
+        for (const TQCurveEditorItemPtr& item : ctrl.selectedCurveSet()->selectedItems())
+            names.push_back(item->simpleName());
+        return names;
+    }
+
+    TQHostAppDelegate host;
+    RWStubViewHost viewHost{800.0, 400.0, 1.0};
+    TQCurveEditorView view;
+    TQCurveEditorCtrl ctrl;
+    TQCurveEditorChannelList list;
+    Ctrl controller;
+};
+
+TEST_F(ChannelListTest, rows__theSelectedSetOpenedWithSwatchesAndValues) {
+    ASSERT_GT(list.numberOfRows(), 1);
+    auto* root = dynamic_cast<TQCurveEditorFolderItem*>(itemAt(0));
+    ASSERT_NE(root, nullptr) << "the first row is the object";
+    EXPECT_EQ(list.numberOfRows(), 1 + static_cast<int64_t>(root->numberOfChildren()))
+        << "an object that is not collapsed opens";
+    const int64_t value = list.columnWithIdentifier(Ctrl::kValueColumn);
+    auto* valueCell = dynamic_cast<TQCurveEditorScrubberCell*>(list.preparedCellAtColumn(value, 0));
+    ASSERT_NE(valueCell, nullptr);
+    EXPECT_FALSE(valueCell->showCell()) << "a folder row has no value";
+    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(itemAt(1));
+    list.preparedCellAtColumn(value, 1);
+    EXPECT_TRUE(valueCell->showCell());
+    EXPECT_EQ(valueCell->stringValue(),
+              *controller.valueFormatter().stringForObjectValue(item->currentValue() *
+                                                                item->conversionFactor()));
+}
+
+TEST_F(ChannelListTest, selection__listAndCurvesInStep) {
+    const int64_t first = 1, second = 2;
+    click(Ctrl::kNameColumn, first);
+    click(Ctrl::kNameColumn, second, RWEventModifierFlagCommand);
+    EXPECT_EQ(selectedNames(),
+              (std::vector<std::string>{itemAt(first)->simpleName(), itemAt(second)->simpleName()}));
+    // The other way: a keypoint of one curve selected in the view selects its row alone.
+    auto entry = std::make_shared<TQCurveSelection>();
+    entry->setCurveId(itemAt(second)->channelId());
+    TQCurveSelectionList keypoints;
+    keypoints.addSelection(entry);
+    ctrl.selectionChangedTo(&keypoints);
+    EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{second}));
+    EXPECT_EQ(selectedNames(), std::vector<std::string>{itemAt(second)->simpleName()});
+    // A press below the last row selects nothing.
+    list.mouseDown(RWEvent::mouseEvent(
+        RWEventType::LeftMouseDown,
+        list.convertPointToWindow(CGPointMake(20, list.bounds().size.height + 5))));
+    EXPECT_TRUE(list.selectedRowIndexes().empty());
+    EXPECT_TRUE(selectedNames().empty());
+}
+
+TEST_F(ChannelListTest, showBoxes__folderTriStateGroupToggleAndSolo) {
+    const int64_t show = list.columnWithIdentifier(Ctrl::kShowColumn);
+    auto state = [&](int64_t row) {
+        return static_cast<RWButtonCell*>(list.preparedCellAtColumn(show, row))->state();
+    };
+    {  // One channel off: the folder's box is mixed; a click on the folder shows them all.
+        click(Ctrl::kShowColumn, 1);
+        EXPECT_EQ(state(1), RWOffState);
+        EXPECT_EQ(state(0), RWMixedState);
+        click(Ctrl::kShowColumn, 0);
+        EXPECT_EQ(state(0), RWOnState);
+        EXPECT_EQ(state(1), RWOnState);
+    }
+    {  // Among selected rows every box takes the opposite of the clicked one.
+        click(Ctrl::kNameColumn, 1);
+        click(Ctrl::kNameColumn, 3, RWEventModifierFlagShift);
+        click(Ctrl::kShowColumn, 2);
+        for (int64_t row : {1, 2, 3}) EXPECT_EQ(state(row), RWOffState) << "row " << row;
+        EXPECT_EQ(state(4), RWOnState);
+        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1, 2, 3}));
+    }
+    {  // Option solos the row and selects it alone; again shows everything.
+        ctrl.selectedCurveSet()->enableAll(true, nullptr);
+        click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
+        EXPECT_EQ(ctrl.numberOfEnabledChannels(), 1u);
+        EXPECT_EQ(state(2), RWOnState);
+        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
+        click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
+        EXPECT_EQ(ctrl.numberOfEnabledChannels(), ctrl.numberOfChannelItems());
+    }
+}
+
+TEST_F(ChannelListTest, typedValue__oneUndoStepAtTheCurrentTime) {
+    const int64_t value = list.columnWithIdentifier(Ctrl::kValueColumn);
+    UndoingManipulator manipulator(host);
+    host.setCurrentTime(TQTarnTimeForChannelSeconds(2.5, 0x40000));
+    auto type = [&](int64_t row, const std::string& text) {
+        list.editColumn(value, row, true);
+        list.userEndEditing(text, RWReturnTextMovement);
+    };
+    auto channelAt = [&](int64_t row) {
+        return dynamic_cast<TQCurveEditorChannelItem*>(itemAt(row))->channel();
+    };
+    {  // No number, or the number shown (in display units, here the channel's): no change.
+        int64_t row = 1;
+        while (dynamic_cast<TQCurveEditorChannelItem*>(itemAt(row))->conversionFactor() != 1.0)
+            ++row;
+        TQChannel* channel = channelAt(row);
+        channel->setObjectManipulator(&manipulator);
+        const std::unique_ptr<TQChannelBase> before(channel->cloneChannel());
+        type(row, "abc");
+        list.editColumn(value, row, true);
+        type(row, list.editingText());
+        EXPECT_EQ(*channel, *before);
+        EXPECT_EQ(manipulator.edits, 0);
+        EXPECT_FALSE(host.canUndo());
+        channel->setObjectManipulator(nullptr);
+    }
+    const int64_t row = rowOf("Opacity");
+    ASSERT_GE(row, 0);
+    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(itemAt(row));
+    TQChannel* channel = item->channel();
+    channel->setObjectManipulator(&manipulator);
+    const std::unique_ptr<TQChannelBase> before(channel->cloneChannel());
+    const unsigned keys = channel->numberOfKeyframes();
+    type(row, "25");
+    EXPECT_EQ(channel->numberOfKeyframes(), keys + 1) << "a keyframe at the playhead";
+    EXPECT_DOUBLE_EQ(item->currentValue() * item->conversionFactor(), 25.0)
+        << "typed in display units";
+    EXPECT_FALSE(list.isEditing()) << "Return does not move the edit to the next row";
+    ASSERT_TRUE(host.canUndo());
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Value"));
+    host.undo();
+    EXPECT_EQ(*channel, *before);
+    EXPECT_FALSE(host.canUndo()) << "one step";
+    channel->setObjectManipulator(nullptr);
+}
+
+TEST_F(ChannelListTest, scrub__dragInValueCellIsOneStep) {
+    const int64_t row = rowOf("Opacity");
+    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(itemAt(row));
+    const double start = item->currentValue();
+    const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
+    const CGPoint press = at(Ctrl::kValueColumn, row);
+    list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, press));
+    for (double dx : {2.0, 10.0, 20.0})
+        list.mouseDragged(RWEvent::mouseEvent(RWEventType::LeftMouseDragged,
+                                              press + CGPointMake(dx, 0)));
+    list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, press + CGPointMake(20, 0)));
+    // Five steps of the channel's nudge step (a hundredth of opacity).
+    EXPECT_NEAR(item->currentValue(), start + 5 * 0.01, 1e-9);
+    ASSERT_TRUE(host.canUndo());
+    host.undo();
+    EXPECT_EQ(*item->channel(), *before);
+    EXPECT_FALSE(list.isEditing()) << "a scrub is no click: no edit starts";
+}
+
+TEST_F(ChannelListTest, dragOut__leavesCustomSetNotScene) {
+    auto dragName = [&](int64_t row, const CGPoint& to) {
+        const CGPoint from = at(Ctrl::kNameColumn, row);
+        list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, from));
+        list.mouseDragged(RWEvent::mouseEvent(RWEventType::LeftMouseDragged, to));
+        list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, to));
+    };
+    const CGPoint outside = list.convertPointToWindow(CGPointMake(-50, 30));
+    {  // An automatic set takes no changes by hand.
+        const uint32_t count = ctrl.numberOfChannelItems();
+        dragName(1, outside);
+        EXPECT_EQ(ctrl.numberOfChannelItems(), count);
+    }
+    ctrl.cloneCurveSetWithName("Mine");
+    ctrl.updateUI();
+    const uint32_t count = ctrl.numberOfChannelItems();
+    const std::string name = itemAt(2)->simpleName();
+    TQChannelBase* channel = itemAt(2)->channelBase();
+    dragName(2, at(Ctrl::kValueColumn, 4));
+    EXPECT_EQ(ctrl.numberOfChannelItems(), count) << "a drop inside the list does nothing";
+    dragName(2, outside);
+    EXPECT_EQ(ctrl.numberOfChannelItems(), count - 1);
+    EXPECT_EQ(ctrl.selectedCurveSet()->itemWithChannel(channel), nullptr);
+    EXPECT_NE(channel->getParent(), nullptr) << "the channel stays in the scene";
+    EXPECT_EQ(rowOf(name), -1) << "the list shows the set again";
+}
+
+TEST_F(ChannelListTest, routing__byColumnAndModifier) {
+    {  // Control in Name is a right press: it selects nothing.
+        click(Ctrl::kNameColumn, 2);
+        click(Ctrl::kNameColumn, 3, RWEventModifierFlagControl);
+        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
+    }
+    {  // Shift in Value is a plain click: the row alone.
+        click(Ctrl::kValueColumn, 4, RWEventModifierFlagShift);
+        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{4}));
+    }
+    {  // A press in Key selects the row (no status cell yet: nothing else happens).
+        click(Ctrl::kKeyColumn, 1);
+        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1}));
+        EXPECT_FALSE(controller.mouseDown());
+        EXPECT_EQ(controller.cellClickedChannel(), nullptr);
+    }
+    {  // The arrows run a bound command instead of moving the selection.
+        int ran = 0;
+        auto command = std::make_shared<RWCommand>("next frame", 0xF703, 0, [&] {
+            ++ran;
+            return true;
+        });
+        RWCommandsController::sharedController().addCommand(command);
+        list.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "\xEF\x9C\x83"));
+        RWCommandsController::sharedController().removeCommand("next frame");
+        EXPECT_EQ(ran, 1);
+        list.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "\xEF\x9C\x81"));  // down arrow
+        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
+    }
+}
+
+TEST_F(ChannelListTest, hover__partsOfTheKeyCellAndTheirTips) {
+    const int64_t row = rowOf("Opacity");
+    const CGRect key = list.frameOfCellAtColumn(list.columnWithIdentifier(Ctrl::kKeyColumn), row);
+    auto over = [&](double x) {
+        moveTo(list.convertPointToWindow(CGPointMake(key.origin.x + x, key.origin.y + 5)));
+    };
+    over(5);
+    EXPECT_EQ(controller.mouseInRow(), row);
+    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartPrevious);
+    EXPECT_EQ(controller.mouseInChan(), itemAt(row)->channelBase());
+    EXPECT_EQ(list.toolTip(), TQLocalizedString("Anim Tool Tip Previous Keyframe"));
+    over(25);
+    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartNext);
+    EXPECT_EQ(list.toolTip(), TQLocalizedString("Anim Tool Tip Next Keyframe"));
+    over(45);
+    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartAddOrDelete);
+    CMTime now = host.currentTime();
+    EXPECT_EQ(list.toolTip(),
+              TQLocalizedString(itemAt(row)->channel()->hasKeyframeAtTime(&now, 0)
+                                    ? "Anim Tool Tip Delete Keyframe"
+                                    : "Anim Tool Tip Add Keyframe"));
+    over(-30);
+    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartOutside);
+    EXPECT_EQ(list.toolTip(), std::nullopt);
+    list.mouseLeftView(RWEvent::mouseEvent(RWEventType::MouseExited, CGPointZero));
+    EXPECT_EQ(controller.mouseInRow(), Ctrl::kNone);
+    EXPECT_EQ(controller.mouseInChan(), nullptr);
+}
+
+}  // namespace
