@@ -14,6 +14,7 @@
 
 #include "host/TQHostSampleScene.h"
 #include "qt/TQQtCurveViewWidget.h"
+#include "qt/TQQtOutlineView.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
 #include "qt/TQQtWindowBinding.h"
@@ -56,6 +57,7 @@ TQDemoWindow::~TQDemoWindow() {
     QObject::disconnect(_objectList, nullptr, this, nullptr);
     delete _windowBinding;
     _curveWidget->setView(nullptr);
+    _channelListView->setOutline(nullptr);
     _scroller->setModel(nullptr);
     _toolSwitch->setModel(nullptr);
     _curveSetPopUp->setModel(nullptr);
@@ -69,6 +71,8 @@ void TQDemoWindow::buildWidgets() {
     _objectList = new QListWidget(splitter);
     _objectList->setSelectionMode(QAbstractItemView::ExtendedSelection);
     _objectList->setMinimumWidth(140);
+    _channelListView = new TQQtOutlineView(splitter);
+    _channelListView->setMinimumWidth(220);
     auto* editor = new QWidget(splitter);
     auto* editorLayout = new QHBoxLayout(editor);
     editorLayout->setContentsMargins(0, 0, 0, 0);
@@ -79,10 +83,12 @@ void TQDemoWindow::buildWidgets() {
     editorLayout->addWidget(_curveWidget, 1);
     editorLayout->addWidget(_scroller);
     splitter->addWidget(_objectList);
+    splitter->addWidget(_channelListView);
     splitter->addWidget(editor);
     splitter->setStretchFactor(0, 0);
-    splitter->setStretchFactor(1, 1);
-    splitter->setSizes({170, 930});
+    splitter->setStretchFactor(1, 0);
+    splitter->setStretchFactor(2, 1);
+    splitter->setSizes({140, 320, 740});
     setCentralWidget(splitter);
     connect(_objectList, &QListWidget::itemSelectionChanged, this, [this] { objectsChosen(); });
 
@@ -119,10 +125,20 @@ void TQDemoWindow::setUpController() {
     _toolSwitch->setModel(outlets.tools);
     outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
     _curveSetPopUp->setModel(outlets.curveSetsPopUp);
+    // The channel list, as its interface file connects it.
+    _channelList->addStandardColumns();
+    _channelList->setCurveListController(&_channelListController);
+    _channelListController.setMainCurveEditorController(&_controller);
+    _channelListController.setOutlineView(_channelList.get());
+    _channelListController.awakeFromNib();
+    outlets.channels = _channelList.get();
+    outlets.channelsList = &_channelListController;
     _controller.connectOutlets(outlets);
     _controller.setupController();
     _controller.viewDidLoad();
     _editorWindow.setDelegate(&_controller);
+    _channelListView->setOutline(_channelList);
+    _controller.updateUI();
 
     // The view offers the edit tool only: the other two are shown, not offered.
     RWSegmentedControl& tools = *_controller.tools();

@@ -1,6 +1,7 @@
 #pragma once
 // The demo's main window: the full curve editor on the sample project. A list of the scene's
-// objects (the scene's selection: pick one or several) sits beside the curve view with its
+// objects (the scene's selection: pick one or several) and the channel list of the shown set
+// (values, show boxes, selection in step with the curves) sit beside the curve view with its
 // vertical zoom scroller; the tool bar holds the tool switch (edit; sketch and box are shown,
 // disabled, as the view does not offer them) and the curve set pop-up, which lists every
 // automatic and custom set. The automatic sets follow the objects selected, through the
@@ -20,11 +21,14 @@
 #include "apps/demo/TQDemoCurveEditorCtrl.h"
 #include "host/TQHostAppDelegate.h"
 #include "qt/TQQtEditMenu.h"
+#include "src/channellist/TQCurveEditorChannelList.h"
+#include "src/channellist/TQCurveEditorListController.h"
 #include "src/editor/TQCurveEditorView.h"
 
 class QAction;
 class QListWidget;
 class TQQtCurveViewWidget;
+class TQQtOutlineView;
 class TQQtPopUpButton;
 class TQQtSegmentedControl;
 class TQQtWindowBinding;
@@ -43,6 +47,10 @@ public:
     TQQtCurveViewWidget* curveWidget() const { return _curveWidget; }
     TQQtEditMenu* editMenu() const { return _editMenu; }
     QListWidget* objectList() const { return _objectList; }
+    // The channels of the selected set beside the curves.
+    TQQtOutlineView* channelListView() const { return _channelListView; }
+    TQCurveEditorChannelList& channelList() { return *_channelList; }
+    TQCurveEditorListController& channelListController() { return _channelListController; }
     TQQtSegmentedControl* toolSwitch() const { return _toolSwitch; }
     TQQtPopUpButton* curveSetPopUp() const { return _curveSetPopUp; }
     TQQtZoomScroller* verticalScroller() const { return _scroller; }
@@ -82,12 +90,17 @@ private:
     // Declared first: everything below refers to it, so it dies last.
     TQHostAppDelegate _host;
     TQCurveEditorView _view;
+    // The list and its controller; the list's widget shares the list.
+    std::shared_ptr<TQCurveEditorChannelList> _channelList =
+        std::make_shared<TQCurveEditorChannelList>();
+    TQCurveEditorListController _channelListController;
     // The editor's window, with the controller as its delegate.
     RWWindow _editorWindow;
     TQDemoCurveEditorCtrl _controller{_host};
 
     // Owned by the window as Qt children.
     QListWidget* _objectList = nullptr;
+    TQQtOutlineView* _channelListView = nullptr;
     TQQtCurveViewWidget* _curveWidget = nullptr;
     TQQtZoomScroller* _scroller = nullptr;
     TQQtSegmentedControl* _toolSwitch = nullptr;

@@ -19,7 +19,7 @@ constexpr uint64_t kCommandKeyMask = 0xc0000000003;
 constexpr uint64_t kTakenOperations = RWDragOperationCopy | RWDragOperationLink;
 // Widths of the columns, in points.
 constexpr double kNameWidth = 150.0;
-constexpr double kValueWidth = 72.0;
+constexpr double kValueWidth = 80.0;
 constexpr double kShowWidth = 22.0;
 constexpr double kKeyWidth = 3 * TQCurveEditorChannelList::kPartWidth;
 constexpr double kMenuWidth = 22.0;

@@ -71,7 +71,8 @@ protected:
     int64_t rowOf(const std::string& name) {
         for (int64_t row = 0; row < list.numberOfRows(); ++row) {
             auto* item = Ctrl::editorItem(list.itemAtRow(row));
-            if (item && dynamic_cast<TQCurveEditorChannelItem*>(item) && item->simpleName().find(name) != std::string::npos)
+            if (item && dynamic_cast<TQCurveEditorChannelItem*>(item) &&
+                item->simpleName().find(name) != std::string::npos)
                 return row;
         }
         return -1;
@@ -80,8 +81,8 @@ protected:
     // A window point in the middle of a cell (a little right of its left edge for Name).
     CGPoint at(const char* column, int64_t row) {
         const CGRect f = list.frameOfCellAtColumn(list.columnWithIdentifier(column), row);
-        return list.convertPointToWindow(CGPointMake(f.origin.x + f.size.width / 2,
-                                                     f.origin.y + f.size.height / 2));
+        return list.convertPointToWindow(
+            CGPointMake(f.origin.x + f.size.width / 2, f.origin.y + f.size.height / 2));
     }
     void click(const char* column, int64_t row, uint64_t flags = 0) {
         list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, at(column, row), flags));
@@ -118,17 +119,16 @@ TEST_F(ChannelListTest, rows__theSelectedSetOpenedWithSwatchesAndValues) {
     auto* item = dynamic_cast<TQCurveEditorChannelItem*>(itemAt(1));
     list.preparedCellAtColumn(value, 1);
     EXPECT_TRUE(valueCell->showCell());
-    EXPECT_EQ(valueCell->stringValue(),
-              *controller.valueFormatter().stringForObjectValue(item->currentValue() *
-                                                                item->conversionFactor()));
+    EXPECT_EQ(valueCell->stringValue(), *controller.valueFormatter().stringForObjectValue(
+                                            item->currentValue() * item->conversionFactor()));
 }
 
 TEST_F(ChannelListTest, selection__listAndCurvesInStep) {
     const int64_t first = 1, second = 2;
     click(Ctrl::kNameColumn, first);
     click(Ctrl::kNameColumn, second, RWEventModifierFlagCommand);
-    EXPECT_EQ(selectedNames(),
-              (std::vector<std::string>{itemAt(first)->simpleName(), itemAt(second)->simpleName()}));
+    EXPECT_EQ(selectedNames(), (std::vector<std::string>{itemAt(first)->simpleName(),
+                                                         itemAt(second)->simpleName()}));
     // The other way: a keypoint of one curve selected in the view selects its row alone.
     auto entry = std::make_shared<TQCurveSelection>();
     entry->setCurveId(itemAt(second)->channelId());
@@ -231,8 +231,8 @@ TEST_F(ChannelListTest, scrub__dragInValueCellIsOneStep) {
     const CGPoint press = at(Ctrl::kValueColumn, row);
     list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, press));
     for (double dx : {2.0, 10.0, 20.0})
-        list.mouseDragged(RWEvent::mouseEvent(RWEventType::LeftMouseDragged,
-                                              press + CGPointMake(dx, 0)));
+        list.mouseDragged(
+            RWEvent::mouseEvent(RWEventType::LeftMouseDragged, press + CGPointMake(dx, 0)));
     list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, press + CGPointMake(20, 0)));
     // Five steps of the channel's nudge step (a hundredth of opacity).
     EXPECT_NEAR(item->currentValue(), start + 5 * 0.01, 1e-9);
@@ -317,10 +317,9 @@ TEST_F(ChannelListTest, hover__partsOfTheKeyCellAndTheirTips) {
     over(45);
     EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartAddOrDelete);
     CMTime now = host.currentTime();
-    EXPECT_EQ(list.toolTip(),
-              TQLocalizedString(itemAt(row)->channel()->hasKeyframeAtTime(&now, 0)
-                                    ? "Anim Tool Tip Delete Keyframe"
-                                    : "Anim Tool Tip Add Keyframe"));
+    EXPECT_EQ(list.toolTip(), TQLocalizedString(itemAt(row)->channel()->hasKeyframeAtTime(&now, 0)
+                                                    ? "Anim Tool Tip Delete Keyframe"
+                                                    : "Anim Tool Tip Add Keyframe"));
     over(-30);
     EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartOutside);
     EXPECT_EQ(list.toolTip(), std::nullopt);
