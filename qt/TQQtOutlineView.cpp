@@ -162,7 +162,8 @@ public:
 protected:
     bool eventFilter(QObject* object, QEvent* event) override {
         auto* editor = qobject_cast<QLineEdit*>(object);
-        if (!editor || editor != _view._editor) return QStyledItemDelegate::eventFilter(object, event);
+        if (!editor || editor != _view._editor)
+            return QStyledItemDelegate::eventFilter(object, event);
         if (event->type() == QEvent::KeyPress) {
             const auto* key = static_cast<QKeyEvent*>(event);
             int64_t movement = -1;
@@ -288,7 +289,17 @@ void TQQtOutlineView::syncSelection() {
 }
 
 void TQQtOutlineView::syncVisibleRect() {
-    if (RWOutlineView* outline = this->outline())
+    RWOutlineView* outline = this->outline();
+    if (outline && outline->numberOfColumns() > 0) {
+        // The outline column takes the width the others leave.
+        double others = 0.0;
+        for (int64_t i = 1; i < outline->numberOfColumns(); ++i)
+            others += outline->tableColumns()[static_cast<size_t>(i)]->width();
+        const double width = std::max(60.0, viewport()->width() - others);
+        if (std::fabs(outline->tableColumns()[0]->width() - width) >= 1.0)
+            outline->setColumnWidth(0, width);
+    }
+    if (outline)
         outline->setVisibleRect(CGRectMake(horizontalOffset(), verticalOffset(),
                                            viewport()->width(), viewport()->height()));
 }
@@ -335,7 +346,8 @@ void TQQtOutlineView::outlineNeedsDisplay(RWOutlineView&, const CGRect& rect) {
 }
 
 void TQQtOutlineView::outlineDidBeginEditing(RWOutlineView& outline, int64_t column, int64_t row) {
-    const QModelIndex index = _model->indexForNode(outline.nodeAtRow(row), static_cast<int>(column));
+    const QModelIndex index =
+        _model->indexForNode(outline.nodeAtRow(row), static_cast<int>(column));
     if (!index.isValid()) return;
     scrollTo(index);
     edit(index);
@@ -431,8 +443,8 @@ void TQQtOutlineView::mouseReleaseEvent(QMouseEvent* event) { sendMouse(event, 1
 void TQQtOutlineView::leaveEvent(QEvent* event) {
     QTreeView::leaveEvent(event);
     if (RWOutlineView* outline = this->outline())
-        outline->mouseLeftView(RWEvent::mouseEvent(RWEventType::MouseExited,
-                                                   outline->mouseLocationInWindow()));
+        outline->mouseLeftView(
+            RWEvent::mouseEvent(RWEventType::MouseExited, outline->mouseLocationInWindow()));
 }
 
 void TQQtOutlineView::keyPressEvent(QKeyEvent* event) {
@@ -465,14 +477,6 @@ bool TQQtOutlineView::viewportEvent(QEvent* event) {
 
 void TQQtOutlineView::resizeEvent(QResizeEvent* event) {
     QTreeView::resizeEvent(event);
-    RWOutlineView* outline = this->outline();
-    if (outline && outline->numberOfColumns() > 0) {
-        // The outline column takes the width the others leave.
-        double others = 0.0;
-        for (int64_t i = 1; i < outline->numberOfColumns(); ++i)
-            others += outline->tableColumns()[static_cast<size_t>(i)]->width();
-        outline->setColumnWidth(0, std::max(60.0, viewport()->width() - others));
-    }
     syncVisibleRect();
 }
 

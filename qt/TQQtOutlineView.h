@@ -27,7 +27,6 @@
 #include "qt/TQQtControlBinding.h"
 #include "qt/TQQtServices.h"
 
-
 class TQQtOutlineModel final : public QAbstractItemModel {
 public:
     explicit TQQtOutlineModel(QObject* parent = nullptr) : QAbstractItemModel(parent) {}

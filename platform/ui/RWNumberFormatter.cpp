@@ -101,13 +101,24 @@ std::string RWNumberFormatter::formatNumber(double number, const Pattern& p) con
            fraction.back() == '0')
         fraction.pop_back();
     if (integer == "0" && p.minimumIntegerDigits == 0 && !fraction.empty()) integer.clear();
-    while (static_cast<int>(integer.size()) < p.minimumIntegerDigits) integer.insert(0, "0");
+    if (static_cast<int>(integer.size()) < p.minimumIntegerDigits)
+        integer = std::string(static_cast<size_t>(p.minimumIntegerDigits) - integer.size(), '0') +
+                  integer;
     if (p.groupingSize > 0) {
-        for (int i = static_cast<int>(integer.size()) - p.groupingSize; i > 0; i -= p.groupingSize)
-            integer.insert(static_cast<size_t>(i), ",");
+        // Built anew rather than by insertions, a separator before each full group.
+        std::string grouped;
+        const size_t size = integer.size(), group = static_cast<size_t>(p.groupingSize);
+        for (size_t i = 0; i < size; ++i) {
+            if (i > 0 && (size - i) % group == 0) grouped += ',';
+            grouped += integer[i];
+        }
+        integer = grouped;
     }
     std::string out = p.prefix + integer;
-    if (!fraction.empty()) out += "." + fraction;
+    if (!fraction.empty()) {
+        out += '.';
+        out += fraction;
+    }
     return out + p.suffix;
 }
 
@@ -120,7 +131,9 @@ std::optional<std::string> RWNumberFormatter::stringForObjectValue(
     const bool negative = std::round(std::fabs(*number) * scale) > 0.0 && *number < 0.0;
     if (!negative) return formatNumber(std::fabs(*number), _positive);
     if (_hasNegative) return formatNumber(-*number, _negative);
-    return "-" + formatNumber(-*number, _positive);
+    std::string text(1, '-');
+    text += formatNumber(-*number, _positive);
+    return text;
 }
 
 bool RWNumberFormatter::getObjectValue(RWObjectValue* value, const std::string& string,
