@@ -9,6 +9,7 @@
 
 #include "platform/ui/RWNumberFormatter.h"
 #include "platform/ui/RWOutlineView.h"
+#include "platform/ui/RWTextField.h"
 
 namespace {
 
