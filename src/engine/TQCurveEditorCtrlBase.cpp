@@ -15,6 +15,11 @@
 TQCurveEditorCtrlBase::TQCurveEditorCtrlBase() = default;
 TQCurveEditorCtrlBase::~TQCurveEditorCtrlBase() = default;
 
+void TQCurveEditorCtrlBase::setView(TQCurveEditorViewBase* view) {
+    if (_view && _view != view && _view->getController() == this) _view->setController(nullptr);
+    _view = view;
+}
+
 // ---- Lifecycle and simple state ---------------------------------------------------------
 
 void TQCurveEditorCtrlBase::init() {

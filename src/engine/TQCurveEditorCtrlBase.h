@@ -87,7 +87,9 @@ public:
     virtual void setAppDelegate(TQCurveEditorAppDelegate* delegate) { _pAppDelegate = delegate; }
     TQCurveEditorViewBase* getView() const { return _view; }
     // Not owned.
-    virtual void setView(TQCurveEditorViewBase* view) { _view = view; }
+    // A view replaced (or set to null) that still names this controller forgets it, so that it
+    // never calls a controller gone before it.
+    virtual void setView(TQCurveEditorViewBase* view);
     bool snapshotChannels() const { return _snapshotChannels; }
     void setSnapshotChannels(bool snapshot) { _snapshotChannels = snapshot; }
     bool negativeRangeAllowed() const { return _negativeRangeAllowed; }

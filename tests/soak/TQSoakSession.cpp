@@ -32,7 +32,8 @@ std::string firstDifference(const TQChannelBase& a, const TQChannelBase& b) {
         for (size_t i = 0; i < ca->size(); ++i) {
             const TQChannelBase* x = (*ca)[i];
             const TQChannelBase* y = (*cb)[i];
-            if (x && y && !sameAnimation(*x, *y)) return a.getName() + "/" + firstDifference(*x, *y);
+            if (x && y && !sameAnimation(*x, *y))
+                return a.getName() + "/" + firstDifference(*x, *y);
         }
     }
     return a.getName();
@@ -119,7 +120,8 @@ std::string TQSoakSession::step() {
         (this->*e.run)();
         frame();
         if (!_failure.empty()) return std::string(e.name) + ": " + _failure;
-        const std::string done = std::string(e.name) + (_lastDetail.empty() ? "" : " " + _lastDetail);
+        const std::string done =
+            std::string(e.name) + (_lastDetail.empty() ? "" : " " + _lastDetail);
         _trace.push_back(done);
         if (_trace.size() > kTraceLength) _trace.pop_front();
         std::string broken = invariants();
@@ -137,10 +139,11 @@ std::string TQSoakSession::unwind() {
     size_t undone = 0;
     while (_host.canUndo() && _host.undo()) ++undone;
     if (!sceneIs(*_start))
-        return "after " + std::to_string(undone) + " undos the scene is not the one it started from";
+        return "after " + std::to_string(undone) +
+               " undos the scene is not the one it started from";
     for (size_t i = 0; i < undone; ++i)
-        if (!_host.redo()) return "redo " + std::to_string(i + 1) + " of " +
-                                  std::to_string(undone) + " refused";
+        if (!_host.redo())
+            return "redo " + std::to_string(i + 1) + " of " + std::to_string(undone) + " refused";
     if (!sceneIs(*end)) return "redo to the end gives another scene";
     return {};
 }
@@ -170,9 +173,12 @@ void TQSoakSession::click() {
 }
 
 void TQSoakSession::drag() {
-    static const uint64_t kModifiers[] = {
-        0, 0, 0, RWEventModifierFlagShift, RWEventModifierFlagControl,
-        RWEventModifierFlagOption | RWEventModifierFlagCommand};
+    static const uint64_t kModifiers[] = {0,
+                                          0,
+                                          0,
+                                          RWEventModifierFlagShift,
+                                          RWEventModifierFlagControl,
+                                          RWEventModifierFlagOption | RWEventModifierFlagCommand};
     static const char* const kNames[] = {"", "", "", "shift", "control", "option-command"};
     const CGPoint from = pressPoint();
     const CGPoint to = CGPointMake(from.x + uniform(-120.0, 120.0), from.y + uniform(-90.0, 90.0));
@@ -200,10 +206,10 @@ void TQSoakSession::menuCommand() {
     static const struct {
         const char* name;
         void (C::*run)(void*);
-    } kCommands[] = {{"delete", &C::menuDelete},       {"duplicate", &C::menuDuplicate},
-                     {"reverse", &C::menuReverse},     {"ease in", &C::menuEaseIn},
-                     {"ease out", &C::menuEaseOut},    {"ease both", &C::menuEaseBoth},
-                     {"lock", &C::menuLockSelected},   {"disable", &C::menuDisableSelected},
+    } kCommands[] = {{"delete", &C::menuDelete},           {"duplicate", &C::menuDuplicate},
+                     {"reverse", &C::menuReverse},         {"ease in", &C::menuEaseIn},
+                     {"ease out", &C::menuEaseOut},        {"ease both", &C::menuEaseBoth},
+                     {"lock", &C::menuLockSelected},       {"disable", &C::menuDisableSelected},
                      {"add keyframe", &C::menuAddKeyframe}};
     const auto& command = kCommands[below(std::size(kCommands))];
     ++_counts[std::string("menu ") + command.name];
@@ -336,9 +342,7 @@ std::vector<CGPoint> TQSoakSession::keypointPoints() {
     return points;
 }
 
-CGPoint TQSoakSession::anyPoint() {
-    return CGPointMake(uniform(0.0, 900.0), uniform(0.0, 500.0));
-}
+CGPoint TQSoakSession::anyPoint() { return CGPointMake(uniform(0.0, 900.0), uniform(0.0, 500.0)); }
 
 CGPoint TQSoakSession::pressPoint() {
     if (below(4) == 0) return anyPoint();
@@ -353,19 +357,12 @@ void TQSoakSession::frame() {
     _view.displayLayer(&_encoder);
 }
 
-void TQSoakSession::mouse(RWEventType type, const CGPoint& at, uint64_t modifiers,
-                          int64_t clicks) {
+void TQSoakSession::mouse(RWEventType type, const CGPoint& at, uint64_t modifiers, int64_t clicks) {
     const RWEvent event = RWEvent::mouseEvent(type, at, modifiers, clicks);
     switch (type) {
-        case RWEventType::LeftMouseDown:
-            _view.mouseDown(event);
-            break;
-        case RWEventType::LeftMouseDragged:
-            _view.mouseDragged(event);
-            break;
-        default:
-            _view.mouseUp(event);
-            break;
+        case RWEventType::LeftMouseDown: _view.mouseDown(event); break;
+        case RWEventType::LeftMouseDragged: _view.mouseDragged(event); break;
+        default: _view.mouseUp(event); break;
     }
 }
 

@@ -85,5 +85,6 @@ private:
     size_t _keypointPresses = 0;
     std::string _failure;
     std::string _lastDetail;
-    std::deque<std::string> _trace;  // the last steps, for a failure's report  // which command or modifier the last action used
+    std::deque<std::string>
+        _trace;  // the last steps, for a failure's report  // which command or modifier the last action used
 };

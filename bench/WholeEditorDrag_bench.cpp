@@ -1,0 +1,161 @@
+// One drag step through the whole editor on the stress scene (100 objects of 30 channels,
+// 1,000,000 keyframes), as the demo window of 1600 x 900 runs it: the curve view 1250 x 850
+// drawable pixels, the channel list 300 x 850 beside it. Each step is the mouse event, the
+// move of the selected keypoints, the editor's notify of the host's words, the list's update
+// and the drawing of its marked rows, and the view's frame built and painted with QPainter into
+// an image. The keypoints stay selected across steps and the pointer goes down and up again in
+// turn, so every step moves them.
+//
+// BM_WholeEditorDragStep/0: two objects selected, the "Animated" set shows their 60 curves;
+// 1,000 keypoints selected on 50 of them. Target: p99 at most 16 ms.
+// BM_WholeEditorDragStep/1: every object selected, the "All" set over all 3,000 channels, the
+// same 1,000 keypoints selected. No target: what it costs.
+// Counters p50 and p99 are in milliseconds, of the steps of the run.
+#include <benchmark/benchmark.h>
+
+#include <QGuiApplication>
+#include <algorithm>
+#include <chrono>
+#include <memory>
+#include <set>
+
+#include "host/TQHostAppDelegate.h"
+#include "host/TQHostDenseScene.h"
+#include "platform/ui/testing/RWTestDoubles.h"
+#include "qt/TQQtPainterEncoder.h"
+#include "src/channellist/TQCurveEditorChannelList.h"
+#include "src/channellist/TQCurveEditorListController.h"
+#include "src/editor/TQCurveEditorCtrl.h"
+#include "src/editor/TQCurveEditorView.h"
+
+namespace {
+
+constexpr double kViewWidth = 1250.0, kViewHeight = 850.0;
+constexpr size_t kSelectedKeypoints = 1000, kSelectedCurves = 50;
+
+// Text is laid out with the fonts of a GUI application; no display is needed.
+void ensureGuiApplication() {
+    if (QGuiApplication::instance()) return;
+    qputenv("QT_QPA_PLATFORM", "offscreen");
+    static int argc = 1;
+    static char name[] = "vce_bench";
+    static char* argv[] = {name, nullptr};
+    static QGuiApplication app(argc, argv);
+}
+
+struct WholeEditor {
+    TQHostAppDelegate host;
+    RWManualClock clock;
+    RWManualTimer timer{clock};
+    RWStubViewHost viewHost{kViewWidth, kViewHeight, 1.0};
+    TQCurveEditorView view;
+    TQCurveEditorCtrl ctrl;
+    TQCurveEditorChannelList list;
+    TQCurveEditorListController listController;
+    TQQtPainterEncoder encoder{QSize(int(kViewWidth), int(kViewHeight))};
+
+    WholeEditor() {
+        ensureGuiApplication();
+        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneSpec());
+        view.setViewHost(&viewHost);
+        view.setClock(&clock);
+        view.setTimer(&timer);
+        const CMTimeRange range = host.displayRange();
+        view.setTotalRange(&range.start, &range.duration);
+        list.addStandardColumns();
+        list.setCurveListController(&listController);
+        listController.setMainCurveEditorController(&ctrl);
+        listController.setOutlineView(&list);
+        listController.awakeFromNib();
+        ctrl.init();
+        ctrl.setAppDelegate(&host);
+        ctrl.setView(&view);
+        TQCurveEditorOutlets outlets;
+        outlets.verticalScroller = std::make_shared<RWZoomScroller>();
+        outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
+        outlets.channels = &list;
+        outlets.channelsList = &listController;
+        ctrl.connectOutlets(outlets);
+        ctrl.setupController();
+        ctrl.viewDidLoad();
+        host.addNotificationReceiver(&ctrl);
+        list.setVisibleRect(CGRectMake(0, 0, 300, kViewHeight));
+    }
+    ~WholeEditor() {
+        host.removeNotificationReceiver(&ctrl);
+        view.setViewHost(nullptr);
+    }
+
+    void show(bool all) {
+        const std::vector<TQChannelObjectRootBase*> objects = host.scene().objects();
+        std::vector<TQChannelBase*> chosen(objects.begin(), objects.begin() + (all ? long(objects.size()) : 2));
+        host.setSelectedObjects(chosen);
+        const char* wanted = all ? "All" : "Animated";
+        for (const TQCurveSetPtr& set : ctrl.curveSets())
+            if (set && set->curveSetName() == wanted) ctrl.setSelectedCurveSet(set);
+        ctrl.showAll();
+        view.frameAll(1);
+        frame();
+    }
+    // 20 keypoints on each of the first 50 curves that have them, the first one primary.
+    void selectKeypoints() {
+        view.selectAll();
+        std::vector<TQCurveSelectionPtr>& entries = view.getSelection()->getSelectionArray();
+        std::vector<TQCurveSelectionPtr> kept;
+        std::set<uint32_t> curves;
+        std::map<uint32_t, size_t> perCurve;
+        for (const TQCurveSelectionPtr& e : entries) {
+            if (!e || !e->isKeypoint()) continue;
+            if (!curves.contains(e->getCurveId()) && curves.size() == kSelectedCurves) continue;
+            curves.insert(e->getCurveId());
+            if (perCurve[e->getCurveId()]++ >= kSelectedKeypoints / kSelectedCurves) continue;
+            kept.push_back(e);
+        }
+        entries = std::move(kept);
+    }
+    CGPoint primaryPoint() {
+        double u = 0.0, y = 0.0;
+        ctrl.getSelectedVertex(view.getSelection()->selectionAtIndex(0).get(), &u, &y);
+        return view.getPointScreen(CGPointMake(u, y));
+    }
+    void frame() {
+        timer.advance(0.05);
+        view.displayLayer(&encoder);
+    }
+    size_t selected() { return view.getSelection()->size(); }
+};
+
+void BM_WholeEditorDragStep(benchmark::State& state) {
+    static WholeEditor e;
+    e.show(state.range(0) != 0);
+    e.selectKeypoints();
+    const CGPoint start = e.primaryPoint();
+    e.view.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, start));
+    std::vector<double> steps;
+    int turn = 0;
+    for (auto _ : state) {
+        const auto t0 = std::chrono::steady_clock::now();
+        e.clock.advance(0.05);
+        const double dy = (turn++ % 2 == 0) ? 6.0 : 0.0;
+        e.view.mouseDragged(RWEvent::mouseEvent(RWEventType::LeftMouseDragged,
+                                                CGPointMake(start.x + 3.0, start.y + dy)));
+        e.listController.update();
+        e.list.displayIfNeeded([](RWCell&, const CGRect&, int64_t, int64_t) {});
+        e.view.displayLayer(&e.encoder);
+        steps.push_back(
+            std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - t0)
+                .count());
+    }
+    e.view.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, start));
+    std::sort(steps.begin(), steps.end());
+    auto at = [&](double q) { return steps.empty() ? 0.0 : steps[size_t(q * double(steps.size() - 1))]; };
+    state.counters["p50_ms"] = at(0.50);
+    state.counters["p99_ms"] = at(0.99);
+    state.counters["curves"] = static_cast<double>(e.ctrl.numberOfChannelItems());
+    state.counters["selected"] = static_cast<double>(e.selected());
+    // Back where it was, for the next run.
+    while (e.host.canUndo() && e.host.undo()) {}
+}
+BENCHMARK(BM_WholeEditorDragStep)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond)->Iterations(200);
+
+}  // namespace
