@@ -213,7 +213,10 @@ void TQCurveEditorCtrl::setupController() {
     }
 }
 
-void TQCurveEditorCtrl::viewDidLoad() { refreshPopUp(); }
+void TQCurveEditorCtrl::viewDidLoad() {
+    constructCurveSets();
+    refreshPopUp();
+}
 
 // ---- Notifications ---------------------------------------------------------------------------
 

@@ -7,7 +7,7 @@
 // Start, in this order:
 //   construct; init(); setAppDelegate(host); setView(view); connectOutlets(controls);
 //   setupController()   the automatic sets, the controls, the Animated set selected;
-//   viewDidLoad()       the pop-up filled.
+//   viewDidLoad()       the saved custom sets built (constructCurveSets), the pop-up filled.
 // The host delivers its notification words, and those the framework posts, to notify().
 // Before the window closes it asks windowShouldClose (the controller is the window's
 // delegate); the destructor undoes the set-up: it detaches the view, stops observing the
@@ -42,6 +42,7 @@
 #include "src/engine/TQCurveEditorCtrlBase.h"
 
 class TQCurveEditorView;
+class TQCurveSetListSerializer;
 
 // The controls of the editor, as a host connects them.
 struct TQCurveEditorOutlets {
@@ -112,7 +113,7 @@ public:
     // last values, the manager's table, the Animated set selected, the add and remove
     // control, the pop-up.
     virtual void setupController();
-    // Fills the pop-up.
+    // Builds the custom sets the host read from its document, then fills the pop-up.
     virtual void viewDidLoad();
 
     // ---- Controls ----
@@ -299,6 +300,24 @@ public:
     // Shows the item alone, or, when it already is, everything again.
     void soloItem(TQCurveEditorItem* item);
 
+    // ---- Curve sets: the saved form (TQCurveEditorCtrlSavedSets.cpp) ----
+
+    // Fills the list from the custom sets, in order: each set's name, kind and the channels
+    // of its present items that still resolve in the scene, with their colours; and the
+    // number of the selected set. The shortcut is not passed on: every saved set has none.
+    // A selected set without a number (Pivot) leaves the list's number as it was.
+    void saveCurveSets(TQCurveSetListSerializer* list);
+    // Builds custom sets from the list the delegate hands over (getCurveSetListSerializer):
+    // each set by name (an existing one of that name takes the channels), its shortcut, the
+    // channels that resolve in the scene with their colours, then its kind. Then selects the
+    // set the list's number names under the delegate's document version, and refreshes it.
+    // Nothing happens without a list.
+    void constructCurveSets();
+    // The set a saved number names in a document of that version: the automatic sets first
+    // (fewer of them in older versions), then the custom sets in order. A number past the
+    // custom sets answers the Animated set.
+    TQCurveSetPtr curveSetForSavedNumber(uint32_t number, double version) const;
+
     // ---- The curve set pop-up ----
 
     // Rebuilds the pop-up's menu: the automatic sets, the sets by property when offered, the
@@ -323,6 +342,8 @@ protected:
     TQCurveSetPtr customSetForAdding();
     // Step 7 of notify: the changed channels against the selected set.
     void notifyChannelsChanged(bool stale);
+    // The automatic sets in the order a document of that version numbers them.
+    std::vector<TQCurveSetPtr> numberedAutomaticCurveSets(double version) const;
     // Step 9 of notify: the playhead moved.
     void notifyTimeChanged();
     // A scroller pan of the view by a fraction of its range.
