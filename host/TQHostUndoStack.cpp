@@ -134,6 +134,7 @@ void TQHostUndoStack::settlePending() {
 }
 
 void TQHostUndoStack::pushUndo(std::unique_ptr<Step> step) {
+    step->identity = ++_lastIdentity;
     _redo.clear();
     _undo.push_back(std::move(step));
     if (_levels > 0 && _undo.size() > _levels)
@@ -219,6 +220,11 @@ size_t TQHostUndoStack::undoCount() {
 size_t TQHostUndoStack::redoCount() {
     if (_depth == 0) settlePending();
     return _redo.size();
+}
+
+uint64_t TQHostUndoStack::position() {
+    if (_depth == 0) settlePending();
+    return _undo.empty() ? 0 : _undo.back()->identity;
 }
 
 void TQHostUndoStack::clear() {

@@ -96,6 +96,11 @@ public:
     BNString redoDescription();
     size_t undoCount();
     size_t redoCount();
+    // Where the history stands: an identity of the step that undo would take back, 0 with
+    // none. Undo and redo back to a step give its identity again and a new step never reuses
+    // one, so a host that notes the position when it saves can tell whether its document
+    // changed since.
+    uint64_t position();
     // Forgets the history; an open step stays open.
     void clear();
 
@@ -121,6 +126,7 @@ private:
     using Part = std::variant<ChannelPart, ClientPart>;
     struct Step {
         BNString description;
+        uint64_t identity = 0;  // given when the step enters the history
         std::vector<Part> parts;
         // Serials of the channels captured while the step is open, so that each channel is
         // captured once (an address may be reused by a channel made inside the step).
@@ -143,6 +149,7 @@ private:
     int _depth = 0;
     bool _applying = false;
     size_t _levels = kDefaultLevelsOfUndo;
+    uint64_t _lastIdentity = 0;
     std::vector<std::unique_ptr<Step>> _undo;  // oldest first
     std::vector<std::unique_ptr<Step>> _redo;  // the next redo last
     std::unordered_map<const void*, TQHostUndoClient*> _clients;

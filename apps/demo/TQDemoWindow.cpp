@@ -1,18 +1,23 @@
 #include "apps/demo/TQDemoWindow.h"
 
 #include <QAction>
+#include <QCloseEvent>
+#include <QDir>
+#include <QFile>
+#include <QFileDialog>
+#include <QFileInfo>
 #include <QHBoxLayout>
 #include <QKeySequence>
 #include <QLabel>
 #include <QListWidget>
 #include <QMenuBar>
+#include <QPushButton>
 #include <QSignalBlocker>
 #include <QSplitter>
 #include <QStatusBar>
 #include <QTimer>
 #include <QToolBar>
 
-#include "host/TQHostSampleScene.h"
 #include "qt/TQQtCurveViewWidget.h"
 #include "qt/TQQtOutlineView.h"
 #include "qt/TQQtPopUpButton.h"
@@ -25,16 +30,26 @@ namespace {
 // Role of a list row's data: the object's id in the scene.
 constexpr int kObjectIdRole = Qt::UserRole + 1;
 
+// Project files: the host's XML document under a name of its own.
+constexpr const char* kProjectSuffix = "vceproj";
+QString projectFilter() {
+    return QObject::tr("Projects (*.%1);;XML Files (*.xml);;All Files (*)").arg(kProjectSuffix);
+}
+
+// A path as the host's file functions take it: in the file system's encoding.
+std::string fileSystemPath(const QString& path) { return QFile::encodeName(path).toStdString(); }
+
 }  // namespace
 
 TQDemoWindow::TQDemoWindow() {
+    installDefaultPrompts();
     buildWidgets();
     buildMenus();
-    TQHostLoadSampleScene(_host, TQHostObjectFamily::Kestrel);
-    // The title and the bouncing logo: the piece's two busiest objects.
-    _host.setSelectedObjects({_host.scene().objectNamed(kTQHostSampleTitleObject),
-                              _host.scene().objectNamed(kTQHostSampleBehaviorObject)});
+    _document.loadSample();
     setUpController();
+    _document.applyEditorState();
+    _autoZoom->setChecked(_view.autoZoom() != 0);
+    _view.registerBoxUndo(_host);
     // Registered after the controller (which registers as it is made): the window hears each
     // word once the editor is in step with it.
     _host.addNotificationReceiver(this);
@@ -43,9 +58,8 @@ TQDemoWindow::TQDemoWindow() {
     refreshTitle();
     _editMenu->refresh();
     statusBar()->showMessage(
-        tr("Choose objects on the left and a curve set above. Click a keypoint to select it, "
-           "drag to move it (Shift: one axis); drag on empty space for a rubber band. Ctrl+Z "
-           "undoes."));
+        tr("Pick objects on the left and a curve set above. Click or band keypoints and drag "
+           "them (Shift: one axis); the box tool puts a box around a band. Ctrl+Z undoes."));
     resize(1100, 620);
     _curveWidget->setFocus();
 }
@@ -54,6 +68,7 @@ TQDemoWindow::~TQDemoWindow() {
     // Qt deletes the child widgets after these members are gone: detach them first, and let
     // no signal of a dying child reach this window.
     _host.removeNotificationReceiver(this);
+    _view.unregisterBoxUndo(_host);
     QObject::disconnect(_objectList, nullptr, this, nullptr);
     delete _windowBinding;
     _curveWidget->setView(nullptr);
@@ -106,10 +121,9 @@ void TQDemoWindow::buildWidgets() {
 }
 
 void TQDemoWindow::setUpController() {
+    // The view's settings, auto zoom among them, come from the document's editor state after.
     const CMTimeRange range = _host.displayRange();
     _view.setTotalRange(&range.start, &range.duration);
-    // The scroller works from the start; View > Auto Zoom hands the vertical fit to the view.
-    _view.setAutoZoom(0);
 
     _controller.init();
     _controller.setAppDelegate(&_host);
@@ -140,18 +154,27 @@ void TQDemoWindow::setUpController() {
     _channelListView->setOutline(_channelList);
     _controller.updateUI();
 
-    // The view offers the edit tool only: the other two are shown, not offered.
+    // The view offers the edit and box tools: sketching is shown, not offered.
     RWSegmentedControl& tools = *_controller.tools();
     const char* descriptions[] = {"Edit keypoints", "Sketch a curve (not offered here)",
-                                  "Transform keypoints with a box (not offered here)"};
+                                  "Transform keypoints with a box"};
     for (int64_t i = 0; i < tools.segmentCount() && i < 3; ++i)
         tools.setAccessibilityDescription(descriptions[i], i);
     tools.setEnabled(false, static_cast<int64_t>(TQTool::kSketch));
-    tools.setEnabled(false, static_cast<int64_t>(TQTool::kBox));
 }
 
 void TQDemoWindow::buildMenus() {
     QMenu* file = menuBar()->addMenu(tr("&File"));
+    auto addFileAction = [&](const QString& title, QKeySequence::StandardKey key, auto command) {
+        QAction* action = file->addAction(title);
+        action->setShortcut(key);
+        connect(action, &QAction::triggered, this, [this, command] { (this->*command)(); });
+    };
+    addFileAction(tr("&New"), QKeySequence::New, &TQDemoWindow::newDocument);
+    addFileAction(tr("&Open…"), QKeySequence::Open, &TQDemoWindow::open);
+    addFileAction(tr("&Save"), QKeySequence::Save, &TQDemoWindow::save);
+    addFileAction(tr("Save &As…"), QKeySequence::SaveAs, &TQDemoWindow::saveAs);
+    file->addSeparator();
     QAction* quit = file->addAction(tr("&Quit"));
     quit->setShortcut(QKeySequence::Quit);
     connect(quit, &QAction::triggered, this, &QWidget::close);
@@ -165,6 +188,9 @@ void TQDemoWindow::buildMenus() {
     QAction* none = _editMenu->menu()->addAction(tr("Select &None"));
     none->setShortcut(QKeySequence(Qt::CTRL | Qt::SHIFT | Qt::Key_A));
     connect(none, &QAction::triggered, this, [this] { _view.selectNone(); });
+    _delete = _editMenu->menu()->addAction(tr("&Delete"));
+    _delete->setShortcuts({QKeySequence(QKeySequence::Delete), QKeySequence(Qt::Key_Backspace)});
+    connect(_delete, &QAction::triggered, this, [this] { deleteSelection(); });
 
     QMenu* viewMenu = menuBar()->addMenu(tr("&View"));
     QAction* frame = viewMenu->addAction(tr("&Frame All"));
@@ -175,20 +201,135 @@ void TQDemoWindow::buildMenus() {
     connect(_autoZoom, &QAction::triggered, this, [this] {
         _controller.setAutoZoom(nullptr);
         _autoZoom->setChecked(_view.autoZoom() != 0);
+        // The user's choice is the preference from now on, and the document's setting.
+        _document.project().editorState().setAutoZoom(_view.autoZoom() != 0);
     });
 }
 
 void TQDemoWindow::showEvent(QShowEvent* event) {
     QMainWindow::showEvent(event);
     if (_framedOnce) return;
-    // Framing fits the curves to the view's size, which the layout settles after the show.
+    // Framing fits the curves to the view's size, which the layout settles after the show. A
+    // document from a file keeps the time range it was saved with.
     _framedOnce = true;
-    QTimer::singleShot(0, this, [this] { frameAll(); });
+    QTimer::singleShot(0, this, [this] { frameAll(_document.isUntitled()); });
 }
 
-void TQDemoWindow::frameAll() {
-    _view.frameAll(1);
+void TQDemoWindow::closeEvent(QCloseEvent* event) {
+    if (maybeSave())
+        event->accept();
+    else
+        event->ignore();
+}
+
+void TQDemoWindow::frameAll(bool includeTime) {
+    _view.frameAll(includeTime ? 1 : 0);
     _controller.updateUI();
+}
+
+void TQDemoWindow::deleteSelection() {
+    // The box tool deletes no keypoint: Delete takes the box away.
+    if (_controller.getCurrentTool() == TQTool::kBox)
+        _view.forgetBox();
+    else
+        _controller.deleteKeypoints();
+}
+
+// ---- The document ---------------------------------------------------------------------------
+
+void TQDemoWindow::installDefaultPrompts() {
+    _prompts.askToSaveChanges = [this](const QString& name) {
+        QMessageBox box(QMessageBox::Warning, tr("Unsaved Changes"),
+                        tr("Do you want to save the changes you made to “%1”?").arg(name),
+                        QMessageBox::Save | QMessageBox::Discard | QMessageBox::Cancel, this);
+        box.setInformativeText(tr("Your changes will be lost if you don't save them."));
+        box.button(QMessageBox::Discard)->setText(tr("Don't Save"));
+        box.setDefaultButton(QMessageBox::Save);
+        return static_cast<QMessageBox::StandardButton>(box.exec());
+    };
+    _prompts.chooseFileToOpen = [this] {
+        return QFileDialog::getOpenFileName(this, tr("Open Project"), QString(), projectFilter());
+    };
+    _prompts.chooseFileToSave = [this](const QString& suggested) {
+        QFileDialog dialog(this, tr("Save Project As"), suggested, projectFilter());
+        dialog.setAcceptMode(QFileDialog::AcceptSave);
+        dialog.setDefaultSuffix(QString::fromLatin1(kProjectSuffix));
+        if (dialog.exec() != QDialog::Accepted || dialog.selectedFiles().isEmpty())
+            return QString();
+        return dialog.selectedFiles().front();
+    };
+    _prompts.showError = [this](const QString& text, const QString& detail) {
+        QMessageBox box(QMessageBox::Critical, tr("VantaCurveEditor Demo"), text, QMessageBox::Ok,
+                        this);
+        box.setInformativeText(detail);
+        box.exec();
+    };
+}
+
+bool TQDemoWindow::maybeSave() {
+    if (!_document.isModified()) return true;
+    switch (_prompts.askToSaveChanges(QString::fromStdString(_document.displayName()))) {
+        case QMessageBox::Save: return save();
+        case QMessageBox::Discard: return true;
+        default: return false;
+    }
+}
+
+bool TQDemoWindow::newDocument() {
+    if (!maybeSave()) return false;
+    _document.newDocument();
+    documentReplaced();
+    return true;
+}
+
+bool TQDemoWindow::open() {
+    if (!maybeSave()) return false;
+    const QString path = _prompts.chooseFileToOpen();
+    return !path.isEmpty() && !openFile(path);
+}
+
+std::optional<BNSerializerError> TQDemoWindow::openFile(const QString& path) {
+    std::optional<BNSerializerError> error = _document.open(fileSystemPath(path));
+    if (error) {
+        _prompts.showError(
+            tr("The project “%1” could not be opened.").arg(QFileInfo(path).fileName()),
+            QString::fromStdString(error->text()));
+        return error;
+    }
+    documentReplaced();
+    return std::nullopt;
+}
+
+bool TQDemoWindow::save() {
+    if (_document.isUntitled()) return saveAs();
+    return writeDocument(QString::fromStdString(_document.path()));
+}
+
+bool TQDemoWindow::saveAs() {
+    const QString suggested = _document.isUntitled()
+                                  ? QDir::home().filePath(tr("Untitled.%1").arg(kProjectSuffix))
+                                  : QFile::decodeName(QByteArray::fromStdString(_document.path()));
+    const QString path = _prompts.chooseFileToSave(suggested);
+    return !path.isEmpty() && writeDocument(path);
+}
+
+bool TQDemoWindow::writeDocument(const QString& path) {
+    if (const std::optional<BNSerializerError> error = _document.saveAs(fileSystemPath(path))) {
+        _prompts.showError(
+            tr("The project could not be saved as “%1”.").arg(QFileInfo(path).fileName()),
+            QString::fromStdString(error->text()));
+        return false;
+    }
+    refreshTitle();
+    return true;
+}
+
+void TQDemoWindow::documentReplaced() {
+    _autoZoom->setChecked(_view.autoZoom() != 0);
+    frameAll(false);
+    refreshObjectList();
+    refreshTitle();
+    _editMenu->refresh();
 }
 
 void TQDemoWindow::refreshObjectList() {
@@ -252,16 +393,19 @@ QPalette TQDemoWindow::darkPalette() {
 }
 
 void TQDemoWindow::refreshTitle() {
-    const TQCurveSetPtr& set = _controller.selectedCurveSet();
-    setWindowTitle(
-        set ? tr("VantaCurveEditor Demo - %1").arg(QString::fromStdString(set->curveSetName()))
-            : tr("VantaCurveEditor Demo"));
+    // "[*]" is where Qt shows the modified mark.
+    QString title = QString::fromStdString(_document.displayName()) + QStringLiteral("[*]");
+    if (const TQCurveSetPtr& set = _controller.selectedCurveSet())
+        title += QStringLiteral(" - ") + QString::fromStdString(set->curveSetName());
+    setWindowTitle(title + tr(" - VantaCurveEditor Demo"));
+    setWindowModified(_document.isModified());
 }
 
 void TQDemoWindow::notify(TQNotificationWord word) {
     if (word & (kTQNotifySceneChanged | kTQNotifySceneReset | kTQNotifyObjectSelectionChanged))
         refreshObjectList();
-    if (word & kTQNotifyCurveSetContentChanged) refreshTitle();
-    // Any word may follow a change of the history (a drag's end, an undo): cheap to refresh.
+    // Any word may follow a change of the history (a drag's end, an undo) or of the sets:
+    // both are cheap to refresh.
+    refreshTitle();
     _editMenu->refresh();
 }

@@ -1,29 +1,43 @@
 #pragma once
-// The demo's main window: the full curve editor on the sample project. A list of the scene's
-// objects (the scene's selection: pick one or several) and the channel list of the shown set
-// (values, show boxes, selection in step with the curves) sit beside the curve view with its
-// vertical zoom scroller; the tool bar holds the tool switch (edit; sketch and box are shown,
-// disabled, as the view does not offer them) and the curve set pop-up, which lists every
-// automatic and custom set. The automatic sets follow the objects selected, through the
-// controller's notify. View > Frame All fits the shown curves; View > Auto Zoom lets the view
-// fit them vertically at every frame (the scroller is disabled meanwhile). The Edit menu undoes
-// and redoes through the host's history and names the step it would undo.
+// The demo's main window: the full curve editor on a project of the reference host, the
+// sample piece at start (untitled). A list of the scene's objects (the scene's selection: pick
+// one or several) and the channel list of the shown set (values, show boxes, selection in step
+// with the curves) sit beside the curve view with its vertical zoom scroller; the tool bar
+// holds the tool switch (edit and box; sketch is shown, disabled, as the view does not offer
+// it) and the curve set pop-up, which lists every automatic and custom set. The automatic sets
+// follow the objects selected, through the controller's notify. View > Frame All fits the
+// shown curves; View > Auto Zoom lets the view fit them vertically at every frame (the
+// scroller is disabled meanwhile). The Edit menu undoes
+// and redoes through the host's history and names the step it would undo; Delete deletes the
+// selected keypoints, or with the box tool forgets the box.
+//
+// The File menu makes a new document, opens and saves project files (Save As… where the
+// document has no file yet); the title shows the file's name and a mark while the document
+// has unsaved changes, and New, Open and closing the window ask first whether to save them
+// (Save, Don't Save, Cancel). A file that cannot be read is named in an error dialog, and the
+// document that was open stays as it was. The dialogs go through prompts() so that tests can
+// answer them.
 //
 // The window owns the host (and so the scene), the controller, the view and the control
 // models; Qt owns the widgets. Notification words reach the controller first, then the
 // window, which keeps the list, the title and the menus in step.
 
 #include <QMainWindow>
+#include <QMessageBox>
 #include <QPalette>
+#include <QString>
 
+#include <functional>
 #include <memory>
+#include <optional>
 
 #include "apps/demo/TQDemoCurveEditorCtrl.h"
+#include "apps/demo/TQDemoCurveEditorView.h"
+#include "apps/demo/TQDemoDocument.h"
 #include "host/TQHostAppDelegate.h"
 #include "qt/TQQtEditMenu.h"
 #include "src/channellist/TQCurveEditorChannelList.h"
 #include "src/channellist/TQCurveEditorListController.h"
-#include "src/editor/TQCurveEditorView.h"
 
 class QAction;
 class QListWidget;
@@ -34,6 +48,18 @@ class TQQtSegmentedControl;
 class TQQtWindowBinding;
 class TQQtZoomScroller;
 
+// The questions the File menu asks; each starts as the Qt dialog that asks it.
+struct TQDemoPrompts {
+    // Whether to save the named document's changes: Save, Discard (Don't Save) or Cancel.
+    std::function<QMessageBox::StandardButton(const QString& name)> askToSaveChanges;
+    // A file to open, or an empty text for none.
+    std::function<QString()> chooseFileToOpen;
+    // Where to save, starting from a suggested name; an empty text for nowhere.
+    std::function<QString(const QString& suggested)> chooseFileToSave;
+    // What went wrong, and the reader's or writer's own words on it.
+    std::function<void(const QString& text, const QString& detail)> showError;
+};
+
 class TQDemoWindow final : public QMainWindow,
                            public TQNotificationReceiver,
                            public TQQtUndoHistory {
@@ -43,7 +69,9 @@ public:
 
     TQHostAppDelegate& host() { return _host; }
     TQDemoCurveEditorCtrl& controller() { return _controller; }
-    TQCurveEditorView& curveView() { return _view; }
+    TQDemoCurveEditorView& curveView() { return _view; }
+    TQDemoDocument& document() { return _document; }
+    TQDemoPrompts& prompts() { return _prompts; }
     TQQtCurveViewWidget* curveWidget() const { return _curveWidget; }
     TQQtEditMenu* editMenu() const { return _editMenu; }
     QListWidget* objectList() const { return _objectList; }
@@ -55,9 +83,22 @@ public:
     TQQtPopUpButton* curveSetPopUp() const { return _curveSetPopUp; }
     TQQtZoomScroller* verticalScroller() const { return _scroller; }
     QAction* autoZoomAction() const { return _autoZoom; }
+    QAction* deleteAction() const { return _delete; }
 
-    // Fits the shown curves into the view, in value and in time.
-    void frameAll();
+    // Fits the shown curves into the view, in value and, unless told not to, in time.
+    void frameAll(bool includeTime = true);
+
+    // The File menu's commands. Each answers whether it went through (false when the user
+    // cancelled or a file could not be read or written).
+    bool newDocument();
+    bool open();
+    bool save();
+    bool saveAs();
+    // Opens the file without a question about unsaved changes (the command line's file, a
+    // file the caller asked about itself); an error dialog names a file that cannot be read.
+    std::optional<BNSerializerError> openFile(const QString& path);
+    // Asks whether to save unsaved changes; false when the user cancels (or the save fails).
+    bool maybeSave();
 
     // The application's look: a dark palette that matches the curve view and its light tool
     // icons (for the Fusion style).
@@ -77,6 +118,7 @@ public:
 
 protected:
     void showEvent(QShowEvent* event) override;
+    void closeEvent(QCloseEvent* event) override;
 
 private:
     void buildWidgets();
@@ -86,10 +128,17 @@ private:
     void refreshObjectList();
     void objectsChosen();
     void refreshTitle();
+    void installDefaultPrompts();
+    // With the box tool, forgets the box; with the others, deletes the selected keypoints.
+    void deleteSelection();
+    // After the document was replaced: the controls and the view follow it.
+    void documentReplaced();
+    // Saves to the path, or names the failure in an error dialog.
+    bool writeDocument(const QString& path);
 
     // Declared first: everything below refers to it, so it dies last.
     TQHostAppDelegate _host;
-    TQCurveEditorView _view;
+    TQDemoCurveEditorView _view;
     // The list and its controller; the list's widget shares the list.
     std::shared_ptr<TQCurveEditorChannelList> _channelList =
         std::make_shared<TQCurveEditorChannelList>();
@@ -97,6 +146,9 @@ private:
     // The editor's window, with the controller as its delegate.
     RWWindow _editorWindow;
     TQDemoCurveEditorCtrl _controller{_host};
+    // After the controller: it hears each word once the editor has.
+    TQDemoDocument _document{_host, _controller, _view};
+    TQDemoPrompts _prompts;
 
     // Owned by the window as Qt children.
     QListWidget* _objectList = nullptr;
@@ -107,6 +159,7 @@ private:
     TQQtPopUpButton* _curveSetPopUp = nullptr;
     TQQtEditMenu* _editMenu = nullptr;
     QAction* _autoZoom = nullptr;
+    QAction* _delete = nullptr;
     TQQtWindowBinding* _windowBinding = nullptr;
     bool _refreshingList = false;
     bool _framedOnce = false;

@@ -89,9 +89,13 @@ TEST_F(HostUndo, brackets__nestedOnesMakeOneStepEmptyOnesNoneAndStrayEndsAreTole
     host.endCaptureModifiedChannels();  // nothing open: changes nothing
     EXPECT_EQ(host.undoStack().redoCount(), 1u);
 
+    TQHostUndoStack& history = host.undoStack();
     bracketedEdit("First", {x}, 1.0);
+    const uint64_t first = history.position();
     bracketedEdit("Second", {y}, 2.0);
+    const uint64_t second = history.position();
     ASSERT_TRUE(host.undo());  // "Second" waits on the redo side
+    EXPECT_EQ(history.position(), first) << "undo goes back to where First left the history";
     // A click that announces a channel but moves nothing.
     host.startCaptureModifiedChannels("Move Keypoint");
     host.willChangeChannel(x);
@@ -106,8 +110,12 @@ TEST_F(HostUndo, brackets__nestedOnesMakeOneStepEmptyOnesNoneAndStrayEndsAreTole
     host.willSetChannelValue(x);
     host.willChangeChannel(x);
     EXPECT_FALSE(host.undoStack().isStepOpen());
+    EXPECT_EQ(history.position(), first) << "an empty step is no position";
+    ASSERT_TRUE(host.redo() && history.position() == second && host.undo());
     bracketedEdit("Third", {opacity}, 0.5);
     EXPECT_FALSE(host.canRedo()) << "a kept step clears redo";
+    EXPECT_TRUE(history.position() != first && history.position() != second)
+        << "a new step after an undo is a new position";
 
     host.undoStack().setLevelsOfUndo(2);
     bracketedEdit("Fourth", {x}, 4.0);

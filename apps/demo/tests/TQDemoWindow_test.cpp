@@ -9,93 +9,19 @@
 #include <QListWidget>
 #include <QMenu>
 #include <QPushButton>
-#include <QTest>
 #include <QTimer>
 
-#include <cmath>
-#include <memory>
 #include <set>
-#include <vector>
 
-#include "apps/demo/TQDemoWindow.h"
+#include "apps/demo/tests/DemoWindowFixture.h"
 #include "host/TQHostSampleScene.h"
-#include "platform/ui/testing/RWTestDoubles.h"
-#include "qt/TQQtCurveViewWidget.h"
 #include "qt/TQQtModal.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
 #include "qt/TQQtZoomScroller.h"
 
+namespace demo_test {
 namespace {
-
-constexpr double kStepSeconds = 0.05;  // past the view's 1/30 s gate
-
-class DemoWindowTest : public ::testing::Test {
-protected:
-    void SetUp() override {
-        window.curveView().setClock(&clock);
-        window.curveView().setTimer(&timer);
-        window.show();
-        settle();
-        drawFrame();
-        ASSERT_GE(window.curveWidget()->framesDrawn(), 1) << "the window drew no frame";
-    }
-    void TearDown() override {
-        window.curveView().setClock(nullptr);
-        window.curveView().setTimer(nullptr);
-    }
-    static void settle() {
-        for (int i = 0; i < 20; ++i) QCoreApplication::processEvents();
-    }
-    void drawFrame() {
-        clock.advance(kStepSeconds);
-        window.curveWidget()->repaint();
-    }
-
-    // Copies of the channels the view shows, in the set's order.
-    std::vector<std::unique_ptr<TQChannelBase>> snapshot() {
-        std::vector<std::unique_ptr<TQChannelBase>> out;
-        for (TQChannel* channel : shownChannels()) out.emplace_back(channel->cloneChannel());
-        return out;
-    }
-    std::vector<TQChannel*> shownChannels() {
-        std::vector<TQChannel*> out;
-        TQDemoCurveEditorCtrl& controller = window.controller();
-        for (uint32_t i = 0; i < controller.numberOfChannelItems(); ++i)
-            if (TQChannel* c = controller.selectedCurveSet()->channeItemAtIndex(i)->channel())
-                out.push_back(c);
-        return out;
-    }
-    // How many shown channels differ from the snapshot (a channel gone counts as different).
-    size_t changedCount(const std::vector<std::unique_ptr<TQChannelBase>>& before) {
-        const std::vector<TQChannel*> now = shownChannels();
-        size_t changed = now.size() == before.size() ? 0 : 1;
-        for (size_t i = 0; i < std::min(now.size(), before.size()); ++i)
-            if (!(*now[i] == *before[i])) ++changed;
-        return changed;
-    }
-    // A keyframe of the first shown channel, in the curve widget's coordinates.
-    QPoint keypointInWidget() {
-        TQDemoCurveEditorCtrl& controller = window.controller();
-        const TQCurveEditorItemPtr item = controller.selectedCurveSet()->channeItemAtIndex(0);
-        TQChannel* channel = item ? item->channel() : nullptr;
-        if (!channel || channel->numberOfKeyframes() == 0) return QPoint(-1, -1);
-        const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
-        CMTime t = kCMTimeInvalid;
-        double v = 0.0;
-        channel->getKeyframe(keys[keys.size() / 2], &t, &v);
-        const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
-        const CGPoint s = window.curveView().getPointScreen(
-            CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
-        const double ratio = window.curveWidget()->devicePixelRatioF();
-        return QPoint(static_cast<int>(std::lround(s.x / ratio)),
-                      static_cast<int>(std::lround(window.curveWidget()->height() - s.y / ratio)));
-    }
-
-    RWManualClock clock;
-    RWManualTimer timer{clock};
-    TQDemoWindow window;
-};
 
 TEST_F(DemoWindowTest, object_list__drives_the_scene_selection_and_the_automatic_set) {
     const std::vector<TQChannelObjectRootBase*> objects = window.host().scene().objects();
@@ -133,7 +59,7 @@ TEST_F(DemoWindowTest, pop_up__lists_every_set_and_a_choice_shows_it) {
         if (action->text() == "Position") action->trigger();
     EXPECT_EQ(window.controller().selectedCurveSet(), window.controller().curveSetPosition());
     EXPECT_EQ(window.curveSetPopUp()->text(), "Position");
-    EXPECT_EQ(window.windowTitle(), "VantaCurveEditor Demo - Position");
+    EXPECT_EQ(window.windowTitle(), "Untitled[*] - Position - VantaCurveEditor Demo");
     ASSERT_FALSE(shownChannels().empty());
     for (TQChannel* channel : shownChannels())
         EXPECT_EQ(channel->getParent()->getName(), "Position") << channel->getName();
@@ -144,9 +70,10 @@ TEST_F(DemoWindowTest, tool_switch_and_scroller__work_through_their_models) {
     ASSERT_EQ(tools->buttonCount(), 3);
     EXPECT_TRUE(tools->button(0)->isChecked());
     EXPECT_FALSE(tools->button(1)->isEnabled()) << "the sketch tool is not offered";
-    EXPECT_FALSE(tools->button(2)->isEnabled()) << "the box tool is not offered";
-    tools->button(2)->click();
+    tools->button(1)->click();
     EXPECT_EQ(window.controller().getCurrentTool(), TQTool::kEdit);
+    tools->button(2)->click();
+    EXPECT_EQ(window.controller().getCurrentTool(), TQTool::kBox);
 
     // Zoomed in, the knob is shorter than the scroller and a page click pans the view.
     TQQtZoomScroller* scroller = window.verticalScroller();
@@ -256,3 +183,4 @@ TEST_F(DemoWindowTest, double_click_on_a_keypoint__types_its_value_in_the_panel_
 }
 
 }  // namespace
+}  // namespace demo_test

@@ -49,7 +49,8 @@ protected:
         return TQChannelRef(c, host.sceneChannelRoot()).getText();
     }
     // A custom set holding the channels, with the colours given.
-    TQCurveSetPtr customSet(const char* name, const std::vector<std::pair<TQChannel*, uint32_t>>& in) {
+    TQCurveSetPtr customSet(const char* name,
+                            const std::vector<std::pair<TQChannel*, uint32_t>>& in) {
         const TQCurveSetPtr set = ctrl.createCurveSetWithName(name);
         ctrl.setSelectedCurveSet(set);
         for (const auto& [c, colour] : in) {
@@ -106,10 +107,10 @@ protected:
 TEST_F(SavedCurveSets, project_round_trip__sets_channels_colours_and_the_selected_set) {
     // The relative set shows its paths on these.
     host.setSelectedObjects({object("Title"), object("Lower Third")});
-    const TQCurveSetPtr bounce =
-        customSet("Bounce", {{channel("Logo", "./1/100/101/2"), 5}, {channel("Logo", "./1/100/109/3"), 7}});
-    const TQCurveSetPtr fades = customSet(
-        "Fades", {{channel("Title", "./1/200/202"), 0}, {channel("Lower Third", "./1/200/202"), 2}});
+    const TQCurveSetPtr bounce = customSet(
+        "Bounce", {{channel("Logo", "./1/100/101/2"), 5}, {channel("Logo", "./1/100/109/3"), 7}});
+    const TQCurveSetPtr fades = customSet("Fades", {{channel("Title", "./1/200/202"), 0},
+                                                    {channel("Lower Third", "./1/200/202"), 2}});
     fades->setRelative(true);
     bounce->setCurveSetShortcut("b");
     ctrl.setSelectedCurveSet(fades);
@@ -147,12 +148,12 @@ TEST_F(SavedCurveSets, save__the_selected_sets_number_with_the_gap_for_pivot) {
         uint32_t previous;
         uint32_t expected;
     } rows[] = {
-        {ctrl.curveSetAll(), 1, 0},       {ctrl.curveSetAnimated(), 0, 1},
-        {ctrl.curveSetCurrent(), 1, 2},   {ctrl.curveSetModified(), 1, 3},
-        {ctrl.curveSetPosition(), 1, 4},  {ctrl.curveSetRotation(), 1, 5},
-        {ctrl.curveSetScale(), 1, 6},     {ctrl.curveSetShear(), 1, 7},
-        {ctrl.curveSetOpacity(), 1, 9},   {ctrl.curveSetRetiming(), 1, 10},
-        {ctrl.curveSets()[0], 1, 11},     {ctrl.curveSets()[1], 1, 12},
+        {ctrl.curveSetAll(), 1, 0},      {ctrl.curveSetAnimated(), 0, 1},
+        {ctrl.curveSetCurrent(), 1, 2},  {ctrl.curveSetModified(), 1, 3},
+        {ctrl.curveSetPosition(), 1, 4}, {ctrl.curveSetRotation(), 1, 5},
+        {ctrl.curveSetScale(), 1, 6},    {ctrl.curveSetShear(), 1, 7},
+        {ctrl.curveSetOpacity(), 1, 9},  {ctrl.curveSetRetiming(), 1, 10},
+        {ctrl.curveSets()[0], 1, 11},    {ctrl.curveSets()[1], 1, 12},
         {ctrl.curveSetPivot(), 1, 1},  // no number of its own: the list's stays
         {ctrl.curveSetPivot(), 7, 7},
     };
@@ -182,11 +183,12 @@ TEST_F(SavedCurveSets, construct__numbers_by_document_version_and_past_the_end) 
         uint32_t number;
         const char* expected;
     } rows[] = {
-        {2.0, 2, "Active"},   {2.0, 3, "First"},    {2.0, 4, "Second"},   {2.0, 5, "Animated"},
-        {2.9, 10, "Animated"}, {3.0, 3, "Modified"}, {3.0, 8, "Pivot"},    {4.0, 9, "Opacity"},
-        {4.0, 10, "First"},   {4.0, 11, "Second"},  {4.0, 12, "Animated"}, {5.0, 0, "All"},
-        {5.0, 7, "Shear"},    {5.0, 10, "Retiming"}, {5.0, 11, "First"},   {5.0, 12, "Second"},
-        {5.0, 13, "Animated"}, {5.0, 4000000000u, "Animated"},
+        {2.0, 2, "Active"},   {2.0, 3, "First"},     {2.0, 4, "Second"},
+        {2.0, 5, "Animated"}, {2.9, 10, "Animated"}, {3.0, 3, "Modified"},
+        {3.0, 8, "Pivot"},    {4.0, 9, "Opacity"},   {4.0, 10, "First"},
+        {4.0, 11, "Second"},  {4.0, 12, "Animated"}, {5.0, 0, "All"},
+        {5.0, 7, "Shear"},    {5.0, 10, "Retiming"}, {5.0, 11, "First"},
+        {5.0, 12, "Second"},  {5.0, 13, "Animated"}, {5.0, 4000000000u, "Animated"},
     };
     for (const auto& row : rows) {
         SCOPED_TRACE(std::to_string(row.version) + " #" + std::to_string(row.number));
@@ -230,7 +232,8 @@ TEST_F(SavedCurveSets, vanished_channels__left_out_when_saving_and_skipped_when_
     {
         SCOPED_TRACE("saving: a channel of an object removed since is left out");
         ctrl.removeAllCurveSets();
-        customSet("Both", {{channel("Title", "./1/200/202"), 1}, {channel("Logo", "./1/100/101/1"), 4}});
+        customSet("Both",
+                  {{channel("Title", "./1/200/202"), 1}, {channel("Logo", "./1/100/101/1"), 4}});
         ASSERT_TRUE(host.removeObject(object("Logo")));
         TQCurveSetListSerializer saved;
         ctrl.saveCurveSets(&saved);

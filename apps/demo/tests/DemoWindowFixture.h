@@ -1,0 +1,113 @@
+#pragma once
+// The demo window, shown on the offscreen platform with a manual clock and timer for its curve
+// view, and what its tests ask of it: the channels shown, a point of the curve view in the
+// widget's coordinates.
+#include <gtest/gtest.h>
+
+#include <QPoint>
+#include <QTest>
+
+#include <cmath>
+#include <memory>
+#include <vector>
+
+#include "apps/demo/TQDemoWindow.h"
+#include "platform/ui/RWServices.h"
+#include "platform/ui/testing/RWTestDoubles.h"
+#include "qt/TQQtCurveViewWidget.h"
+
+namespace demo_test {
+
+inline constexpr double kStepSeconds = 0.05;  // past the view's 1/30 s gate
+
+// User defaults of the test's own, in place before the window reads them: a preference one
+// test sets must not reach the next window.
+class TestDefaults {
+public:
+    TestDefaults() : _previous(RWApplicationServices().userDefaults) { install(&defaults); }
+    ~TestDefaults() { install(_previous); }
+    TestDefaults(const TestDefaults&) = delete;
+    TestDefaults& operator=(const TestDefaults&) = delete;
+    RWMemoryUserDefaults defaults;
+
+private:
+    static void install(RWUserDefaults* userDefaults) {
+        RWServiceSet services;
+        services.userDefaults = userDefaults;
+        RWInstallServices(services);
+    }
+    RWUserDefaults* _previous;
+};
+
+class DemoWindowTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        window.curveView().setClock(&clock);
+        window.curveView().setTimer(&timer);
+        window.show();
+        settle();
+        drawFrame();
+        ASSERT_GE(window.curveWidget()->framesDrawn(), 1) << "the window drew no frame";
+    }
+    void TearDown() override {
+        window.curveView().setClock(nullptr);
+        window.curveView().setTimer(nullptr);
+    }
+    static void settle() {
+        for (int i = 0; i < 20; ++i) QCoreApplication::processEvents();
+    }
+    void drawFrame() {
+        clock.advance(kStepSeconds);
+        window.curveWidget()->repaint();
+    }
+
+    // Copies of the channels the view shows, in the set's order.
+    std::vector<std::unique_ptr<TQChannelBase>> snapshot() {
+        std::vector<std::unique_ptr<TQChannelBase>> out;
+        for (TQChannel* channel : shownChannels()) out.emplace_back(channel->cloneChannel());
+        return out;
+    }
+    std::vector<TQChannel*> shownChannels() {
+        std::vector<TQChannel*> out;
+        TQDemoCurveEditorCtrl& controller = window.controller();
+        for (uint32_t i = 0; i < controller.numberOfChannelItems(); ++i)
+            if (TQChannel* c = controller.selectedCurveSet()->channeItemAtIndex(i)->channel())
+                out.push_back(c);
+        return out;
+    }
+    // How many shown channels differ from the snapshot (a channel gone counts as different).
+    size_t changedCount(const std::vector<std::unique_ptr<TQChannelBase>>& before) {
+        const std::vector<TQChannel*> now = shownChannels();
+        size_t changed = now.size() == before.size() ? 0 : 1;
+        for (size_t i = 0; i < std::min(now.size(), before.size()); ++i)
+            if (!(*now[i] == *before[i])) ++changed;
+        return changed;
+    }
+    // A world point of the curve view in the curve widget's coordinates.
+    QPoint toWidget(const CGPoint& world) {
+        const CGPoint s = window.curveView().getPointScreen(world);
+        const double ratio = window.curveWidget()->devicePixelRatioF();
+        return QPoint(static_cast<int>(std::lround(s.x / ratio)),
+                      static_cast<int>(std::lround(window.curveWidget()->height() - s.y / ratio)));
+    }
+    // A keyframe of the first shown channel, in the curve widget's coordinates.
+    QPoint keypointInWidget() {
+        TQDemoCurveEditorCtrl& controller = window.controller();
+        const TQCurveEditorItemPtr item = controller.selectedCurveSet()->channeItemAtIndex(0);
+        TQChannel* channel = item ? item->channel() : nullptr;
+        if (!channel || channel->numberOfKeyframes() == 0) return QPoint(-1, -1);
+        const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+        CMTime t = kCMTimeInvalid;
+        double v = 0.0;
+        channel->getKeyframe(keys[keys.size() / 2], &t, &v);
+        const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
+        return toWidget(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
+    }
+
+    TestDefaults preferences;
+    RWManualClock clock;
+    RWManualTimer timer{clock};
+    TQDemoWindow window;
+};
+
+}  // namespace demo_test
