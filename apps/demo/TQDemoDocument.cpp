@@ -31,7 +31,8 @@ TQDemoDocument::TQDemoDocument(TQHostAppDelegate& host, TQCurveEditorCtrl& contr
 TQDemoDocument::~TQDemoDocument() { _host.removeNotificationReceiver(this); }
 
 std::string TQDemoDocument::displayName() const {
-    return isUntitled() ? std::string("Untitled") : std::filesystem::path(_path).filename().string();
+    return isUntitled() ? std::string("Untitled")
+                        : std::filesystem::path(_path).filename().string();
 }
 
 bool TQDemoDocument::isModified() const {
@@ -132,7 +133,8 @@ std::vector<TQDemoDocument::SavedSetForm> TQDemoDocument::customSetsForm() const
         SavedSetForm form{set->curveSetName(), set->isRelative(), {}};
         if (set->isRelative()) {
             // What a relative set shows follows the objects selected; its paths are the set.
-            for (const TQChannelRef& ref : *set->references()) form.members.emplace_back(ref.getText(), 0);
+            for (const TQChannelRef& ref : *set->references())
+                form.members.emplace_back(ref.getText(), 0);
         } else {
             for (const TQCurveEditorItemPtr& item : set->allItems()) {
                 const auto* channelItem = dynamic_cast<const TQCurveEditorChannelItem*>(item.get());
