@@ -1,8 +1,8 @@
 #include "apps/demo/TQDemoWindow.h"
 
 #include <QAction>
-#include <QCloseEvent>
 #include <QDir>
+#include <QEvent>
 #include <QFile>
 #include <QFileDialog>
 #include <QFileInfo>
@@ -54,6 +54,8 @@ TQDemoWindow::TQDemoWindow() {
     // word once the editor is in step with it.
     _host.addNotificationReceiver(this);
     _windowBinding = new TQQtWindowBinding(_editorWindow, this);
+    // Filters run last installed first: this one asks before the binding closes the editor.
+    installEventFilter(this);
     refreshObjectList();
     refreshTitle();
     _editMenu->refresh();
@@ -215,11 +217,14 @@ void TQDemoWindow::showEvent(QShowEvent* event) {
     QTimer::singleShot(0, this, [this] { frameAll(_document.isUntitled()); });
 }
 
-void TQDemoWindow::closeEvent(QCloseEvent* event) {
-    if (maybeSave())
-        event->accept();
-    else
+bool TQDemoWindow::eventFilter(QObject* watched, QEvent* event) {
+    // Ahead of the editor window's binding, whose close lets the controller forget what its
+    // sets hold: a close the user cancels must not get that far.
+    if (watched == this && event->type() == QEvent::Close && !maybeSave()) {
         event->ignore();
+        return true;
+    }
+    return QMainWindow::eventFilter(watched, event);
 }
 
 void TQDemoWindow::frameAll(bool includeTime) {
@@ -397,7 +402,8 @@ void TQDemoWindow::refreshTitle() {
     QString title = QString::fromStdString(_document.displayName()) + QStringLiteral("[*]");
     if (const TQCurveSetPtr& set = _controller.selectedCurveSet())
         title += QStringLiteral(" - ") + QString::fromStdString(set->curveSetName());
-    setWindowTitle(title + tr(" - VantaCurveEditor Demo"));
+    // Through the editor's window, whose binding shows its title.
+    _editorWindow.setTitle((title + tr(" - VantaCurveEditor Demo")).toStdString());
     setWindowModified(_document.isModified());
 }
 

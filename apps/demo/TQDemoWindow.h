@@ -118,7 +118,8 @@ public:
 
 protected:
     void showEvent(QShowEvent* event) override;
-    void closeEvent(QCloseEvent* event) override;
+    // Asks about unsaved changes before the window closes.
+    bool eventFilter(QObject* watched, QEvent* event) override;
 
 private:
     void buildWidgets();

@@ -168,6 +168,7 @@ TEST_F(DemoDocumentTest, unsaved_changes__asked_about_and_never_lost_to_a_damage
     EXPECT_NE(errors[0].find("damaged.vceproj"), std::string::npos) << errors[0];
     EXPECT_NE(errors[0].find("line "), std::string::npos) << "where the file is broken";
     EXPECT_TRUE(window.isVisible());
+    EXPECT_FALSE(shownChannels().empty()) << "a cancelled close leaves the editor's sets";
     EXPECT_TRUE(same(sceneChannels(), edited)) << "nothing lost";
     EXPECT_TRUE(window.isWindowModified());
     EXPECT_TRUE(window.editMenu()->undoAction()->isEnabled()) << "the history neither";
