@@ -7,9 +7,11 @@
 
 #include "platform/channels/internal/TQChannelData.h"
 
+using tq_internal::autoTangents;
 using tq_internal::compareTimes;
 using tq_internal::CurveCursor;
 using tq_internal::handleOf;
+using tq_internal::mirroredInterpolation;
 using tq_internal::TQChannelData;
 using tq_internal::TQKeyframeRecord;
 
@@ -31,43 +33,6 @@ bool TQIsInterpolationCode(unsigned code) {
 namespace {
 
 bool isInterpolationCode(unsigned code) { return TQIsInterpolationCode(code); }
-
-// The code of a segment run backwards in time: the eased end and the exponential shapes swap.
-unsigned mirroredInterpolation(unsigned code) {
-    switch (code) {
-        case kTQInterpolationExp: return kTQInterpolationLog;
-        case kTQInterpolationLog: return kTQInterpolationExp;
-        case kTQInterpolationEaseOut: return kTQInterpolationEaseIn;
-        case kTQInterpolationEaseIn: return kTQInterpolationEaseOut;
-        default: return code;
-    }
-}
-
-// Automatic handles of the keyframe at `pos` from its neighbours in the table: the slope of
-// the chord through them (Catmull-Rom), flat at an extreme and at the ends so that the curve
-// does not overshoot its keyframes; each handle a third of its segment long, or of the other
-// segment at an end.
-void autoTangents(std::vector<TQKeyframeRecord>& keys, size_t pos) {
-    TQKeyframeRecord& k = keys[pos];
-    const TQKeyframeRecord* prev = pos > 0 ? &keys[pos - 1] : nullptr;
-    const TQKeyframeRecord* next = pos + 1 < keys.size() ? &keys[pos + 1] : nullptr;
-    double slope = 0.0;
-    if (prev && next) {
-        const bool extreme = (k.value >= prev->value && k.value >= next->value) ||
-                             (k.value <= prev->value && k.value <= next->value);
-        const double span = next->seconds - prev->seconds;
-        if (!extreme && span > 0.0) slope = (next->value - prev->value) / span;
-    }
-    double lenIn = prev ? (k.seconds - prev->seconds) / 3.0 : 0.0;
-    double lenOut = next ? (next->seconds - k.seconds) / 3.0 : 0.0;
-    if (!prev) lenIn = lenOut;
-    if (!next) lenOut = lenIn;
-    k.inU = -lenIn;
-    k.inV = -lenIn * slope;
-    k.outU = lenOut;
-    k.outV = lenOut * slope;
-    k.broken = false;
-}
 
 }  // namespace
 

@@ -80,6 +80,18 @@ struct TQKeyframeState {
     bool scaled = false;
 };
 
+// The segments simplifyCurve fits (its fourth argument).
+enum : int {
+    kTQSimplifyConstant = 0,  // steps: each keyframe's value held to the next
+    kTQSimplifyLinear = 1,    // straight lines
+    kTQSimplifyBezier = 2,    // cubic Bezier segments with handles
+};
+// Where simplifyCurve may put keyframes (its last argument).
+enum : int {
+    kTQSimplifyOnFrames = 0,             // on any frame of the span
+    kTQSimplifyOnExistingKeyframes = 1,  // only where keyframes are now: it only removes
+};
+
 // Options for the sampling form that takes a context. A null context samples the keyframed
 // curve alone; a context asks for the processed curve with the behaviours it selects.
 struct TQSampleContext {
@@ -281,6 +293,91 @@ public:
     // handles are mirrored and swapped (input becomes output), and each segment keeps its
     // interpolation, which moves to the keyframe that now starts it.
     virtual void reverseKeyframes(TQKeyframeHandle first, TQKeyframeHandle last);
+    // Refits the curve between two of its keyframes with as few keyframes as a fitter can
+    // find, within a promised worst error.
+    //
+    // Span. From the first keyframe at or after `start` to the last at or before `end`
+    // (channel times); with fewer than two there, nothing happens. Those two keyframes keep
+    // their times, values and outer handles, and every keyframe outside stays, so the curve
+    // outside is unchanged (a Catmull-Rom segment bordering the span, whose shape would follow
+    // the new keyframe inside, is written out as the Bezier segment it was). Locked keyframes
+    // inside stay with their times and values, and the fit runs on either side of them; every
+    // other keyframe inside, disabled ones included, is replaced.
+    //
+    // tolerance: the worst value error, in percent of the span's height (the highest minus the
+    // lowest value of the curve at the frames of the span). In the curve's own units, the new
+    // curve lies within tolerance / 100 * height of the old one at every frame of the span
+    // (each multiple of frameDuration inside it, and its two ends) and at the time of every
+    // keyframe the span had. The editor's panel offers 0 to 10; any finite value from 0 up is
+    // taken. At 0 the curve stays as it is to within 1e-10 of its scale (height plus largest
+    // magnitude): only keyframes that change nothing go.
+    //
+    // smoothness: a number of frames, 0 to 10 from the panel (up to 100 taken; more counts as
+    // 100). The fit follows the curve smoothed over that many frames on either side (at each
+    // frame the value of the parabola that best fits the frames around it), which keeps slopes
+    // and peaks that are slower than that and irons out jitter that is faster: on recorded
+    // data the keyframes land on the motion, not on its noise. The smoothed curve is never let
+    // further than half the tolerance from the old one, so the promise above holds whatever
+    // the smoothness. At 0 the fit follows the curve itself and keeps segments of the old curve
+    // whole where they serve.
+    //
+    // shape: kTQSimplifyBezier (the editor's) fits cubic Bezier segments whose handles reach a
+    // third of their segment, so that time runs forward through every new segment; a
+    // keyframe's two handles line up (unbroken) wherever the tolerance allows, and are marked
+    // broken where not. kTQSimplifyLinear and kTQSimplifyConstant fit lines and steps, with
+    // automatic handles on new keyframes. A discrete channel is always fitted with steps.
+    //
+    // placement: kTQSimplifyOnFrames (the editor's) puts new keyframes on frames, whole
+    // multiples of frameDuration; kTQSimplifyOnExistingKeyframes only keeps or removes the
+    // span's keyframes, with their values.
+    //
+    // The fewest keyframes: a keyframe takes the (smoothed) curve's value at its frame, and of
+    // the chains of fitting segments the fitter finds the shortest, checking the error at
+    // every frame rather than estimating it (internal/TQCurveFit.h tells how).
+    //
+    // Announces the change (noteWillChange(true)) once when it goes ahead. Handles of replaced
+    // keyframes go stale; keyframes that stay (outside, the ends, locked ones, old ones the fit
+    // keeps) keep their handles. No-op, announcing nothing: a time that is not numeric, a frame
+    // duration that is not a positive time, an unknown shape or placement, a tolerance that is
+    // negative or not finite, a negative smoothness, a span of more than 10 million frames.
+    // Cost: about linear in the frames of the span (a few fits per frame, each over the frames
+    // it spans), plus frames times smoothness for the smoothing.
+    virtual void simplifyCurve(const CMTime& start, const CMTime& end, const CMTime& frameDuration,
+                               int shape, int smoothness, double tolerance, int placement);
+    // Bakes `cycles` cycles of the extrapolation on one side (kTQExtrapolationBefore or
+    // kTQExtrapolationAfter) into keyframes, so that the curve stays what it was: the new
+    // keyframes are the cycles the extrapolation showed, and beyond them the extrapolation,
+    // left as it is, repeats the longer span, which shows the same curve.
+    //
+    // A cycle is the span from the first keyframe to the last. Repeat and progressive cycles
+    // are copies (raised by the span's rise per cycle for progressive), ping-pong cycles
+    // alternate mirror images and copies; copies keep the values, handles (lengths and broken
+    // state included), interpolation and locked state of the keyframes they copy. Where two
+    // cycles meet, their end keyframes become one, with the arriving handle of the one and the
+    // leaving handle of the other (broken unless they line up). Constant and linear
+    // extrapolation bake one keyframe per cycle length on the held value or the line.
+    //
+    // Exactness. The baked curve equals the extrapolated one at every time but these:
+    // - where a repeated curve jumps (its ends differ), the jump takes one tick of timescale
+    //   0x40000: a keyframe that close to the seam, the segment beside it cut there. Only
+    //   times inside that tick differ (an Exp or Log segment cut there keeps its shape squeezed
+    //   into the shorter span: a difference of about a tick over the segment's length);
+    // - a step run backwards in a mirrored cycle takes a tick likewise;
+    // - baked after the keyframes, the last keyframe of a curve that jumps keeps its value,
+    //   the end of a cycle, where the seams beyond show the start of the next; the longer span
+    //   repeats it, so at the instants a whole number of new spans away from that keyframe,
+    //   beyond the new keyframes, the curve shows the end of a cycle instead of the start.
+    // Catmull-Rom segments whose shape would change with their new neighbours (at the seams,
+    // and beside a step in a mirrored cycle) are written out as the Bezier segments they are.
+    // Only keyframes that shape the curve are copied: enabled ones, and of keyframes that met,
+    // the one that stands.
+    //
+    // Announces the change (noteWillChange(true)) once when it goes ahead. Existing keyframes
+    // keep their handles (the one at the seam too); the copies get new ones. No-op: fewer than
+    // two keyframes at distinct times, zero cycles, an unknown direction, more keyframes than a
+    // channel holds (10 million, counting up to two per keyframe of a cycle), or a time beyond
+    // the range of CMTime. Cost: linear in the keyframes made.
+    virtual void generateKeypoints(unsigned direction, unsigned cycles);
     // Disabled animation: the value is the initial value; keyframes stay.
     virtual void setAnimationEnabled(bool enabled);
     // With keyframes and enabled animation: a keyframe at *time (channel time) with that value;

@@ -5,6 +5,8 @@
 #include <cmath>
 #include <limits>
 
+#include "platform/channels/TQChannel.h"
+
 namespace tq_internal {
 
 bool sameState(const TQKeyframeRecord& a, const TQKeyframeRecord& b) {
@@ -12,6 +14,38 @@ bool sameState(const TQKeyframeRecord& a, const TQKeyframeRecord& b) {
            a.inV == b.inV && a.outU == b.outU && a.outV == b.outV &&
            a.interpolation == b.interpolation && a.locked == b.locked && a.enabled == b.enabled &&
            a.broken == b.broken && a.scaled == b.scaled;
+}
+
+unsigned mirroredInterpolation(unsigned code) {
+    switch (code) {
+        case kTQInterpolationExp: return kTQInterpolationLog;
+        case kTQInterpolationLog: return kTQInterpolationExp;
+        case kTQInterpolationEaseOut: return kTQInterpolationEaseIn;
+        case kTQInterpolationEaseIn: return kTQInterpolationEaseOut;
+        default: return code;
+    }
+}
+
+void autoTangents(std::vector<TQKeyframeRecord>& keys, size_t pos) {
+    TQKeyframeRecord& k = keys[pos];
+    const TQKeyframeRecord* prev = pos > 0 ? &keys[pos - 1] : nullptr;
+    const TQKeyframeRecord* next = pos + 1 < keys.size() ? &keys[pos + 1] : nullptr;
+    double slope = 0.0;
+    if (prev && next) {
+        const bool extreme = (k.value >= prev->value && k.value >= next->value) ||
+                             (k.value <= prev->value && k.value <= next->value);
+        const double span = next->seconds - prev->seconds;
+        if (!extreme && span > 0.0) slope = (next->value - prev->value) / span;
+    }
+    double lenIn = prev ? (k.seconds - prev->seconds) / 3.0 : 0.0;
+    double lenOut = next ? (next->seconds - k.seconds) / 3.0 : 0.0;
+    if (!prev) lenIn = lenOut;
+    if (!next) lenOut = lenIn;
+    k.inU = -lenIn;
+    k.inV = -lenIn * slope;
+    k.outU = lenOut;
+    k.outV = lenOut * slope;
+    k.broken = false;
 }
 
 uint64_t nextKeyframeSerial() {

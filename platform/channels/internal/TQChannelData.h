@@ -35,6 +35,15 @@ bool sameState(const TQKeyframeRecord& a, const TQKeyframeRecord& b);
 
 uint64_t nextKeyframeSerial();
 
+// The code of a segment run backwards in time: the eased end and the exponential shapes swap.
+unsigned mirroredInterpolation(unsigned code);
+
+// Automatic handles of the keyframe at `pos` from its neighbours in the table: the slope of the
+// chord through them (Catmull-Rom), flat at an extreme and at the ends so that the curve does
+// not overshoot its keyframes; each handle a third of its segment long, or of the other segment
+// at an end; unbroken.
+void autoTangents(std::vector<TQKeyframeRecord>& keys, size_t pos);
+
 // CMTimeCompare with a shortcut for the common case of two numeric times on one timescale,
 // which is every comparison between keyframes set on the editor's grid.
 inline int32_t compareTimes(const CMTime& a, const CMTime& b) {

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <limits>
 
 #include "platform/channels/TQChannel.h"
 #include "platform/channels/internal/TQChannelData.h"
@@ -113,18 +114,58 @@ double slopeAt(const CurveSegment& seg, double s) {
     return (polynomial(seg, 1.0) - polynomial(seg, 0.0)) / dt;
 }
 
-// Non-uniform Catmull-Rom slope: the chord through the neighbours, one-sided at the ends.
-template <typename Points>
-double catmullRomSlope(const Points& pts, size_t i) {
-    const size_t n = pts.size();
-    const size_t lo = i == 0 ? 0 : i - 1;
-    const size_t hi = i + 1 < n ? i + 1 : n - 1;
-    const double dt = pts[hi]->seconds - pts[lo]->seconds;
-    if (!(dt > 0.0)) return 0.0;
-    return (pts[hi]->value - pts[lo]->value) / dt;
+}  // namespace
+
+void collectStanding(const std::vector<TQKeyframeRecord>& keys,
+                     std::vector<const TQKeyframeRecord*>& out) {
+    out.clear();
+    out.reserve(keys.size());
+    for (const TQKeyframeRecord& k : keys) {
+        if (!k.enabled) continue;
+        if (!out.empty() && compareTimes(out.back()->time, k.time) == 0) {
+            out.back() = &k;  // keyframes that met: the last arrived stands for the time
+        } else {
+            out.push_back(&k);
+        }
+    }
 }
 
-}  // namespace
+double catmullRomSlope(const TQKeyframeRecord& before, const TQKeyframeRecord& after) {
+    const double dt = after.seconds - before.seconds;
+    if (!(dt > 0.0)) return 0.0;
+    return (after.value - before.value) / dt;
+}
+
+CurveSegment makeSegment(const TQKeyframeRecord& a, const TQKeyframeRecord& b, unsigned code,
+                         double slopeA, double slopeB) {
+    CurveSegment seg;
+    seg.t0 = a.seconds;
+    seg.t1 = b.seconds;
+    const double dt = seg.t1 - seg.t0;
+    if (!(dt > 0.0)) return seg;
+    seg.invDt = 1.0 / dt;
+    const double rise = b.value - a.value;
+    switch (code) {
+        case kTQInterpolationConstant: seg.y[0] = a.value; break;
+        case kTQInterpolationBezier: setBezier(seg, a, b); break;
+        case kTQInterpolationCatmullRom: setHermite(seg, a.value, b.value, slopeA, slopeB); break;
+        case kTQInterpolationExp:
+        case kTQInterpolationLog:
+            seg.kind = code == kTQInterpolationExp ? SegmentKind::Exp : SegmentKind::Log;
+            seg.y[0] = a.value;
+            seg.y[1] = rise;
+            break;
+        case kTQInterpolationEaseBoth: setHermite(seg, a.value, b.value, 0.0, 0.0); break;
+        case kTQInterpolationEaseOut: setHermite(seg, a.value, b.value, 0.0, rise / dt); break;
+        case kTQInterpolationEaseIn: setHermite(seg, a.value, b.value, rise / dt, 0.0); break;
+        case kTQInterpolationLinear:
+        default:
+            seg.y[0] = a.value;
+            seg.y[1] = rise;
+            break;
+    }
+    return seg;
+}
 
 double expShape(double s) { return std::expm1(kShapeCurvature * s) / std::expm1(kShapeCurvature); }
 
@@ -276,15 +317,7 @@ void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
     _slopeAfter = 0.0;
 
     std::vector<const TQKeyframeRecord*> pts;
-    pts.reserve(keys.size());
-    for (const TQKeyframeRecord& k : keys) {
-        if (!k.enabled) continue;
-        if (!pts.empty() && compareTimes(pts.back()->time, k.time) == 0) {
-            pts.back() = &k;  // keyframes that met: the last arrived stands for the time
-        } else {
-            pts.push_back(&k);
-        }
-    }
+    collectStanding(keys, pts);
     _keyCount = pts.size();
     if (pts.empty()) return;
     _firstT = pts.front()->seconds;
@@ -294,39 +327,17 @@ void CurveCache::build(const std::vector<TQKeyframeRecord>& keys, bool discrete,
 
     _segments.reserve(pts.size() - 1);
     _starts.reserve(pts.size() - 1);
+    // Catmull-Rom slopes take the chord through the neighbours, one-sided at the ends.
+    auto chordSlope = [&](size_t i) {
+        return catmullRomSlope(*pts[i == 0 ? 0 : i - 1], *pts[i + 1 < pts.size() ? i + 1 : i]);
+    };
     for (size_t i = 0; i + 1 < pts.size(); ++i) {
         const TQKeyframeRecord& a = *pts[i];
-        const TQKeyframeRecord& b = *pts[i + 1];
-        CurveSegment seg;
-        seg.t0 = a.seconds;
-        seg.t1 = b.seconds;
-        const double dt = seg.t1 - seg.t0;
-        if (!(dt > 0.0)) continue;  // distinct times closer than a double tells apart
-        seg.invDt = 1.0 / dt;
-        const double rise = b.value - a.value;
         const unsigned code = discrete ? unsigned(kTQInterpolationConstant) : a.interpolation;
-        switch (code) {
-            case kTQInterpolationConstant: seg.y[0] = a.value; break;
-            case kTQInterpolationBezier: setBezier(seg, a, b); break;
-            case kTQInterpolationCatmullRom:
-                setHermite(seg, a.value, b.value, catmullRomSlope(pts, i),
-                           catmullRomSlope(pts, i + 1));
-                break;
-            case kTQInterpolationExp:
-            case kTQInterpolationLog:
-                seg.kind = code == kTQInterpolationExp ? SegmentKind::Exp : SegmentKind::Log;
-                seg.y[0] = a.value;
-                seg.y[1] = rise;
-                break;
-            case kTQInterpolationEaseBoth: setHermite(seg, a.value, b.value, 0.0, 0.0); break;
-            case kTQInterpolationEaseOut: setHermite(seg, a.value, b.value, 0.0, rise / dt); break;
-            case kTQInterpolationEaseIn: setHermite(seg, a.value, b.value, rise / dt, 0.0); break;
-            case kTQInterpolationLinear:
-            default:
-                seg.y[0] = a.value;
-                seg.y[1] = rise;
-                break;
-        }
+        const bool catmullRom = code == kTQInterpolationCatmullRom;
+        const CurveSegment seg = makeSegment(a, *pts[i + 1], code, catmullRom ? chordSlope(i) : 0.0,
+                                             catmullRom ? chordSlope(i + 1) : 0.0);
+        if (!(seg.invDt > 0.0)) continue;  // distinct times closer than a double tells apart
         _segments.push_back(seg);
         _starts.push_back(seg.t0);
     }
@@ -418,6 +429,14 @@ double CurveCache::evaluateInside(double seconds, CurveCursor& cursor) const {
     return polynomial(seg, solved);
 }
 
+double CurveCache::snapToKeyframe(double seconds, double slack, CurveCursor& cursor) const {
+    if (_segments.empty() || seconds >= _lastT) return seconds;
+    if (_lastT - seconds <= slack) return _lastT;
+    const size_t i = locate(seconds, cursor);
+    if (i + 1 < _starts.size() && _starts[i + 1] - seconds <= slack) return _starts[i + 1];
+    return seconds;
+}
+
 double CurveCache::evaluateOutside(double seconds, bool before, CurveCursor& cursor) const {
     const unsigned code = before ? _extrapolationBefore : _extrapolationAfter;
     const double endT = before ? _firstT : _lastT;
@@ -430,10 +449,17 @@ double CurveCache::evaluateOutside(double seconds, bool before, CurveCursor& cur
         case kTQExtrapolationRepeat:
         case kTQExtrapolationProgressive: {
             if (!(period > 0.0)) return endV;
-            const double cycles = std::floor((seconds - _firstT) / period);
-            double u = std::clamp((seconds - _firstT) - cycles * period, 0.0, period);
+            // The time within the cycle is off by a few roundings of the times involved. A time
+            // that far short of a cycle's start, or of a keyframe, is taken as that time: a
+            // jump between cycles or a step then lands on the frame where it lands among the
+            // keyframes, not a frame late.
+            const double slack = 8.0 * std::numeric_limits<double>::epsilon() *
+                                 (std::fabs(seconds) + std::fabs(_firstT) + period);
+            const double d = seconds - _firstT;
+            const double cycles = std::floor((d + slack) / period);
+            double u = std::clamp(d - cycles * period, 0.0, period);
             if (code == kTQExtrapolationPingPong && std::fmod(cycles, 2.0) != 0.0) u = period - u;
-            const double v = evaluateInside(_firstT + u, cursor);
+            const double v = evaluateInside(snapToKeyframe(_firstT + u, slack, cursor), cursor);
             if (code == kTQExtrapolationProgressive) return v + cycles * (_lastV - _firstV);
             return v;
         }

@@ -69,6 +69,8 @@ public:
 private:
     double evaluateInside(double seconds, CurveCursor& cursor) const;
     double evaluateOutside(double seconds, bool before, CurveCursor& cursor) const;
+    // The keyframe's time when `seconds` lies at most `slack` short of a keyframe, else seconds.
+    double snapToKeyframe(double seconds, double slack, CurveCursor& cursor) const;
     size_t locate(double seconds, CurveCursor& cursor) const;
     size_t locateFar(double seconds, size_t from, size_t& stride) const;
     // Samples the run of evenly spaced times, from `value` on, that fall in one Bezier
@@ -93,6 +95,22 @@ private:
     unsigned _extrapolationAfter = 0;
     double _initialValue = 0.0;
 };
+
+// The keyframes that shape the curve, in time order: the enabled ones, and of keyframes that
+// share a time the one that arrived last.
+void collectStanding(const std::vector<TQKeyframeRecord>& keys,
+                     std::vector<const TQKeyframeRecord*>& out);
+
+// The Catmull-Rom slope at a keyframe: the chord from its neighbour before to its neighbour
+// after (the keyframe itself standing in for a missing neighbour at an end); 0 when they share
+// a time.
+double catmullRomSlope(const TQKeyframeRecord& before, const TQKeyframeRecord& after);
+
+// The segment from a to b evaluated with interpolation `code`; slopeA and slopeB are the
+// Catmull-Rom slopes at a and b, read by that code only. invDt stays 0 when b is not later
+// than a: there is no segment.
+CurveSegment makeSegment(const TQKeyframeRecord& a, const TQKeyframeRecord& b, unsigned code,
+                         double slopeA, double slopeB);
 
 // Interpolation shapes of the non-Bezier codes, on s in [0, 1], exposed for tests.
 double expShape(double s);

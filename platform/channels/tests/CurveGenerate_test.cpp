@@ -1,0 +1,185 @@
+#include <gtest/gtest.h>
+
+#include <climits>
+#include <memory>
+
+#include "platform/channels/testing/ReferenceCurves.h"
+#include "platform/channels/tests/CurveCatalogue.h"
+
+using reference_curves::frame;
+
+namespace {
+
+std::unique_ptr<TQChannel> cloneOf(const TQChannel& c) {
+    return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
+}
+
+// Keyframes on frames 0 to 40 with a segment of most kinds: Catmull-Rom segments at each end
+// and after a step (their shape changes with new neighbours unless baked with care), the step
+// (which a mirrored cycle runs backwards), broken handles, an ease and an Exp segment. The ends
+// differ in value, so a repeated cycle jumps.
+// A channel whose values step whatever the interpolation codes say (as booleans do).
+struct SteppedChannel : TQChannel {
+    SteppedChannel() : TQChannel("stepped", 1, 0.0) { setDiscrete(true); }
+};
+
+std::unique_ptr<TQChannel> mixedCurve(bool discrete = false) {
+    std::unique_ptr<TQChannel> c = discrete ? std::make_unique<SteppedChannel>()
+                                            : std::make_unique<TQChannel>("mixed", 1, 0.0);
+    struct Key {
+        int64_t frame;
+        double value;
+        unsigned interpolation;
+    };
+    const Key keys[] = {{0, 1.0, kTQInterpolationCatmullRom},
+                        {6, 3.0, kTQInterpolationCatmullRom},
+                        {11, 2.0, kTQInterpolationBezier},
+                        {17, -1.0, kTQInterpolationConstant},
+                        {22, 0.5, kTQInterpolationCatmullRom},
+                        {25, 0.0, kTQInterpolationEaseOut},
+                        {27, 2.5, kTQInterpolationExp},
+                        {32, 4.0, kTQInterpolationCatmullRom},
+                        {36, 2.0, kTQInterpolationCatmullRom},
+                        {40, 3.0, kTQInterpolationBezier}};
+    for (const Key& k : keys) {
+        TQKeyframeHandle h = c->setKeyframe(frame(k.frame), k.value);
+        c->setKeyframeInterpolation(h, k.interpolation);
+    }
+    TQKeyframeHandle broken = c->getKeyframe(frame(11));
+    c->setKeyframeTangentsBroken(broken, true);
+    c->setKeyframeInputTangents(broken, -0.05, 0.8);
+    c->setKeyframeOutputTangents(broken, 0.1, -2.0);
+    return c;
+}
+
+// The frames where the two curves differ, over the baked cycles and two cycles beyond on
+// either side, where the extrapolation of the baked curve takes over. `blind` frames are left
+// out: every `blind` frames from frame 40 on, beyond the baked keyframes.
+int differingFrames(const TQChannel& expected, const TQChannel& baked, unsigned cycles,
+                    int64_t blind = 0) {
+    const int64_t reach = 40 * int64_t(cycles + 2);
+    int differing = 0;
+    for (int64_t k = -reach; k <= 40 + reach; ++k) {
+        if (blind > 0 && k != 40 && (k - 40) % blind == 0) continue;
+        const double want = expected.getCurveValue(frame(k));
+        const double got = baked.getCurveValue(frame(k));
+        if (!(std::fabs(want - got) <= 1e-9 * (1.0 + std::fabs(want)))) {
+            ADD_FAILURE() << "frame " << k << ": " << got << " instead of " << want;
+            if (++differing > 5) break;
+        }
+    }
+    return differing;
+}
+
+TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_frame) {
+    const unsigned modes[] = {kTQExtrapolationRepeat, kTQExtrapolationPingPong,
+                              kTQExtrapolationProgressive, kTQExtrapolationLinear,
+                              kTQExtrapolationConstant};
+    for (bool discrete : {false, true}) {
+        for (unsigned mode : modes) {
+            for (unsigned direction : {kTQExtrapolationBefore, kTQExtrapolationAfter}) {
+                for (unsigned cycles : {1u, 2u, 5u}) {
+                    SCOPED_TRACE(testing::Message() << "mode " << mode << " direction "
+                                                    << direction << " cycles " << cycles
+                                                    << (discrete ? " discrete" : ""));
+                    auto curve = mixedCurve(discrete);
+                    curve->setExtrapolation(mode, kTQExtrapolationBefore);
+                    curve->setExtrapolation(mode, kTQExtrapolationAfter);
+                    auto baked = cloneOf(*curve);
+                    baked->generateKeypoints(direction, cycles);
+
+                    // A repeated curve that jumps shows the start of a cycle at each seam, but
+                    // its last keyframe, now inside, keeps the value that ends one: where the
+                    // longer span repeats beyond the new keyframes, so does that value.
+                    const bool jumpBakedAfter = mode == kTQExtrapolationRepeat &&
+                                                direction == kTQExtrapolationAfter;
+                    const int64_t blind = jumpBakedAfter ? 40 * int64_t(cycles + 1) : 0;
+                    EXPECT_EQ(differingFrames(*curve, *baked, cycles, blind), 0);
+                    // The keyframes now reach over the cycles on the side baked.
+                    const CMTime reach = frame(40 * int64_t(cycles));
+                    if (direction == kTQExtrapolationBefore) {
+                        EXPECT_EQ(CMTimeCompare(baked->getKeyframeMinTime(),
+                                                CMTimeSubtract(kCMTimeZero, reach)),
+                                  0);
+                        EXPECT_EQ(CMTimeCompare(baked->getKeyframeMaxTime(), frame(40)), 0);
+                    } else {
+                        EXPECT_EQ(CMTimeCompare(baked->getKeyframeMinTime(), frame(0)), 0);
+                        EXPECT_GE(CMTimeCompare(baked->getKeyframeMaxTime(),
+                                                CMTimeAdd(frame(40), reach)),
+                                  0);
+                    }
+                    EXPECT_EQ(reference_curves::backwardSegments(*baked), 0u);
+                }
+            }
+        }
+    }
+}
+
+TEST(CurveGenerate, copies_keep_the_state_of_their_originals_and_existing_handles_stay) {
+    auto curve = curve_catalogue::dense(12);
+    curve->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
+    const std::vector<TQKeyframeHandle> before = curve->getKeyframes(false);
+    curve->setKeyframeValue(before.back(), curve->getCurveValue(curve->getKeyframeMinTime()));
+    curve->setKeyframeLocked(before[3], true);
+    const std::vector<TQKeyframeState> original = curve->getKeyframeStates();
+
+    curve->generateKeypoints(kTQExtrapolationAfter, 2);
+
+    for (TQKeyframeHandle h : before) EXPECT_TRUE(curve->getKeyframe(h, nullptr, nullptr));
+    const std::vector<TQKeyframeState> baked = curve->getKeyframeStates();
+    // The ends meet in value, so each seam is one keyframe: two cycles of 11 more.
+    ASSERT_EQ(baked.size(), 12u + 2 * 11u);
+    const CMTime period = CMTimeSubtract(original.back().time, original.front().time);
+    for (size_t i = 1; i + 1 < original.size(); ++i) {
+        const TQKeyframeState& copy = baked[11 + i];
+        EXPECT_EQ(CMTimeCompare(copy.time, CMTimeAdd(original[i].time, period)), 0);
+        EXPECT_EQ(copy.value, original[i].value);
+        EXPECT_EQ(copy.locked, original[i].locked);
+        EXPECT_EQ(copy.broken, original[i].broken);
+        EXPECT_EQ(copy.inV, original[i].inV);
+        EXPECT_EQ(copy.outU, original[i].outU);
+    }
+    // At a seam the arriving handle is the last keyframe's, the leaving one the first's.
+    const TQKeyframeState& seam = baked[11];
+    EXPECT_EQ(seam.inU, original.back().inU);
+    EXPECT_EQ(seam.inV, original.back().inV);
+    EXPECT_EQ(seam.outU, original.front().outU);
+    EXPECT_EQ(seam.outV, original.front().outV);
+}
+
+TEST(CurveGenerate, refuses_what_it_cannot_bake_and_changes_nothing) {
+    auto curve = mixedCurve();
+    curve->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
+    const auto untouched = cloneOf(*curve);
+    struct Case {
+        const char* what;
+        unsigned direction;
+        unsigned cycles;
+    };
+    const Case cases[] = {{"no cycle", kTQExtrapolationAfter, 0},
+                          {"unknown direction", 2, 1},
+                          {"more keyframes than a channel holds", kTQExtrapolationAfter, UINT_MAX},
+                          {"18 million keyframes", kTQExtrapolationAfter, 2'000'000}};
+    for (const Case& c : cases) {
+        curve->generateKeypoints(c.direction, c.cycles);
+        EXPECT_TRUE(*curve == *untouched) << c.what;
+    }
+
+    // A single keyframe has no cycle to copy; neither have keyframes that all met at one time.
+    auto single = std::make_unique<TQChannel>("single", 1, 0.0);
+    single->setKeyframe(frame(3), 1.0);
+    single->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
+    single->generateKeypoints(kTQExtrapolationAfter, 4);
+    EXPECT_EQ(single->numberOfKeyframes(), 1u);
+
+    // Cycles that would end past the range of time.
+    auto wide = std::make_unique<TQChannel>("wide", 1, 0.0);
+    wide->setKeyframe(CMTimeMake(0, 1), 0.0);
+    wide->setKeyframe(CMTimeMake(INT64_MAX / 3, 1), 1.0);
+    wide->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
+    const auto wideBefore = cloneOf(*wide);
+    wide->generateKeypoints(kTQExtrapolationAfter, 4);
+    EXPECT_TRUE(*wide == *wideBefore);
+}
+
+}  // namespace
