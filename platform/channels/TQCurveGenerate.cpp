@@ -172,7 +172,8 @@ void mergeInto(std::vector<TQKeyframeRecord>& table, const Block& added) {
     merged.reserve(table.size() + added.size());
     size_t j = 0;
     for (const TQKeyframeRecord& k : table) {
-        while (j < added.size() && compareTimes(added[j].time, k.time) < 0) merged.push_back(added[j++]);
+        while (j < added.size() && compareTimes(added[j].time, k.time) < 0)
+            merged.push_back(added[j++]);
         merged.push_back(k);
     }
     merged.insert(merged.end(), added.begin() + long(j), added.end());
@@ -228,8 +229,9 @@ void TQChannel::generateKeypoints(unsigned direction, unsigned cycles) {
     auto writeOut = [&](TQKeyframeRecord& a, TQKeyframeRecord& b, size_t i) {
         if (evaluatedCode(*standing[i], baker.discrete) != kTQInterpolationCatmullRom) return;
         BezierControl c;
-        const CurveSegment s = makeSegment(*standing[i], *standing[i + 1],
-                                           kTQInterpolationCatmullRom, oldSlope(i), oldSlope(i + 1));
+        const CurveSegment s =
+            makeSegment(*standing[i], *standing[i + 1], kTQInterpolationCatmullRom, oldSlope(i),
+                        oldSlope(i + 1));
         if (bezierControl(s, c)) setBezierHandles(a, b, c);
     };
     auto atTable = [&](size_t i) -> TQKeyframeRecord& {
@@ -258,7 +260,8 @@ void TQChannel::generateKeypoints(unsigned direction, unsigned cycles) {
     } else {
         for (const TQKeyframeRecord* k : standing) baker.cycle.push_back(*k);
         auto steps = [&](size_t i) {
-            return i + 1 < n && evaluatedCode(*standing[i], baker.discrete) == kTQInterpolationConstant;
+            return i + 1 < n &&
+                   evaluatedCode(*standing[i], baker.discrete) == kTQInterpolationConstant;
         };
         const bool mirrored = baker.mode == kTQExtrapolationPingPong;
         for (size_t i = 0; i + 1 < n; ++i) {
@@ -271,7 +274,8 @@ void TQChannel::generateKeypoints(unsigned direction, unsigned cycles) {
         std::vector<Block> blocks;
         blocks.reserve(size_t(count) + 2);
         if (!before) blocks.push_back({table[seamPos]});
-        for (int32_t k = 1; k <= count; ++k) blocks.push_back(baker.copy(before ? k - 1 - count : k));
+        for (int32_t k = 1; k <= count; ++k)
+            blocks.push_back(baker.copy(before ? k - 1 - count : k));
         if (before) blocks.push_back({table[seamPos]});
         const size_t original = before ? blocks.size() - 1 : 0;
         for (size_t b = 0; b + 1 < blocks.size(); ++b) {

@@ -89,8 +89,8 @@ double outerSlope(const TQKeyframeRecord& k, bool input, bool shapes) {
 
 void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTime& frameDuration,
                               int shape, int smoothness, double tolerance, int placement) {
-    if (!CMTIME_IS_NUMERIC(start) || !CMTIME_IS_NUMERIC(end) ||
-        !CMTIME_IS_NUMERIC(frameDuration) || frameDuration.value <= 0) {
+    if (!CMTIME_IS_NUMERIC(start) || !CMTIME_IS_NUMERIC(end) || !CMTIME_IS_NUMERIC(frameDuration) ||
+        frameDuration.value <= 0) {
         return;
     }
     if (shape < kTQSimplifyConstant || shape > kTQSimplifyBezier) return;
@@ -100,15 +100,12 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
     std::vector<TQKeyframeRecord>& table = _d->keys;
     std::vector<const TQKeyframeRecord*> standing;
     collectStanding(table, standing);
-    const auto firstIt =
-        std::lower_bound(standing.begin(), standing.end(), start,
-                         [](const TQKeyframeRecord* k, const CMTime& t) {
-                             return compareTimes(k->time, t) < 0;
-                         });
-    const auto endIt = std::upper_bound(standing.begin(), standing.end(), end,
-                                        [](const CMTime& t, const TQKeyframeRecord* k) {
-                                            return compareTimes(t, k->time) < 0;
-                                        });
+    const auto firstIt = std::lower_bound(
+        standing.begin(), standing.end(), start,
+        [](const TQKeyframeRecord* k, const CMTime& t) { return compareTimes(k->time, t) < 0; });
+    const auto endIt = std::upper_bound(
+        standing.begin(), standing.end(), end,
+        [](const CMTime& t, const TQKeyframeRecord* k) { return compareTimes(t, k->time) < 0; });
     if (endIt - firstIt < 2) return;
     const size_t first = size_t(firstIt - standing.begin());
     const size_t last = size_t(endIt - standing.begin()) - 1;
@@ -155,13 +152,13 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
     long previousKeySample = -1;
     for (size_t i = 0; i < n; ++i) {
         const bool isKey = span[i].key >= 0;
-        const bool fixed =
-            i == 0 || i + 1 == n || (isKey && table[size_t(span[i].key)].locked);
+        const bool fixed = i == 0 || i + 1 == n || (isKey && table[size_t(span[i].key)].locked);
         if (!onKeys || isKey) fs.flags[i] |= kFitNode;
         if (fixed) fs.flags[i] |= kFitNode | kFitFixed;
         if (fixed || (isKey && keepWhole)) fs.target[i] = fs.y[i];
         if (isKey) {
-            if (keepWhole && previousKeySample >= 0) fs.wholeTo[size_t(previousKeySample)] = uint32_t(i);
+            if (keepWhole && previousKeySample >= 0)
+                fs.wholeTo[size_t(previousKeySample)] = uint32_t(i);
             previousKeySample = long(i);
         }
     }
@@ -169,9 +166,10 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
     const TQKeyframeRecord& startKey = *standing[first];
     const TQKeyframeRecord& endKey = *standing[last];
     const bool discrete = _d->discrete;
-    const FitShape fitShape = discrete || shape == kTQSimplifyConstant
-                                  ? FitShape::Constant
-                                  : (shape == kTQSimplifyLinear ? FitShape::Linear : FitShape::Bezier);
+    const FitShape fitShape =
+        discrete || shape == kTQSimplifyConstant
+            ? FitShape::Constant
+            : (shape == kTQSimplifyLinear ? FitShape::Linear : FitShape::Bezier);
     // Catmull-Rom slopes at the keyframes of the old curve.
     auto oldSlope = [&](size_t i) {
         return catmullRomSlope(*standing[i == 0 ? 0 : i - 1],
@@ -184,9 +182,9 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
     auto writtenOut = [&](size_t i, TQKeyframeRecord& a, TQKeyframeRecord& b) {
         if (discrete || standing[i]->interpolation != kTQInterpolationCatmullRom) return false;
         BezierControl c;
-        const CurveSegment segment = makeSegment(*standing[i], *standing[i + 1],
-                                                 kTQInterpolationCatmullRom, oldSlope(i),
-                                                 oldSlope(i + 1));
+        const CurveSegment segment =
+            makeSegment(*standing[i], *standing[i + 1], kTQInterpolationCatmullRom, oldSlope(i),
+                        oldSlope(i + 1));
         if (!bezierControl(segment, c)) return false;
         setBezierHandles(a, b, c);
         return true;
@@ -217,7 +215,7 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
     const unsigned code = fitShape == FitShape::Bezier
                               ? unsigned(kTQInterpolationBezier)
                               : (fitShape == FitShape::Linear ? unsigned(kTQInterpolationLinear)
-                                                               : unsigned(kTQInterpolationConstant));
+                                                              : unsigned(kTQInterpolationConstant));
     for (size_t j = 0; j < fit.size(); ++j) {
         const SpanSample& at = span[fit[j].index];
         TQKeyframeRecord& k = fitted[j];
@@ -249,16 +247,18 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
             const size_t ia = standingIndexOf(span[fit[j].index].key);
             const size_t ib = ia + 1;
             if (!discrete && a.interpolation == kTQInterpolationCatmullRom) {
-                const bool sameBefore =
-                    ia == first ? true
-                                : (j > 0 && span[fit[j - 1].index].key == long(standing[ia - 1] - table.data()));
+                const bool sameBefore = ia == first
+                                            ? true
+                                            : (j > 0 && span[fit[j - 1].index].key ==
+                                                            long(standing[ia - 1] - table.data()));
                 const bool sameAfter =
                     ib == last ? true
-                               : (j + 2 < fit.size() &&
-                                  span[fit[j + 2].index].key == long(standing[ib + 1] - table.data()));
+                               : (j + 2 < fit.size() && span[fit[j + 2].index].key ==
+                                                            long(standing[ib + 1] - table.data()));
                 if (!sameBefore || !sameAfter) {
                     BezierControl c;
-                    if (bezierControl(makeSegment(a, b, a.interpolation, oldSlope(ia), oldSlope(ib)), c)) {
+                    if (bezierControl(
+                            makeSegment(a, b, a.interpolation, oldSlope(ia), oldSlope(ib)), c)) {
                         setBezierHandles(a, b, c);
                     }
                 }
@@ -296,8 +296,8 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
             rebuilt.push_back(fitted[j++]);  // a keyframe that stays comes as fitted
             continue;
         }
-        const bool atEnd = compareTimes(old.time, startKey.time) == 0 ||
-                           compareTimes(old.time, endKey.time) == 0;
+        const bool atEnd =
+            compareTimes(old.time, startKey.time) == 0 || compareTimes(old.time, endKey.time) == 0;
         if (atEnd || (old.locked && !isStanding)) rebuilt.push_back(old);
     }
     while (j < fitted.size()) rebuilt.push_back(fitted[j++]);

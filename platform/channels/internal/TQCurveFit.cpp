@@ -300,8 +300,10 @@ void alignSlopes(const Fitter& fitter, const Chain& chain, double alignStart, do
             const bool outSide = j < segments && !chain.whole[j];
             inVar[j] = outVar[j] = -1;
             fixedIn[j] = fixedOut[j] = kNone;
-            if (j == 0 && outSide && !freed[j] && std::isfinite(alignStart)) fixedOut[j] = alignStart;
-            if (j == segments && inSide && !freed[j] && std::isfinite(alignEnd)) fixedIn[j] = alignEnd;
+            if (j == 0 && outSide && !freed[j] && std::isfinite(alignStart))
+                fixedOut[j] = alignStart;
+            if (j == segments && inSide && !freed[j] && std::isfinite(alignEnd))
+                fixedIn[j] = alignEnd;
             if (inSide && std::isnan(fixedIn[j])) inVar[j] = unknowns++;
             if (outSide && std::isnan(fixedOut[j])) {
                 outVar[j] = (inSide && !freed[j] && inVar[j] >= 0) ? inVar[j] : unknowns++;
@@ -337,7 +339,8 @@ void alignSlopes(const Fitter& fitter, const Chain& chain, double alignStart, do
                 slopes[j] = solve(sums[j]);
                 continue;
             }
-            slopes[j] = {p >= 0 ? rhs[size_t(p)] : fixedOut[j], q >= 0 ? rhs[size_t(q)] : fixedIn[j + 1]};
+            slopes[j] = {p >= 0 ? rhs[size_t(p)] : fixedOut[j],
+                         q >= 0 ? rhs[size_t(q)] : fixedIn[j + 1]};
             if (!fitter.bezierFits(chain.keys[j], chain.keys[j + 1], slopes[j])) {
                 freed[j] = freed[j + 1] = 1;
                 allFit = false;
@@ -411,10 +414,13 @@ void smoothedTargets(const std::vector<double>& t, const std::vector<double>& y,
             r2 += wx2 * y[k];
         }
         // Cramer's rule for a; a window too short for a parabola takes the weighted mean.
-        const double det = m0 * (m2 * m4 - m3 * m3) - m1 * (m1 * m4 - m2 * m3) + m2 * (m1 * m3 - m2 * m2);
+        const double det =
+            m0 * (m2 * m4 - m3 * m3) - m1 * (m1 * m4 - m2 * m3) + m2 * (m1 * m3 - m2 * m2);
         double value = r0 / m0;
         if (std::fabs(det) > 1e-12 * m0 * m0 * m0) {
-            value = (r0 * (m2 * m4 - m3 * m3) - m1 * (r1 * m4 - r2 * m3) + m2 * (r1 * m3 - r2 * m2)) / det;
+            value =
+                (r0 * (m2 * m4 - m3 * m3) - m1 * (r1 * m4 - r2 * m3) + m2 * (r1 * m3 - r2 * m2)) /
+                det;
         }
         target[i] = std::clamp(value, y[i] - limit, y[i] + limit);
     }

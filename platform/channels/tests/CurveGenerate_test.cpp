@@ -31,16 +31,12 @@ std::unique_ptr<TQChannel> mixedCurve(bool discrete = false) {
         double value;
         unsigned interpolation;
     };
-    const Key keys[] = {{0, 1.0, kTQInterpolationCatmullRom},
-                        {6, 3.0, kTQInterpolationCatmullRom},
-                        {11, 2.0, kTQInterpolationBezier},
-                        {17, -1.0, kTQInterpolationConstant},
-                        {22, 0.5, kTQInterpolationCatmullRom},
-                        {25, 0.0, kTQInterpolationEaseOut},
-                        {27, 2.5, kTQInterpolationExp},
-                        {32, 4.0, kTQInterpolationCatmullRom},
-                        {36, 2.0, kTQInterpolationCatmullRom},
-                        {40, 3.0, kTQInterpolationBezier}};
+    const Key keys[] = {
+        {0, 1.0, kTQInterpolationCatmullRom},  {6, 3.0, kTQInterpolationCatmullRom},
+        {11, 2.0, kTQInterpolationBezier},     {17, -1.0, kTQInterpolationConstant},
+        {22, 0.5, kTQInterpolationCatmullRom}, {25, 0.0, kTQInterpolationEaseOut},
+        {27, 2.5, kTQInterpolationExp},        {32, 4.0, kTQInterpolationCatmullRom},
+        {36, 2.0, kTQInterpolationCatmullRom}, {40, 3.0, kTQInterpolationBezier}};
     for (const Key& k : keys) {
         TQKeyframeHandle h = c->setKeyframe(frame(k.frame), k.value);
         c->setKeyframeInterpolation(h, k.interpolation);
@@ -79,9 +75,9 @@ TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_fram
         for (unsigned mode : modes) {
             for (unsigned direction : {kTQExtrapolationBefore, kTQExtrapolationAfter}) {
                 for (unsigned cycles : {1u, 2u, 5u}) {
-                    SCOPED_TRACE(testing::Message() << "mode " << mode << " direction "
-                                                    << direction << " cycles " << cycles
-                                                    << (discrete ? " discrete" : ""));
+                    SCOPED_TRACE(testing::Message()
+                                 << "mode " << mode << " direction " << direction << " cycles "
+                                 << cycles << (discrete ? " discrete" : ""));
                     auto curve = mixedCurve(discrete);
                     curve->setExtrapolation(mode, kTQExtrapolationBefore);
                     curve->setExtrapolation(mode, kTQExtrapolationAfter);
@@ -91,8 +87,8 @@ TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_fram
                     // A repeated curve that jumps shows the start of a cycle at each seam, but
                     // its last keyframe, now inside, keeps the value that ends one: where the
                     // longer span repeats beyond the new keyframes, so does that value.
-                    const bool jumpBakedAfter = mode == kTQExtrapolationRepeat &&
-                                                direction == kTQExtrapolationAfter;
+                    const bool jumpBakedAfter =
+                        mode == kTQExtrapolationRepeat && direction == kTQExtrapolationAfter;
                     const int64_t blind = jumpBakedAfter ? 40 * int64_t(cycles + 1) : 0;
                     EXPECT_EQ(differingFrames(*curve, *baked, cycles, blind), 0);
                     // The keyframes now reach over the cycles on the side baked.
@@ -104,9 +100,9 @@ TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_fram
                         EXPECT_EQ(CMTimeCompare(baked->getKeyframeMaxTime(), frame(40)), 0);
                     } else {
                         EXPECT_EQ(CMTimeCompare(baked->getKeyframeMinTime(), frame(0)), 0);
-                        EXPECT_GE(CMTimeCompare(baked->getKeyframeMaxTime(),
-                                                CMTimeAdd(frame(40), reach)),
-                                  0);
+                        EXPECT_GE(
+                            CMTimeCompare(baked->getKeyframeMaxTime(), CMTimeAdd(frame(40), reach)),
+                            0);
                     }
                     EXPECT_EQ(reference_curves::backwardSegments(*baked), 0u);
                 }

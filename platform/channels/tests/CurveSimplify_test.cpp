@@ -1,0 +1,240 @@
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <memory>
+
+#include "platform/channels/testing/ReferenceCurves.h"
+
+using namespace reference_curves;
+
+namespace {
+
+std::unique_ptr<TQChannel> cloneOf(const TQChannel& c) {
+    return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
+}
+
+int64_t frameOf(const CMTime& t) { return t.value * kFps / t.timescale; }
+
+bool onFrame(const CMTime& t) {
+    return CMTimeCompare(BN_CMTimeFloorToSampleDuration(t, frameDuration()), t) == 0;
+}
+
+// Simplifies the span from frame `first` to frame `last` to a worst error of `error` (in the
+// curve's units) and checks what every simplification promises: the error at every frame of the
+// span, keyframes on frames, no segment running back in time, both ends kept.
+void simplifyAndCheck(TQChannel& c, int64_t first, int64_t last, double error, int smoothness,
+                      int shape = kTQSimplifyBezier, int placement = kTQSimplifyOnFrames) {
+    const auto before = cloneOf(c);
+    const double tolerance = error / height(c, first, last) * 100.0;
+    c.simplifyCurve(frame(first), frame(last), frameDuration(), shape, smoothness, tolerance,
+                    placement);
+    EXPECT_LE(worstFrameError(*before, c, first, last), error * (1.0 + 1e-9));
+    EXPECT_EQ(backwardSegments(c), 0u);
+    for (const TQKeyframeState& k : c.getKeyframeStates()) {
+        EXPECT_TRUE(onFrame(k.time)) << "keyframe at " << CMTimeGetSeconds(k.time) << " s";
+    }
+    for (int64_t end : {first, last}) {
+        TQKeyframeHandle now = c.getKeyframe(frame(end));
+        TQKeyframeHandle then = before->getKeyframe(frame(end));
+        ASSERT_TRUE(now && then) << "end at frame " << end;
+        double a = 0.0, b = 0.0;
+        c.getKeyframe(now, nullptr, &a);
+        before->getKeyframe(then, nullptr, &b);
+        EXPECT_EQ(a, b) << "end at frame " << end;
+    }
+}
+
+TEST(CurveSimplify, keeps_its_promise_on_the_reference_curves_with_few_keyframes) {
+    struct Case {
+        const char* name;
+        std::unique_ptr<TQChannel> (*make)();
+        double error;  // the worst error asked, in the curve's units or of its height
+        bool ofHeight;
+        unsigned most;  // keyframes at most
+    };
+    // A shorter noisy sine than the benchmark's, with the same rate of keyframes allowed.
+    const Case cases[] = {{"noisy sine", [] { return noisySine(6000); }, 0.05, false, 270},
+                          {"catmull-rom keys", [] { return catmullRomKeys(); }, 0.001, true, 500},
+                          {"sketched stroke", [] { return sketchedStroke(); }, 0.01, true, 35}};
+    for (const Case& k : cases) {
+        for (int smoothness : {0, 3, 10}) {
+            SCOPED_TRACE(testing::Message() << k.name << ", smoothness " << smoothness);
+            auto c = k.make();
+            const int64_t first = frameOf(c->getKeyframeMinTime());
+            const int64_t last = frameOf(c->getKeyframeMaxTime());
+            const double error = k.ofHeight ? k.error * height(*c, first, last) : k.error;
+            simplifyAndCheck(*c, first, last, error, smoothness);
+            EXPECT_LE(c->numberOfKeyframes(), k.most);
+        }
+    }
+}
+
+TEST(CurveSimplify, leaves_the_curve_outside_the_span_and_locked_keyframes_as_they_were) {
+    auto c = catmullRomKeys(80);
+    c->setInterpolation(kTQInterpolationCatmullRom);
+    const std::vector<TQKeyframeHandle> keys = c->getKeyframes(false);
+    const TQKeyframeHandle locked = keys[40];
+    c->setKeyframeLocked(locked, true);
+    CMTime lockedTime;
+    double lockedValue = 0.0;
+    c->getKeyframe(locked, &lockedTime, &lockedValue);
+    CMTime first, last;
+    c->getKeyframe(keys[20], &first, nullptr);
+    c->getKeyframe(keys[60], &last, nullptr);
+    const auto before = cloneOf(*c);
+
+    // The span asked for reaches past the keyframes at its ends, which it snaps in to.
+    c->simplifyCurve(CMTimeSubtract(first, frame(1)), CMTimeAdd(last, frame(1)),
+                     frameDuration(), kTQSimplifyBezier, 0, 5.0, kTQSimplifyOnFrames);
+
+    EXPECT_LT(c->numberOfKeyframes(), before->numberOfKeyframes());
+    const int64_t end = frameOf(c->getKeyframeMaxTime());
+    // Outside, the curve is the same but for rounding (the bordering Catmull-Rom segments are
+    // Bezier segments now).
+    EXPECT_LE(worstFrameError(*before, *c, -60, frameOf(first)), 1e-12);
+    EXPECT_LE(worstFrameError(*before, *c, frameOf(last), end + 60), 1e-12);
+    EXPECT_LE(worstFrameError(*before, *c, frameOf(first), frameOf(last)),
+              0.05 * height(*before, frameOf(first), frameOf(last)));
+    // Keyframes that stay keep their handles; the locked one keeps its time and value too.
+    for (size_t i : {size_t(0), size_t(20), size_t(40), size_t(60), size_t(79)}) {
+        EXPECT_TRUE(c->getKeyframe(keys[i], nullptr, nullptr)) << "keyframe " << i;
+    }
+    CMTime time;
+    double value = 0.0;
+    ASSERT_TRUE(c->getKeyframe(locked, &time, &value));
+    EXPECT_EQ(CMTimeCompare(time, lockedTime), 0);
+    EXPECT_EQ(value, lockedValue);
+    EXPECT_TRUE(c->getKeyframeLocked(locked));
+}
+
+TEST(CurveSimplify, at_zero_tolerance_keeps_every_frame_and_drops_keyframes_that_change_nothing) {
+    // Two straight runs of keyframes, one per frame, meeting at a corner on frame 30; values
+    // from 0 up to 3 and down to -3: the scale (height plus largest magnitude) is 9.
+    auto corner = std::make_unique<TQChannel>("corner", 1, 0.0);
+    corner->setInterpolation(kTQInterpolationLinear);
+    for (int64_t k = 0; k <= 60; ++k) corner->setKeyframe(frame(k), k <= 30 ? 0.1 * k : 9.0 - 0.2 * k);
+    auto expected = std::make_unique<TQChannel>("corner", 1, 0.0);
+    for (int64_t k : {0, 30, 60}) expected->setKeyframe(frame(k), corner->getCurveValue(frame(k)));
+    expected->setInterpolation(kTQInterpolationLinear);
+    corner->simplifyCurve(frame(0), frame(60), frameDuration(), kTQSimplifyBezier, 0, 0.0,
+                          kTQSimplifyOnFrames);
+    EXPECT_EQ(corner->numberOfKeyframes(), 3u);
+    EXPECT_LE(worstFrameError(*expected, *corner, -10, 70), 9e-10);
+
+    // Noise keeps its value at every frame (its scale is about 3.1).
+    auto noise = noisySine(200);
+    const auto before = cloneOf(*noise);
+    noise->simplifyCurve(frame(0), frame(199), frameDuration(), kTQSimplifyBezier, 4, 0.0,
+                         kTQSimplifyOnFrames);
+    EXPECT_LE(worstFrameError(*before, *noise, 0, 199), 3.1e-10);
+    EXPECT_EQ(backwardSegments(*noise), 0u);
+}
+
+TEST(CurveSimplify, fits_lines_steps_and_existing_keyframes_within_the_same_promise) {
+    struct Case {
+        const char* name;
+        int shape;
+        int placement;
+        unsigned interpolation;  // of every new segment, or kTQInterpolationMixed
+    };
+    const Case cases[] = {
+        {"lines", kTQSimplifyLinear, kTQSimplifyOnFrames, kTQInterpolationLinear},
+        {"steps", kTQSimplifyConstant, kTQSimplifyOnFrames, kTQInterpolationConstant},
+        {"existing keyframes", kTQSimplifyBezier, kTQSimplifyOnExistingKeyframes,
+         kTQInterpolationMixed},
+    };
+    for (const Case& k : cases) {
+        SCOPED_TRACE(k.name);
+        auto c = sketchedStroke(120);
+        const auto before = cloneOf(*c);
+        const int64_t last = frameOf(c->getKeyframeMaxTime());
+        simplifyAndCheck(*c, 0, last, 0.02 * height(*c, 0, last), 2, k.shape, k.placement);
+        EXPECT_LT(c->numberOfKeyframes(), before->numberOfKeyframes());
+        const std::vector<TQKeyframeHandle> now = c->getKeyframes(false);
+        for (size_t i = 0; i + 1 < now.size(); ++i) {
+            CMTime t;
+            double v = 0.0;
+            c->getKeyframe(now[i], &t, &v);
+            if (k.interpolation != kTQInterpolationMixed) {
+                EXPECT_EQ(c->getKeyframeInterpolation(now[i]), k.interpolation);
+            } else {
+                // Only keyframes that were there, with their values.
+                TQKeyframeHandle old = before->getKeyframe(t);
+                ASSERT_TRUE(old) << "new keyframe at " << CMTimeGetSeconds(t) << " s";
+                double oldValue = 0.0;
+                before->getKeyframe(old, nullptr, &oldValue);
+                EXPECT_EQ(v, oldValue);
+            }
+        }
+    }
+}
+
+// A channel whose values step whatever the interpolation codes say (as booleans do).
+struct SteppedChannel : TQChannel {
+    SteppedChannel() : TQChannel("stepped", 1, 0.0) { setDiscrete(true); }
+};
+
+TEST(CurveSimplify, fits_a_stepped_channel_with_steps) {
+    SteppedChannel c;
+    Lcg rng{9};
+    double value = 0.0;
+    for (int64_t k = 0; k < 120; ++k) {
+        if (k % 12 == 0) value = std::floor(rng.next() * 4.0);
+        c.setKeyframe(frame(k), value);
+    }
+    simplifyAndCheck(c, 0, 119, 0.0, 0);
+    EXPECT_LE(c.numberOfKeyframes(), 11u);
+}
+
+struct AnnouncementCounter : TQChannelChangeObserver {
+    int count = 0;
+    void channelWillChange(TQChannelBase&) override { ++count; }
+};
+
+TEST(CurveSimplify, refuses_bad_input_without_a_change_or_an_announcement) {
+    auto c = sketchedStroke(60);
+    AnnouncementCounter announcements;
+    c->setChangeObserver(&announcements);
+    const auto untouched = cloneOf(*c);
+    const double nan = std::numeric_limits<double>::quiet_NaN();
+    const double inf = std::numeric_limits<double>::infinity();
+    struct Case {
+        const char* what;
+        CMTime start, end, duration;
+        int shape, smoothness;
+        double tolerance;
+        int placement;
+    };
+    const CMTime f = frameDuration();
+    const Case cases[] = {
+        {"invalid start", kCMTimeInvalid, frame(59), f, 2, 0, 1.0, 0},
+        {"infinite end", frame(0), kCMTimePositiveInfinity, f, 2, 0, 1.0, 0},
+        {"zero frame duration", frame(0), frame(59), CMTimeMake(0, kFps), 2, 0, 1.0, 0},
+        {"negative frame duration", frame(0), frame(59), CMTimeMake(-1, kFps), 2, 0, 1.0, 0},
+        {"NaN tolerance", frame(0), frame(59), f, 2, 0, nan, 0},
+        {"infinite tolerance", frame(0), frame(59), f, 2, 0, inf, 0},
+        {"negative tolerance", frame(0), frame(59), f, 2, 0, -1.0, 0},
+        {"negative smoothness", frame(0), frame(59), f, 2, -1, 1.0, 0},
+        {"unknown shape", frame(0), frame(59), f, 3, 0, 1.0, 0},
+        {"unknown placement", frame(0), frame(59), f, 2, 0, 1.0, 2},
+        {"span after the keyframes", frame(80), frame(200), f, 2, 0, 1.0, 0},
+        {"span with one keyframe", frame(10), frame(10), f, 2, 0, 1.0, 0},
+        {"span reversed", frame(59), frame(0), f, 2, 0, 1.0, 0},
+        {"too many frames", frame(0), frame(59), CMTimeMake(1, 1'000'000'000), 2, 0, 1.0, 0},
+    };
+    for (const Case& k : cases) {
+        c->simplifyCurve(k.start, k.end, k.duration, k.shape, k.smoothness, k.tolerance,
+                         k.placement);
+        EXPECT_TRUE(*c == *untouched) << k.what;
+    }
+    EXPECT_EQ(announcements.count, 0);
+
+    // Smoothness past what the panel offers is taken as the most there is, once announced.
+    c->simplifyCurve(frame(0), frame(59), f, kTQSimplifyBezier, 1'000'000, 1.0,
+                     kTQSimplifyOnFrames);
+    EXPECT_EQ(announcements.count, 1);
+    EXPECT_LE(worstFrameError(*untouched, *c, 0, 59), 0.01 * height(*untouched, 0, 59));
+}
+
+}  // namespace
