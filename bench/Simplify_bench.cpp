@@ -42,8 +42,8 @@ void simplifyReference(benchmark::State& state, const TQChannel& curve, double e
         state.PauseTiming();
         result.reset(static_cast<TQChannel*>(curve.cloneChannel()));
         state.ResumeTiming();
-        result->simplifyCurve(start, end, frameDuration(), kTQSimplifyBezier, smoothness,
-                              tolerance, kTQSimplifyOnFrames);
+        result->simplifyCurve(start, end, frameDuration(), kTQSimplifyBezier, smoothness, tolerance,
+                              kTQSimplifyOnFrames);
         benchmark::ClobberMemory();
     }
     state.counters["keyframes"] = double(result->numberOfKeyframes());

@@ -22,6 +22,7 @@
 #include <vector>
 
 #include "platform/channels/TQChannel.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 
 namespace reference_curves {
 
@@ -30,15 +31,7 @@ inline constexpr int32_t kFps = 30;
 inline CMTime frame(int64_t k) { return CMTimeMake(k, kFps); }
 inline CMTime frameDuration() { return CMTimeMake(1, kFps); }
 
-// Deterministic generator (64-bit LCG, top bits): every run and every compiler sees the same
-// curve. Draw into named locals, one per statement, since argument order is unspecified.
-struct Lcg {
-    uint64_t state;
-    double next() {
-        state = state * 6364136223846793005ull + 1442695040888963407ull;
-        return double(state >> 11) / 9007199254740992.0;
-    }
-};
+using curve_catalogue::Lcg;
 
 inline std::unique_ptr<TQChannel> noisySine(int64_t frames = 100'000, uint64_t seed = 11) {
     auto c = std::make_unique<TQChannel>("noisy sine", 1, 0.0);

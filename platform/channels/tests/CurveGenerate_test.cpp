@@ -4,7 +4,6 @@
 #include <memory>
 
 #include "platform/channels/testing/ReferenceCurves.h"
-#include "platform/channels/tests/CurveCatalogue.h"
 
 using reference_curves::frame;
 

@@ -85,8 +85,8 @@ TEST(CurveSimplify, leaves_the_curve_outside_the_span_and_locked_keyframes_as_th
     const auto before = cloneOf(*c);
 
     // The span asked for reaches past the keyframes at its ends, which it snaps in to.
-    c->simplifyCurve(CMTimeSubtract(first, frame(1)), CMTimeAdd(last, frame(1)),
-                     frameDuration(), kTQSimplifyBezier, 0, 5.0, kTQSimplifyOnFrames);
+    c->simplifyCurve(CMTimeSubtract(first, frame(1)), CMTimeAdd(last, frame(1)), frameDuration(),
+                     kTQSimplifyBezier, 0, 5.0, kTQSimplifyOnFrames);
 
     EXPECT_LT(c->numberOfKeyframes(), before->numberOfKeyframes());
     const int64_t end = frameOf(c->getKeyframeMaxTime());
@@ -113,7 +113,8 @@ TEST(CurveSimplify, at_zero_tolerance_keeps_every_frame_and_drops_keyframes_that
     // from 0 up to 3 and down to -3: the scale (height plus largest magnitude) is 9.
     auto corner = std::make_unique<TQChannel>("corner", 1, 0.0);
     corner->setInterpolation(kTQInterpolationLinear);
-    for (int64_t k = 0; k <= 60; ++k) corner->setKeyframe(frame(k), k <= 30 ? 0.1 * k : 9.0 - 0.2 * k);
+    for (int64_t k = 0; k <= 60; ++k)
+        corner->setKeyframe(frame(k), k <= 30 ? 0.1 * k : 9.0 - 0.2 * k);
     auto expected = std::make_unique<TQChannel>("corner", 1, 0.0);
     for (int64_t k : {0, 30, 60}) expected->setKeyframe(frame(k), corner->getCurveValue(frame(k)));
     expected->setInterpolation(kTQInterpolationLinear);
