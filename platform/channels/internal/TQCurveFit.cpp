@@ -72,7 +72,10 @@ private:
     const FitSamples& _s;
     FitShape _shape;
     double _tol;
+    // Buffers of place, kept across the runs between fixed samples.
     std::vector<size_t> _nodes;  // sample indices of the nodes of the run being placed
+    std::vector<size_t> _chain;  // node indices: the best node of each layer
+    std::vector<size_t> _path;   // node indices of the chain as checked
 };
 
 SegmentSums Fitter::sums(size_t a, size_t b) const {
@@ -208,7 +211,8 @@ void Fitter::place(size_t lo, size_t hi, std::vector<size_t>& out) {
         if (_s.flags[i] & kFitNode) _nodes.push_back(i);
     }
     const size_t last = _nodes.size() - 1;
-    std::vector<size_t> chain{0};  // node indices: the best node of each layer
+    std::vector<size_t>& chain = _chain;
+    chain.assign(1, 0);
     if (last > 1) {
         size_t hint = 1;
         size_t layerEnd = 0;
@@ -231,7 +235,8 @@ void Fitter::place(size_t lo, size_t hi, std::vector<size_t>& out) {
     chain.push_back(last);
 
     // Check the chain: each segment fits when reaching is monotone, as it nearly always is.
-    std::vector<size_t> path{0};
+    std::vector<size_t>& path = _path;
+    path.assign(1, 0);
     for (size_t d = 1; d < chain.size(); ++d) {
         const size_t from = path.back();
         const size_t to = chain[d];

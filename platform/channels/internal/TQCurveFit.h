@@ -4,8 +4,8 @@
 // answer into keyframes. Nothing here knows about channels.
 //
 // Model. Keyframes sit on samples marked as nodes, each with a pinned value: the sample's
-// target (the curve itself, or the curve averaged, never farther from it than the tolerance),
-// or the curve's own value where a keyframe must keep its value. A segment between two
+// target (the curve itself, or the curve smoothed, never farther from it than half the
+// tolerance), or the curve's own value where a keyframe must keep its value. A segment between two
 // keyframes is one of
 //   Bezier    a cubic whose handles reach a third of the segment, so that time is linear in
 //             the parameter and the handles can never turn time back; its two handle slopes are
@@ -27,11 +27,12 @@
 // checked segment by segment; where one does not fit after all, the two segments around it are
 // refitted through another node, or as a last resort the gap is filled greedily.
 //
-// Smoothness. After placement, Bezier handles are made to line up (one slope on both sides of a
-// keyframe) by one least-squares solve over the whole chain, a tridiagonal system; keyframes
-// next to a segment that no longer fits get their two slopes back as separate unknowns, and the
-// solve repeats until every segment fits. A segment with both keyframes freed is exactly its
-// own fit from the placement, which fitted, so this always ends.
+// Lined-up handles. After placement, Bezier handles are made to line up (one slope on both
+// sides of a keyframe) by one least-squares solve over the whole chain, a tridiagonal system;
+// keyframes next to a segment that no longer fits get their two slopes back as separate
+// unknowns, and the solve repeats until every segment fits. A segment with both keyframes freed is exactly its
+// own fit from the placement, which fitted, so this always ends; after a few rounds every
+// keyframe is freed at once, so that it ends soon.
 
 #include <cstddef>
 #include <cstdint>

@@ -86,6 +86,14 @@ inline std::unique_ptr<TQChannel> sketchedStroke(int points = 300, uint64_t seed
     return c;
 }
 
+// The greatest keyframe value, read from the keyframes themselves: what the channel's cached
+// extremes must answer after an edit.
+inline double greatestKeyframeValue(const TQChannel& c) {
+    double greatest = -HUGE_VAL;
+    for (const TQKeyframeState& k : c.getKeyframeStates()) greatest = std::max(greatest, k.value);
+    return greatest;
+}
+
 // The highest minus the lowest value of the curve at the frames from `first` to `last`.
 inline double height(const TQChannel& c, int64_t first, int64_t last) {
     double lo = HUGE_VAL, hi = -HUGE_VAL;

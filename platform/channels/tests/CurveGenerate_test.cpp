@@ -104,6 +104,8 @@ TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_fram
                             0);
                     }
                     EXPECT_EQ(reference_curves::backwardSegments(*baked), 0u);
+                    EXPECT_EQ(baked->getKeyframeMaxValue(false),
+                              reference_curves::greatestKeyframeValue(*baked));
                 }
             }
         }

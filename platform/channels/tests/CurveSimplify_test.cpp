@@ -31,6 +31,7 @@ void simplifyAndCheck(TQChannel& c, int64_t first, int64_t last, double error, i
                     placement);
     EXPECT_LE(worstFrameError(*before, c, first, last), error * (1.0 + 1e-9));
     EXPECT_EQ(backwardSegments(c), 0u);
+    EXPECT_EQ(c.getKeyframeMaxValue(false), greatestKeyframeValue(c));
     for (const TQKeyframeState& k : c.getKeyframeStates()) {
         EXPECT_TRUE(onFrame(k.time)) << "keyframe at " << CMTimeGetSeconds(k.time) << " s";
     }
