@@ -77,7 +77,7 @@ void cutSegment(TQKeyframeRecord& a, TQKeyframeRecord& b, const CMTime& at, bool
 
 struct Baker {
     std::vector<const TQKeyframeRecord*> standing;
-    Block cycle;  // the standing keyframes, Catmull-Rom segments at both ends written out
+    Block cycle;  // the standing keyframes, Catmull-Rom segments that copies change written out
     unsigned mode = 0;
     bool discrete = false;
     CMTime period = kCMTimeZero;
@@ -85,9 +85,10 @@ struct Baker {
 
     // Cycle k (k = 0 being the keyframes themselves), in time order.
     Block copy(int32_t k) const;
-    // Joins two neighbouring blocks where they meet. `before` tells which side is being baked,
-    // leftOriginal that the left block is the existing keyframe at the seam.
+    // Joins two neighbouring blocks where they meet; leftOriginal or rightOriginal tells that
+    // the block on that side is the existing keyframe at the seam.
     void join(Block& left, Block& right, bool leftOriginal, bool rightOriginal) const;
+    // Repeated cycles whose ends differ in value: the curve jumps at every seam.
     bool jumps() const;
 };
 
