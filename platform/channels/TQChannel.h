@@ -325,7 +325,8 @@ public:
     // third of their segment, so that time runs forward through every new segment; a
     // keyframe's two handles line up (unbroken) wherever the tolerance allows, and are marked
     // broken where not. kTQSimplifyLinear and kTQSimplifyConstant fit lines and steps, with
-    // automatic handles on new keyframes. A discrete channel is always fitted with steps.
+    // automatic handles on new keyframes. A discrete channel is always fitted with steps on its
+    // own values, unsmoothed.
     //
     // placement: kTQSimplifyOnFrames (the editor's) puts new keyframes on frames, whole
     // multiples of frameDuration; kTQSimplifyOnExistingKeyframes only keeps or removes the

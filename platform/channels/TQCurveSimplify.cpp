@@ -139,14 +139,17 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
 
     // Keyframes may go on every sample, or only where keyframes are; the ends and locked
     // keyframes stay. A keyframe that stays keeps its value, and so does every keyframe of the
-    // curve while its segments may be kept whole: without averaging, or with existing
+    // curve while its segments may be kept whole: without smoothing, or with existing
     // placement.
+    // A stepped channel is not smoothed: its values are levels (a boolean's off and on), and
+    // its keyframes keep to them.
+    const bool discrete = _d->discrete;
+    const size_t radius = discrete ? 0 : size_t(std::min(smoothness, kMaxSmoothness));
     const bool onKeys = placement == kTQSimplifyOnExistingKeyframes;
-    const bool keepWhole = smoothness == 0 || onKeys;
-    // The averaged curve keeps half the tolerance to itself, so that a fit of it has the other
+    const bool keepWhole = radius == 0 || onKeys;
+    // The smoothed curve keeps half the tolerance to itself, so that a fit of it has the other
     // half to spare.
-    smoothedTargets(fs.t, fs.y, size_t(std::min(smoothness, kMaxSmoothness)), 0.5 * fitTolerance,
-                    fs.target);
+    smoothedTargets(fs.t, fs.y, radius, 0.5 * fitTolerance, fs.target);
     fs.flags.assign(n, 0);
     fs.wholeTo.assign(n, 0);
     long previousKeySample = -1;
@@ -165,7 +168,6 @@ void TQChannel::simplifyCurve(const CMTime& start, const CMTime& end, const CMTi
 
     const TQKeyframeRecord& startKey = *standing[first];
     const TQKeyframeRecord& endKey = *standing[last];
-    const bool discrete = _d->discrete;
     const FitShape fitShape =
         discrete || shape == kTQSimplifyConstant
             ? FitShape::Constant

@@ -177,7 +177,7 @@ struct SteppedChannel : TQChannel {
     SteppedChannel() : TQChannel("stepped", 1, 0.0) { setDiscrete(true); }
 };
 
-TEST(CurveSimplify, fits_a_stepped_channel_with_steps) {
+TEST(CurveSimplify, fits_a_stepped_channel_with_steps_on_its_own_levels) {
     SteppedChannel c;
     Lcg rng{9};
     double value = 0.0;
@@ -185,8 +185,13 @@ TEST(CurveSimplify, fits_a_stepped_channel_with_steps) {
         if (k % 12 == 0) value = std::floor(rng.next() * 4.0);
         c.setKeyframe(frame(k), value);
     }
-    simplifyAndCheck(c, 0, 119, 0.0, 0);
-    EXPECT_LE(c.numberOfKeyframes(), 11u);
+    for (int smoothness : {0, 3}) {
+        simplifyAndCheck(c, 0, 119, 0.3, smoothness);
+        EXPECT_LE(c.numberOfKeyframes(), 11u);
+        for (const TQKeyframeState& k : c.getKeyframeStates()) {
+            EXPECT_EQ(k.value, std::floor(k.value)) << "smoothness " << smoothness;
+        }
+    }
 }
 
 struct AnnouncementCounter : TQChannelChangeObserver {
