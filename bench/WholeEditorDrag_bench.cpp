@@ -88,7 +88,8 @@ struct WholeEditor {
 
     void show(bool all) {
         const std::vector<TQChannelObjectRootBase*> objects = host.scene().objects();
-        std::vector<TQChannelBase*> chosen(objects.begin(), objects.begin() + (all ? long(objects.size()) : 2));
+        std::vector<TQChannelBase*> chosen(objects.begin(),
+                                           objects.begin() + (all ? long(objects.size()) : 2));
         host.setSelectedObjects(chosen);
         const char* wanted = all ? "All" : "Animated";
         for (const TQCurveSetPtr& set : ctrl.curveSets())
@@ -148,7 +149,9 @@ void BM_WholeEditorDragStep(benchmark::State& state) {
     }
     e.view.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, start));
     std::sort(steps.begin(), steps.end());
-    auto at = [&](double q) { return steps.empty() ? 0.0 : steps[size_t(q * double(steps.size() - 1))]; };
+    auto at = [&](double q) {
+        return steps.empty() ? 0.0 : steps[size_t(q * double(steps.size() - 1))];
+    };
     state.counters["p50_ms"] = at(0.50);
     state.counters["p99_ms"] = at(0.99);
     state.counters["curves"] = static_cast<double>(e.ctrl.numberOfChannelItems());
