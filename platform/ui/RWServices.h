@@ -24,6 +24,7 @@
 
 #include "platform/geometry/CGGeometry.h"
 #include "platform/ui/RWEvent.h"
+#include "platform/ui/RWTrackingArea.h"
 #include "platform/ui/RWWindow.h"
 
 // ---- View host --------------------------------------------------------------------------
@@ -61,6 +62,9 @@ public:
     virtual bool hasWindow() const { return true; }
     // Asks for one redraw; requests before the redraw runs collapse into one.
     virtual void setNeedsDisplay() = 0;
+    // Redraws now, before answering, where the host can (the frame is then what a hit test
+    // that follows sees); a request otherwise.
+    virtual void displayNow() { setNeedsDisplay(); }
     virtual void setCursor(RWCursor cursor) = 0;
     virtual void setCursorHidden(bool hidden) = 0;
     // A point in window coordinates (an event's locationInWindow) in the view's points.
@@ -68,6 +72,10 @@ public:
     // Takes the oldest pending event that matches the mask off the queue, or answers none.
     // Lets a handler fold events that are already waiting (the wheel) into one step.
     virtual std::optional<RWEvent> nextEventMatchingMask(RWEventMask mask) = 0;
+    // The areas whose owners hear the pointer move without a button down. A host that tracks
+    // nothing ignores them.
+    virtual void addTrackingArea(const RWTrackingAreaPtr& area) { (void)area; }
+    virtual void removeTrackingArea(const RWTrackingArea& area) { (void)area; }
 };
 
 // ---- Time -------------------------------------------------------------------------------

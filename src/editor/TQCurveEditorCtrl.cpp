@@ -631,5 +631,7 @@ bool TQCurveEditorCtrl::performAction(const std::string& action, RWActionSender&
 bool TQCurveEditorCtrl::validateMenuItem(RWMenuItem& item) {
     for (const char* action : kPanelActions)
         if (item.action() == action) return false;
+    // The pop-up's sets can always be chosen; the context menus are the base's to judge.
+    if (_curveSetsPopUp && item.menu() && item.menu() == _curveSetsPopUp->menu().get()) return true;
     return TQCurveEditorCtrlBase::validateMenuItem(item);
 }

@@ -26,6 +26,8 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
+#include <string>
 #include <type_traits>
 #include <vector>
 
@@ -341,14 +343,44 @@ public:
     void setBezierPointSelected(TQCurveSelectionList* list);
     void flattenSelected(TQCurveSelectionList* list);
 
-    // ---- Menus --------------------------------------------------------------------------
+    // ---- Context menus (TQCurveEditorCtrlMenus.cpp) -------------------------------------
+    //
+    // Four menus: a keypoint's, a tangent handle's, a curve's and the empty background's; the
+    // view picks one for a right click (menuForEvent). Titles are looked up in the strings
+    // table when a menu is built; validation may retitle an item (Lock / Unlock, Disable /
+    // Enable, Break / Link). Every action runs on the view's selection as it is when the
+    // action runs, validated first: an item chosen after its curve went away changes nothing.
 
+    // Each stores its menu in its field; a subclass may build its own or add to the base's.
     virtual void buildKeyframeMenu();
     virtual void buildCurveMenu();
     virtual void buildTangentMenu();
     virtual void buildDefaultMenu();
     // Runs the menu... action named; false for an action this controller does not know.
     bool performAction(const std::string& action, RWActionSender& sender) override;
+    // Routes the item by its menu (a submenu's item through the submenu's supermenu) to one of
+    // the four below; an item of none of the four menus is disabled.
+    bool validateMenuItem(RWMenuItem& item) override;
+    // Lock and Disable take their title and a mixed mark from the selected keypoints; the
+    // interpolation items are marked on, mixed or off by the selected keypoints' segments.
+    virtual bool validateKeyframeMenuItem(RWMenuItem& item);
+    // Delete All wants keypoints; the segment interpolation items a segment under the click.
+    virtual bool validateCurveMenuItem(RWMenuItem& item);
+    // Break reads Link on a broken pair; both need an unlocked channel.
+    virtual bool validateTangentMenuItem(RWMenuItem& item);
+    virtual bool validateDefaultMenuItem(RWMenuItem& item);
+
+    void menuBreakTangent(void* sender = nullptr);
+    void menuAlignTangent(void* sender = nullptr);
+    // The sender's tag as the interpolation of every selected keypoint (through the linked
+    // compound when there is one), and of the keypoint before it for the kinds that shape a
+    // segment from both ends. One undo step; nothing without a sender.
+    void menuSetKeypointInterpolation(RWActionSender* sender);
+    // The sender's tag as the interpolation of the segment of the picked curve under the
+    // mouse origin (that of the keypoint starting it). One undo step.
+    void menuSetSegmentInterpolation(RWActionSender* sender);
+    // Every keypoint of the first selected entry's channel, keeping its present value.
+    void menuDeleteAllKeyframes(void* sender = nullptr);
 
     // ---- Public fields ------------------------------------------------------------------
 
@@ -428,6 +460,30 @@ protected:
     void performWithBracket(const char* undoKey, ListOperation operation);
     // Runs the value window modally; true when it was accepted (value updated).
     virtual bool runValuePanel(TQCurveEditorValueWindow& window);
+
+    // ---- Menu helpers ---------------------------------------------------------------------
+
+    // Locks and enabled states over a selection's keypoints.
+    struct KeypointStates {
+        size_t count = 0;
+        size_t locked = 0;
+        size_t unlocked = 0;
+        size_t enabled = 0;
+        size_t disabled = 0;
+        // An empty selection counts as all locked.
+        bool allLocked() const { return locked == count; }
+    };
+    KeypointStates keypointStates(TQCurveSelectionList* list) const;
+    bool validateKeypointInterpolationItem(RWMenuItem& item, TQCurveSelectionList* list,
+                                           bool canModify) const;
+    // One keypoint's interpolation, through its linked compound when there is one; announced
+    // and marked dirty.
+    void setKeypointInterpolation(TQChannel& channel, TQKeyframeHandle handle,
+                                  unsigned interpolation);
+    // The time of the view's mouse origin as the channel's own time (invalid without a view).
+    CMTime channelTimeAtMouseOrigin(const TQChannel& channel) const;
+    // The keypoint that starts the segment under the mouse origin, or null before the first.
+    TQKeyframeHandle segmentKeyframeAtMouseOrigin(const TQChannel& channel) const;
 
     // A frozen key's item and channel, resolved once per curve for one deform call.
     struct DeformTarget {

@@ -26,6 +26,8 @@ TQCurveEditorViewBase::~TQCurveEditorViewBase() {
     // A drag still under way ends here: its undo step closes while the selection it
     // announced is still alive.
     closeDragCapture();
+    // The host would report pointer moves to a dead view.
+    if (_viewHost && _trackingArea) _viewHost->removeTrackingArea(*_trackingArea);
     // A controller that still points here would call a dead view at its next update.
     if (_controller && _controller->getView() == this) _controller->setView(nullptr);
 }
@@ -38,8 +40,15 @@ void TQCurveEditorViewBase::setController(TQCurveEditorCtrlBase* controller) {
 // ---- Wiring, size and backing --------------------------------------------------------------
 
 void TQCurveEditorViewBase::setViewHost(RWViewHost* host) {
+    if (host == _viewHost) {
+        viewDidChangeBackingProperties();
+        return;
+    }
+    if (_viewHost && _trackingArea) _viewHost->removeTrackingArea(*_trackingArea);
+    _trackingArea.reset();
     _viewHost = host;
     viewDidChangeBackingProperties();
+    updateTrackingAreas();
 }
 
 RWClock& TQCurveEditorViewBase::clock() const {
@@ -55,8 +64,9 @@ CGRect TQCurveEditorViewBase::bounds() const {
 }
 
 void TQCurveEditorViewBase::setFrameSize(const CGSize&) {
-    // The host has already resized its widget; only the backing follows.
+    // The host has already resized its widget; only the backing and the tracking follow.
     viewDidChangeBackingProperties();
+    updateTrackingAreas();
 }
 
 void TQCurveEditorViewBase::viewDidChangeBackingProperties() {

@@ -29,6 +29,7 @@
 #include <map>
 #include <memory>
 #include <optional>
+#include <string>
 #include <utility>
 #include <vector>
 
@@ -37,8 +38,11 @@
 #include "platform/geometry/CGGeometry.h"
 #include "platform/media/CMTime.h"
 #include "platform/support/BNString.h"
+#include "platform/ui/RWAction.h"
 #include "platform/ui/RWEvent.h"
+#include "platform/ui/RWMenu.h"
 #include "platform/ui/RWServices.h"
+#include "platform/ui/RWTrackingArea.h"
 #include "src/contract/TQNotificationWords.h"
 #include "src/data/TQCurveSelection.h"
 #include "src/engine/TQCurveEditorCodes.h"
@@ -81,7 +85,7 @@ enum TQBoxPart : uint32_t {
     kTQBoxPartInside = 9,
 };
 
-class TQCurveEditorViewBase {
+class TQCurveEditorViewBase : public RWTrackingAreaOwner, public RWActionTarget {
 public:
     // Minimum time between two frames, in seconds, and the delay of the one redraw that a
     // request inside that gap schedules, in nanoseconds.
@@ -90,7 +94,7 @@ public:
 
     // Zero volumes; a subclass's constructor sets them.
     TQCurveEditorViewBase();
-    virtual ~TQCurveEditorViewBase();
+    ~TQCurveEditorViewBase() override;
     TQCurveEditorViewBase(const TQCurveEditorViewBase&) = delete;
     TQCurveEditorViewBase& operator=(const TQCurveEditorViewBase&) = delete;
 
@@ -267,9 +271,14 @@ public:
     // The edit tool (tool 0).
     virtual void mouseDownEdit(const RWEvent& event);
     virtual void mouseDraggedEdit(const RWEvent& event);
-    // The sketch tool (1): nothing in this class; the views that offer it override these.
-    virtual void mouseDownSketch(const RWEvent&) {}
-    virtual void mouseDraggedSketch(const RWEvent&) {}
+    // The sketch tool (1, TQCurveEditorViewSketch.cpp): the press puts a keypoint at the
+    // pointer on every enabled sketched channel, and opens the stroke's one undo step (closed
+    // at the release). Each drag step erases, on the first enabled sketched channel, the
+    // keypoints that the pointer passed over since the last step, then puts a keypoint at the
+    // pointer on each of them. No smoothing: the 1/30 s gate of drag steps alone sets the
+    // density of the keypoints. Shift holds the stroke to one axis.
+    virtual void mouseDownSketch(const RWEvent& event);
+    virtual void mouseDraggedSketch(const RWEvent& event);
     // The box tool (2, TQCurveEditorViewBox.cpp): a press on a part of the box starts its
     // drag; anywhere else it forgets the box and starts a rubber band, whose release puts a
     // box around the keypoints it caught (two at least).
@@ -299,6 +308,51 @@ public:
     // Whether the view has the keyboard focus.
     char isInCurveEditor() const { return _isInCurveEditor; }
     void setIsInCurveEditor(char inEditor) { _isInCurveEditor = inEditor; }
+    virtual bool acceptsFirstResponder() const { return true; }
+    // A click that activates the window also acts in the view; the pointer's shape is brought
+    // up to date first (mouseMoved).
+    virtual bool acceptsFirstMouse(const RWEvent& event);
+    // The pointer moved with no button down: nothing here (cursorUpdate chooses the shape).
+    virtual void mouseMoved(const RWEvent&) {}
+
+    // ---- Keys, nudges, deletion, cursors, the context menu (TQCurveEditorViewKeys.cpp) ----
+    //
+    // The view offers actions; which keys send them is the host's key map. Each nudge and
+    // each deletion is one undo step of its own.
+
+    // The selection by one step: up and down by one drawable pixel of value (so the step
+    // follows the zoom), left and right by one frame of the host (no time without a host).
+    void nudgeUp(void* sender = nullptr);
+    void nudgeDown(void* sender = nullptr);
+    void nudgeLeft(void* sender = nullptr);
+    void nudgeRight(void* sender = nullptr);
+    // The key of a nudge came up: the host hears that the channels are done changing.
+    void nudgeUpFinished(void* sender = nullptr);
+    void nudgeDownFinished(void* sender = nullptr);
+    void nudgeLeftFinished(void* sender = nullptr);
+    void nudgeRightFinished(void* sender = nullptr);
+    // The Delete key: the selected keypoints through the controller, and the selection
+    // emptied; with the box tool, the box and the selection are forgotten and no keypoint goes.
+    void deleteKeypoints(void* sender = nullptr);
+    // The menu of a right click: what is under the pointer is selected (keypoints and handles
+    // join the selection as a click does, a curve replaces it), the view redraws, and the
+    // controller's menu for the kind hit (keypoint, tangent, curve; else the background's)
+    // is the answer. The pick stays in the current selection for the menu's actions.
+    RWMenuPtr menuForEvent(const RWEvent& event);
+    // The pointer's shape for what a click would do: the tool's own for the sketch and box
+    // tools; for the edit tool, by what lies under the pointer, unchanged while a button or
+    // the space bar is down.
+    void cursorUpdate(const RWEvent& event) override;
+    void setCursor(RWCursor cursor) const { setCursorShape(cursor); }
+    // The area that makes the host report pointer moves over the visible part (cursor updates
+    // while the application is active); made again when the view's host or size changes.
+    virtual void updateTrackingAreas();
+    const RWTrackingAreaPtr& trackingArea() const { return _trackingArea; }
+    // Redraws at once where the host can (the next pick tests the new frame).
+    void display();
+    // The actions above by name ("nudgeUp:", "nudgeUpFinished:", ..., "delete:",
+    // "selectAll:", "selectNone:"), as a key map sends them.
+    bool performAction(const std::string& action, RWActionSender& sender) override;
 
     // Horizontal or vertical constraint of a Shift drag: the first call with no direction
     // decides it from p - origin (a tie is vertical) and answers origin; later calls keep
@@ -315,8 +369,8 @@ public:
     char snapCursor() const { return _snapCursor; }
     void setLockKeyframesInU(char lock) { _lockInU = lock; }
     char lockKeyframesInU() const { return _lockInU; }
-    // A drag's undo step is open (from its first step until the release).
-    char getCapturing() const { return _capturing.has_value() ? 1 : 0; }
+    // A drag's or a key's undo step is open (a drag's from its first step until the release).
+    char getCapturing() const { return _capturing.has_value() || _keyCapturing ? 1 : 0; }
     void setShouldDrawProcessedCurve(char draw) { _shouldDrawProcessedCurve = draw; }
     char shouldDrawProcessedCurve() const { return _shouldDrawProcessedCurve; }
     char startDrag() const { return _startDrag; }
@@ -557,6 +611,16 @@ protected:
     bool boxKeepsAspect() const;
     void setCursorShape(RWCursor cursor) const;
     void hideCursorForDrag();
+    // A nudge: the selection offset by a time and a value, in one undo step of its own.
+    void nudgeBy(CMTime time, double value);
+    void nudgeVertically(double pixels);
+    // The host's frame, or a zero time without a host.
+    CMTime frameDuration() const;
+    // One drag step of the sketch tool on one channel item: erases the keypoints passed since
+    // _lastTime, then writes a keypoint at (newTime, v).
+    void sketchChannelStep(uint32_t channelId, double lastX, double newX, double v);
+    // The entry the sketch tool writes through, made at first use.
+    const TQCurveSelectionPtr& sketchEntry(uint32_t channelId);
 
     // ---- Fields of the view volume, in declaration order ----
     TQCurveEditorCtrlBase* _controller = nullptr;  // not owned
@@ -602,6 +666,7 @@ protected:
     // reset at the release, or when the gesture is abandoned (a new press without a release,
     // a new controller, the view's end).
     std::optional<TQChangeBracket> _capturing;
+    char _keyCapturing = 0;     // a nudge's or a deletion's undo step is open
     char _isInCurveEditor = 0;  // the view has the keyboard focus
     char _mouseIsDown = 0;      // a gesture is under way
     char _snapCursor = 0;
@@ -613,6 +678,10 @@ protected:
     char _selecting = 0;
     uint32_t _activePart = kTQBoxPartNone;         // box part of the gesture
     uint32_t _currentActivePart = kTQBoxPartNone;  // hit id of the last pick of the box tool
+
+    RWTrackingAreaPtr _trackingArea;  // registered with _viewHost while both exist
+    // The sketch tool's entry, reused for every channel and step of a stroke.
+    TQCurveSelectionPtr _sketchEntry;
 
     // ---- Selection lists, owned, never null ----
     std::shared_ptr<TQCurveSelectionList> _selection;
@@ -669,6 +738,7 @@ protected:
     CGPoint _worldPerPixel = CGPointZero;  // getSizeWorld of one pixel, set with the projection
 
 private:
+    friend class HotKeySentry;
     // Scratch of drawOriginalCurve, kept between frames so that the merge of selected
     // keypoints allocates only when it grows.
     std::vector<std::pair<CMTime, double>> _selectedKeyScratch;

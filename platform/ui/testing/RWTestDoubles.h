@@ -67,6 +67,12 @@ public:
         return std::nullopt;
     }
 
+    void displayNow() override { ++_immediateRedraws; }
+    void addTrackingArea(const RWTrackingAreaPtr& area) override { _trackingAreas.push_back(area); }
+    void removeTrackingArea(const RWTrackingArea& area) override {
+        std::erase_if(_trackingAreas, [&](const RWTrackingAreaPtr& a) { return a.get() == &area; });
+    }
+
     void setBounds(const CGRect& bounds) { _bounds = bounds; }
     void setBackingScaleFactor(double scale) { _scale = scale; }
     void setHasWindow(bool has) { _hasWindow = has; }
@@ -76,6 +82,8 @@ public:
     void resetRedrawRequests() { _redrawRequests = 0; }
     const std::vector<RWCursor>& cursors() const { return _cursors; }
     bool cursorHidden() const { return _cursorHidden; }
+    int immediateRedraws() const { return _immediateRedraws; }
+    const std::vector<RWTrackingAreaPtr>& trackingAreas() const { return _trackingAreas; }
 
 private:
     CGRect _bounds;
@@ -85,6 +93,8 @@ private:
     bool _cursorHidden = false;
     std::vector<RWCursor> _cursors;
     std::deque<RWEvent> _queued;
+    int _immediateRedraws = 0;
+    std::vector<RWTrackingAreaPtr> _trackingAreas;
 };
 
 // Each runModalForWindow plays the next script: the script stands for the user working the
