@@ -75,9 +75,8 @@ bool usesBothEnds(unsigned interpolation) {
 
 // Linear, Bezier and Catmull-Rom: the kinds whose segments are marked mixed when the keypoint
 // and the one before it differ.
-constexpr uint32_t kBothEndsMask =
-    (1u << kTQInterpolationLinear) | (1u << kTQInterpolationBezier) |
-    (1u << kTQInterpolationCatmullRom);
+constexpr uint32_t kBothEndsMask = (1u << kTQInterpolationLinear) | (1u << kTQInterpolationBezier) |
+                                   (1u << kTQInterpolationCatmullRom);
 
 bool inBothEndsMask(unsigned interpolation) {
     return interpolation < 32 && ((kBothEndsMask >> interpolation) & 1u) != 0;
@@ -267,7 +266,8 @@ void TQCurveEditorCtrlBase::menuDeleteAllKeyframes(void*) {
     if (list->empty()) return;
     const TQCurveSelectionPtr entry = list->selectionAtIndex(0);
     // Held for the edit. Only the first entry's channel is cleared.
-    const TQCurveEditorItemPtr held = entry ? channelItemWithIdentifier(entry->getCurveId()) : nullptr;
+    const TQCurveEditorItemPtr held =
+        entry ? channelItemWithIdentifier(entry->getCurveId()) : nullptr;
     auto* item = dynamic_cast<TQCurveEditorChannelItem*>(held.get());
     TQChannel* channel = item ? item->channel() : nullptr;
     if (!channel) return;
@@ -332,19 +332,24 @@ bool TQCurveEditorCtrlBase::validateKeyframeMenuItem(RWMenuItem& item) {
         return canModify;
     }
     if (action == "menuDisableSelected:") {
-        if (s.count == 0) return false;
+        if (s.count == 0) {
+            item.setState(RWOffState);
+            item.setTitle(TQLocalizedString("Curve Editor Menu Disable"));
+            return false;
+        }
         const bool allDisabled = s.enabled == 0;
         item.setState(s.disabled == 0 || allDisabled ? RWOffState : RWMixedState);
         item.setTitle(TQLocalizedString(allDisabled ? "Curve Editor Menu Enable"
                                                     : "Curve Editor Menu Disable"));
         return canModify && !s.allLocked();
     }
+    const bool interpolation = action == "menuSetKeypointInterpolation:";
+    // A mark left by an earlier showing must not stay on an item that is not judged again.
+    if (interpolation) item.setState(RWOffState);
     // With nothing enabled, only the item that enables keypoints again is of use.
     if (s.enabled == 0) return false;
-    if (action == "menuSetKeypointInterpolation:") {
-        if (s.allLocked()) return false;
-        return validateKeypointInterpolationItem(item, list, canModify);
-    }
+    if (interpolation)
+        return !s.allLocked() && validateKeypointInterpolationItem(item, list, canModify);
     if (action == "menuDelete:" || action == "menuReverse:") return s.count != 0 && canModify;
     return true;
 }
@@ -408,6 +413,7 @@ bool TQCurveEditorCtrlBase::validateCurveMenuItem(RWMenuItem& item) {
     if (action == "menuAddKeyframe:") return canModify;
     if (action != "menuDeleteAllKeyframes:" && action != "menuSetSegmentInterpolation:")
         return true;
+    if (action == "menuSetSegmentInterpolation:") item.setState(RWOffState);
 
     TQCurveSelectionList* list = viewSelection();
     validateSelection(list);

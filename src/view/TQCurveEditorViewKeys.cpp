@@ -181,8 +181,8 @@ void TQCurveEditorViewBase::cursorUpdate(const RWEvent& event) {
     // The window point is scaled to the backing before it is taken into the view: unlike
     // mouseDown's conversion, and kept so.
     const double scale = windowBackingScale();
-    const CGPoint backing = CGPointMake(event.locationInWindow().x * scale,
-                                        event.locationInWindow().y * scale);
+    const CGPoint backing =
+        CGPointMake(event.locationInWindow().x * scale, event.locationInWindow().y * scale);
     CGPoint at = backing;
     if (_viewHost) at = _viewHost->convertPointFromWindow(backing) - _viewHost->bounds().origin;
     // A miss leaves the current selection as it was: it must start empty to tell.

@@ -17,9 +17,7 @@ namespace {
 
 CMTime timeOfWorldX(double x) { return TQTarnTimeForChannelSeconds(x, kTQCurveEditorTimescale); }
 
-CMTime magnitude(const CMTime& t) {
-    return CMTimeCompare(t, kCMTimeZero) < 0 ? t * -1.0 : t;
-}
+CMTime magnitude(const CMTime& t) { return CMTimeCompare(t, kCMTimeZero) < 0 ? t * -1.0 : t; }
 
 }  // namespace
 
