@@ -8,6 +8,7 @@
 #include <cmath>
 
 #include "qt/TQQtEvents.h"
+#include "qt/TQQtMenu.h"
 #include "src/view/TQCurveEditorViewBase.h"
 
 TQQtCurveViewWidget::TQQtCurveViewWidget(QWidget* parent) : QWidget(parent), _host(this) {
@@ -21,6 +22,9 @@ TQQtCurveViewWidget::TQQtCurveViewWidget(QWidget* parent) : QWidget(parent), _ho
     _dragRepeat.setInterval(
         static_cast<int>(std::ceil(TQCurveEditorViewBase::kFrameInterval * 1000.0)) + 1);
     connect(&_dragRepeat, &QTimer::timeout, this, [this] { repeatLastDrag(); });
+    _menuRunner = [this](const RWMenuPtr& menu, const QPoint& at) {
+        return TQQtRunContextMenu(menu, at, this);
+    };
 }
 
 TQQtCurveViewWidget::~TQQtCurveViewWidget() { setView(nullptr); }
@@ -116,6 +120,9 @@ void TQQtCurveViewWidget::beginGesture(QMouseEvent* event, bool doubleClick) {
     const std::optional<RWEvent> down = TQQtEvents::mouseEvent(*event, _host, _clickCount);
     if (!down) return;
     event->accept();
+    // A click that activates the window acts in the view as well, the pointer brought up to
+    // date first.
+    if (!isActiveWindow()) _view->acceptsFirstMouse(*down);
     // A gesture whose release never came (it went to a window that was modal then) ends
     // before the next one starts, so that the view is never left with its button down.
     if (_leftGesture) endGesture(*down);
@@ -155,6 +162,11 @@ void TQQtCurveViewWidget::mouseDoubleClickEvent(QMouseEvent* event) {
 }
 
 void TQQtCurveViewWidget::mouseMoveEvent(QMouseEvent* event) {
+    if (_view && event->buttons() == Qt::NoButton && !_leftGesture) {
+        hover(event->position(), event->modifiers());
+        QWidget::mouseMoveEvent(event);
+        return;
+    }
     if (!_view || !_leftGesture || !(event->buttons() & Qt::LeftButton)) {
         QWidget::mouseMoveEvent(event);
         return;
@@ -199,12 +211,23 @@ bool TQQtCurveViewWidget::event(QEvent* event) {
     return QWidget::event(event);
 }
 
+bool TQQtCurveViewWidget::sendMappedAction(const std::optional<std::string>& action) {
+    if (!_view || !action) return false;
+    struct KeySender final : RWActionSender {
+        int64_t tag() const override { return 0; }
+    } sender;
+    return _view->performAction(*action, sender);
+}
+
 void TQQtCurveViewWidget::keyPressEvent(QKeyEvent* event) {
     if (_view) {
         const RWEvent key = TQQtEvents::keyEvent(*event);
-        // A modifier key alone changes no state of the view's; the next mouse event
-        // carries the new modifiers.
-        if (key.type() == RWEventType::KeyDown && _view->keyDown(key)) {
+        // A modifier key changes no state of the view's, but may change what a click where
+        // the pointer hovers would do.
+        if (key.type() == RWEventType::FlagsChanged && _hoverAt)
+            hover(*_hoverAt, event->modifiers() | QGuiApplication::queryKeyboardModifiers());
+        if ((key.type() == RWEventType::KeyDown && _view->keyDown(key)) ||
+            sendMappedAction(_keyMap.actionForPress(*event))) {
             event->accept();
             return;
         }
@@ -215,10 +238,57 @@ void TQQtCurveViewWidget::keyPressEvent(QKeyEvent* event) {
 void TQQtCurveViewWidget::keyReleaseEvent(QKeyEvent* event) {
     if (_view) {
         const RWEvent key = TQQtEvents::keyEvent(*event);
-        if (key.type() == RWEventType::KeyUp && _view->keyUp(key)) {
+        if (key.type() == RWEventType::FlagsChanged && _hoverAt)
+            hover(*_hoverAt, QGuiApplication::queryKeyboardModifiers());
+        if ((key.type() == RWEventType::KeyUp && _view->keyUp(key)) ||
+            sendMappedAction(_keyMap.actionForRelease(*event))) {
             event->accept();
             return;
         }
     }
     QWidget::keyReleaseEvent(event);
+}
+
+void TQQtCurveViewWidget::hover(const QPointF& at, Qt::KeyboardModifiers modifiers) {
+    _hoverAt = at;
+    if (!_view) return;
+    _host.pointerMoved(RWEvent::mouseEvent(RWEventType::MouseMoved,
+                                           _host.windowPointFromWidgetPoint(at),
+                                           TQQtEvents::modifierFlags(modifiers), 0));
+}
+
+void TQQtCurveViewWidget::enterEvent(QEnterEvent* event) {
+    QWidget::enterEvent(event);
+    hover(event->position(), event->modifiers());
+}
+
+void TQQtCurveViewWidget::leaveEvent(QEvent* event) {
+    QWidget::leaveEvent(event);
+    _hoverAt.reset();
+}
+
+void TQQtCurveViewWidget::contextMenuEvent(QContextMenuEvent* event) {
+    // The menu of a click that is part of a left drag would act on a gesture under way.
+    if (!_view || _leftGesture) {
+        QWidget::contextMenuEvent(event);
+        return;
+    }
+    event->accept();
+    const RWEvent click = RWEvent::mouseEvent(RWEventType::RightMouseDown,
+                                              _host.windowPointFromWidgetPoint(event->pos()),
+                                              TQQtEvents::modifierFlags(event->modifiers()));
+    const RWMenuPtr menu = _view->menuForEvent(click);
+    if (_menuRunner) _menuRunner(menu, event->globalPos());
+    // The menu's action may have changed what lies under the pointer.
+    if (_view) hover(event->pos(), QGuiApplication::queryKeyboardModifiers());
+}
+
+void TQQtCurveViewWidget::focusInEvent(QFocusEvent* event) {
+    QWidget::focusInEvent(event);
+    if (_view) _view->becomeFirstResponder();
+}
+
+void TQQtCurveViewWidget::focusOutEvent(QFocusEvent* event) {
+    QWidget::focusOutEvent(event);
+    if (_view) _view->resignFirstResponder();
 }

@@ -13,8 +13,15 @@
 // platform's double-click interval, near where it was, counts one click more (2 for Qt's
 // double click, 3 for a third press...). Moves without a gesture under way, and the other
 // buttons, are not the edit tool's. A key press is offered to the view's customKeyEquivalent
-// before any shortcut of the window (Qt's shortcut override), then to its keyDown; keys it
-// does not take go on to the parent, so that window shortcuts still work.
+// before any shortcut of the window (Qt's shortcut override), then to its keyDown, then to the
+// key map (TQQtKeyMap.h: the arrows nudge, Delete deletes); keys none of them take go on to
+// the parent, so that window shortcuts still work. Focus in and out make the view the first
+// responder and end that.
+//
+// Pointer and menu. Moves with no button down reach the view's tracking areas, which choose the
+// pointer's shape for what a click would do (and again when a modifier key changes). A right
+// click, or the menu key, asks the view for its menu (menuForEvent, which selects what lies
+// under the pointer) and shows it, validated as it opens.
 //
 // The view takes at most one drag step per 1/30 s and drops the moves in between; the next
 // step makes up for them. So that a pointer that stops right after a dropped move still
@@ -33,8 +40,12 @@
 #include <QTimer>
 #include <QWidget>
 
+#include <functional>
 #include <optional>
+#include <string>
 
+#include "platform/ui/RWMenu.h"
+#include "qt/TQQtKeyMap.h"
 #include "qt/TQQtPainterEncoder.h"
 #include "qt/TQQtServices.h"
 
@@ -54,6 +65,13 @@ public:
 
     QSize sizeHint() const override { return QSize(640, 320); }
 
+    const TQQtKeyMap& keyMap() const { return _keyMap; }
+    void setKeyMap(TQQtKeyMap map) { _keyMap = std::move(map); }
+    // Shows a context menu and runs the chosen action (TQQtRunContextMenu unless replaced, as
+    // a test does to choose without a nested loop).
+    using ContextMenuRunner = std::function<bool(const RWMenuPtr&, const QPoint& globalPosition)>;
+    void setContextMenuRunner(ContextMenuRunner runner) { _menuRunner = std::move(runner); }
+
 protected:
     void paintEvent(QPaintEvent* event) override;
     void resizeEvent(QResizeEvent* event) override;
@@ -67,6 +85,11 @@ protected:
     bool event(QEvent* event) override;
     void keyPressEvent(QKeyEvent* event) override;
     void keyReleaseEvent(QKeyEvent* event) override;
+    void contextMenuEvent(QContextMenuEvent* event) override;
+    void enterEvent(QEnterEvent* event) override;
+    void leaveEvent(QEvent* event) override;
+    void focusInEvent(QFocusEvent* event) override;
+    void focusOutEvent(QFocusEvent* event) override;
 
 private:
     void syncBacking();
@@ -76,6 +99,10 @@ private:
     void repeatLastDrag();
     // Ends the gesture in the view with a release where `at` happened.
     void endGesture(const RWEvent& at);
+    // The key map's action for the view, if the map holds the key; answers whether it did.
+    bool sendMappedAction(const std::optional<std::string>& action);
+    // The pointer is over the widget at `at` (widget coordinates) with these modifiers.
+    void hover(const QPointF& at, Qt::KeyboardModifiers modifiers);
 
     TQQtViewHost _host;
     TQQtPainterEncoder _encoder;
@@ -92,4 +119,8 @@ private:
     // The last move of the drag, handed over again by _dragRepeat.
     std::optional<RWEvent> _lastDrag;
     QTimer _dragRepeat;
+    TQQtKeyMap _keyMap = TQQtKeyMap::standard();
+    ContextMenuRunner _menuRunner;
+    // Where the pointer hovers, for a modifier key that changes what a click would do.
+    std::optional<QPointF> _hoverAt;
 };

@@ -1,5 +1,8 @@
 #include "qt/TQQtMenu.h"
 
+#include <QPainter>
+#include <QPixmap>
+
 namespace {
 
 void fill(QMenu& into, const RWMenuPtr& menu, const TQQtMenuChoice& chosen) {
@@ -18,8 +21,10 @@ void fill(QMenu& into, const RWMenuPtr& menu, const TQQtMenuChoice& chosen) {
         }
         QAction* action = into.addAction(title);
         action->setEnabled(item->isEnabled());
-        action->setCheckable(item->state() != RWOffState);
+        // Qt's check marks know on and off only: a mixed item shows a dash instead.
+        action->setCheckable(item->state() == RWOnState);
         action->setChecked(item->state() == RWOnState);
+        if (item->state() == RWMixedState) action->setIcon(TQQtMixedStateIcon());
         // Held weakly: the menu may be rebuilt while the QMenu is still up.
         std::weak_ptr<RWMenu> weak = menu;
         QObject::connect(action, &QAction::triggered, &into, [weak, i, chosen] {
@@ -35,4 +40,30 @@ void TQQtFillMenu(QMenu& into, const RWMenuPtr& menu, const TQQtMenuChoice& chos
     if (!menu) return;
     menu->update();
     fill(into, menu, chosen);
+}
+
+QIcon TQQtMixedStateIcon() {
+    QIcon icon;
+    for (const qreal ratio : {1.0, 2.0}) {
+        constexpr int kSize = 16;
+        QPixmap pixmap(static_cast<int>(kSize * ratio), static_cast<int>(kSize * ratio));
+        pixmap.setDevicePixelRatio(ratio);
+        pixmap.fill(Qt::transparent);
+        QPainter painter(&pixmap);
+        painter.setRenderHint(QPainter::Antialiasing);
+        painter.setPen(QPen(QColor(200, 200, 204), 2.0, Qt::SolidLine, Qt::RoundCap));
+        painter.drawLine(QPointF(4.5, 8.0), QPointF(11.5, 8.0));
+        painter.end();
+        icon.addPixmap(pixmap);
+    }
+    return icon;
+}
+
+bool TQQtRunContextMenu(const RWMenuPtr& menu, const QPoint& globalPosition, QWidget* parent) {
+    if (!menu || menu->numberOfItems() == 0) return false;
+    QMenu shown(parent);
+    // Validated now, as the menu opens: what the items say is true of this moment.
+    TQQtFillMenu(shown, menu,
+                 [](RWMenu& holder, int64_t index) { holder.performActionForItemAtIndex(index); });
+    return shown.exec(globalPosition) != nullptr;
 }

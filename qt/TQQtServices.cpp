@@ -8,6 +8,10 @@
 #include <QtMath>
 
 #include <chrono>
+#include <optional>
+
+#include "qt/TQQtImages.h"
+#include "src/resources/BNImage.h"
 
 // ---- Clock --------------------------------------------------------------------------------
 
@@ -52,6 +56,14 @@ void TQQtViewHost::setNeedsDisplay() {
     if (_widget) _widget->update();
 }
 
+void TQQtViewHost::displayNow() {
+    // Painting runs only for a widget that is shown; a hidden one draws at its next show.
+    if (_widget && _widget->isVisible())
+        _widget->repaint();
+    else
+        setNeedsDisplay();
+}
+
 Qt::CursorShape TQQtViewHost::cursorShape(RWCursor cursor) {
     switch (cursor) {
         case RWCursor::Arrow: return Qt::ArrowCursor;
@@ -63,11 +75,11 @@ Qt::CursorShape TQQtViewHost::cursorShape(RWCursor cursor) {
         case RWCursor::ResizeLeftRight: return Qt::SizeHorCursor;
         case RWCursor::ResizeUpDown: return Qt::SizeVerCursor;
         case RWCursor::OperationNotAllowed: return Qt::ForbiddenCursor;
-        case RWCursor::Move: return Qt::SizeAllCursor;
-        case RWCursor::EditPoints: return Qt::PointingHandCursor;
-        case RWCursor::CrossHairs: return Qt::CrossCursor;
-        case RWCursor::Sketch: return Qt::CrossCursor;
-        case RWCursor::PenAddControlPoint: return Qt::CrossCursor;
+        case RWCursor::Move:
+        case RWCursor::EditPoints:
+        case RWCursor::CrossHairs:
+        case RWCursor::Sketch:
+        case RWCursor::PenAddControlPoint: return Qt::BitmapCursor;
         case RWCursor::ZoomIn: return Qt::BitmapCursor;
         case RWCursor::ZoomOut: return Qt::BitmapCursor;
     }
@@ -107,12 +119,44 @@ QCursor magnifierCursor(bool plus, qreal ratio) {
 
 }  // namespace
 
+const GDCursorImage* TQQtViewHost::resourceCursor(RWCursor cursor) {
+    switch (cursor) {
+        case RWCursor::Move: return &GDCursorMove;
+        case RWCursor::EditPoints: return &GDCursorEditPoints;
+        case RWCursor::CrossHairs: return &GDCursorCrossHairs;
+        case RWCursor::Sketch: return &GDCursorSketch;
+        case RWCursor::PenAddControlPoint: return &GDCursorPenAddControlPoint;
+        default: return nullptr;
+    }
+}
+
+namespace {
+
+// The resource's image at the screen's scale (its 2x file above a ratio of 1), the hot spot in
+// points as Qt takes it for a pixmap with a pixel ratio.
+std::optional<QCursor> imageCursor(const GDCursorImage& cursor, qreal devicePixelRatio) {
+    const double scale = devicePixelRatio > 1.0 ? 2.0 : 1.0;
+    const auto image = BNImageForResource(cursor.name, scale);
+    if (!image) return std::nullopt;
+    QPixmap pixmap = QPixmap::fromImage(TQQtImage(*image));
+    pixmap.setDevicePixelRatio(image->scale());
+    return QCursor(pixmap, qRound(cursor.hotSpotX), qRound(cursor.hotSpotY));
+}
+
+}  // namespace
+
 QCursor TQQtViewHost::qtCursor(RWCursor cursor, qreal devicePixelRatio) {
     switch (cursor) {
         case RWCursor::ZoomIn: return magnifierCursor(true, devicePixelRatio);
         case RWCursor::ZoomOut: return magnifierCursor(false, devicePixelRatio);
-        default: return QCursor(cursorShape(cursor));
+        default: break;
     }
+    if (const GDCursorImage* resource = resourceCursor(cursor)) {
+        if (auto drawn = imageCursor(*resource, devicePixelRatio)) return *drawn;
+        // Resources without the image: the nearest shape of Qt's own.
+        return QCursor(cursor == RWCursor::Move ? Qt::SizeAllCursor : Qt::CrossCursor);
+    }
+    return QCursor(cursorShape(cursor));
 }
 
 void TQQtViewHost::setCursor(RWCursor cursor) {
@@ -135,14 +179,36 @@ void TQQtViewHost::applyCursor() {
         _widget->setCursor(cursorShape(_cursor));
         return;
     }
-    // A zoom drag asks for its cursor at every step: the images are drawn once per pixel ratio.
+    // Drags and pointer moves ask for their cursor at every step: each image is made once per
+    // pixel ratio.
     const qreal ratio = _widget->devicePixelRatioF();
-    if (ratio != _zoomCursorRatio) {
-        _zoomCursors[0] = qtCursor(RWCursor::ZoomOut, ratio);
-        _zoomCursors[1] = qtCursor(RWCursor::ZoomIn, ratio);
-        _zoomCursorRatio = ratio;
+    if (ratio != _imageCursorRatio) {
+        for (auto& made : _imageCursors) made.reset();
+        _imageCursorRatio = ratio;
     }
-    _widget->setCursor(_zoomCursors[_cursor == RWCursor::ZoomIn ? 1 : 0]);
+    std::optional<QCursor>& made = _imageCursors[static_cast<size_t>(_cursor)];
+    if (!made) made = qtCursor(_cursor, ratio);
+    _widget->setCursor(*made);
+}
+
+void TQQtViewHost::addTrackingArea(const RWTrackingAreaPtr& area) {
+    if (area) _trackingAreas.push_back(area);
+}
+
+void TQQtViewHost::removeTrackingArea(const RWTrackingArea& area) {
+    std::erase_if(_trackingAreas, [&](const RWTrackingAreaPtr& a) { return a.get() == &area; });
+}
+
+void TQQtViewHost::pointerMoved(const RWEvent& event) {
+    if (!_widget) return;
+    const CGPoint at = convertPointFromWindow(event.locationInWindow());
+    const CGRect visible = bounds();
+    // A copy: an owner may replace its area while it hears the move.
+    const std::vector<RWTrackingAreaPtr> areas = _trackingAreas;
+    for (const RWTrackingAreaPtr& area : areas)
+        if ((area->options() & RWTrackingCursorUpdate) && area->owner() &&
+            area->contains(at, visible))
+            area->owner()->cursorUpdate(event);
 }
 
 CGPoint TQQtViewHost::convertPointFromWindow(const CGPoint& pointInWindow) const {

@@ -12,10 +12,14 @@
 #include <QPointer>
 #include <QWidget>
 
+#include <array>
 #include <deque>
+#include <optional>
+#include <vector>
 
 #include "platform/ui/RWServices.h"
 #include "qt/TQQtPainterEncoder.h"
+#include "src/resources/GDCursor.h"
 
 // Seconds since the clock was made, on the monotonic clock Qt's timers use.
 class TQQtClock final : public RWClock {
@@ -56,10 +60,17 @@ public:
     double backingScaleFactor() const override;
     bool hasWindow() const override;
     void setNeedsDisplay() override;
+    void displayNow() override;
     void setCursor(RWCursor cursor) override;
     void setCursorHidden(bool hidden) override;
     CGPoint convertPointFromWindow(const CGPoint& pointInWindow) const override;
     std::optional<RWEvent> nextEventMatchingMask(RWEventMask mask) override;
+    void addTrackingArea(const RWTrackingAreaPtr& area) override;
+    void removeTrackingArea(const RWTrackingArea& area) override;
+    size_t trackingAreaCount() const { return _trackingAreas.size(); }
+    // The pointer moved over the widget with no button down (or entered it): the owners of
+    // the cursor-update areas under it hear it.
+    void pointerMoved(const RWEvent& event);
 
     // The inverse of convertPointFromWindow for a point in the widget's own Qt coordinates:
     // what the adapter stores as an event's locationInWindow.
@@ -74,10 +85,12 @@ public:
     RWCursor cursor() const { return _cursor; }
     bool cursorHidden() const { return _cursorHidden; }
 
-    // The Qt shape shown for a cursor of the views; Qt::BitmapCursor for the shapes Qt has no
-    // cursor of its own for (the zoom cursors), which qtCursor draws.
+    // The Qt shape shown for a cursor of the views; Qt::BitmapCursor for the cursors that are
+    // images: the editor's own pointers (from the image resources) and the zoom cursors (drawn).
     static Qt::CursorShape cursorShape(RWCursor cursor);
-    // The cursor shown, drawn at the given device pixel ratio where it is an image.
+    // The resource of an editor pointer, or null for the cursors Qt or the zoom draws.
+    static const GDCursorImage* resourceCursor(RWCursor cursor);
+    // The cursor shown, made at the given device pixel ratio where it is an image.
     static QCursor qtCursor(RWCursor cursor, qreal devicePixelRatio);
 
 private:
@@ -86,9 +99,11 @@ private:
     QPointer<QWidget> _widget;
     RWCursor _cursor = RWCursor::Arrow;
     bool _cursorHidden = false;
-    QCursor _zoomCursors[2];  // out, in; drawn at _zoomCursorRatio
-    qreal _zoomCursorRatio = 0.0;
+    // The image cursors by RWCursor, made at _imageCursorRatio.
+    std::array<std::optional<QCursor>, static_cast<size_t>(RWCursor::ZoomOut) + 1> _imageCursors;
+    qreal _imageCursorRatio = 0.0;
     std::deque<RWEvent> _pending;
+    std::vector<RWTrackingAreaPtr> _trackingAreas;
 };
 
 // Installs a Qt clock, a Qt timer and the Qt text metrics (so that text boxes are measured

@@ -156,13 +156,12 @@ void TQDemoWindow::setUpController() {
     _channelListView->setOutline(_channelList);
     _controller.updateUI();
 
-    // The view offers the edit and box tools: sketching is shown, not offered.
+    // Every tool is offered: edit, sketch and box.
     RWSegmentedControl& tools = *_controller.tools();
-    const char* descriptions[] = {"Edit keypoints", "Sketch a curve (not offered here)",
+    const char* descriptions[] = {"Edit keypoints", "Sketch a curve on the selected channels",
                                   "Transform keypoints with a box"};
     for (int64_t i = 0; i < tools.segmentCount() && i < 3; ++i)
         tools.setAccessibilityDescription(descriptions[i], i);
-    tools.setEnabled(false, static_cast<int64_t>(TQTool::kSketch));
 }
 
 void TQDemoWindow::buildMenus() {

@@ -3,13 +3,14 @@
 // sample piece at start (untitled). A list of the scene's objects (the scene's selection: pick
 // one or several) and the channel list of the shown set (values, show boxes, selection in step
 // with the curves) sit beside the curve view with its vertical zoom scroller; the tool bar
-// holds the tool switch (edit and box; sketch is shown, disabled, as the view does not offer
-// it) and the curve set pop-up, which lists every automatic and custom set. The automatic sets
-// follow the objects selected, through the controller's notify. View > Frame All fits the
-// shown curves; View > Auto Zoom lets the view fit them vertically at every frame (the
-// scroller is disabled meanwhile). The Edit menu undoes
+// holds the tool switch (edit, sketch and box) and the curve set pop-up, which lists every
+// automatic and custom set. The automatic sets follow the objects selected, through the
+// controller's notify. View > Frame All fits the shown curves; View > Auto Zoom lets the view
+// fit them vertically at every frame (the scroller is disabled meanwhile). The Edit menu undoes
 // and redoes through the host's history and names the step it would undo; Delete deletes the
-// selected keypoints, or with the box tool forgets the box.
+// selected keypoints, or with the box tool forgets the box. In the curves, a right click opens
+// the menu of what lies under the pointer and the arrows nudge the selection (the curve
+// widget's key map).
 //
 // The File menu makes a new document, opens and saves project files (Save As… where the
 // document has no file yet); the title shows the file's name and a mark while the document

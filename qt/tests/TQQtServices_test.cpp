@@ -37,7 +37,7 @@ TEST(QtViewHostTest, setCursor__hidden_wins_until_shown_again) {
     TQQtViewHost host(&view);
     host.setCursor(RWCursor::Move);
     host.setCursorHidden(true);
-    host.setCursor(RWCursor::CrossHairs);
+    host.setCursor(RWCursor::CrossHair);
     EXPECT_EQ(view.cursor().shape(), Qt::BlankCursor) << "a new shape must not unhide the cursor";
     host.setCursorHidden(false);
     EXPECT_EQ(view.cursor().shape(), Qt::CrossCursor);

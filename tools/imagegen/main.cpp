@@ -9,6 +9,7 @@
 #include "ImageCanvas.h"
 
 #include "src/resources/GDColor.h"
+#include "src/resources/GDCursor.h"
 #include "src/resources/TQKeyframeImages.h"
 
 #include <algorithm>
@@ -215,6 +216,97 @@ void drawGradientBorder(ImageCanvas& canvas) {
     canvas.draw(rectangle(s - 1.0, 0.0, 1.0, s), solid(line));
 }
 
+// Pointers: a dark shape on a white rim, so that it reads on the dark curve view and on light
+// windows alike. Each is drawn twice, the rim first and wider.
+void drawOutlined(const std::function<void(double, const Rgba&)>& shape) {
+    shape(1.25, kWhite);
+    shape(0.0, grey(0.08));
+}
+
+// A capsule whose half width grows by `grow`.
+Coverage stroke(Point a, Point b, double halfWidth, double grow) {
+    return capsule(a, b, halfWidth + grow);
+}
+
+// A polygon grown by `grow`: its outline stroked around it.
+Coverage grownPolygon(const std::vector<Point>& corners, double grow) {
+    const Coverage inside = polygon(corners);
+    if (grow <= 0.0) return inside;
+    std::vector<Coverage> edges;
+    for (size_t i = 0; i < corners.size(); ++i)
+        edges.push_back(capsule(corners[i], corners[(i + 1) % corners.size()], grow));
+    return [inside, edges](Point p) {
+        double c = inside(p);
+        for (const Coverage& e : edges) c = std::max(c, e(p));
+        return c;
+    };
+}
+
+void drawMoveCursor(ImageCanvas& canvas) {
+    // Four arrows from the centre.
+    const Point c{12.0, 12.0};
+    drawOutlined([&](double g, const Rgba& colour) {
+        canvas.draw(stroke({c.x - 7.0, c.y}, {c.x + 7.0, c.y}, 0.75, g), solid(colour));
+        canvas.draw(stroke({c.x, c.y - 7.0}, {c.x, c.y + 7.0}, 0.75, g), solid(colour));
+        for (const auto& [dx, dy] : {std::pair{1.0, 0.0}, {-1.0, 0.0}, {0.0, 1.0}, {0.0, -1.0}}) {
+            const Point tip{c.x + dx * 10.0, c.y + dy * 10.0};
+            const Point base{c.x + dx * 6.5, c.y + dy * 6.5};
+            canvas.draw(grownPolygon({tip,
+                                      {base.x + dy * 3.0, base.y + dx * 3.0},
+                                      {base.x - dy * 3.0, base.y - dx * 3.0}},
+                                     g),
+                        solid(colour));
+        }
+    });
+}
+
+void drawEditPointsCursor(ImageCanvas& canvas) {
+    // An arrow whose tip is the hot spot, with a keypoint beside it.
+    const std::vector<Point> arrow{{3.0, 2.0},   {3.0, 17.0}, {6.6, 13.6}, {9.2, 19.4},
+                                   {11.6, 18.4}, {9.0, 12.6}, {14.0, 12.4}};
+    drawOutlined([&](double g, const Rgba& colour) {
+        canvas.draw(grownPolygon(arrow, g), solid(colour));
+        canvas.draw(disc({17.5, 17.5}, 3.0 + g), solid(colour));
+    });
+    canvas.draw(disc({17.5, 17.5}, 1.6), solid(kWhite));
+}
+
+void drawCrossHairsCursor(ImageCanvas& canvas) {
+    // A thin cross open at the centre, so the point under it stays visible.
+    const Point c{12.0, 12.0};
+    drawOutlined([&](double g, const Rgba& colour) {
+        canvas.draw(stroke({c.x - 9.5, c.y}, {c.x - 2.5, c.y}, 0.5, g), solid(colour));
+        canvas.draw(stroke({c.x + 2.5, c.y}, {c.x + 9.5, c.y}, 0.5, g), solid(colour));
+        canvas.draw(stroke({c.x, c.y - 9.5}, {c.x, c.y - 2.5}, 0.5, g), solid(colour));
+        canvas.draw(stroke({c.x, c.y + 2.5}, {c.x, c.y + 9.5}, 0.5, g), solid(colour));
+    });
+}
+
+void drawSketchCursor(ImageCanvas& canvas) {
+    // A pencil leaning to the right, its tip at the bottom left.
+    const std::vector<Point> body{{5.6, 15.6}, {16.6, 4.6}, {19.4, 7.4}, {8.4, 18.4}};
+    const std::vector<Point> tip{{3.0, 21.0}, {5.6, 15.6}, {8.4, 18.4}};
+    const std::vector<Point> eraser{{16.6, 4.6}, {18.2, 3.0}, {21.0, 5.8}, {19.4, 7.4}};
+    drawOutlined([&](double g, const Rgba& colour) {
+        canvas.draw(grownPolygon(body, g), solid(colour));
+        canvas.draw(grownPolygon(tip, g), solid(colour));
+        canvas.draw(grownPolygon(eraser, g), solid(colour));
+    });
+    canvas.draw(polygon({{7.0, 16.0}, {16.8, 6.2}, {17.8, 7.2}, {8.0, 17.0}}), solid(grey(0.85)));
+}
+
+void drawPenAddControlPointCursor(ImageCanvas& canvas) {
+    // A pen nib pointing down-left at the hot spot, and a plus.
+    const std::vector<Point> nib{{4.0, 20.0}, {6.0, 11.0}, {13.0, 4.0}, {20.0, 11.0}, {13.0, 18.0}};
+    drawOutlined([&](double g, const Rgba& colour) {
+        canvas.draw(grownPolygon(nib, g), solid(colour));
+        canvas.draw(stroke({16.0, 19.5}, {22.0, 19.5}, 0.7, g), solid(colour));
+        canvas.draw(stroke({19.0, 16.5}, {19.0, 22.5}, 0.7, g), solid(colour));
+    });
+    canvas.draw(stroke({4.6, 19.4}, {10.4, 13.6}, 0.35, 0.0), solid(kWhite));
+    canvas.draw(disc({11.2, 12.8}, 1.3), solid(kWhite));
+}
+
 bool writeBothScales(const std::string& folder, const std::string& name, double sizePoints,
                      const std::function<void(ImageCanvas&)>& drawImage) {
     for (const double scale : {1.0, 2.0}) {
@@ -272,5 +364,11 @@ int main(int argc, char** argv) {
     ok &= writeBothScales(folder, "ChannelRowMenu", kMenuButtonSize, drawParameterMenu);
     ok &= writeBothScales(folder, "StripReset", kSmallIconSize, drawReset);
     ok &= writeBothScales(folder, "StripBorder", kBorderSize, drawGradientBorder);
+    ok &= writeBothScales(folder, GDCursorMove.name, kGDCursorSize, drawMoveCursor);
+    ok &= writeBothScales(folder, GDCursorEditPoints.name, kGDCursorSize, drawEditPointsCursor);
+    ok &= writeBothScales(folder, GDCursorCrossHairs.name, kGDCursorSize, drawCrossHairsCursor);
+    ok &= writeBothScales(folder, GDCursorSketch.name, kGDCursorSize, drawSketchCursor);
+    ok &= writeBothScales(folder, GDCursorPenAddControlPoint.name, kGDCursorSize,
+                          drawPenAddControlPointCursor);
     return ok ? 0 : 1;
 }

@@ -93,39 +93,59 @@ TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelec
         const char* want;
     };
     const std::vector<Case> cases = {
-        {"nothing selected: only the lock item, reading Unlock", nothing, {},
+        {"nothing selected: only the lock item, reading Unlock",
+         nothing,
+         {},
          "[Delete] / [Reverse] / [Ease In] [Ease Out] [Ease In and Out] / [Constant] [Linear] "
          "[Bézier] [Catmull-Rom] [Exponential] [Logarithmic] / Unlock [Disable]"},
-        {"a keypoint after one of its kind", nothing, {3},
+        {"a keypoint after one of its kind",
+         nothing,
+         {3},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / Constant Linear* Bézier "
          "Catmull-Rom Exponential Logarithmic / Lock Disable"},
-        {"the first keypoint", nothing, {1},
+        {"the first keypoint",
+         nothing,
+         {1},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / Constant Linear* Bézier "
          "Catmull-Rom Exponential Logarithmic / Lock Disable"},
-        {"a Linear keypoint after a Bezier one: both kinds mixed", atKeys({2}, bezier), {3},
+        {"a Linear keypoint after a Bezier one: both kinds mixed",
+         atKeys({2}, bezier),
+         {3},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / Constant Linear~ Bézier~ "
          "Catmull-Rom Exponential Logarithmic / Lock Disable"},
-        {"keypoints of two kinds: every item mixed", atKeys({4}, bezier), {2, 4},
+        {"keypoints of two kinds: every item mixed",
+         atKeys({4}, bezier),
+         {2, 4},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / Constant~ Linear~ Bézier~ "
          "Catmull-Rom~ Exponential~ Logarithmic~ / Lock Disable"},
-        {"all locked: no interpolation, Unlock, no Disable", atKeys({2, 3}, lock), {2, 3},
+        {"all locked: no interpolation, Unlock, no Disable",
+         atKeys({2, 3}, lock),
+         {2, 3},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / [Constant] [Linear] [Bézier] "
          "[Catmull-Rom] [Exponential] [Logarithmic] / Unlock [Disable]"},
-        {"some locked: Lock mixed", atKeys({2}, lock), {2, 3},
+        {"some locked: Lock mixed",
+         atKeys({2}, lock),
+         {2, 3},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / Constant Linear* Bézier "
          "Catmull-Rom Exponential Logarithmic / Lock~ Disable"},
-        {"all disabled: only Lock and Enable", atKeys({2, 3}, disable), {2, 3},
+        {"all disabled: only Lock and Enable",
+         atKeys({2, 3}, disable),
+         {2, 3},
          "[Delete] / [Reverse] / [Ease In] [Ease Out] [Ease In and Out] / [Constant] [Linear] "
          "[Bézier] [Catmull-Rom] [Exponential] [Logarithmic] / Lock Enable"},
-        {"some disabled: Disable mixed", atKeys({3}, disable), {2, 3},
+        {"some disabled: Disable mixed",
+         atKeys({3}, disable),
+         {2, 3},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / Constant Linear* Bézier "
          "Catmull-Rom Exponential Logarithmic / Lock Disable~"},
-        {"a locked channel: nothing that edits", [](TQChannel& c) { c.setLocked(true, false); },
+        {"a locked channel: nothing that edits",
+         [](TQChannel& c) { c.setLocked(true, false); },
          {3},
          "[Delete] / [Reverse] / Ease In Ease Out Ease In and Out / [Constant] [Linear]* "
          "[Bézier] [Catmull-Rom] [Exponential] [Logarithmic] / [Lock] [Disable]"},
         {"a channel that refuses interpolation changes",
-         [](TQChannel& c) { c.setFlag(kTQChannelFlagNoInterpolationChange); }, {3},
+         [](TQChannel& c) { c.setFlag(kTQChannelFlagNoInterpolationChange); },
+         {3},
          "Delete / Reverse / Ease In Ease Out Ease In and Out / [Constant] [Linear]* [Bézier] "
          "[Catmull-Rom] [Exponential] [Logarithmic] / Lock Disable"},
     };
@@ -236,12 +256,18 @@ TEST_F(CtrlMenus, interpolationActions__setTheKeypointsTheKindNeedsInOneUndoStep
     };
     constexpr unsigned L = kTQInterpolationLinear, B = kTQInterpolationBezier;
     const std::vector<Case> cases = {
-        {"Bezier needs both ends: the keypoint before follows", "menuSetKeypointInterpolation:",
-         kTQInterpolationBezier, {L, B, B, L}},
-        {"Exp shapes from its start alone", "menuSetKeypointInterpolation:", kTQInterpolationExp,
+        {"Bezier needs both ends: the keypoint before follows",
+         "menuSetKeypointInterpolation:",
+         kTQInterpolationBezier,
+         {L, B, B, L}},
+        {"Exp shapes from its start alone",
+         "menuSetKeypointInterpolation:",
+         kTQInterpolationExp,
          {L, L, kTQInterpolationExp, L}},
-        {"the segment under the click is its start's", "menuSetSegmentInterpolation:",
-         kTQInterpolationConstant, {L, kTQInterpolationConstant, L, L}},
+        {"the segment under the click is its start's",
+         "menuSetSegmentInterpolation:",
+         kTQInterpolationConstant,
+         {L, kTQInterpolationConstant, L, L}},
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(c.what);

@@ -152,13 +152,15 @@ TEST_F(ViewKeys, rightClick__selectsWhatItHitsAndAnswersThatKindsMenu) {
         SCOPED_TRACE("a selected keypoint: the selection stays, the keypoint leads it");
         selectInView({keypointEntry(item, 2), keypointEntry(item, 5)});
         EXPECT_EQ(rightClick(5, .5), ctrl().getKeyframeMenu());
-        EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{keyAt(item, 5), keyAt(item, 2)}));
+        EXPECT_EQ(selectedHandles(),
+                  (std::vector<TQKeyframeHandle>{keyAt(item, 5), keyAt(item, 2)}));
     }
     {
         SCOPED_TRACE("Shift on another keypoint: it joins the selection");
         selectInView({keypointEntry(item, 5)});
         EXPECT_EQ(rightClick(2, 0, kShift), ctrl().getKeyframeMenu());
-        EXPECT_EQ(selectedHandles(), (std::vector<TQKeyframeHandle>{keyAt(item, 2), keyAt(item, 5)}));
+        EXPECT_EQ(selectedHandles(),
+                  (std::vector<TQKeyframeHandle>{keyAt(item, 2), keyAt(item, 5)}));
     }
     {
         SCOPED_TRACE("the handle of the selected keypoint");
@@ -199,7 +201,12 @@ TEST_F(ViewKeys, pointer__showsWhatAClickWouldDo) {
         {"nothing under the pointer", TQTool::kEdit, 3.5, .9, 0, 0, {RWCursor::EditPoints}},
         {"a keypoint", TQTool::kEdit, 5, .5, 0, 0, {RWCursor::Move}},
         {"a curve", TQTool::kEdit, 5, -.5, 0, 0, {RWCursor::Move}},
-        {"a curve with Option: a click adds a keypoint", TQTool::kEdit, 5, -.5, kOption, 0,
+        {"a curve with Option: a click adds a keypoint",
+         TQTool::kEdit,
+         5,
+         -.5,
+         kOption,
+         0,
          {RWCursor::PenAddControlPoint}},
         {"a keypoint with Option", TQTool::kEdit, 5, .5, kOption, 0, {RWCursor::Move}},
         {"the space bar keeps its own", TQTool::kEdit, 5, .5, 0, 1, {}},
@@ -209,12 +216,12 @@ TEST_F(ViewKeys, pointer__showsWhatAClickWouldDo) {
     for (const Case& c : cases) {
         SCOPED_TRACE(c.what);
         ctrl().setCurrentTool(c.tool);
-        if (c.space)
-            view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " ", 0, 49));
+        if (c.space) view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " ", 0, 49));
         const size_t seen = viewHost.cursors().size();
         view.cursorUpdate(mouseAt(RWEventType::MouseMoved, CGPointMake(c.t, c.v), c.mods, 0));
-        EXPECT_EQ(std::vector<RWCursor>(viewHost.cursors().begin() + seen, viewHost.cursors().end()),
-                  c.want);
+        EXPECT_EQ(
+            std::vector<RWCursor>(viewHost.cursors().begin() + seen, viewHost.cursors().end()),
+            c.want);
         EXPECT_TRUE(view.getCurrentSelection()->empty());
         if (c.space) view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ", 0, 49));
     }

@@ -58,17 +58,27 @@ TEST_F(ViewSketch, stroke__erasesWhatItPassesOverAsOneUndoStep) {
         const char* want;
     };
     const std::vector<Case> cases = {
-        {"to the right", {{2.5, .5}, {3.5, .6}, {4.5, .7}}, 0,
+        {"to the right",
+         {{2.5, .5}, {3.5, .6}, {4.5, .7}},
+         0,
          "1 0, 2 0, 2.5 0.5, 3.5 0.6, 4.5 0.7, 5 0, 6 0, 7 0, 8 0"},
-        {"to the left: the new keypoints come before the old ones", {{6.5, .5}, {5.5, .6}, {4.5, .7}},
-         0, "1 0, 2 0, 3 0, 4 0, 4.5 0.7, 5.5 0.6, 6.5 0.5, 7 0, 8 0"},
+        {"to the left: the new keypoints come before the old ones",
+         {{6.5, .5}, {5.5, .6}, {4.5, .7}},
+         0,
+         "1 0, 2 0, 3 0, 4 0, 4.5 0.7, 5.5 0.6, 6.5 0.5, 7 0, 8 0"},
         // A keypoint beyond the step's reach stays: from 2.5 a step of half a second reaches 3.
-        {"short steps erase only what they reach", {{2.5, .5}, {3, .5}, {3.25, .5}}, 0,
+        {"short steps erase only what they reach",
+         {{2.5, .5}, {3, .5}, {3.25, .5}},
+         0,
          "1 0, 2 0, 2.5 0.5, 3 0.5, 3.25 0.5, 4 0, 5 0, 6 0, 7 0, 8 0"},
-        {"a click alone leaves one keypoint", {{2.5, .5}}, 0,
+        {"a click alone leaves one keypoint",
+         {{2.5, .5}},
+         0,
          "1 0, 2 0, 2.5 0.5, 3 0, 4 0, 5 0, 6 0, 7 0, 8 0"},
         // Mostly sideways from the press: the stroke keeps the press's value.
-        {"Shift holds the first axis", {{2.5, .5}, {3.5, .55}, {4.5, .9}}, kShift,
+        {"Shift holds the first axis",
+         {{2.5, .5}, {3.5, .55}, {4.5, .9}},
+         kShift,
          "1 0, 2 0, 2.5 0.5, 3.5 0.5, 4.5 0.5, 5 0, 6 0, 7 0, 8 0"},
     };
     for (const Case& c : cases) {

@@ -1,0 +1,144 @@
+// The curve widget's keys, context menu and pointer through Qt: the key map's arrows and
+// Delete act on the selection one undo step each, a right click shows the menu of what it hit
+// validated as it opens (marks and all) and runs the chosen item, and the pointer takes the
+// editor's own images over what a click would touch.
+#include <gtest/gtest.h>
+
+#include <QContextMenuEvent>
+#include <QMenu>
+#include <QTest>
+
+#include "qt/TQQtKeyMap.h"
+#include "qt/TQQtMenu.h"
+#include "qt/TQQtServices.h"
+#include "qt/tests/QtViewFixture.h"
+#include "src/resources/TQStrings.h"
+
+namespace qt_test {
+namespace {
+
+class QtViewKeysMenu : public QtViewFixture {
+protected:
+    void SetUp() override {
+        QtViewFixture::SetUp();
+        channel = addCurve("A", "bump");  // 2 0, 5 .5, 8 0
+        channel->setInterpolation(kTQInterpolationLinear);
+        item = addItem(channel);
+        item->setScaleY(1.0);
+        item->setOffsetY(0.0);
+        item->select(1);
+        drawFrame();
+        ASSERT_GE(widget.framesDrawn(), 1) << "the widget drew no frame: picks would find nothing";
+    }
+    TQChannel* channel = nullptr;
+    TQCurveEditorChannelItemPtr item;
+};
+
+TEST(QtKeyMap, standard__arrowsNudgeUntilTheLastReleaseAndDeleteDeletes) {
+    const TQQtKeyMap map = TQQtKeyMap::standard();
+    const QKeyEvent up(QEvent::KeyPress, Qt::Key_Up, Qt::KeypadModifier);
+    EXPECT_EQ(map.actionForPress(up), "nudgeUp:") << "the keypad's arrows are arrows";
+    const QKeyEvent repeatRelease(QEvent::KeyRelease, Qt::Key_Left, Qt::NoModifier, {}, true);
+    EXPECT_EQ(map.actionForRelease(repeatRelease), std::nullopt);
+    const QKeyEvent release(QEvent::KeyRelease, Qt::Key_Left, Qt::NoModifier);
+    EXPECT_EQ(map.actionForRelease(release), "nudgeLeftFinished:");
+    const QKeyEvent backspace(QEvent::KeyPress, Qt::Key_Backspace, Qt::NoModifier);
+    EXPECT_EQ(map.actionForPress(backspace), "delete:");
+    const QKeyEvent shifted(QEvent::KeyPress, Qt::Key_Right, Qt::ShiftModifier);
+    EXPECT_EQ(map.actionForPress(shifted), std::nullopt) << "modifiers must match";
+
+    TQQtKeyMap own = map;
+    own.bind(Qt::Key_Right, Qt::ShiftModifier, "nudgeUp:");
+    own.unbind(Qt::Key_Backspace, Qt::NoModifier);
+    EXPECT_EQ(own.actionForPress(shifted), "nudgeUp:");
+    EXPECT_EQ(own.actionForPress(backspace), std::nullopt);
+}
+
+TEST_F(QtViewKeysMenu, keys__nudgeAFrameAndDeleteEachAsAStepOfItsOwn) {
+    selectInView({keypointEntry(item, 5)});
+    widget.setFocus();
+    recorder.clearCalls();
+    QTest::keyPress(&widget, Qt::Key_Right);
+    QTest::keyRelease(&widget, Qt::Key_Right);
+    const std::vector<double> nudged = keyTimes(channel);
+    ASSERT_EQ(nudged.size(), 3u);
+    EXPECT_NEAR(nudged[1], 5.0 + 1.0 / 30.0, 1e-6) << "one frame of the host";
+    EXPECT_EQ(recorder.count("postNotification"), 2u) << "the nudge's word and the release's";
+    EXPECT_EQ(host.undoStack().undoCount(), 1u);
+
+    QTest::keyClick(&widget, Qt::Key_Delete);
+    EXPECT_EQ(keyTimes(channel), (std::vector<double>{2.0, 8.0}));
+    EXPECT_EQ(host.undoStack().undoCount(), 2u);
+    EXPECT_TRUE(view.getSelection()->empty());
+}
+
+TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheChoice) {
+    // The segment into the keypoint at 5 is Bezier, the one leaving it Linear: both marked.
+    channel->setKeyframeInterpolation(channel->getKeyframe(seconds(2)), kTQInterpolationBezier);
+    selectInView({});
+    RWMenuPtr shown;
+    QStringList titles;
+    QAction* linear = nullptr;
+    QAction* constant = nullptr;
+    widget.setContextMenuRunner([&](const RWMenuPtr& menu, const QPoint&) {
+        shown = menu;
+        QMenu qmenu;
+        TQQtFillMenu(qmenu, menu,
+                     [](RWMenu& holder, int64_t index) { holder.performActionForItemAtIndex(index); });
+        for (QAction* a : qmenu.actions()) titles << (a->isSeparator() ? "-" : a->text());
+        QMenu* kinds = qmenu.actions()[8]->menu();
+        if (!kinds) return false;
+        for (QAction* a : kinds->actions()) {
+            if (a->text() == QString::fromStdString(TQLocalizedString("Anim Menu Interpolation Linear")))
+                linear = a;
+            if (a->text() ==
+                QString::fromStdString(TQLocalizedString("Anim Menu Interpolation Constant")))
+                constant = a;
+        }
+        if (!linear || !constant) return false;
+        EXPECT_FALSE(linear->isCheckable());
+        EXPECT_FALSE(linear->icon().isNull()) << "a mixed item shows the dash";
+        EXPECT_TRUE(constant->icon().isNull());
+        EXPECT_TRUE(constant->isEnabled());
+        constant->trigger();  // the user's choice: the keypoint at 5 becomes Constant
+        return true;
+    });
+    QContextMenuEvent click(QContextMenuEvent::Mouse, widgetPoint(5, .5),
+                            widget.mapToGlobal(widgetPoint(5, .5)));
+    QCoreApplication::sendEvent(&widget, &click);
+
+    EXPECT_EQ(shown, ctrl().getKeyframeMenu());
+    EXPECT_EQ(titles.join("|").toStdString(),
+              "Delete|-|Reverse|-|Ease In|Ease Out|Ease In and Out|-|Interpolation|-|Lock|Disable");
+    EXPECT_EQ(channel->getKeyframeInterpolation(channel->getKeyframe(seconds(5))),
+              kTQInterpolationConstant);
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Interpolation"));
+}
+
+TEST_F(QtViewKeysMenu, pointer__takesTheEditorsImagesOverWhatAClickWouldTouch) {
+    struct Case {
+        const char* what;
+        TQTool tool;
+        double u, v;
+        GDCursorImage want;
+    };
+    const Case cases[] = {
+        {"over a keypoint", TQTool::kEdit, 5, .5, GDCursorMove},
+        {"over nothing", TQTool::kEdit, 3.5, .9, GDCursorEditPoints},
+        {"the sketch tool", TQTool::kSketch, 5, .5, GDCursorSketch},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.what);
+        ctrl().setCurrentTool(c.tool);
+        drawFrame();
+        QTest::mouseMove(&widget, widgetPoint(c.u, c.v));
+        const QCursor shownCursor = widget.cursor();
+        ASSERT_EQ(shownCursor.shape(), Qt::BitmapCursor);
+        EXPECT_EQ(shownCursor.hotSpot(), QPoint(qRound(c.want.hotSpotX), qRound(c.want.hotSpotY)));
+        const RWCursor asked = widget.viewHost().cursor();
+        EXPECT_EQ(TQQtViewHost::resourceCursor(asked)->name, std::string(c.want.name));
+    }
+}
+
+}  // namespace
+}  // namespace qt_test
