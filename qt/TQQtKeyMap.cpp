@@ -26,8 +26,8 @@ TQQtKeyMap TQQtKeyMap::standard() {
 void TQQtKeyMap::bind(int key, Qt::KeyboardModifiers modifiers, std::string pressAction,
                       std::string releaseAction) {
     unbind(key, modifiers);
-    _bindings.push_back({key, meaningful(modifiers), std::move(pressAction),
-                         std::move(releaseAction)});
+    _bindings.push_back(
+        {key, meaningful(modifiers), std::move(pressAction), std::move(releaseAction)});
 }
 
 void TQQtKeyMap::unbind(int key, Qt::KeyboardModifiers modifiers) {

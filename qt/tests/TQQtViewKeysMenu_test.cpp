@@ -83,13 +83,15 @@ TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheC
     widget.setContextMenuRunner([&](const RWMenuPtr& menu, const QPoint&) {
         shown = menu;
         QMenu qmenu;
-        TQQtFillMenu(qmenu, menu,
-                     [](RWMenu& holder, int64_t index) { holder.performActionForItemAtIndex(index); });
+        TQQtFillMenu(qmenu, menu, [](RWMenu& holder, int64_t index) {
+            holder.performActionForItemAtIndex(index);
+        });
         for (QAction* a : qmenu.actions()) titles << (a->isSeparator() ? "-" : a->text());
         QMenu* kinds = qmenu.actions()[8]->menu();
         if (!kinds) return false;
         for (QAction* a : kinds->actions()) {
-            if (a->text() == QString::fromStdString(TQLocalizedString("Anim Menu Interpolation Linear")))
+            if (a->text() ==
+                QString::fromStdString(TQLocalizedString("Anim Menu Interpolation Linear")))
                 linear = a;
             if (a->text() ==
                 QString::fromStdString(TQLocalizedString("Anim Menu Interpolation Constant")))

@@ -23,9 +23,8 @@ inline constexpr GDCursorImage GDCursorSketch{"GDCursorSketch", 3.0, 21.0};
 // A click on the curve adds a keypoint: the pen's nib.
 inline constexpr GDCursorImage GDCursorPenAddControlPoint{"GDCursorPenAddControlPoint", 4.0, 20.0};
 
-inline constexpr GDCursorImage kGDCursors[] = {GDCursorMove, GDCursorEditPoints,
-                                               GDCursorCrossHairs, GDCursorSketch,
-                                               GDCursorPenAddControlPoint};
+inline constexpr GDCursorImage kGDCursors[] = {GDCursorMove, GDCursorEditPoints, GDCursorCrossHairs,
+                                               GDCursorSketch, GDCursorPenAddControlPoint};
 
 // The cursor of that name, or null.
 inline const GDCursorImage* GDCursorWithName(std::string_view name) {
