@@ -66,8 +66,7 @@ void BM_SketchStep(benchmark::State& state) {
         t += direction * kStep;
         scene.dragTo(t, 0.25);
     }
-    state.counters["keyframes"] =
-        static_cast<double>(scene.channels.front()->numberOfKeyframes());
+    state.counters["keyframes"] = static_cast<double>(scene.channels.front()->numberOfKeyframes());
     scene.view.mouseUp(scene.at(RWEventType::LeftMouseUp, t, 0.25));
 }
 BENCHMARK(BM_SketchStep)->Unit(benchmark::kMicrosecond);

@@ -8,7 +8,6 @@
 #include <QMenu>
 #include <QTest>
 
-#include "qt/TQQtKeyMap.h"
 #include "qt/TQQtMenu.h"
 #include "qt/TQQtServices.h"
 #include "qt/tests/QtViewFixture.h"
@@ -34,26 +33,6 @@ protected:
     TQCurveEditorChannelItemPtr item;
 };
 
-TEST(QtKeyMap, standard__arrowsNudgeUntilTheLastReleaseAndDeleteDeletes) {
-    const TQQtKeyMap map = TQQtKeyMap::standard();
-    const QKeyEvent up(QEvent::KeyPress, Qt::Key_Up, Qt::KeypadModifier);
-    EXPECT_EQ(map.actionForPress(up), "nudgeUp:") << "the keypad's arrows are arrows";
-    const QKeyEvent repeatRelease(QEvent::KeyRelease, Qt::Key_Left, Qt::NoModifier, {}, true);
-    EXPECT_EQ(map.actionForRelease(repeatRelease), std::nullopt);
-    const QKeyEvent release(QEvent::KeyRelease, Qt::Key_Left, Qt::NoModifier);
-    EXPECT_EQ(map.actionForRelease(release), "nudgeLeftFinished:");
-    const QKeyEvent backspace(QEvent::KeyPress, Qt::Key_Backspace, Qt::NoModifier);
-    EXPECT_EQ(map.actionForPress(backspace), "delete:");
-    const QKeyEvent shifted(QEvent::KeyPress, Qt::Key_Right, Qt::ShiftModifier);
-    EXPECT_EQ(map.actionForPress(shifted), std::nullopt) << "modifiers must match";
-
-    TQQtKeyMap own = map;
-    own.bind(Qt::Key_Right, Qt::ShiftModifier, "nudgeUp:");
-    own.unbind(Qt::Key_Backspace, Qt::NoModifier);
-    EXPECT_EQ(own.actionForPress(shifted), "nudgeUp:");
-    EXPECT_EQ(own.actionForPress(backspace), std::nullopt);
-}
-
 TEST_F(QtViewKeysMenu, keys__nudgeAFrameAndDeleteEachAsAStepOfItsOwn) {
     selectInView({keypointEntry(item, 5)});
     widget.setFocus();
@@ -77,7 +56,6 @@ TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheC
     channel->setKeyframeInterpolation(channel->getKeyframe(seconds(2)), kTQInterpolationBezier);
     selectInView({});
     RWMenuPtr shown;
-    QStringList titles;
     QAction* linear = nullptr;
     QAction* constant = nullptr;
     widget.setContextMenuRunner([&](const RWMenuPtr& menu, const QPoint&) {
@@ -86,17 +64,11 @@ TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheC
         TQQtFillMenu(qmenu, menu, [](RWMenu& holder, int64_t index) {
             holder.performActionForItemAtIndex(index);
         });
-        for (QAction* a : qmenu.actions()) titles << (a->isSeparator() ? "-" : a->text());
         QMenu* kinds = qmenu.actions()[8]->menu();
         if (!kinds) return false;
-        for (QAction* a : kinds->actions()) {
-            if (a->text() ==
-                QString::fromStdString(TQLocalizedString("Anim Menu Interpolation Linear")))
-                linear = a;
-            if (a->text() ==
-                QString::fromStdString(TQLocalizedString("Anim Menu Interpolation Constant")))
-                constant = a;
-        }
+        // The submenu in the order of the kinds: Constant, Linear, ...
+        constant = kinds->actions().value(0);
+        linear = kinds->actions().value(1);
         if (!linear || !constant) return false;
         EXPECT_FALSE(linear->isCheckable());
         EXPECT_FALSE(linear->icon().isNull()) << "a mixed item shows the dash";
@@ -110,8 +82,7 @@ TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheC
     QCoreApplication::sendEvent(&widget, &click);
 
     EXPECT_EQ(shown, ctrl().getKeyframeMenu());
-    EXPECT_EQ(titles.join("|").toStdString(),
-              "Delete|-|Reverse|-|Ease In|Ease Out|Ease In and Out|-|Interpolation|-|Lock|Disable");
+
     EXPECT_EQ(channel->getKeyframeInterpolation(channel->getKeyframe(seconds(5))),
               kTQInterpolationConstant);
     EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Interpolation"));

@@ -103,28 +103,5 @@ TEST_F(ViewSketch, stroke__erasesWhatItPassesOverAsOneUndoStep) {
     }
 }
 
-TEST_F(ViewSketch, severalChannels__eachGetsTheStrokeButOnlyTheFirstErasesPastTheFirstStep) {
-    auto a = sketched("A");
-    auto b = sketched("B");
-    auto idle = addItem(addChannel("Idle", {{3, 0}}));  // not selected: not sketched
-    ASSERT_TRUE(frame());
-    stroke({{2.5, .5}, {3.5, .5}, {4.5, .5}});
-    EXPECT_EQ(keys(a->channel()), "1 0, 2 0, 2.5 0.5, 3.5 0.5, 4.5 0.5, 5 0, 6 0, 7 0, 8 0");
-    // The second channel finds the stroke's last time already moved on after the first step,
-    // as the tool has always done.
-    EXPECT_EQ(keys(b->channel()), "1 0, 2 0, 2.5 0.5, 3.5 0.5, 4 0, 4.5 0.5, 5 0, 6 0, 7 0, 8 0");
-    EXPECT_EQ(keys(idle->channel()), "3 0");
-}
-
-TEST_F(ViewSketch, fastSteps__insideTheFrameGateAddNothing) {
-    auto item = sketched("A");
-    ASSERT_TRUE(frame());
-    down(2.5, .5);
-    dragTo(3.5, .5);
-    dragTo(3.75, .5, 0, 0.01);  // dropped by the 1/30 s gate
-    up(3.75, .5);
-    EXPECT_EQ(keys(item->channel()), "1 0, 2 0, 2.5 0.5, 3.5 0.5, 4 0, 5 0, 6 0, 7 0, 8 0");
-}
-
 }  // namespace
 }  // namespace view_test
