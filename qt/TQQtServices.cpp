@@ -206,9 +206,8 @@ void TQQtViewHost::pointerMoved(const RWEvent& event) {
     // A copy: an owner may replace its area while it hears the move.
     const std::vector<RWTrackingAreaPtr> areas = _trackingAreas;
     for (const RWTrackingAreaPtr& area : areas)
-        if ((area->options() & RWTrackingCursorUpdate) && area->owner() &&
-            area->contains(at, visible))
-            area->owner()->cursorUpdate(event);
+        if ((area->options & RWTrackingCursorUpdate) && area->owner && area->contains(at, visible))
+            area->owner->cursorUpdate(event);
 }
 
 CGPoint TQQtViewHost::convertPointFromWindow(const CGPoint& pointInWindow) const {

@@ -156,20 +156,6 @@ public:
     virtual void selectionDidChange(RWOutlineView& view) { (void)view; }
 };
 
-// A part of the view whose entry and exit the pointer reports: mouseEntered and mouseExited
-// get the area, with its user info.
-struct RWTrackingArea {
-    uint64_t identifier = 0;  // given by addTrackingArea
-    CGRect rect = CGRectZero;
-    uint64_t options = 0;
-    std::map<std::string, int64_t> userInfo;
-
-    int64_t value(const std::string& key, int64_t fallback = -1) const {
-        const auto it = userInfo.find(key);
-        return it == userInfo.end() ? fallback : it->second;
-    }
-};
-
 // One item of the cached tree, as an adapter walks it.
 class RWOutlineNode {
 public:

@@ -1,25 +1,28 @@
 #pragma once
-// A region of a view in which the pointer is tracked without a button down: the view's host
-// tells the area's owner when the pointer moves inside it, so that the owner can choose the
-// pointer's shape for what a click there would do.
+// A region of a view in which the pointer is tracked without a button down. A view that keeps
+// its own areas (the outline) reports entries and exits itself; a view whose host tracks the
+// pointer gives its area to the host (RWViewHost::addTrackingArea), and the host tells the
+// area's owner when the pointer moves inside it, so that the owner can choose the pointer's
+// shape for what a click there would do.
 //
 // Lifetime: the owner is not owned and must remove its areas from the host (or outlive it).
-// The host keeps the areas it was given until they are removed.
 
 #include <cstdint>
+#include <map>
 #include <memory>
+#include <string>
 
 #include "platform/geometry/CGGeometry.h"
 #include "platform/ui/RWEvent.h"
 
-// What the host reports to the owner of an area; the owner takes the cases it asked for.
+// What a host reports to the owner of an area with RWTrackingCursorUpdate.
 class RWTrackingAreaOwner {
 public:
     virtual ~RWTrackingAreaOwner() = default;
     virtual void cursorUpdate(const RWEvent& event) = 0;
 };
 
-enum RWTrackingAreaOptions : uint32_t {
+enum RWTrackingAreaOptions : uint64_t {
     RWTrackingMouseEnteredAndExited = 0x01,
     RWTrackingMouseMoved = 0x02,
     RWTrackingCursorUpdate = 0x04,
@@ -33,25 +36,22 @@ enum RWTrackingAreaOptions : uint32_t {
     RWTrackingEnabledDuringMouseDrag = 0x400,
 };
 
-class RWTrackingArea {
-public:
-    RWTrackingArea(const CGRect& rect, uint32_t options, RWTrackingAreaOwner* owner)
-        : _rect(rect), _options(options), _owner(owner) {}
+struct RWTrackingArea {
+    uint64_t identifier = 0;  // given by a view that keeps its own areas
+    CGRect rect = CGRectZero;
+    uint64_t options = 0;
+    std::map<std::string, int64_t> userInfo;
+    RWTrackingAreaOwner* owner = nullptr;  // not owned; hears cursor updates through a host
 
-    const CGRect& rect() const { return _rect; }
-    uint32_t options() const { return _options; }
-    RWTrackingAreaOwner* owner() const { return _owner; }
+    int64_t value(const std::string& key, int64_t fallback = -1) const {
+        const auto it = userInfo.find(key);
+        return it == userInfo.end() ? fallback : it->second;
+    }
     // Whether a point of the view (in points, as its bounds) lies in the area, given the
     // view's visible rectangle.
     bool contains(const CGPoint& point, const CGRect& visibleRect) const {
-        return CGRectContainsPoint((_options & RWTrackingInVisibleRect) ? visibleRect : _rect,
-                                   point);
+        return CGRectContainsPoint((options & RWTrackingInVisibleRect) ? visibleRect : rect, point);
     }
-
-private:
-    CGRect _rect;
-    uint32_t _options;
-    RWTrackingAreaOwner* _owner;  // not owned
 };
 
 using RWTrackingAreaPtr = std::shared_ptr<RWTrackingArea>;

@@ -207,9 +207,11 @@ void TQCurveEditorViewBase::updateTrackingAreas() {
     if (_viewHost && _trackingArea) _viewHost->removeTrackingArea(*_trackingArea);
     _trackingArea.reset();
     if (!_viewHost) return;
-    _trackingArea = std::make_shared<RWTrackingArea>(
-        bounds(), RWTrackingCursorUpdate | RWTrackingActiveInActiveApp | RWTrackingInVisibleRect,
-        this);
+    _trackingArea = std::make_shared<RWTrackingArea>();
+    _trackingArea->rect = bounds();
+    _trackingArea->options =
+        RWTrackingCursorUpdate | RWTrackingActiveInActiveApp | RWTrackingInVisibleRect;
+    _trackingArea->owner = this;
     _viewHost->addTrackingArea(_trackingArea);
 }
 
