@@ -473,18 +473,22 @@ void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad,
     if (!image) return;
     const float attenuation = quad.attenuation();
     if (!(attenuation > 0.0f)) return;
-    QRectF target = toDevice(_mapping.worldRectToPixels(quad.destinationRect()));
+    const QRectF target = toDevice(_mapping.worldRectToPixels(quad.destinationRect()));
     if (!target.isValid()) return;
+    const bool faded = attenuation < 1.0f;
+    if (faded) _painter.setOpacity(attenuation);
     // An image shown texel for pixel (keypoints, handles) lands on whole pixels: it stays
-    // crisp, and the painter blits it instead of resampling. The shift is under half a pixel.
+    // crisp, and the painter blits it instead of resampling (the shift is under half a
+    // pixel). A frame draws thousands of them, so no painter state changes for them either.
     if (std::abs(target.width() - image->width()) < 0.01 &&
-        std::abs(target.height() - image->height()) < 0.01)
-        target = QRectF(QPointF(std::round(target.left()), std::round(target.top())),
-                        QSizeF(image->size()));
-    _painter.setOpacity(std::min(1.0f, attenuation));
-    _painter.setRenderHint(QPainter::SmoothPixmapTransform, true);
-    _painter.drawImage(target, *image, QRectF(image->rect()));
-    _painter.setOpacity(1.0);
+        std::abs(target.height() - image->height()) < 0.01) {
+        _painter.drawImage(QPoint(int(std::lround(target.left())), int(std::lround(target.top()))),
+                           *image);
+    } else {
+        _painter.setRenderHint(QPainter::SmoothPixmapTransform, true);
+        _painter.drawImage(target, *image, QRectF(image->rect()));
+    }
+    if (faded) _painter.setOpacity(1.0);
 }
 
 void TQQtPainterEncoder::encodeScreenspaceQuad(const HXDScreenspaceQuad& quad,
