@@ -71,7 +71,14 @@ void TQCurveEditorCtrlBase::purgeSelected(TQCurveSelectionList* list) {
     for (uint32_t id : ids) {
         TQCurveSelection probe;
         probe.setCurveId(id);
-        if (TQChannel* channel = channelForEntry(probe)) channel->purgeKeyframes();
+        TQChannel* channel = channelForEntry(probe);
+        if (!channel) continue;
+        // A linked edit retimed the other components too, shown or not.
+        if (TQCompoundChannel* compound = linkedParent(channel)) {
+            for (TQChannel* component : componentsOf(*compound)) component->purgeKeyframes();
+        } else {
+            channel->purgeKeyframes();
+        }
     }
 }
 
