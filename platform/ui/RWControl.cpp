@@ -15,6 +15,12 @@ void RWControl::setEnabled(bool enabled) {
     changed();
 }
 
+void RWControl::setHidden(bool hidden) {
+    if (_hidden == hidden) return;
+    _hidden = hidden;
+    changed();
+}
+
 void RWControl::setAccessibilityLabel(const std::string& label) {
     if (_accessibilityLabel == label) return;
     _accessibilityLabel = label;

@@ -97,6 +97,9 @@ public:
     // ---- State every control has ----
     bool isEnabled() const { return _enabled; }
     virtual void setEnabled(bool enabled);
+    // A hidden control is not shown and takes no input; it keeps its place and state.
+    bool isHidden() const { return _hidden; }
+    void setHidden(bool hidden);
     const std::string& accessibilityLabel() const { return _accessibilityLabel; }
     void setAccessibilityLabel(const std::string& label);
 
@@ -135,6 +138,7 @@ private:
     std::string _action;
     int64_t _tag = 0;
     bool _enabled = true;
+    bool _hidden = false;
     std::string _accessibilityLabel;
     CGRect _frame = CGRectZero;
     uint32_t _autoresizingMask = RWViewNotSizable;

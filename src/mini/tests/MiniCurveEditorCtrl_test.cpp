@@ -1,0 +1,241 @@
+// The mini editor's controller through its container, on the reference host: what a channel
+// or a folder puts in the private set, the default menu and its commands as undo steps over
+// every channel, and the value edits the rows make on the selected keypoints.
+
+#include <functional>
+#include <string>
+
+#include "src/mini/tests/MiniFixture.h"
+#include "platform/channels/TQChannelRef.h"
+#include "src/engine/TQEditBrackets.h"
+#include "src/resources/TQStrings.h"
+
+using namespace mini_test;
+
+namespace {
+
+class MiniCtrl : public MiniFixture {};
+
+TEST_F(MiniCtrl, setChannel__a_channel_or_a_folder_fills_the_private_set) {
+    {
+        editor.setChannel(gain);
+        EXPECT_EQ(ctrl().numberOfChannelItems(), 1u);
+        EXPECT_TRUE(ctrl()._linked);
+        EXPECT_EQ(ctrl().getCurrentTool(), TQTool::kEdit);
+        EXPECT_EQ(ctrl().selectedCurveSet()->curveSetName(),
+                  TQLocalizedString("Curve Editor Curve Set Untitled"));
+        EXPECT_EQ(editor.axisY().stringValue(), "Gain");
+        EXPECT_EQ(view().getController(), editor.controller());
+    }
+    {
+        editor.setChannel(gradient);
+        EXPECT_EQ(ctrl().numberOfChannelItems(), 2u) << "both components of the pair";
+        const auto item = ctrl().selectedCurveSet()->itemWithChannel(gradient->getXChannel());
+        ASSERT_NE(item, nullptr);
+        EXPECT_FALSE(static_cast<TQCurveEditorChannelItem&>(*item).drawProcessedCurve());
+    }
+    {
+        editor.setChannel(nullptr);
+        EXPECT_EQ(ctrl().numberOfChannelItems(), 0u) << "a null channel is an empty folder";
+        EXPECT_FALSE(editor.hasSelection());
+        EXPECT_EQ(CMTimeCompare(editor.getSelectedValueX(), kCMTimeZero), 0);
+    }
+}
+
+TEST_F(MiniCtrl, defaultMenu__extrapolation_submenus_reflect_the_first_channel) {
+    editor.setChannel(gradient);
+    gradient->getXChannel()->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationBefore);
+    const RWMenuPtr& menu = ctrl().getDefaultMenu();
+    ASSERT_EQ(menu->itemArray().size(), 2u);
+    const RWMenuItemPtr& pre = menu->itemArray()[0];
+    const RWMenuItemPtr& post = menu->itemArray()[1];
+    EXPECT_EQ(pre->tag(), TQMiniCurveEditorCtrl::kPreExtrapolationItemTag);
+    EXPECT_EQ(post->tag(), TQMiniCurveEditorCtrl::kPostExtrapolationItemTag);
+    EXPECT_EQ(pre->title(), TQLocalizedString("Anim Menu Pre Extrapolation"));
+    ASSERT_EQ(pre->submenu()->itemArray().size(), 5u);
+
+    std::string states;
+    for (const RWMenuItemPtr& item : pre->submenu()->itemArray()) {
+        EXPECT_TRUE(ctrl().validateDefaultMenuItem(*item));
+        states += std::to_string(item->state());
+    }
+    EXPECT_EQ(states, "00100");
+    RWMenuItem& constant = *post->submenu()->itemArray()[0];
+    EXPECT_TRUE(ctrl().validateDefaultMenuItem(constant));
+    EXPECT_EQ(constant.state(), 1);
+
+    // Without a channel nothing is valid, and the states stay as they were.
+    editor.setChannel(nullptr);
+    RWMenuItem& pingPong = *ctrl().getDefaultMenu()->itemArray()[0]->submenu()->itemArray()[2];
+    pingPong.setState(1);
+    EXPECT_FALSE(ctrl().validateDefaultMenuItem(pingPong));
+    EXPECT_EQ(pingPong.state(), 1);
+    RWMenuItem del("Delete", "delete:");
+    EXPECT_TRUE(ctrl().validateMenuItem(del));
+}
+
+struct MenuCommand {
+    const char* action;
+    int64_t tag;
+    const char* undoKey;
+    std::function<void(TQChannel& x, TQChannel& y)> expect;
+};
+
+void PrintTo(const MenuCommand& c, std::ostream* os) { *os << c.action << c.tag; }
+
+class MiniMenuCommand : public MiniFixture, public ::testing::WithParamInterface<MenuCommand> {};
+
+TEST_P(MiniMenuCommand, command__every_channel_in_one_undo_step) {
+    const MenuCommand& command = GetParam();
+    editor.setChannel(gradient);
+    const auto before = snapshot();
+    auto want = snapshot();
+    auto& wantPair =
+        static_cast<TQChannel2DOverRange&>(*TQChannelRef(gradient, object).getChannel(want.get()));
+    command.expect(*wantPair.getXChannel(), *wantPair.getYChannel());
+    recorder.clearCalls();
+
+    RWMenuItem sender("", command.action);
+    sender.setTag(command.tag);
+    ASSERT_TRUE(ctrl().performAction(command.action, sender));
+
+    EXPECT_TRUE(*object == *want);
+    EXPECT_EQ(recorder.captureBalance(), 0);
+    const auto seq = recorder.bracketSequence();
+    ASSERT_FALSE(seq.empty());
+    EXPECT_EQ(seq.back(), "postNotification(0x8)");
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString(command.undoKey));
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(*object == *before) << "undo gives the scene back exactly";
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Menu, MiniMenuCommand,
+    ::testing::Values(
+        MenuCommand{"menuSetCurvePreExtrapolation:", kTQExtrapolationRepeat,
+                    "Undo Set Pre Extrapolation",
+                    [](TQChannel& x, TQChannel& y) {
+                        x.setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationBefore);
+                        y.setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationBefore);
+                    }},
+        MenuCommand{"menuSetCurvePostExtrapolation:", kTQExtrapolationLinear,
+                    "Undo Set Post Extrapolation",
+                    [](TQChannel& x, TQChannel& y) {
+                        x.setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter);
+                        y.setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter);
+                    }},
+        MenuCommand{"menuSetCurveInterpolation:channel:", kTQInterpolationLinear,
+                    "Undo Set Interpolation",
+                    [](TQChannel& x, TQChannel& y) {
+                        x.setInterpolation(kTQInterpolationLinear);
+                        y.setInterpolation(kTQInterpolationLinear);
+                    }},
+        // Both follow the first channel's state, whatever their own.
+        MenuCommand{"menuLockChannel:channel:", 0, "Undo Lock Keypoint",
+                    [](TQChannel& x, TQChannel& y) {
+                        x.setLocked(true, true);
+                        y.setLocked(true, true);
+                    }}));
+
+TEST_F(MiniCtrl, menuLockChannel__all_take_the_opposite_of_the_first) {
+    editor.setChannel(gradient);
+    gradient->getYChannel()->setLocked(true, true);
+    RWMenuItem sender("", "menuLockChannel:channel:");
+    ctrl().performAction(sender.action(), sender);
+    EXPECT_TRUE(gradient->getXChannel()->isLocked(false));
+    EXPECT_TRUE(gradient->getYChannel()->isLocked(false));
+    ctrl().performAction(sender.action(), sender);
+    EXPECT_FALSE(gradient->getXChannel()->isLocked(false));
+    EXPECT_FALSE(gradient->getYChannel()->isLocked(false));
+}
+
+TEST_F(MiniCtrl, menuSetCurveInterpolation__checks_the_chosen_item_and_ignores_mixed) {
+    editor.setChannel(gain);
+    RWMenu menu;
+    const RWMenuItemPtr linear = menu.addItemWithTitle("Linear", "menuSetCurveInterpolation:channel:", "");
+    linear->setTag(kTQInterpolationLinear);
+    const RWMenuItemPtr mixed = menu.addItemWithTitle("Mixed", "menuSetCurveInterpolation:channel:", "");
+    mixed->setTag(TQMiniCurveEditorCtrl::kMixedInterpolationTag);
+    mixed->setState(1);
+
+    recorder.clearCalls();
+    ctrl().performAction(mixed->action(), *mixed);
+    EXPECT_TRUE(recorder.calls().empty()) << "the mixed tag does nothing at all";
+    ctrl().performAction(linear->action(), *linear);
+    EXPECT_EQ(gain->getInterpolation(), static_cast<unsigned>(kTQInterpolationLinear));
+    EXPECT_EQ(linear->state(), 1);
+    EXPECT_EQ(mixed->state(), 0);
+}
+
+TEST_F(MiniCtrl, selection__mirrored_onto_items_and_read_by_the_rows) {
+    editor.setChannel(gain);
+    recorder.clearCalls();
+    selectKeys(gain, {0.5});
+    EXPECT_EQ(recorder.count("postNotification"), 1u);
+    EXPECT_EQ(ctrl().numberOfSelectedChannels(), 1u);
+    EXPECT_TRUE(editor.hasSelection());
+    EXPECT_DOUBLE_EQ(CMTimeGetSeconds(editor.getSelectedValueX()), 0.5);
+    EXPECT_DOUBLE_EQ(editor.getSelectedValueY(), 30.0);
+
+    // Tangent entries count as a selection, but give no position.
+    view().getSelection()->getSelectionArray().front()->setFlags(TQSelectionOutTangent);
+    EXPECT_TRUE(editor.hasSelection());
+    EXPECT_EQ(CMTimeCompare(editor.getSelectedValueX(), kCMTimeZero), 0);
+    EXPECT_EQ(editor.getSelectedValueY(), 0.0);
+
+    view().getSelection()->reset();
+    ctrl().selectionChangedTo(view().getSelection());
+    EXPECT_EQ(ctrl().numberOfSelectedChannels(), 0u);
+}
+
+TEST_F(MiniCtrl, moveSelectedInY__primary_takes_the_value_others_keep_their_distance) {
+    editor.setChannel(gain);
+    selectKeys(gain, {0.5, 1.0});
+    editor.setSelectedValueY(40.0);
+    EXPECT_DOUBLE_EQ(keyValue(*gain, 0.5), 40.0);
+    EXPECT_DOUBLE_EQ(keyValue(*gain, 1.0), 30.0);
+    EXPECT_DOUBLE_EQ(keyValue(*gain, 0.0), 10.0) << "unselected keypoints stay";
+}
+
+TEST_F(MiniCtrl, moveSelectedInX__moves_a_linked_pair_as_a_whole) {
+    editor.setChannel(gradient);
+    TQChannel* x = gradient->getXChannel();
+    TQChannel* y = gradient->getYChannel();
+    setKeys(*x, {{0.4, 2.0}});
+    setKeys(*y, {{0.4, 1.5}});
+    selectKeys(x, {0.4});
+    editor.setSelectedValueX(position(0.6));
+    editor.didEndModifyingSelectedX();
+    for (TQChannel* c : {x, y}) {
+        EXPECT_EQ(c->getKeyframe(position(0.4)), nullptr) << c->getName();
+        EXPECT_NE(c->getKeyframe(position(0.6)), nullptr) << c->getName();
+    }
+    EXPECT_DOUBLE_EQ(keyValue(*y, 0.6), 1.5);
+}
+
+TEST_F(MiniCtrl, staleSelection__after_undo_or_a_deleted_channel_reads_as_nothing) {
+    editor.setChannel(gain);
+    setKeys(*gain, {{0.25, 5.0}});
+    {
+        TQCaptureGuard capture(&recorder, "Undo Move Keypoint");
+        TQChannelEditGuard edit(&recorder, gain);
+        gain->setKeyframe(position(0.75), 8.0);
+    }
+    selectKeys(gain, {0.75});
+    ASSERT_TRUE(host.undo());
+    EXPECT_EQ(CMTimeCompare(editor.getSelectedValueX(), kCMTimeZero), 0);
+    editor.setSelectedValueY(3.0);  // a stale list is a no-op
+    EXPECT_DOUBLE_EQ(keyValue(*gain, 0.25), 5.0);
+    view().update();
+
+    selectKeys(gain, {0.5});
+    object->removeChild(gain);
+    gain = nullptr;
+    EXPECT_EQ(CMTimeCompare(editor.getSelectedValueX(), kCMTimeZero), 0);
+    editor.setSelectedValueY(3.0);
+    editor.setSelectedValueX(position(0.2));
+    editor.update();
+    EXPECT_TRUE(view().getSelection()->empty());
+}
+
+}  // namespace
