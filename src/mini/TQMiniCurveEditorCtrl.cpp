@@ -61,8 +61,7 @@ void TQMiniCurveEditorCtrl::initWithView(TQCurveEditorViewBase* view, TQChannelB
         appendFolderToCurveSet(dynamic_cast<TQChannelFolder*>(channel));
 
     for (uint32_t i = 0; i < numberOfChannelItems(); ++i)
-        if (auto* item =
-                dynamic_cast<TQCurveEditorChannelItem*>(set->channeItemAtIndex(i).get()))
+        if (auto* item = dynamic_cast<TQCurveEditorChannelItem*>(set->channeItemAtIndex(i).get()))
             item->setDrawProcessedCurve(0);
 }
 
@@ -72,8 +71,8 @@ void TQMiniCurveEditorCtrl::buildDefaultMenu() {
     TQCurveEditorCtrlBase::buildDefaultMenu();
     addExtrapolationSubmenu(*_defaultMenu, "Anim Menu Pre Extrapolation", kPreExtrapolationAction,
                             kPreExtrapolationItemTag, this);
-    addExtrapolationSubmenu(*_defaultMenu, "Anim Menu Post Extrapolation",
-                            kPostExtrapolationAction, kPostExtrapolationItemTag, this);
+    addExtrapolationSubmenu(*_defaultMenu, "Anim Menu Post Extrapolation", kPostExtrapolationAction,
+                            kPostExtrapolationItemTag, this);
 }
 
 bool TQMiniCurveEditorCtrl::validateMenuItem(RWMenuItem& item) {
@@ -125,16 +124,14 @@ void TQMiniCurveEditorCtrl::changeAllChannels(const char* undoKey, Change&& chan
 
 void TQMiniCurveEditorCtrl::menuSetCurvePreExtrapolation(RWActionSender& sender) {
     const auto tag = static_cast<unsigned>(sender.tag());
-    changeAllChannels("Undo Set Pre Extrapolation", [tag](TQChannel& c) {
-        c.setExtrapolation(tag, kTQExtrapolationBefore);
-    });
+    changeAllChannels("Undo Set Pre Extrapolation",
+                      [tag](TQChannel& c) { c.setExtrapolation(tag, kTQExtrapolationBefore); });
 }
 
 void TQMiniCurveEditorCtrl::menuSetCurvePostExtrapolation(RWActionSender& sender) {
     const auto tag = static_cast<unsigned>(sender.tag());
-    changeAllChannels("Undo Set Post Extrapolation", [tag](TQChannel& c) {
-        c.setExtrapolation(tag, kTQExtrapolationAfter);
-    });
+    changeAllChannels("Undo Set Post Extrapolation",
+                      [tag](TQChannel& c) { c.setExtrapolation(tag, kTQExtrapolationAfter); });
 }
 
 void TQMiniCurveEditorCtrl::menuLockChannel(RWActionSender&) {
@@ -147,9 +144,8 @@ void TQMiniCurveEditorCtrl::menuLockChannel(RWActionSender&) {
 void TQMiniCurveEditorCtrl::menuSetCurveInterpolation(RWActionSender& sender) {
     const int64_t tag = sender.tag();
     if (tag == kMixedInterpolationTag) return;
-    changeAllChannels("Undo Set Interpolation", [tag](TQChannel& c) {
-        c.setInterpolation(static_cast<unsigned>(tag));
-    });
+    changeAllChannels("Undo Set Interpolation",
+                      [tag](TQChannel& c) { c.setInterpolation(static_cast<unsigned>(tag)); });
     auto* item = dynamic_cast<RWMenuItem*>(&sender);
     if (RWMenu* menu = item ? item->menu() : nullptr)
         for (const RWMenuItemPtr& each : menu->itemArray())
@@ -273,8 +269,8 @@ void TQMiniCurveEditorCtrl::moveSelectedInX(TQCurveSelectionList* list, CMTime x
             if (!channel->getKeyframe(entry->getHandle(), &time, nullptr)) continue;
             // The compound moves by axis time: the channel's offset added.
             const CMTime from = BN_CMTimeSaferAdd(time, channel->timeOffset());
-            compound->moveKeyframe(channel, from, BN_CMTimeSaferAdd(from, delta), nullptr,
-                                   nullptr, true);
+            compound->moveKeyframe(channel, from, BN_CMTimeSaferAdd(from, delta), nullptr, nullptr,
+                                   true);
             markComponentsDirty(*compound);
             continue;
         }

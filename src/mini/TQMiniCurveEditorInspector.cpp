@@ -63,8 +63,7 @@ TQMiniCurveEditorInspector::TQMiniCurveEditorInspector(TQCurveEditorAppDelegate*
     _autoFit->setAutoresizingMask(33);
 }
 
-bool TQMiniCurveEditorInspector::performAction(const std::string& action,
-                                               RWActionSender& sender) {
+bool TQMiniCurveEditorInspector::performAction(const std::string& action, RWActionSender& sender) {
     if (action == "setMode:")
         setMode(sender);
     else if (action == "autoFit:")
@@ -129,18 +128,18 @@ void TQMiniCurveEditorInspector::verticalScroller(RWActionSender&) {
     TQMiniCurveEditorView& view = *_curveEditorView;
     double page = 0.0;
     switch (s.hitPart()) {
-    case kRWScrollerDecrementPage: page = -1.0; break;
-    case kRWScrollerIncrementPage: page = 1.0; break;
-    case kRWScrollerDecrementLine: page = -0.2; break;
-    case kRWScrollerIncrementLine: page = 0.2; break;
-    case kRWScrollerKnob:
-    case kRWScrollerKnobSlot:
-    case kRWScrollerKnobStartEdge:
-    case kRWScrollerKnobEndEdge:
-        view.setVerticalZoom(s.knobProportion(), s.floatValue());
-        view.setNeedsDisplay(1);
-        return;
-    default: return;
+        case kRWScrollerDecrementPage: page = -1.0; break;
+        case kRWScrollerIncrementPage: page = 1.0; break;
+        case kRWScrollerDecrementLine: page = -0.2; break;
+        case kRWScrollerIncrementLine: page = 0.2; break;
+        case kRWScrollerKnob:
+        case kRWScrollerKnobSlot:
+        case kRWScrollerKnobStartEdge:
+        case kRWScrollerKnobEndEdge:
+            view.setVerticalZoom(s.knobProportion(), s.floatValue());
+            view.setNeedsDisplay(1);
+            return;
+        default: return;
     }
     // Taken before the pan, as the knob's value follows the volume it left.
     const CGRect m = _curveEditorCtrl ? _curveEditorCtrl->getMaxViewVolume() : CGRectZero;
@@ -159,22 +158,22 @@ void TQMiniCurveEditorInspector::horizontalZoomScroller(RWActionSender&) {
         s.setFloatValue(s.floatValue() + valueStep);
     };
     switch (s.hitPart()) {
-    case kRWScrollerDecrementPage: pageBy(-1.0, -0.2); break;
-    case kRWScrollerIncrementPage: pageBy(1.0, 0.2); break;
-    case kRWScrollerDecrementLine: pageBy(-0.2, -0.04); break;
-    case kRWScrollerIncrementLine: pageBy(0.2, 0.04); break;
-    case kRWScrollerKnob:
-    case kRWScrollerKnobSlot:
-    case kRWScrollerKnobStartEdge:
-    case kRWScrollerKnobEndEdge: {
-        const CGRect& o = view.getOriginalViewVolume();
-        CGRect c = view.getCurrentViewVolume();
-        c.origin.x = o.origin.x + (o.size.width - c.size.width) * s.floatValue();
-        c.size.width = s.knobProportion() * o.size.width;
-        view.setCurrentViewVolume(c);
-        break;
-    }
-    default: break;
+        case kRWScrollerDecrementPage: pageBy(-1.0, -0.2); break;
+        case kRWScrollerIncrementPage: pageBy(1.0, 0.2); break;
+        case kRWScrollerDecrementLine: pageBy(-0.2, -0.04); break;
+        case kRWScrollerIncrementLine: pageBy(0.2, 0.04); break;
+        case kRWScrollerKnob:
+        case kRWScrollerKnobSlot:
+        case kRWScrollerKnobStartEdge:
+        case kRWScrollerKnobEndEdge: {
+            const CGRect& o = view.getOriginalViewVolume();
+            CGRect c = view.getCurrentViewVolume();
+            c.origin.x = o.origin.x + (o.size.width - c.size.width) * s.floatValue();
+            c.size.width = s.knobProportion() * o.size.width;
+            view.setCurrentViewVolume(c);
+            break;
+        }
+        default: break;
     }
     view.setNeedsDisplay(1);
 }
@@ -201,7 +200,8 @@ void TQMiniCurveEditorInspector::updateHorizontalZoomScroller() {
     const CGRect& o = _curveEditorView->getOriginalViewVolume();
     const CGRect& c = _curveEditorView->getCurrentViewVolume();
     const double slack = o.size.width - c.size.width;
-    const double value = std::fabs(slack) < kTQZeroTolerance ? 0.0 : (c.origin.x - o.origin.x) / slack;
+    const double value =
+        std::fabs(slack) < kTQZeroTolerance ? 0.0 : (c.origin.x - o.origin.x) / slack;
     _horizontalZoomScroller->setFloatValue(value);
     if (std::fabs(o.size.width) >= kTQZeroTolerance)
         _horizontalZoomScroller->setKnobProportion(c.size.width / o.size.width);

@@ -63,7 +63,8 @@ void TQMiniCurveEditorStripView::sample() {
 
     _samplesY.resize(_numberOfSamples);
     for (uint32_t i = 0; i < _numberOfSamples; ++i)
-        _samplesY[i] = channel->getValueAsDouble(CMTimeMultiply(_resolution, static_cast<int32_t>(i)));
+        _samplesY[i] =
+            channel->getValueAsDouble(CMTimeMultiply(_resolution, static_cast<int32_t>(i)));
     _keypointsX.resize(_numberOfKeypoints, kCMTimeZero);
     _keypointsY.resize(_numberOfKeypoints, 0.0);
     for (uint32_t i = 0; i < _numberOfKeypoints; ++i)
@@ -77,10 +78,9 @@ bool TQMiniCurveEditorStripView::drawInView(HXDEncoder& encoder) {
     if (!target) return false;
     encoder.beginEncoding(*target, kClearColor);
     const CGRect b = bounds();
-    _renderController.updateTexture(target, 1.0f,
-                                    BNViewVolumeProjection(CGRectMake(0.0, 0.0, b.size.width,
-                                                                      b.size.height)),
-                                    HXDFloat2{1.0f, 1.0f});
+    _renderController.updateTexture(
+        target, 1.0f, BNViewVolumeProjection(CGRectMake(0.0, 0.0, b.size.width, b.size.height)),
+        HXDFloat2{1.0f, 1.0f});
     drawCurve();
     const HXDRenderingContext& context = *_renderController.renderingContext();
     for (const auto& primitive : _primitives)

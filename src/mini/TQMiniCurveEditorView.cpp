@@ -94,13 +94,14 @@ void TQMiniCurveEditorView::drawGridRows(double left, double right, double botto
     double up = 0.0;
     double down = 0.0;
     do {
+        // 0 once: the lower run starts on it too.
+        const bool lowerToo = std::fabs(up - down) >= kTQZeroTolerance;
         for (const double y : {up, down}) {
-            // 0 once: the lower run starts on it too.
-            if (y == down && std::fabs(up - down) < kTQZeroTolerance) continue;
             if (y < bottom || y > top) continue;
             addGridLine(CGPointMake(left, y), CGPointMake(right, y), color);
             if (auto label = getScale(item, y * item->scaleY() + item->offsetY()))
                 metalPrint(*label, CGPointMake(left, y));
+            if (!lowerToo) break;
         }
         up += step;
         down -= step;
@@ -109,7 +110,8 @@ void TQMiniCurveEditorView::drawGridRows(double left, double right, double botto
 
 void TQMiniCurveEditorView::drawGrid() {
     const CGPoint lowerLeft = getPointWorld(CGPointZero);
-    const CGPoint upperRight = getPointWorld(CGPointMake(_drawableSize.width, _drawableSize.height));
+    const CGPoint upperRight =
+        getPointWorld(CGPointMake(_drawableSize.width, _drawableSize.height));
     if (!std::isfinite(lowerLeft.x) || !std::isfinite(upperRight.x)) return;
     const HXDColor color = drawingColor(gridColor());
     drawGridColumns(lowerLeft.x, upperRight.x, lowerLeft.y, upperRight.y, color);

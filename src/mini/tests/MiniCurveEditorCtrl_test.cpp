@@ -5,9 +5,9 @@
 #include <functional>
 #include <string>
 
-#include "src/mini/tests/MiniFixture.h"
 #include "platform/channels/TQChannelRef.h"
 #include "src/engine/TQEditBrackets.h"
+#include "src/mini/tests/MiniFixture.h"
 #include "src/resources/TQStrings.h"
 
 using namespace mini_test;
@@ -152,9 +152,11 @@ TEST_F(MiniCtrl, menuLockChannel__all_take_the_opposite_of_the_first) {
 TEST_F(MiniCtrl, menuSetCurveInterpolation__checks_the_chosen_item_and_ignores_mixed) {
     editor.setChannel(gain);
     RWMenu menu;
-    const RWMenuItemPtr linear = menu.addItemWithTitle("Linear", "menuSetCurveInterpolation:channel:", "");
+    const RWMenuItemPtr linear =
+        menu.addItemWithTitle("Linear", "menuSetCurveInterpolation:channel:", "");
     linear->setTag(kTQInterpolationLinear);
-    const RWMenuItemPtr mixed = menu.addItemWithTitle("Mixed", "menuSetCurveInterpolation:channel:", "");
+    const RWMenuItemPtr mixed =
+        menu.addItemWithTitle("Mixed", "menuSetCurveInterpolation:channel:", "");
     mixed->setTag(TQMiniCurveEditorCtrl::kMixedInterpolationTag);
     mixed->setState(1);
 
