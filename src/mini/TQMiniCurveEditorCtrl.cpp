@@ -184,8 +184,13 @@ void TQMiniCurveEditorCtrl::selectionChangedTo(TQCurveSelectionList* list) {
 bool TQMiniCurveEditorCtrl::hasSelection() const {
     TQCurveSelectionList* list = viewSelection();
     if (!list) return false;
-    for (const TQCurveSelectionPtr& entry : list->getSelectionArray())
-        if (entry && (entry->isKeypoint() || entry->isTangent())) return true;
+    // A handle that went stale (an undo rebuilt its keyframe, and nothing lies at its time)
+    // selects nothing: the rows go disabled instead of editing a keyframe that is gone.
+    for (const TQCurveSelectionPtr& entry : list->getSelectionArray()) {
+        if (!entry || !(entry->isKeypoint() || entry->isTangent())) continue;
+        const TQChannel* channel = channelForEntry(*entry);
+        if (channel && channel->getKeyframe(entry->getHandle(), nullptr, nullptr)) return true;
+    }
     return false;
 }
 

@@ -59,7 +59,7 @@ public:
     // Mirrors the list onto the items of the set and posts kTQNotifyChannelsChanged, so that
     // the rows show the new keypoint.
     void selectionChangedTo(TQCurveSelectionList* list) override;
-    // Any keypoint or tangent entry in the view's selection.
+    // Any keypoint or tangent entry in the view's selection whose keyframe is alive.
     bool hasSelection() const;
     // The first keypoint entry's position and value; zero without one.
     CMTime getSelectedValueX() const;

@@ -231,14 +231,14 @@ TEST_F(Strip, draws_the_curve_and_its_keypoints_in_the_box) {
 }
 
 TEST_F(Strip, flat_forms_one_keypoint_none_and_no_channel) {
-    TQChannel* one = static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannel>("One", 20)));
+    TQChannel* one =
+        static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannel>("One", 20)));
     setKeys(*one, {{0.25, 5.0}});
     source.channel = one;
     strip.setController(&source);
     EXPECT_EQ(drawn(), "LQ") << "one keypoint: flat at mid height";
-    EXPECT_DOUBLE_EQ(CGRectGetMidY(
-                         static_cast<const HXDScreenspaceQuad&>(*strip.primitives()[1]).frame()),
-                     9.0);
+    EXPECT_DOUBLE_EQ(
+        CGRectGetMidY(static_cast<const HXDScreenspaceQuad&>(*strip.primitives()[1]).frame()), 9.0);
 
     one->deleteAllKeyframes(kCMTimeZero);
     strip.sample();
