@@ -2,6 +2,7 @@
 
 #include <filesystem>
 
+#include "apps/demo/TQDemoInspector.h"
 #include "host/TQHostSampleScene.h"
 
 namespace {
@@ -47,6 +48,7 @@ void TQDemoDocument::loadSample() {
         const LoadingScope loading(_loading);
         _project.newDocument(kFamily);
         TQHostLoadSampleScene(_host, kFamily);
+        TQDemoSeedOverRangeCurves(_host);
         // The title and the bouncing logo: the piece's two busiest objects.
         _host.setSelectedObjects({_host.scene().objectNamed(kTQHostSampleTitleObject),
                                   _host.scene().objectNamed(kTQHostSampleBehaviorObject)});

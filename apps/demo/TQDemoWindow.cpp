@@ -18,6 +18,7 @@
 #include <QTimer>
 #include <QToolBar>
 
+#include "apps/demo/TQDemoInspector.h"
 #include "qt/TQQtCurveViewWidget.h"
 #include "qt/TQQtOutlineView.h"
 #include "qt/TQQtPopUpButton.h"
@@ -59,6 +60,8 @@ TQDemoWindow::TQDemoWindow() {
     refreshObjectList();
     refreshTitle();
     _editMenu->refresh();
+    _inspector = new TQDemoInspector(_host, this);
+    addDockWidget(Qt::RightDockWidgetArea, _inspector);
     statusBar()->showMessage(
         tr("Pick objects on the left and a curve set above. Click or band keypoints and drag "
            "them (Shift: one axis); the box tool puts a box around a band. Ctrl+Z undoes."));
@@ -70,6 +73,9 @@ TQDemoWindow::~TQDemoWindow() {
     // Qt deletes the child widgets after these members are gone: detach them first, and let
     // no signal of a dying child reach this window.
     _host.removeNotificationReceiver(this);
+    // Its rows refer to the host's channels: it goes while they are there.
+    delete _inspector;
+    _inspector = nullptr;
     _view.unregisterBoxUndo(_host);
     QObject::disconnect(_objectList, nullptr, this, nullptr);
     delete _windowBinding;
@@ -214,6 +220,7 @@ void TQDemoWindow::showEvent(QShowEvent* event) {
     // document from a file keeps the time range it was saved with.
     _framedOnce = true;
     QTimer::singleShot(0, this, [this] { frameAll(_document.isUntitled()); });
+    if (_inspector) _inspector->headsUpWindow()->show();
 }
 
 bool TQDemoWindow::eventFilter(QObject* watched, QEvent* event) {
@@ -413,4 +420,5 @@ void TQDemoWindow::notify(TQNotificationWord word) {
     // both are cheap to refresh.
     refreshTitle();
     _editMenu->refresh();
+    if (_inspector) _inspector->notify(word);
 }

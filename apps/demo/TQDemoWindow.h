@@ -48,6 +48,7 @@ class TQQtPopUpButton;
 class TQQtSegmentedControl;
 class TQQtWindowBinding;
 class TQQtZoomScroller;
+class TQDemoInspector;
 
 // The questions the File menu asks; each starts as the Qt dialog that asks it.
 struct TQDemoPrompts {
@@ -85,6 +86,8 @@ public:
     TQQtZoomScroller* verticalScroller() const { return _scroller; }
     QAction* autoZoomAction() const { return _autoZoom; }
     QAction* deleteAction() const { return _delete; }
+    // The inspector of the selected object, with its heads-up window.
+    TQDemoInspector* inspector() const { return _inspector; }
 
     // Fits the shown curves into the view, in value and, unless told not to, in time.
     void frameAll(bool includeTime = true);
@@ -163,6 +166,7 @@ private:
     QAction* _autoZoom = nullptr;
     QAction* _delete = nullptr;
     TQQtWindowBinding* _windowBinding = nullptr;
+    TQDemoInspector* _inspector = nullptr;
     bool _refreshingList = false;
     bool _framedOnce = false;
 };

@@ -15,8 +15,8 @@ constexpr double kSnappingSliderWidth = 200.0;
 double scaleOf(const TQChannel& channel) { return channel.getInfo()->displayScale; }
 
 double clampToCurve(const TQChannel& channel, double x) {
-    return std::clamp(x, channel.curveMinimum(), std::max(channel.curveMinimum(),
-                                                          channel.curveMaximum()));
+    return std::clamp(x, channel.curveMinimum(),
+                      std::max(channel.curveMinimum(), channel.curveMaximum()));
 }
 
 double snapToDigits(double x, int digits) {
@@ -72,19 +72,22 @@ void TQChanNumberController::endScrubberAction(RWActionSender&) {
 void TQChanNumberController::endSliderAction(RWActionSender& sender) { endScrubberAction(sender); }
 
 void TQChanNumberController::userEnterNumber(const std::string& text) {
-    if (!isEnabled()) return;
-    const TQNumberAction was = _actionType;
-    _actionType = TQNumberAction::Typed;
-    // The field's own end of editing sends the action: the step is opened around it.
-    if (!isChanging()) aboutToChangeChannel();
-    _pTF->userEndEditing(text);
-    endScrubberAction(*_pTF);
-    _actionType = was;
+    if (isEnabled()) _pTF->userEndEditing(text);
 }
 
 bool TQChanNumberController::performAction(const std::string& action, RWActionSender& sender) {
     if (action != "setChannelValue:") return false;
+    if (!isField(sender) || isChanging()) {
+        setChannelValue(sender);
+        return true;
+    }
+    // A number typed in the field (its end of editing sends the action) is a step of its own.
+    const TQNumberAction was = _actionType;
+    _actionType = TQNumberAction::Typed;
+    aboutToChangeChannel();
     setChannelValue(sender);
+    endScrubberAction(sender);
+    _actionType = was;
     return true;
 }
 
@@ -211,8 +214,7 @@ void TQChanDoubleController::setChannelValue(RWActionSender& sender) {
 
 // ---- Angle -----------------------------------------------------------------------------------
 
-TQChanAngleController::TQChanAngleController(TQChannelBase* channel,
-                                             const JNBuildContext& context)
+TQChanAngleController::TQChanAngleController(TQChannelBase* channel, const JNBuildContext& context)
     : TQChanNumberController(channel, context), _pDial(std::make_shared<RWSlider>()) {
     setFrameSize(CGSizeMake(237.0, 32.0));
     _pDial->setMinValue(0.0);
@@ -237,7 +239,8 @@ void TQChanAngleController::startScrubberAction(RWActionSender& sender) {
     TQChanNumberController::startScrubberAction(sender);
     _isOffsetting = !areAllChannelsEqual() && _actionType != TQNumberAction::Typed;
     _pMouseDownValues.clear();
-    if (const TQChannel* c = channel()) _pMouseDownValues.push_back(c->getValueAsDouble(currentTime()));
+    if (const TQChannel* c = channel())
+        _pMouseDownValues.push_back(c->getValueAsDouble(currentTime()));
 }
 
 void TQChanAngleController::update() {
@@ -245,8 +248,7 @@ void TQChanAngleController::update() {
     if (!c || _isOffsetting) return;
     updateEnableState();
     const double v = c->getValueAsDouble(currentTime()) * scaleOf(*c);
-    if (_pTF->doubleValue() != v || _pTF->objectValue().isNil())
-        _pTF->setDoubleValue(v);
+    if (_pTF->doubleValue() != v || _pTF->objectValue().isNil()) _pTF->setDoubleValue(v);
     _pDial->setDoubleValue(360.0 - renormalize(v));
 }
 

@@ -30,6 +30,7 @@ public:
     TQChanNumberController(TQChannelBase* channel, const JNBuildContext& context);
 
     RWTextField& textField() { return *_pTF; }
+    const std::shared_ptr<RWTextField>& textFieldModel() const { return _pTF; }
     // The action's sender: the field, the slider or the dial.
     virtual void setChannelValue(RWActionSender& sender) = 0;
     virtual void startScrubberAction(RWActionSender& sender);
@@ -67,6 +68,7 @@ public:
     TQChanDoubleController(TQChannelBase* channel, const JNBuildContext& context);
 
     RWSlider* slider() const { return _pSlider.get(); }
+    const std::shared_ptr<RWSlider>& sliderModel() const { return _pSlider; }
     void update() override;
     void updateEnableState() override;
     void setChannelValue(RWActionSender& sender) override;
@@ -102,6 +104,7 @@ public:
     TQChanAngleController(TQChannelBase* channel, const JNBuildContext& context);
 
     RWSlider* dial() const { return _pDial.get(); }
+    const std::shared_ptr<RWSlider>& dialModel() const { return _pDial; }
     // An angle in degrees put into 0 .. 360.
     static double renormalize(double degrees);
     void update() override;
@@ -119,6 +122,7 @@ public:
     TQChan2DPropController(TQChannelBase* channel, const JNBuildContext& context);
 
     RWSlider* slider() const { return _pSlider.get(); }
+    const std::shared_ptr<RWSlider>& sliderModel() const { return _pSlider; }
     // The pair the row edits (the associated channel as a compound of two), or null.
     TQChannelBase* compoundChan() const { return associatedChannel(); }
     void update() override;

@@ -26,8 +26,9 @@ public:
     // A maker for the channels of one class (or its subclasses).
     template <class Channel>
     void registerClass(Maker maker) {
-        registerKind([](const TQChannelBase& c) { return dynamic_cast<const Channel*>(&c) != nullptr; },
-                     std::move(maker));
+        registerKind(
+            [](const TQChannelBase& c) { return dynamic_cast<const Channel*>(&c) != nullptr; },
+            std::move(maker));
     }
     std::unique_ptr<TQViewController> controllerForChannel(TQChannelBase* channel,
                                                            const JNBuildContext& context) const;

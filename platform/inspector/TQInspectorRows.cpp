@@ -15,9 +15,9 @@ TQLabeledParamController::TQLabeledParamController(std::unique_ptr<TQViewControl
       _param(std::move(param)) {
     const double height = std::max(_label ? _label->frame().size.height : 0.0,
                                    _param ? _param->frame().size.height : 0.0);
-    setFrameSize(CGSizeMake((_label ? _label->frame().size.width : 0.0) +
-                                (_param ? _param->frame().size.width : 0.0),
-                            height));
+    setFrameSize(CGSizeMake(
+        (_label ? _label->frame().size.width : 0.0) + (_param ? _param->frame().size.width : 0.0),
+        height));
 }
 
 bool TQLabeledParamController::isEnabled() const { return !_param || _param->isEnabled(); }

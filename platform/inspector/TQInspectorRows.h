@@ -62,6 +62,6 @@ public:
     void twiddle(bool open);
 
 private:
-    TQViewController* _heading = nullptr;       // owned as a row of this group
+    TQViewController* _heading = nullptr;        // owned as a row of this group
     TQViewControllerGroup* _enclosed = nullptr;  // owned as a row of this group
 };

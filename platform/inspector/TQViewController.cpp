@@ -13,8 +13,7 @@ TQViewController::~TQViewController() {
     endChannelChange();
 }
 
-bool TQViewController::addOrResetAssociatedChannel(TQChannelBase* channel, bool isAdd,
-                                                   bool force) {
+bool TQViewController::addOrResetAssociatedChannel(TQChannelBase* channel, bool isAdd, bool force) {
     if (!isAdd) {
         _channel = channel;
         _channelList.clear();
@@ -69,8 +68,8 @@ void TQViewController::endChannelChange() {
 
 TQViewControllerGroup::~TQViewControllerGroup() = default;
 
-TQViewController* TQViewControllerGroup::addController(
-    std::unique_ptr<TQViewController> controller, bool appendSubview) {
+TQViewController* TQViewControllerGroup::addController(std::unique_ptr<TQViewController> controller,
+                                                       bool appendSubview) {
     if (!controller) return nullptr;
     TQViewController* row = controller.get();
     if (appendSubview) {

@@ -70,6 +70,9 @@ public:
     TQMiniCurveEditorView& curveEditorView() { return *_curveEditorView; }
     const TQMiniCurveEditorView& curveEditorView() const { return *_curveEditorView; }
     TQMiniCurveEditorCtrl* controller() const { return _curveEditorCtrl.get(); }
+    // The models, shared with the widgets that show them.
+    const std::shared_ptr<RWTextField>& axisXModel() const { return _axisX; }
+    const std::shared_ptr<RWTextField>& axisYModel() const { return _axisY; }
     RWTextField& axisX() { return *_axisX; }
     RWTextField& axisY() { return *_axisY; }
     // The Y label is drawn turned by this many degrees.

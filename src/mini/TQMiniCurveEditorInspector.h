@@ -40,6 +40,15 @@ public:
     void updateVerticalZoomScroller();
     void updateHorizontalZoomScroller();
 
+    // The models, shared with the widgets that show them.
+    const std::shared_ptr<RWSegmentedControl>& modesModel() const { return _modes; }
+    const std::shared_ptr<RWButton>& autoFitModel() const { return _autoFit; }
+    const std::shared_ptr<RWZoomScroller>& verticalScrollerModel() const {
+        return _verticalScroller;
+    }
+    const std::shared_ptr<RWZoomScroller>& horizontalScrollerModel() const {
+        return _horizontalZoomScroller;
+    }
     RWSegmentedControl& modes() { return *_modes; }
     RWButton& autoFitButton() { return *_autoFit; }
     RWZoomScroller& verticalZoomScroller() { return *_verticalScroller; }

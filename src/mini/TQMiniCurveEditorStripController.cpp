@@ -49,8 +49,7 @@ void TQMiniCurveEditorStripController::resetChannel() {
     delegate->postNotification(kTQNotifyFolderResetWord);
 }
 
-bool TQMiniCurveEditorStripController::performAction(const std::string& action,
-                                                     RWActionSender&) {
+bool TQMiniCurveEditorStripController::performAction(const std::string& action, RWActionSender&) {
     if (action != "resetChannel:") return false;
     resetChannel();
     return true;

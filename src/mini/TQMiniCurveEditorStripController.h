@@ -34,6 +34,7 @@ public:
 
     TQMiniCurveEditorStripView& stripView() { return *_pMiniCurveEditorImage; }
     RWButton& resetButton() { return *_pResetButton; }
+    const std::shared_ptr<RWButton>& resetButtonModel() const { return _pResetButton; }
     const CGRect& borderFrame() const { return _borderFrame; }
 
 private:

@@ -42,8 +42,7 @@ void TQChanMiniCurveEditorController::setTotalRange(const CMTime* start, const C
     _pMiniCurveEditor->setTotalRange(start, duration);
 }
 
-void TQChanMiniCurveEditorController::setDisplayRange(const CMTime* start,
-                                                      const CMTime* duration) {
+void TQChanMiniCurveEditorController::setDisplayRange(const CMTime* start, const CMTime* duration) {
     _pMiniCurveEditor->setDisplayRange(start, duration);
 }
 
@@ -107,7 +106,8 @@ void TQMiniCurveEditorGroupController::init() {
     TQMiniCurveEditor* editor = _pEditorController->getMiniCurveEditor();
     _pYController = createYController(*editorGroup, channel, editor, ctx);
     _pXController = createXController(*editorGroup, channel, editor, ctx);
-    _pEditorGroup = static_cast<TQViewControllerGroup*>(addController(std::move(editorGroup), true));
+    _pEditorGroup =
+        static_cast<TQViewControllerGroup*>(addController(std::move(editorGroup), true));
     if (_pEditorStripController) {
         _pEditorStripController->setMiniCurveEditor(editor);
         // The parameter starts closed, with the strip showing.
@@ -153,9 +153,9 @@ void TQMiniCurveEditorGroupController::notify(uint32_t word) {
 }
 
 void TQMiniCurveEditorGroupController::update() {
-    for (TQViewController* row : {static_cast<TQViewController*>(_pHeadingController),
-                                  static_cast<TQViewController*>(_pEditorController), _pYController,
-                                  _pXController})
+    for (TQViewController* row :
+         {static_cast<TQViewController*>(_pHeadingController),
+          static_cast<TQViewController*>(_pEditorController), _pYController, _pXController})
         if (row) row->update();
 }
 
@@ -195,8 +195,7 @@ TQViewController* addPairRows(TQViewControllerGroup& group, TQChannelPair& pair,
                               TQMiniCurveEditor* editor, const JNBuildContext& context) {
     auto heading = std::make_unique<TQLabeledParamController>(
         std::make_unique<TQFolderLabelController>(&pair, context),
-        std::make_unique<TQChan2DPropOverRangeScrubberController>(&pair, editor, context),
-        context);
+        std::make_unique<TQChan2DPropOverRangeScrubberController>(&pair, editor, context), context);
     auto components = std::make_unique<TQViewControllerOverRangeGroup>(&pair, context);
     components->setIsCollapsed(true);
     for (TQChannel* component : {pair.getXChannel(), pair.getYChannel()})
@@ -219,9 +218,10 @@ TQViewController* TQChannelScaleOverRangeController::createYController(
     return pair ? addPairRows(group, *pair, editor, context) : nullptr;
 }
 
-TQViewController* TQChannel2DOverRangeController::createYController(
-    TQViewControllerGroup& group, TQChannelBase* channel, TQMiniCurveEditor* editor,
-    const JNBuildContext& context) {
+TQViewController* TQChannel2DOverRangeController::createYController(TQViewControllerGroup& group,
+                                                                    TQChannelBase* channel,
+                                                                    TQMiniCurveEditor* editor,
+                                                                    const JNBuildContext& context) {
     auto* pair = dynamic_cast<TQChannel2DOverRange*>(channel);
     return pair ? addPairRows(group, *pair, editor, context) : nullptr;
 }

@@ -20,9 +20,9 @@
 // The row that holds the mini editor.
 class TQChanMiniCurveEditorController : public TQViewControllerGroup {
 public:
-    TQChanMiniCurveEditorController(TQChannelBase* channel, TQCurveEditorAppDelegate* host,
-                                    const JNBuildContext& context,
-                                    uint32_t controlFlags = TQMiniCurveEditorInspector::kAllControlFlags);
+    TQChanMiniCurveEditorController(
+        TQChannelBase* channel, TQCurveEditorAppDelegate* host, const JNBuildContext& context,
+        uint32_t controlFlags = TQMiniCurveEditorInspector::kAllControlFlags);
     TQMiniCurveEditorInspector* getMiniCurveEditor() const { return _pMiniCurveEditor.get(); }
 
     void setTotalRange(const CMTime* start, const CMTime* duration);

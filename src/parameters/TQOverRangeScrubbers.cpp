@@ -39,7 +39,8 @@ JNBuildContext TQOverRangeRow::rowContext(const JNBuildContext& context) {
 }
 
 void TQOverRangeRow::postChanging() const {
-    if (TQCurveEditorAppDelegate* d = _pMiniCurveEditor ? _pMiniCurveEditor->appDelegate() : nullptr)
+    if (TQCurveEditorAppDelegate* d =
+            _pMiniCurveEditor ? _pMiniCurveEditor->appDelegate() : nullptr)
         d->postNotification(kTQNotifyChannelsChanging);
 }
 
@@ -59,7 +60,8 @@ void TQChanDoubleOverRangeScrubberController::startScrubberAction(RWActionSender
     _isOffsetting = !areAllChannelsEqual() && _actionType != TQNumberAction::Typed;
     _pMouseDownValues.clear();
     if (!_pMiniCurveEditor) return;
-    _pMouseDownValues.push_back(_pMiniCurveEditor->getSelectedValueYForChannel(associatedChannel()));
+    _pMouseDownValues.push_back(
+        _pMiniCurveEditor->getSelectedValueYForChannel(associatedChannel()));
     for (TQChannelBase* other : associatedChannelList())
         _pMouseDownValues.push_back(_pMiniCurveEditor->getSelectedValueYForChannel(other));
     (void)sender;

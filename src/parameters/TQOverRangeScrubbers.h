@@ -36,7 +36,7 @@ protected:
 };
 
 class TQChanDoubleOverRangeScrubberController : public TQChanDoubleController,
-                                                 public TQOverRangeRow {
+                                                public TQOverRangeRow {
 public:
     TQChanDoubleOverRangeScrubberController(TQChannelBase* channel, TQMiniCurveEditor* editor,
                                             const JNBuildContext& context);
@@ -64,8 +64,7 @@ protected:
     void aboutToChangeChannel() override;
 };
 
-class TQChanAngleOverRangeScrubberController : public TQChanAngleController,
-                                                public TQOverRangeRow {
+class TQChanAngleOverRangeScrubberController : public TQChanAngleController, public TQOverRangeRow {
 public:
     TQChanAngleOverRangeScrubberController(TQChannelBase* channel, TQMiniCurveEditor* editor,
                                            const JNBuildContext& context);
@@ -76,7 +75,7 @@ public:
 };
 
 class TQChan2DPropOverRangeScrubberController : public TQChan2DPropController,
-                                                 public TQOverRangeRow {
+                                                public TQOverRangeRow {
 public:
     TQChan2DPropOverRangeScrubberController(TQChannelBase* channel, TQMiniCurveEditor* editor,
                                             const JNBuildContext& context);

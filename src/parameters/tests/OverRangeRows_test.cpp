@@ -170,8 +170,8 @@ TEST_F(OverRangeRows, group__starts_closed_with_the_strip_and_opens) {
 }
 
 TEST_F(OverRangeRows, pair__typed_sets_both_a_drag_keeps_the_ratio) {
-    auto pairGroup = TQMakeOverRangeGroup<TQChannel2DOverRangeController>(gradient, &recorder,
-                                                                          context);
+    auto pairGroup =
+        TQMakeOverRangeGroup<TQChannel2DOverRangeController>(gradient, &recorder, context);
     TQMiniCurveEditorInspector* editor = pairGroup->editorController()->getMiniCurveEditor();
     auto* folder = static_cast<TQFolderGroupController*>(pairGroup->yController());
     ASSERT_NE(folder, nullptr);
@@ -186,7 +186,8 @@ TEST_F(OverRangeRows, pair__typed_sets_both_a_drag_keeps_the_ratio) {
     {
         TQCurveSelectionList* list = editor->curveEditorView().getSelection();
         auto entry = std::make_shared<TQCurveSelection>();
-        entry->setCurveId(editor->controller()->selectedCurveSet()->itemWithChannel(x)->channelId());
+        entry->setCurveId(
+            editor->controller()->selectedCurveSet()->itemWithChannel(x)->channelId());
         entry->setHandle(x->getKeyframe(position(0.5)));
         entry->setFlags(TQSelectionKeypoint);
         list->addSelection(entry);
@@ -216,18 +217,18 @@ TEST_F(OverRangeRows, pair__typed_sets_both_a_drag_keeps_the_ratio) {
     EXPECT_DOUBLE_EQ(keyValue(*y, 0.5), 6.0);
     EXPECT_DOUBLE_EQ(keyValue(*x, 0.5), 0.0);
 
-    auto wrong = TQMakeOverRangeGroup<TQChannelScaleOverRangeController>(gradient, &recorder,
-                                                                         context);
+    auto wrong =
+        TQMakeOverRangeGroup<TQChannelScaleOverRangeController>(gradient, &recorder, context);
     EXPECT_EQ(wrong->yController(), nullptr) << "a pair of another class has no value row";
 }
 
 TEST_F(OverRangeRows, angle__dial_across_zero_takes_a_small_step) {
-    auto* turn =
-        static_cast<TQChannelAngle*>(object->addChild(std::make_unique<TQChannelAngle>("Turn", 13)));
+    auto* turn = static_cast<TQChannelAngle*>(
+        object->addChild(std::make_unique<TQChannelAngle>("Turn", 13)));
     const double degree = 1.0 / turn->getInfo()->displayScale;
     setKeys(*turn, {{0.5, 5.0 * degree}});
-    auto angleGroup = TQMakeOverRangeGroup<TQChannelAngleOverRangeController>(turn, &recorder,
-                                                                              context);
+    auto angleGroup =
+        TQMakeOverRangeGroup<TQChannelAngleOverRangeController>(turn, &recorder, context);
     TQMiniCurveEditorInspector* editor = angleGroup->editorController()->getMiniCurveEditor();
     TQCurveSelectionList* list = editor->curveEditorView().getSelection();
     auto entry = std::make_shared<TQCurveSelection>();
