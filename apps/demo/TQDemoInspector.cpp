@@ -117,8 +117,9 @@ void TQDemoInspector::rebuild() {
 
     TQChannelBase* gradient = channelAt(object, typed.gradient);
     _hudEditor.setChannel(gradient);
-    _hudTitle->setText(gradient ? tr("Gradient of %1").arg(QString::fromStdString(object->getName()))
-                                : tr("No object selected"));
+    _hudTitle->setText(gradient
+                           ? tr("Gradient of %1").arg(QString::fromStdString(object->getName()))
+                           : tr("No object selected"));
     _hudWidget->sync();
 }
 

@@ -7,24 +7,22 @@
 #include "platform/channels/TQCompoundChannel.h"
 
 namespace {
-
 constexpr double kZeroTolerance = 1e-7;
-// Rows of this width or more place the slider finely enough to keep every value it gives.
-constexpr double kSnappingSliderWidth = 200.0;
+}  // namespace
 
-double scaleOf(const TQChannel& channel) { return channel.getInfo()->displayScale; }
+double TQChanNumberController::displayScaleOf(const TQChannel& channel) {
+    return channel.getInfo()->displayScale;
+}
 
-double clampToCurve(const TQChannel& channel, double x) {
+double TQChanNumberController::clampToCurve(const TQChannel& channel, double x) {
     return std::clamp(x, channel.curveMinimum(),
                       std::max(channel.curveMinimum(), channel.curveMaximum()));
 }
 
-double snapToDigits(double x, int digits) {
+double TQChanNumberController::snapToDigits(double x, int digits) {
     const double d = std::pow(10.0, digits);
     return std::floor(x * d + 0.5 + 1e-7) / d;
 }
-
-}  // namespace
 
 // ---- Common ----------------------------------------------------------------------------------
 
@@ -155,7 +153,7 @@ void TQChanDoubleController::update() {
     TQChannel* c = channel();
     if (!c || _isOffsetting) return;
     updateEnableState();
-    const double scale = scaleOf(*c);
+    const double scale = displayScaleOf(*c);
     updateScrubberRange(*c, scale);
     const double y = c->getValueAsDouble(currentTime());
     _pSlider->setDoubleValue(y * scale);
@@ -187,7 +185,7 @@ void TQChanDoubleController::setChannelValue(RWActionSender& sender) {
     TQChannel* c = channel();
     if (!c) return;
     const CMTime t = currentTime();
-    const double scale = scaleOf(*c);
+    const double scale = displayScaleOf(*c);
     double x = snapForSlider(sender, senderValue(sender));
     if (_isIntegerController) x = std::trunc(x);
     x /= scale;
@@ -247,7 +245,7 @@ void TQChanAngleController::update() {
     TQChannel* c = channel();
     if (!c || _isOffsetting) return;
     updateEnableState();
-    const double v = c->getValueAsDouble(currentTime()) * scaleOf(*c);
+    const double v = c->getValueAsDouble(currentTime()) * displayScaleOf(*c);
     if (_pTF->doubleValue() != v || _pTF->objectValue().isNil()) _pTF->setDoubleValue(v);
     _pDial->setDoubleValue(360.0 - renormalize(v));
 }
@@ -257,7 +255,7 @@ void TQChanAngleController::setChannelValue(RWActionSender& sender) {
     TQChannel* c = channel();
     if (!c) return;
     const CMTime t = currentTime();
-    const double scale = scaleOf(*c);
+    const double scale = displayScaleOf(*c);
     const double x = senderValue(sender);
     double value = x / scale;
     double shown = x;
@@ -344,7 +342,7 @@ void TQChan2DPropController::update() {
     const CMTime t = currentTime();
     const double x = cx->getValueAsDouble(t);
     const double y = cy->getValueAsDouble(t);
-    const double shown = (std::fabs(y) > std::fabs(x) ? y : x) * scaleOf(*cx);
+    const double shown = (std::fabs(y) > std::fabs(x) ? y : x) * displayScaleOf(*cx);
     _pSlider->setDoubleValue(shown);
     _isMixed = std::fabs(x - y) >= kZeroTolerance;
     if (!isHUD() && _pTF->formatter() != _pEqualFormatter.get())
@@ -366,15 +364,15 @@ void TQChan2DPropController::setChannelValue(RWActionSender& sender) {
     TQChannel* trailing = xLeads ? cy : cx;
     const double ratio = xLeads ? (std::fabs(ox) < kZeroTolerance ? 0.0 : oy / ox)
                                 : (std::fabs(oy) < kZeroTolerance ? 0.0 : ox / oy);
-    x = clampToCurve(*leading, x / scaleOf(*leading));
+    x = clampToCurve(*leading, x / displayScaleOf(*leading));
     if (JNInspectorDelegate* d = delegate()) d->abort();
     double factor = 1.0;
     if (isField(sender)) {
         if (_pTF->stringValue().empty()) return;
         factor = _isSliding ? ratio : 1.0;
-        _pSlider->setDoubleValue(x * scaleOf(*leading));
+        _pSlider->setDoubleValue(x * displayScaleOf(*leading));
     } else if (&sender == _pSlider.get()) {
-        _pTF->setDoubleValue(x * scaleOf(*leading));
+        _pTF->setDoubleValue(x * displayScaleOf(*leading));
         factor = ratio;
     }
     leading->noteWillChange(true);

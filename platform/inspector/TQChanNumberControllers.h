@@ -53,6 +53,14 @@ protected:
     TQChannel* channel() const;
     // The sender's number (field, slider or dial).
     static double senderValue(RWActionSender& sender);
+    // What a user reads is the value times this.
+    static double displayScaleOf(const TQChannel& channel);
+    // Within the channel's limits: numbers out of range are clamped, never refused.
+    static double clampToCurve(const TQChannel& channel, double x);
+    // To `digits` decimals (what a narrow slider can place).
+    static double snapToDigits(double x, int digits);
+    // Sliders narrower than this snap to the row's decimals.
+    static constexpr double kSnappingSliderWidth = 200.0;
     bool isField(const RWActionSender& sender) const { return &sender == _pTF.get(); }
     // Refused while the inspector is rebuilding and a number was typed.
     bool entryCheckFails(const RWActionSender& sender) const;

@@ -35,7 +35,8 @@ protected:
             object->addChild(std::make_unique<TQChannel2DOverRange>("Gradient", 11)));
         gradient->getXChannel()->setKeyframe(position(0.5), 2.0);
         rows.push_back(std::make_unique<TQChanDoubleController>(opacity, context));
-        rows.push_back(TQMakeOverRangeGroup<TQChannel2DOverRangeController>(gradient, &host, context));
+        rows.push_back(
+            TQMakeOverRangeGroup<TQChannel2DOverRangeController>(gradient, &host, context));
         for (auto& row : rows) row->update();
         panel.setRows({rows[0].get(), rows[1].get()});
         panel.resize(320, 600);
@@ -89,8 +90,8 @@ TEST_F(QtInspectorPanel, over_range_parameter_opens_onto_its_mini_editor_and_res
 
     TQQtButton* reset = nullptr;
     for (QWidget* w : panel.findChildren<QWidget*>())
-        if (auto* b = dynamic_cast<TQQtButton*>(w); b && b->model() &&
-                                                    b->model()->action() == "resetChannel:")
+        if (auto* b = dynamic_cast<TQQtButton*>(w);
+            b && b->model() && b->model()->action() == "resetChannel:")
             reset = b;
     ASSERT_NE(reset, nullptr);
     reset->click();

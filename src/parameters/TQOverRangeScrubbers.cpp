@@ -7,28 +7,7 @@
 #include "platform/channels/TQChannelTypes.h"
 
 namespace {
-
 constexpr double kZeroTolerance = 1e-7;
-constexpr double kSnappingSliderWidth = 200.0;
-
-double scaleOf(const TQChannel& channel) { return channel.getInfo()->displayScale; }
-
-double clampToCurve(const TQChannel& channel, double x) {
-    return std::clamp(x, channel.curveMinimum(),
-                      std::max(channel.curveMinimum(), channel.curveMaximum()));
-}
-
-double snapToDigits(double x, int digits) {
-    const double d = std::pow(10.0, digits);
-    return std::floor(x * d + 0.5 + 1e-7) / d;
-}
-
-double senderNumber(RWActionSender& sender) {
-    if (auto* field = dynamic_cast<RWTextField*>(&sender)) return field->doubleValue();
-    if (auto* value = dynamic_cast<RWValueControl*>(&sender)) return value->doubleValue();
-    return 0.0;
-}
-
 }  // namespace
 
 JNBuildContext TQOverRangeRow::rowContext(const JNBuildContext& context) {
@@ -73,7 +52,7 @@ void TQChanDoubleOverRangeScrubberController::update() {
     if (_isSuppressingDisabledUpdates && !isEnabled()) return;
     updateEnableState();
     const double y = _pMiniCurveEditor->getSelectedValueYForChannel(c);
-    const double scale = scaleOf(*c);
+    const double scale = displayScaleOf(*c);
     updateScrubberRange(*c, scale);
     _pSlider->setDoubleValue(y * scale);
     const double shown = y * scale + valueBias();
@@ -86,8 +65,8 @@ void TQChanDoubleOverRangeScrubberController::setChannelValue(RWActionSender& se
     TQChannel* c = channel();
     if (!c || !_pMiniCurveEditor) return;
     const CMTime t = currentTime();
-    const double scale = scaleOf(*c);
-    double x = snapForSlider(sender, senderNumber(sender));
+    const double scale = displayScaleOf(*c);
+    double x = snapForSlider(sender, senderValue(sender));
     if (_isIntegerController) x = std::trunc(x);
     x /= scale;
     if (_isOffsetting && !_pMouseDownValues.empty())
@@ -156,7 +135,7 @@ void TQChanRangeScrubberController::setChannelValue(RWActionSender& sender) {
     TQChannel* c = channel();
     if (!c || !_pMiniCurveEditor) return;
     const CMTime t = currentTime();
-    double x = snapForSlider(sender, senderNumber(sender));
+    double x = snapForSlider(sender, senderValue(sender));
     if (_isIntegerController) x = std::trunc(x);
     x /= 100.0;
     if (_isOffsetting && !_pMouseDownValues.empty())
@@ -213,7 +192,7 @@ void TQChanAngleOverRangeScrubberController::update() {
     TQChannel* c = channel();
     if (!c || _isOffsetting || !_pMiniCurveEditor) return;
     updateEnableState();
-    const double v = _pMiniCurveEditor->getSelectedValueY() * scaleOf(*c);
+    const double v = _pMiniCurveEditor->getSelectedValueY() * displayScaleOf(*c);
     if (_pTF->doubleValue() != v || _pTF->objectValue().isNil()) _pTF->setDoubleValue(v);
     _pDial->setDoubleValue(360.0 - renormalize(v));
 }
@@ -222,8 +201,8 @@ void TQChanAngleOverRangeScrubberController::setChannelValue(RWActionSender& sen
     if (entryCheckFails(sender)) return;
     TQChannel* c = channel();
     if (!c || !_pMiniCurveEditor) return;
-    const double scale = scaleOf(*c);
-    const double x = senderNumber(sender);
+    const double scale = displayScaleOf(*c);
+    const double x = senderValue(sender);
     double value = x / scale;
     double shown = x;
     if (&sender == _pDial.get()) {
@@ -303,7 +282,7 @@ void TQChan2DPropOverRangeScrubberController::update() {
     updateEnableState();
     const double x = _pMiniCurveEditor->getSelectedValueYForChannel(cx);
     const double y = _pMiniCurveEditor->getSelectedValueYForChannel(cy);
-    const double shown = (std::fabs(y) > std::fabs(x) ? y : x) * scaleOf(*cx);
+    const double shown = (std::fabs(y) > std::fabs(x) ? y : x) * displayScaleOf(*cx);
     _pSlider->setDoubleValue(shown);
     _isMixed = std::fabs(x - y) >= kZeroTolerance;
     if (!isHUD() && _pTF->formatter() != _pEqualFormatter.get())
@@ -316,12 +295,12 @@ void TQChan2DPropOverRangeScrubberController::setChannelValue(RWActionSender& se
     const auto [cx, cy] = components(compoundChan());
     if (!cx || !cy) return;
     const CMTime t = currentTime();
-    double x = senderNumber(sender);
+    double x = senderValue(sender);
     if (&sender == _pSlider.get() && _pSlider->frame().size.width < kSnappingSliderWidth)
         x = snapToDigits(x, _decimalDigits);
     TQChannel* leading = _isXMax ? cx : cy;
     TQChannel* trailing = _isXMax ? cy : cx;
-    const double scale = scaleOf(*leading);
+    const double scale = displayScaleOf(*leading);
     x = clampToCurve(*leading, x / scale);
     if (JNInspectorDelegate* d = delegate()) d->abort();
     double factor = 1.0;

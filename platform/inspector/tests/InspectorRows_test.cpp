@@ -96,8 +96,8 @@ TEST(InspectorRows, groups__collapse_hides_rows_and_a_folder_row_opens_its_group
     JNBuildContext context;
     TQChannel channel("X", 1);
     auto enclosed = std::make_unique<TQViewControllerGroup>(&channel, context);
-    TQViewController* first = enclosed->addController(
-        std::make_unique<TQChanLabelController>(&channel, context), true);
+    TQViewController* first =
+        enclosed->addController(std::make_unique<TQChanLabelController>(&channel, context), true);
     enclosed->setIsCollapsed(true);
     TQFolderGroupController folder(std::make_unique<TQFolderLabelController>(&channel, context),
                                    std::move(enclosed), context);
@@ -120,12 +120,12 @@ TEST(InspectorRows, mapping__registered_kinds_first_then_a_number_row) {
     TQChannelAngle angle("Turn", 1);
     TQChannel plain("Plain", 2);
     TQChannel2D pair("Pos", 3);
-    EXPECT_NE(dynamic_cast<TQChanAngleController*>(
-                  mapping.controllerForChannel(&angle, context).get()),
-              nullptr);
-    EXPECT_NE(dynamic_cast<TQChanDoubleController*>(
-                  mapping.controllerForChannel(&plain, context).get()),
-              nullptr);
+    EXPECT_NE(
+        dynamic_cast<TQChanAngleController*>(mapping.controllerForChannel(&angle, context).get()),
+        nullptr);
+    EXPECT_NE(
+        dynamic_cast<TQChanDoubleController*>(mapping.controllerForChannel(&plain, context).get()),
+        nullptr);
     EXPECT_EQ(mapping.controllerForChannel(&pair, context), nullptr);
     EXPECT_EQ(mapping.controllerForChannel(nullptr, context), nullptr);
 }
