@@ -44,7 +44,7 @@ public:
     bool validateMenuItem(RWMenuItem& item) override;
     // False with no channel item. The extrapolation items take the state of the first
     // channel's extrapolation (before or after); their state is left as it was when invalid.
-    bool validateDefaultMenuItem(RWMenuItem& item);
+    bool validateDefaultMenuItem(RWMenuItem& item) override;
     bool performAction(const std::string& action, RWActionSender& sender) override;
     // Each on every channel item of the set, one undo step, posted with kTQNotifyChannelsChanged.
     void menuSetCurvePreExtrapolation(RWActionSender& sender);
