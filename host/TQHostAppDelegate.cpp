@@ -106,6 +106,10 @@ void TQHostAppDelegate::unsuppressEventCoalescing() {
 
 // --- Undo ---
 
+void TQHostAppDelegate::eventLoopDidGoIdle() {
+    if (_coalescingSuppressed == 0) _undo.closeOpenStep();
+}
+
 bool TQHostAppDelegate::undo() {
     if (!_undo.undo()) return false;
     _notifications.post(kTQNotifyChannelsChanged);

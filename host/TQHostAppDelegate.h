@@ -94,6 +94,13 @@ public:
     bool canRedo() { return _undo.canRedo(); }
     BNString undoDescription() { return _undo.undoDescription(); }
     BNString redoDescription() { return _undo.redoDescription(); }
+    // The event loop calls this when it has handled an event and goes idle with no mouse
+    // button held. A step still open then outlives the gesture that opened it: a drag or a
+    // scrub holds its step only while the button is down, and the framework leaves one step
+    // open on purpose (the interpolation menu's mixed entry). It is closed here, kept if it
+    // changed anything, so that the edits after it are steps of their own and undo goes on.
+    // Nothing happens while a drag of the curves holds the event stream.
+    void eventLoopDidGoIdle();
     void registerUndoClient(const void* object, TQHostUndoClient* client) {
         _undo.registerClient(object, client);
     }

@@ -43,6 +43,12 @@ void TQHostUndoStack::endStep() {
     if (--_depth == 0) closeStep(std::move(_open));
 }
 
+void TQHostUndoStack::closeOpenStep() {
+    if (_applying || _depth == 0) return;
+    _depth = 0;
+    closeStep(std::move(_open));
+}
+
 void TQHostUndoStack::announceChannel(const TQChannelBase* channel) {
     if (_applying || !_open || !channel) return;
     captureBefore(*_open, *channel);

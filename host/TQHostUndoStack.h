@@ -71,6 +71,9 @@ public:
     // --- Recording ---
     void beginStep(const BNString& description);
     void endStep();
+    // Closes the open step at whatever depth, as its outermost end would have: for a step
+    // that was left open (the ends still to come are then ignored as unbalanced).
+    void closeOpenStep();
     bool isStepOpen() const { return _depth > 0; }
     int depth() const { return _depth; }
 

@@ -200,6 +200,47 @@ public:
     // Mirrors a keypoint selection into the channel list: the rows of the selected curves.
     void selectionChangedTo(TQCurveSelectionList* list) override;
 
+    // ---- Commands on whole channels (TQCurveEditorCtrlChannelCommands.cpp) ----
+    //
+    // The animation menu's commands. Each works on the selected channels, in one undo step
+    // under its key even when no channel is selected, announcing each channel around its
+    // change and marking its curve dirty; the step is followed by kTQNotifyChannelsChanged.
+    // Items whose channel has gone are skipped.
+
+    // The sender's tag as the interpolation of every keyframe, through the linked compound
+    // too; curve and blind-data channels are skipped, and a channel that refuses
+    // interpolation changes keeps its own. The sender's menu ticks the item of that tag. Tag
+    // 100 (the mixed entry) opens the step and returns, leaving it open: hosts close it.
+    void animMenuSetCurveInterpolation(RWActionSender* sender);
+    // The sender's tag as the extrapolation before the first (after the last) keyframe; the
+    // sender's menu ticks the item whose index is the tag.
+    void animMenuSetCurvePreExtrapolation(RWActionSender* sender);
+    void animMenuSetCurvePostExtrapolation(RWActionSender* sender);
+    void animMenuLockChannel(RWActionSender* sender = nullptr);
+    void animMenuUnlockChannel(RWActionSender* sender = nullptr);
+    void animMenuEnableAnimation(RWActionSender* sender = nullptr);
+    void animMenuDisableAnimation(RWActionSender* sender = nullptr);
+    // A keyframe at (the keyframe at) the delegate's current time.
+    void animMenuAddKeyframe(RWActionSender* sender = nullptr);
+    void animMenuDeleteKeyframe(RWActionSender* sender = nullptr);
+    void animMenuResetChannel(RWActionSender* sender = nullptr);
+    // Each channel takes the state of its ghost; a channel without a ghost is left alone.
+    void animMenuSetChannelToGhost(RWActionSender* sender = nullptr);
+    // The playhead to the nearest keyframe after (before) it on any selected channel, posting
+    // kTQNotifyTimeChanged; nothing when there is none. A keyframe before time 0 is never
+    // the previous one.
+    void animMenuNextKeyframe(RWActionSender* sender = nullptr);
+    void animMenuPreviousKeyframe(RWActionSender* sender = nullptr);
+    void nextKeyframe(RWActionSender* sender = nullptr) { animMenuNextKeyframe(sender); }
+    void previousKeyframe(RWActionSender* sender = nullptr) { animMenuPreviousKeyframe(sender); }
+    // The clipboard's actions, taken so that the editor answers them in the responder chain.
+    virtual void copy(RWActionSender* sender = nullptr);
+    virtual void cut(RWActionSender* sender = nullptr);
+    virtual void paste(RWActionSender* sender = nullptr);
+    void menuCopy(RWActionSender* sender = nullptr) { copy(sender); }
+    void menuCut(RWActionSender* sender = nullptr) { cut(sender); }
+    void menuPaste(RWActionSender* sender = nullptr) { paste(sender); }
+
     // ---- Curve sets: the automatic sets ----
 
     // Animated, Modified, All and Active, each with its localised name and the delegate.
@@ -346,6 +387,14 @@ protected:
     std::vector<TQCurveSetPtr> numberedAutomaticCurveSets(double version) const;
     // Step 9 of notify: the playhead moved.
     void notifyTimeChanged();
+    // The shape of the per-channel commands: one step under the key around `change` (item,
+    // channel) for each selected channel item with a channel, each announced and marked
+    // dirty, then `after` (item); kTQNotifyChannelsChanged when the step has closed.
+    template <class Change, class After>
+    void changeSelectedChannels(const char* undoKey, Change&& change, After&& after);
+    // One channel's announced change inside the open step, its curve marked dirty after.
+    template <class Change>
+    void changeChannel(TQCurveEditorChannelItem& item, TQChannel& channel, Change&& change);
     // A scroller pan of the view by a fraction of its range.
     void panVertically(double fraction);
 
