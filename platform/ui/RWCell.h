@@ -52,6 +52,13 @@ public:
     // A check box of the state (RWOnState, RWOffState, RWMixedState) centred in the frame.
     // Here from the primitives above: an outlined square, filled for on, a bar for mixed.
     virtual void drawCheckBox(const CGRect& frame, int32_t state, bool enabled, bool highlighted);
+    // The image of the framework's resources of that name, scaled into the frame, at an
+    // opacity from 0 to 1. A drawing that shows no images (one that only measures) draws none.
+    virtual void drawImage(const std::string& resourceName, const CGRect& frame, double opacity) {
+        (void)resourceName;
+        (void)frame;
+        (void)opacity;
+    }
 };
 
 class RWCell : public RWActionSender {

@@ -563,6 +563,12 @@ void RWOutlineView::makeFirstResponder() {
     tellObservers([&](RWOutlineViewObserver& o) { o.outlineWantsKeyboardFocus(*this); });
 }
 
+void RWOutlineView::popUpContextMenu(const RWMenuPtr& menu, const RWEvent& event) {
+    if (!menu) return;
+    const CGPoint point = event.locationInWindow();
+    tellObservers([&](RWOutlineViewObserver& o) { o.outlinePopUpContextMenu(*this, menu, point); });
+}
+
 void RWOutlineView::mouseDown(const RWEvent& event) {
     _mouseLocation = event.locationInWindow();
     makeFirstResponder();

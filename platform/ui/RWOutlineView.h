@@ -202,6 +202,9 @@ public:
     // The effect of a thing vanishing, at a window point.
     virtual void outlineShowAnimationEffect(RWOutlineView&, const CGPoint&) {}
     virtual void outlineDidChangeColumns(RWOutlineView&) {}
+    // A cell asked for its menu at a window point: the adapter shows it, validated as it
+    // opens, and performs the chosen item through the menu.
+    virtual void outlinePopUpContextMenu(RWOutlineView&, const RWMenuPtr&, const CGPoint&) {}
 };
 
 // How an edit was left, as the text system reports it.
@@ -408,6 +411,9 @@ public:
                    bool untilMouseUp);
     // Asks for the keyboard (the toolkit's makeFirstResponder).
     void makeFirstResponder();
+    // Shows the menu where the event happened (popUpContextMenu:withEvent:forView:); nothing
+    // for a null menu.
+    void popUpContextMenu(const RWMenuPtr& menu, const RWEvent& event);
 
     // ---- Dragging rows ----
     virtual bool canDragRowsWithIndexes(const RWIndexSet& rows, const CGPoint& point);

@@ -307,6 +307,31 @@ void drawPenAddControlPointCursor(ImageCanvas& canvas) {
     canvas.draw(disc({11.2, 12.8}, 1.3), solid(kWhite));
 }
 
+// The parts of a parameter row's animation status cell: arrows to the previous and next
+// keyframe, and the keyframe mark, filled when the channel has a keyframe at the current time
+// and hollow when it has none there.
+constexpr double kStatusPartSize = 16.0;
+
+void drawStatusArrow(ImageCanvas& canvas, bool forward) {
+    const double c = kStatusPartSize * 0.5;
+    const double tip = forward ? c + 3.0 : c - 3.0;
+    const double base = forward ? c - 2.0 : c + 2.0;
+    canvas.draw(polygon({{tip, c}, {base, c - 4.0}, {base, c + 4.0}}), solid(kGlyph));
+}
+
+void drawStatusKeyframe(ImageCanvas& canvas, bool filled) {
+    const double c = kStatusPartSize * 0.5;
+    const double r = 5.0;
+    const Coverage outer = polygon({{c, c - r}, {c + r, c}, {c, c + r}, {c - r, c}});
+    if (filled) {
+        canvas.draw(outer, solid(kGlyph));
+        return;
+    }
+    const double i = r - 1.4;
+    const Coverage inner = polygon({{c, c - i}, {c + i, c}, {c, c + i}, {c - i, c}});
+    canvas.draw([outer, inner](Point p) { return inner(p) > 0.0 ? 0.0 : outer(p); }, solid(kGlyph));
+}
+
 bool writeBothScales(const std::string& folder, const std::string& name, double sizePoints,
                      const std::function<void(ImageCanvas&)>& drawImage) {
     for (const double scale : {1.0, 2.0}) {
@@ -370,5 +395,13 @@ int main(int argc, char** argv) {
     ok &= writeBothScales(folder, GDCursorSketch.name, kGDCursorSize, drawSketchCursor);
     ok &= writeBothScales(folder, GDCursorPenAddControlPoint.name, kGDCursorSize,
                           drawPenAddControlPointCursor);
+    ok &= writeBothScales(folder, "AnimStatusPrevious", kStatusPartSize,
+                          [](ImageCanvas& canvas) { drawStatusArrow(canvas, false); });
+    ok &= writeBothScales(folder, "AnimStatusNext", kStatusPartSize,
+                          [](ImageCanvas& canvas) { drawStatusArrow(canvas, true); });
+    ok &= writeBothScales(folder, "AnimStatusKeyframe", kStatusPartSize,
+                          [](ImageCanvas& canvas) { drawStatusKeyframe(canvas, true); });
+    ok &= writeBothScales(folder, "AnimStatusNoKeyframe", kStatusPartSize,
+                          [](ImageCanvas& canvas) { drawStatusKeyframe(canvas, false); });
     return ok ? 0 : 1;
 }

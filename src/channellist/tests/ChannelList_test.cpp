@@ -13,13 +13,14 @@
 #include "src/channellist/TQCurveEditorChannelList.h"
 #include "src/channellist/TQCurveEditorListController.h"
 #include "src/channellist/TQCurveEditorScrubberCell.h"
+#include "src/channellist/tests/ChannelListFixture.h"
 #include "src/editor/TQCurveEditorCtrl.h"
 #include "src/editor/TQCurveEditorView.h"
 #include "src/resources/TQStrings.h"
 
 namespace {
 
-using Ctrl = TQCurveEditorListController;
+using namespace channellist_test;
 
 // The host's undo hears a value edit through the channel's manipulator, as a host that groups
 // value edits into steps does.
@@ -34,76 +35,6 @@ public:
 
 private:
     TQHostAppDelegate& _host;
-};
-
-class ChannelListTest : public ::testing::Test {
-protected:
-    void SetUp() override {
-        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
-        view.setViewHost(&viewHost);
-        const CMTimeRange range = host.displayRange();
-        view.setTotalRange(&range.start, &range.duration);
-        list.addStandardColumns();
-        controller.setMainCurveEditorController(&ctrl);
-        controller.setOutlineView(&list);
-        list.setCurveListController(&controller);
-        controller.awakeFromNib();
-        ctrl.init();
-        ctrl.setAppDelegate(&host);
-        ctrl.setView(&view);
-        TQCurveEditorOutlets outlets;
-        outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
-        outlets.channels = &list;
-        outlets.channelsList = &controller;
-        ctrl.connectOutlets(outlets);
-        ctrl.setupController();
-        ctrl.viewDidLoad();
-        host.addNotificationReceiver(&ctrl);
-        list.setVisibleRect(CGRectMake(0, 0, list.bounds().size.width, 400));
-        ctrl.updateUI();
-    }
-    void TearDown() override {
-        host.removeNotificationReceiver(&ctrl);
-        view.setViewHost(nullptr);
-    }
-
-    // The row of the first channel item whose name holds `name`, -1 when the list shows none.
-    int64_t rowOf(const std::string& name) {
-        for (int64_t row = 0; row < list.numberOfRows(); ++row) {
-            auto* item = Ctrl::editorItem(list.itemAtRow(row));
-            if (item && dynamic_cast<TQCurveEditorChannelItem*>(item) &&
-                item->simpleName().find(name) != std::string::npos)
-                return row;
-        }
-        return -1;
-    }
-    TQCurveEditorItem* itemAt(int64_t row) { return Ctrl::editorItem(list.itemAtRow(row)); }
-    // A window point in the middle of a cell (a little right of its left edge for Name).
-    CGPoint at(const char* column, int64_t row) {
-        const CGRect f = list.frameOfCellAtColumn(list.columnWithIdentifier(column), row);
-        return list.convertPointToWindow(
-            CGPointMake(f.origin.x + f.size.width / 2, f.origin.y + f.size.height / 2));
-    }
-    void click(const char* column, int64_t row, uint64_t flags = 0) {
-        list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, at(column, row), flags));
-        list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, at(column, row), flags));
-    }
-    void moveTo(const CGPoint& point) {
-        list.mouseMoved(RWEvent::mouseEvent(RWEventType::MouseMoved, point));
-    }
-    std::vector<std::string> selectedNames() const {
-        std::vector<std::string> names;
-        for (const TQCurveEditorItemPtr& item : ctrl.selectedCurveSet()->selectedItems())
-            names.push_back(item->simpleName());
-        return names;
-    }
-
-    TQHostAppDelegate host;
-    RWStubViewHost viewHost{800.0, 400.0, 1.0};
-    TQCurveEditorView view;
-    TQCurveEditorCtrl ctrl;
-    TQCurveEditorChannelList list;
-    Ctrl controller;
 };
 
 TEST_F(ChannelListTest, rows__theSelectedSetOpenedWithSwatchesAndValues) {
