@@ -3,6 +3,9 @@
 #include <QApplication>
 #include <QStyle>
 
+#include "qt/TQQtImages.h"
+#include "src/resources/BNImage.h"
+
 TQQtCellDrawing::TQQtCellDrawing(QPainter& painter, const QPalette& palette)
     : _painter(painter), _palette(palette) {
     _painter.save();
@@ -53,6 +56,19 @@ void TQQtCellDrawing::drawText(const std::string& text, const CGRect& frame,
     _painter.drawText(rect, int(flags),
                       _painter.fontMetrics().elidedText(QString::fromStdString(text),
                                                         Qt::ElideRight, int(rect.width())));
+}
+
+void TQQtCellDrawing::drawImage(const std::string& resourceName, const CGRect& frame,
+                                double opacity) {
+    const qreal ratio = _painter.device() ? _painter.device()->devicePixelRatioF() : 1.0;
+    const auto image = BNImageForResource(resourceName, ratio);
+    if (!image) return;
+    _painter.save();
+    _painter.setOpacity(_painter.opacity() * opacity);
+    _painter.setRenderHint(QPainter::SmoothPixmapTransform, true);
+    _painter.drawImage(QRectF(frame.origin.x, frame.origin.y, frame.size.width, frame.size.height),
+                       TQQtImage(*image));
+    _painter.restore();
 }
 
 void TQQtCellDelegate::paint(QPainter* painter, const QStyleOptionViewItem& option,

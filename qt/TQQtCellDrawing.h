@@ -27,6 +27,8 @@ public:
     void strokeRect(const CGRect& rect, const RWColor& color, double lineWidth) override;
     void drawText(const std::string& text, const CGRect& frame, RWTextAlignment alignment,
                   bool enabled) override;
+    // The image's file for the painter's device pixel ratio, smoothly scaled into the frame.
+    void drawImage(const std::string& resourceName, const CGRect& frame, double opacity) override;
 
     static QColor qtColor(const RWColor& color);
 

@@ -1,9 +1,11 @@
 #include "qt/TQQtOutlineView.h"
 
 #include <QApplication>
+#include <QCursor>
 #include <QHeaderView>
 #include <QKeyEvent>
 #include <QLineEdit>
+#include <QMenu>
 #include <QPainter>
 #include <QScrollBar>
 #include <QTimer>
@@ -13,6 +15,7 @@
 
 #include "qt/TQQtCellDrawing.h"
 #include "qt/TQQtEvents.h"
+#include "qt/TQQtMenu.h"
 
 // ---- The item model -----------------------------------------------------------------------
 
@@ -381,6 +384,15 @@ void TQQtOutlineView::outlineDidChangeDrag(RWOutlineView& outline) {
         viewport()->setCursor(Qt::ClosedHandCursor);
     else
         viewport()->unsetCursor();
+}
+
+void TQQtOutlineView::outlinePopUpContextMenu(RWOutlineView&, const RWMenuPtr& menu,
+                                              const CGPoint&) {
+    // The menu opens under the pointer, where the press that asked for it is.
+    QMenu shown(this);
+    TQQtFillMenu(shown, menu,
+                 [](RWMenu& chosen, int64_t index) { chosen.performActionForItemAtIndex(index); });
+    if (!shown.isEmpty()) shown.exec(QCursor::pos());
 }
 
 void TQQtOutlineView::outlineShowAnimationEffect(RWOutlineView& outline,

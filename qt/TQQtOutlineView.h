@@ -90,6 +90,9 @@ public:
     void outlineDidChangeDrag(RWOutlineView&) override;
     void outlineShowAnimationEffect(RWOutlineView&, const CGPoint& pointInWindow) override;
     void outlineDidChangeColumns(RWOutlineView&) override;
+    // A QMenu of the menu, validated as it opens, at the pointer; the chosen item performs
+    // through the menu.
+    void outlinePopUpContextMenu(RWOutlineView&, const RWMenuPtr& menu, const CGPoint&) override;
 
     // The editor's widget ended the edit with a movement.
     void editorFinished(QLineEdit* editor, int64_t movement);

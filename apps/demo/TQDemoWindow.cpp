@@ -1,11 +1,13 @@
 #include "apps/demo/TQDemoWindow.h"
 
+#include <QAbstractEventDispatcher>
 #include <QAction>
 #include <QDir>
 #include <QEvent>
 #include <QFile>
 #include <QFileDialog>
 #include <QFileInfo>
+#include <QGuiApplication>
 #include <QHBoxLayout>
 #include <QKeySequence>
 #include <QLabel>
@@ -20,6 +22,7 @@
 
 #include "apps/demo/TQDemoInspector.h"
 #include "qt/TQQtCurveViewWidget.h"
+#include "qt/TQQtMenu.h"
 #include "qt/TQQtOutlineView.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
@@ -54,6 +57,12 @@ TQDemoWindow::TQDemoWindow() {
     // Registered after the controller (which registers as it is made): the window hears each
     // word once the editor is in step with it.
     _host.addNotificationReceiver(this);
+    // An undo step still open when the loop waits for the next event, with no button held,
+    // was left open; the host closes it (see eventLoopDidGoIdle).
+    connect(QAbstractEventDispatcher::instance(), &QAbstractEventDispatcher::aboutToBlock, this,
+            [this] {
+                if (QGuiApplication::mouseButtons() == Qt::NoButton) _host.eventLoopDidGoIdle();
+            });
     _windowBinding = new TQQtWindowBinding(_editorWindow, this);
     // Filters run last installed first: this one asks before the binding closes the editor.
     installEventFilter(this);
@@ -152,6 +161,10 @@ void TQDemoWindow::setUpController() {
     _channelList->setCurveListController(&_channelListController);
     _channelListController.setMainCurveEditorController(&_controller);
     _channelListController.setOutlineView(_channelList.get());
+    _channelList->tableColumnWithIdentifier(TQCurveEditorListController::kKeyColumn)
+        ->setDataCell(_keyCell);
+    _channelList->tableColumnWithIdentifier(TQCurveEditorListController::kMenuColumn)
+        ->setDataCell(_menuCell);
     _channelListController.awakeFromNib();
     outlets.channels = _channelList.get();
     outlets.channelsList = &_channelListController;
@@ -199,6 +212,10 @@ void TQDemoWindow::buildMenus() {
     _delete->setShortcuts({QKeySequence(QKeySequence::Delete), QKeySequence(Qt::Key_Backspace)});
     connect(_delete, &QAction::triggered, this, [this] { deleteSelection(); });
 
+    QMenu* animation = menuBar()->addMenu(tr("&Animation"));
+    connect(animation, &QMenu::aboutToShow, this,
+            [this, animation] { fillAnimationMenu(*animation); });
+
     QMenu* viewMenu = menuBar()->addMenu(tr("&View"));
     QAction* frame = viewMenu->addAction(tr("&Frame All"));
     frame->setShortcut(QKeySequence(Qt::CTRL | Qt::SHIFT | Qt::Key_F));
@@ -211,6 +228,17 @@ void TQDemoWindow::buildMenus() {
         // The user's choice is the preference from now on, and the document's setting.
         _document.project().editorState().setAutoZoom(_view.autoZoom() != 0);
     });
+}
+
+void TQDemoWindow::fillAnimationMenu(QMenu& menu) {
+    // The cell's menu for the first selected channel at the playhead, as the list's Menu
+    // column opens it.
+    const TQCurveEditorItemPtr first = _controller.selectedChannel();
+    _keyCell->updateChannel(first ? first->channelBase() : nullptr, _host.currentTime());
+    _animationMenu = _keyCell->newMenuUseImages(true);
+    TQQtFillMenu(menu, _animationMenu,
+                 [](RWMenu& chosen, int64_t index) { chosen.performActionForItemAtIndex(index); });
+    if (!_animationMenu) menu.addAction(tr("Select a channel in the list"))->setEnabled(false);
 }
 
 void TQDemoWindow::showEvent(QShowEvent* event) {

@@ -37,6 +37,7 @@
 #include "apps/demo/TQDemoDocument.h"
 #include "host/TQHostAppDelegate.h"
 #include "qt/TQQtEditMenu.h"
+#include "src/channellist/TQCurveEditorAnimStatusCell.h"
 #include "src/channellist/TQCurveEditorChannelList.h"
 #include "src/channellist/TQCurveEditorListController.h"
 
@@ -140,6 +141,8 @@ private:
     void documentReplaced();
     // Saves to the path, or names the failure in an error dialog.
     bool writeDocument(const QString& path);
+    // The Animation menu, built for the selected channels each time it opens.
+    void fillAnimationMenu(QMenu& menu);
 
     // Declared first: everything below refers to it, so it dies last.
     TQHostAppDelegate _host;
@@ -154,6 +157,14 @@ private:
     // After the controller: it hears each word once the editor has.
     TQDemoDocument _document{_host, _controller, _view};
     TQDemoPrompts _prompts;
+    // The cells of the list's "Key" and "Menu" columns; the key cell also builds the
+    // Animation menu of the menu bar.
+    std::shared_ptr<TQCurveEditorAnimStatusCell> _keyCell =
+        std::make_shared<TQCurveEditorAnimStatusCell>(&_controller);
+    std::shared_ptr<TQCurveEditorAnimMenuCell> _menuCell =
+        std::make_shared<TQCurveEditorAnimMenuCell>(&_controller);
+    // The Animation menu's model while it is shown.
+    RWMenuPtr _animationMenu;
 
     // Owned by the window as Qt children.
     QListWidget* _objectList = nullptr;
