@@ -12,6 +12,12 @@ void RWButton::setImageName(const std::string& name) {
     changed();
 }
 
+void RWButton::setKeyEquivalent(const std::string& key) {
+    if (_keyEquivalent == key) return;
+    _keyEquivalent = key;
+    changed();
+}
+
 void RWButton::setState(int32_t state) {
     if (_cell->state() == state) return;
     _cell->setState(state);

@@ -65,10 +65,22 @@ public:
     // Redraws now, before answering, where the host can (the frame is then what a hit test
     // that follows sees); a request otherwise.
     virtual void displayNow() { setNeedsDisplay(); }
+    // Asks for a redraw of a rectangle of the view (points, y up). A host that draws whole
+    // frames anyway redraws everything.
+    virtual void setNeedsDisplayInRect(const CGRect& rect) {
+        (void)rect;
+        setNeedsDisplay();
+    }
     virtual void setCursor(RWCursor cursor) = 0;
     virtual void setCursorHidden(bool hidden) = 0;
     // A point in window coordinates (an event's locationInWindow) in the view's points.
     virtual CGPoint convertPointFromWindow(const CGPoint& pointInWindow) const = 0;
+    // A rectangle of the view's points in screen points (RWWindow.h); nothing while the view
+    // is in no window.
+    virtual std::optional<CGRect> convertRectToScreen(const CGRect& rect) const {
+        (void)rect;
+        return std::nullopt;
+    }
     // Takes the oldest pending event that matches the mask off the queue, or answers none.
     // Lets a handler fold events that are already waiting (the wheel) into one step.
     virtual std::optional<RWEvent> nextEventMatchingMask(RWEventMask mask) = 0;

@@ -43,7 +43,19 @@ void RWTextField::setPlaceholderString(const std::string& text) {
     changed();
 }
 
-std::optional<std::string> RWTextField::userEndEditing(const std::string& text) {
+void RWTextField::selectText() {
+    _allTextSelected = true;
+    changed();
+}
+
+void RWTextField::insertText(const std::string& text) {
+    const std::string typed = _allTextSelected ? text : stringValue() + text;
+    _allTextSelected = false;
+    _cell->setStringValue(typed);
+    changed();
+}
+
+std::optional<std::string> RWTextField::userEndEditing(const std::string& text, bool sendsAction) {
     if (!isEnabled() || !isEditable()) {
         changed();
         return std::string();
@@ -57,7 +69,8 @@ std::optional<std::string> RWTextField::userEndEditing(const std::string& text) 
         }
     }
     _cell->setObjectValue(value);
+    _allTextSelected = false;
     changed();
-    sendAction();
+    if (sendsAction) sendAction();
     return std::nullopt;
 }

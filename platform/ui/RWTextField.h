@@ -58,14 +58,26 @@ public:
     const std::string& placeholderString() const { return _placeholder; }
     void setPlaceholderString(const std::string& text);
 
+    // ---- The text being edited ----
+    // Selects the whole text, so that what is typed next replaces it. Setting a value keeps
+    // the selection as it is.
+    void selectText();
+    bool isAllTextSelected() const { return _allTextSelected; }
+    // Text typed into the field (a key press forwarded to it): it replaces the whole text
+    // when that is selected and is appended otherwise, and the insertion point follows it.
+    // Nothing is sent: the edit has not ended.
+    void insertText(const std::string& text);
+
     // ---- The user ----
     // The user ended an edit with this text. Accepted: the value changes and the action is
-    // sent; answers nothing. Refused (or the field is disabled or not editable): the value
-    // stays and the observers hear of it, so the widget shows the value again; answers why
-    // (the formatter's reason, which may be empty).
-    std::optional<std::string> userEndEditing(const std::string& text);
+    // sent (unless the edit ended without it: a click on a button of the field's window
+    // settles the field first); answers nothing. Refused (or the field is disabled or not
+    // editable): the value stays and the observers hear of it, so the widget shows the value
+    // again; answers why (the formatter's reason, which may be empty).
+    std::optional<std::string> userEndEditing(const std::string& text, bool sendsAction = true);
 
 private:
     RWTextFieldCellPtr _cell;
     std::string _placeholder;
+    bool _allTextSelected = false;
 };

@@ -53,10 +53,17 @@ public:
     double backingScaleFactor() const override { return _scale; }
     bool hasWindow() const override { return _hasWindow; }
     void setNeedsDisplay() override { ++_redrawRequests; }
+    void setNeedsDisplayInRect(const CGRect& rect) override { _redrawRects.push_back(rect); }
     void setCursor(RWCursor cursor) override { _cursors.push_back(cursor); }
     void setCursorHidden(bool hidden) override { _cursorHidden = hidden; }
     // The view fills the window, whose origin is the view's.
     CGPoint convertPointFromWindow(const CGPoint& p) const override { return p - _bounds.origin; }
+    // The window sits at screenOrigin (bottom left), when the view has one.
+    std::optional<CGRect> convertRectToScreen(const CGRect& rect) const override {
+        if (!_hasWindow) return std::nullopt;
+        return CGRectMake(rect.origin.x + _screenOrigin.x, rect.origin.y + _screenOrigin.y,
+                          rect.size.width, rect.size.height);
+    }
     std::optional<RWEvent> nextEventMatchingMask(RWEventMask mask) override {
         for (auto it = _queued.begin(); it != _queued.end(); ++it) {
             if (!it->matchesMask(mask)) continue;
@@ -76,6 +83,8 @@ public:
     void setBounds(const CGRect& bounds) { _bounds = bounds; }
     void setBackingScaleFactor(double scale) { _scale = scale; }
     void setHasWindow(bool has) { _hasWindow = has; }
+    void setScreenOrigin(const CGPoint& origin) { _screenOrigin = origin; }
+    const std::vector<CGRect>& redrawRects() const { return _redrawRects; }
     void queueEvent(const RWEvent& event) { _queued.push_back(event); }
     size_t queuedCount() const { return _queued.size(); }
     int redrawRequests() const { return _redrawRequests; }
@@ -89,7 +98,9 @@ private:
     CGRect _bounds;
     double _scale;
     bool _hasWindow = true;
+    CGPoint _screenOrigin = CGPointZero;
     int _redrawRequests = 0;
+    std::vector<CGRect> _redrawRects;
     bool _cursorHidden = false;
     std::vector<RWCursor> _cursors;
     std::deque<RWEvent> _queued;

@@ -1,0 +1,163 @@
+// The time ruler as a user drives it, the number formatter of the number panels, typing into
+// a field whose text is selected, and which window takes the keys.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "platform/ui/RWButton.h"
+#include "platform/ui/RWDecimalFormatter.h"
+#include "platform/ui/RWTextField.h"
+#include "platform/ui/RWTimeRuler.h"
+#include "platform/ui/RWWindow.h"
+
+namespace {
+
+class Recorder : public RWActionTarget {
+public:
+    bool performAction(const std::string& action, RWActionSender&) override {
+        actions.push_back(action);
+        return true;
+    }
+    std::vector<std::string> actions;
+};
+
+double seconds(const CMTime& t) { return CMTimeGetSeconds(t); }
+
+TEST(RWDecimalFormatter, readsWholeFiniteNumbersAndLetPartsOfThemBeTyped) {
+    const RWDecimalFormatter numbers;
+    const struct {
+        const char* text;
+        std::optional<double> number;
+        bool mayStand;  // as a partial text
+    } cases[] = {
+        {"12", 12.0, true},       {" -0.5 ", -0.5, true},   {"+3", 3.0, true},
+        {".25", 0.25, true},      {"1e-3", 0.001, true},    {"-", std::nullopt, true},
+        {"1e", std::nullopt, true}, {"", std::nullopt, true}, {"1..2", std::nullopt, false},
+        {"1a", std::nullopt, false}, {"1 2", std::nullopt, false},
+        {"1e999", std::nullopt, true},  // beyond the doubles
+        {"nan", std::nullopt, false},
+    };
+    for (const auto& c : cases) {
+        EXPECT_EQ(RWDecimalFormatter::numberFromString(c.text), c.number) << c.text;
+        RWObjectValue value("kept");
+        EXPECT_EQ(numbers.getObjectValue(&value, c.text, nullptr), c.number.has_value()) << c.text;
+        if (c.number) {
+            EXPECT_EQ(value, RWObjectValue(*c.number)) << c.text;
+        } else {
+            EXPECT_EQ(value, RWObjectValue("kept")) << "a refusal leaves the value: " << c.text;
+        }
+        EXPECT_EQ(numbers.isPartialStringValid(c.text, nullptr, nullptr), c.mayStand) << c.text;
+    }
+    EXPECT_EQ(numbers.stringForObjectValue(2.5), "2.5");
+    EXPECT_EQ(numbers.stringForObjectValue("-"), "-") << "typed text shows as typed";
+    EXPECT_EQ(numbers.stringForObjectValue(std::numeric_limits<double>::infinity()), std::nullopt);
+}
+
+TEST(RWTextField, typedKeysReplaceASelectedTextAndFollowAnUnselectedOne) {
+    RWDecimalFormatter numbers;
+    Recorder target;
+    auto field = std::make_shared<RWTextField>();
+    field->setTarget(&target);
+    field->setAction("changed:");
+    field->setEditable(true);
+    field->setFormatter(&numbers);
+    field->setDoubleValue(42.0);
+    field->selectText();
+    field->insertText("-");
+    EXPECT_EQ(field->stringValue(), "-") << "the selected number is replaced";
+    field->insertText("7");
+    EXPECT_EQ(field->doubleValue(), -7.0) << "then the keys follow";
+    EXPECT_TRUE(target.actions.empty()) << "typing is no end of the edit";
+
+    // An edit that ends without its action (a button settles the field first).
+    EXPECT_EQ(field->userEndEditing("8", false), std::nullopt);
+    EXPECT_EQ(field->doubleValue(), 8.0);
+    EXPECT_TRUE(target.actions.empty());
+}
+
+TEST(RWWindow, oneKeyWindowAndAFirstResponderFromItsContent) {
+    RWPanel a;
+    RWPanel b;
+    auto content = std::make_shared<RWView>(CGRectMake(0, 0, 120, 40));
+    auto field = std::make_shared<RWTextField>();
+    content->addSubview(field);
+    a.setContentView(content);
+    EXPECT_EQ(a.frame().size, CGSizeMake(120, 40)) << "the frame takes the content's size";
+    EXPECT_FALSE(a.makeFirstResponder(std::make_shared<RWButton>("elsewhere")));
+    EXPECT_TRUE(a.makeFirstResponder(field));
+    EXPECT_EQ(a.firstResponder(), field);
+
+    a.makeKeyAndOrderFront();
+    EXPECT_TRUE(a.isKeyWindow());
+    b.makeKeyAndOrderFront();
+    EXPECT_TRUE(b.isKeyWindow() && !a.isKeyWindow()) << "one key window at a time";
+    b.close();
+    EXPECT_FALSE(b.isKeyWindow()) << "a hidden window takes no keys";
+
+    a.setFrame(CGRectMake(300, 200, 120, 40));
+    EXPECT_EQ(a.convertRectToScreen(CGRectMake(10, 5, 1, 1)), CGRectMake(310, 205, 1, 1));
+    EXPECT_NE(a.windowNumber(), b.windowNumber());
+}
+
+class RWTimeRulerTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        ruler->setTarget(&target);
+        ruler->setAction("moved:");
+        ruler->setDisplayRange(CMTimeRangeMake(CMTimeMake(-1, 1), CMTimeMake(6, 1)));
+        ruler->setFrameDuration(CMTimeMake(1, 30));
+    }
+    Recorder target;
+    std::shared_ptr<RWTimeRuler> ruler = std::make_shared<RWTimeRuler>();
+};
+
+TEST_F(RWTimeRulerTest, geometry__theRangeAcrossTheWidth) {
+    EXPECT_EQ(ruler->xForTime(CMTimeMake(-1, 1), 600.0), 0.0);
+    EXPECT_EQ(ruler->xForTime(CMTimeMake(2, 1), 600.0), 300.0);
+    EXPECT_NEAR(seconds(ruler->timeForX(450.0, 600.0)), 3.5, 1e-6);
+    // An empty range or width maps everything to the start.
+    EXPECT_EQ(ruler->xForTime(CMTimeMake(2, 1), 0.0), 0.0);
+    ruler->setDisplayRange(CMTimeRangeMake(kCMTimeZero, kCMTimeZero));
+    EXPECT_EQ(seconds(ruler->timeForX(100.0, 600.0)), 0.0);
+}
+
+TEST_F(RWTimeRulerTest, labelTimes__multiplesOfTheStepThinnedToFit) {
+    auto labels = [&](double width, double spacing) {
+        std::vector<double> out;
+        for (const CMTime& t : ruler->labelTimes(width, spacing)) out.push_back(seconds(t));
+        return out;
+    };
+    EXPECT_EQ(labels(600.0, 50.0), (std::vector<double>{-1, 0, 1, 2, 3, 4, 5}));
+    // 100 points a second: labels 120 apart need every second second.
+    EXPECT_EQ(labels(600.0, 120.0), (std::vector<double>{0, 2, 4}));
+    EXPECT_EQ(labels(600.0, 250.0), (std::vector<double>{0, 5})) << "then five";
+    ruler->setLabelStep(kCMTimeZero);
+    EXPECT_TRUE(labels(600.0, 50.0).empty()) << "a zero step gives no labels";
+    ruler->setLabelStep(CMTimeMake(1, 1000000));
+    EXPECT_LE(labels(600.0, 0.0).size(), 601u) << "a tiny step is thinned to a label a point";
+}
+
+TEST_F(RWTimeRulerTest, userGestures__putThePlayheadOnAFrameInsideTheRange) {
+    ruler->userPress(301.0, 600.0);  // 2.01 s: in frame 60
+    EXPECT_TRUE(ruler->isTracking());
+    EXPECT_EQ(ruler->currentTime(), CMTimeMake(2, 1));
+    ruler->userDrag(301.5, 600.0);  // the same frame: no action
+    ruler->userDrag(-40.0, 600.0);
+    EXPECT_EQ(ruler->currentTime(), CMTimeMake(-1, 1)) << "not before the range";
+    ruler->userDrag(900.0, 600.0);
+    EXPECT_EQ(ruler->currentTime(), CMTimeMake(149, 30)) << "the last frame of the range";
+    ruler->userRelease();
+    EXPECT_FALSE(ruler->isTracking());
+    ruler->userDrag(100.0, 600.0);
+    EXPECT_EQ(target.actions.size(), 3u) << "press and two moves; nothing after the release";
+
+    ruler->setEnabled(false);
+    ruler->userPress(100.0, 600.0);
+    EXPECT_EQ(target.actions.size(), 3u);
+}
+
+}  // namespace
