@@ -241,6 +241,18 @@ public:
     void menuCut(RWActionSender* sender = nullptr) { cut(sender); }
     void menuPaste(RWActionSender* sender = nullptr) { paste(sender); }
 
+    // ---- Time moves of selected keypoints (TQCurveEditorCtrlTimeMoves.cpp) ----
+    //
+    // The caller holds the edit bracket. Both are plainer than a drag: keypoints move by
+    // handle in list order, each put on the frame grid by itself (so spacing may change), with
+    // no clamp at time 0 and no linked edit.
+
+    // Each keypoint entry's channel time plus the delta, on the frame grid.
+    void moveSelectedInTime(TQCurveSelectionList* list, CMTime by);
+    // The same by the delta that takes the earliest keypoint (axis time) to the target;
+    // nothing when no entry is a keypoint or the delta is zero.
+    void moveSelectedInTimeTo(TQCurveSelectionList* list, CMTime to);
+
     // ---- Curve sets: the automatic sets ----
 
     // Animated, Modified, All and Active, each with its localised name and the delegate.

@@ -497,6 +497,10 @@ void TQCurveEditorViewBase::setNeedsDisplay(char needs) {
     if (needs && _viewHost) _viewHost->setNeedsDisplay();
 }
 
+void TQCurveEditorViewBase::setNeedsDisplayInRect(const CGRect& rect) {
+    if (_viewHost) _viewHost->setNeedsDisplayInRect(rect);
+}
+
 void TQCurveEditorViewBase::setOriginalCurveDirty(TQCurveEditorItem* item, char enable) {
     if (auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item))
         channelItem->setOriginalCurveDirty(enable);

@@ -392,6 +392,8 @@ public:
 
     // Asks the host for a redraw when the flag is set.
     virtual void setNeedsDisplay(char needs);
+    // Asks the host to redraw a rectangle of the view (points).
+    virtual void setNeedsDisplayInRect(const CGRect& rect);
     void setOriginalCurveDirty(TQCurveEditorItem* item, char enable);
     void setProcessedCurveDirty(TQCurveEditorItem* item, char enable);
     // Every item with a channel that the host reports as modified.
