@@ -5,8 +5,10 @@
 #include "qt/TQQtImages.h"
 
 TQQtButton::TQQtButton(QWidget* parent) : QPushButton(parent) {
+    setAutoDefault(false);
     connect(this, &QPushButton::clicked, this, [this] {
-        if (model()) model()->userClick();
+        if (_gate && !_gate()) return;
+        if (const std::shared_ptr<RWButton> held = model()) held->userClick();
         syncFromModel();  // a click the model refused shows its state again
     });
 }

@@ -9,6 +9,7 @@
 
 #include <cmath>
 
+#include "qt/TQQtPanelDialog.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
 
 namespace {
@@ -44,12 +45,14 @@ void TQQtModalService::registerDialog(const std::string& windowTitle, DialogFact
 }
 
 RWModalResponse TQQtModalService::runModalForWindow(RWWindow& window) {
-    const auto found = _factories.find(window.title());
-    if (found == _factories.end()) return RWModalResponseAbort;
-    std::unique_ptr<QDialog> dialog = found->second(window);
+    std::unique_ptr<QDialog> dialog;
+    if (const auto found = _factories.find(window.title()); found != _factories.end())
+        dialog = found->second(window);
+    if (!dialog && TQQtPanelDialog::canShow(window))
+        dialog = std::make_unique<TQQtPanelDialog>(window, QApplication::activeWindow());
     if (!dialog) return RWModalResponseAbort;
     dialog->setModal(true);
-    _runs.emplace_back(dialog.get());
+    _runs.push_back(Run{dialog.get(), false});
     const int result = dialog->exec();
     _runs.pop_back();
     return result;
@@ -57,8 +60,10 @@ RWModalResponse TQQtModalService::runModalForWindow(RWWindow& window) {
 
 void TQQtModalService::stopModalWithCode(RWModalResponse code) {
     // Dialogs deleted behind the service's back leave null entries: skip to a live run.
-    while (!_runs.empty() && !_runs.back()) _runs.pop_back();
-    if (!_runs.empty()) _runs.back()->done(dialogCode(code));
+    while (!_runs.empty() && !_runs.back().dialog) _runs.pop_back();
+    if (_runs.empty() || _runs.back().stopped) return;
+    _runs.back().stopped = true;
+    _runs.back().dialog->done(dialogCode(code));
 }
 
 std::unique_ptr<QDialog> TQQtModalService::makeValueDialog(RWWindow& window) {

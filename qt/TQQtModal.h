@@ -4,8 +4,12 @@
 // dialog ends (OK 1, Cancel 0) or when someone calls stopModal, stopModalWithCode or
 // abortModal during the run. Runs nest; the stop calls end the innermost one.
 //
-// A window whose title has no dialog registered is not shown: the run answers
+// A window whose title has no dialog registered is shown as a TQQtPanelDialog when it has
+// laid-out content (the framework's number panels); otherwise it is not shown: the run answers
 // RWModalResponseAbort at once, as a run that nothing could show.
+//
+// The first stop of a run decides its answer: a later one (a field that ends its edit as the
+// dialog goes away after Cancel) changes nothing.
 //
 // Built in: "TQCurveEditorValueView", the number panel of a keypoint's value
 // (TQCurveEditorValueWindow), placed at the point the window names in the active window.
@@ -46,14 +50,18 @@ public:
     void abortModal() override { stopModalWithCode(RWModalResponseAbort); }
 
     // The dialog of the innermost run, or null.
-    QDialog* activeDialog() const { return _runs.empty() ? nullptr : _runs.back().data(); }
+    QDialog* activeDialog() const { return _runs.empty() ? nullptr : _runs.back().dialog.data(); }
 
     // The value panel: a line that takes a number, OK and Cancel.
     static std::unique_ptr<QDialog> makeValueDialog(RWWindow& window);
 
 private:
     std::map<std::string, DialogFactory> _factories;
-    std::vector<QPointer<QDialog>> _runs;
+    struct Run {
+        QPointer<QDialog> dialog;
+        bool stopped = false;
+    };
+    std::vector<Run> _runs;
     bool _installed = false;
     RWModalService* _previous = nullptr;
 };

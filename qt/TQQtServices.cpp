@@ -8,9 +8,11 @@
 #include <QtMath>
 
 #include <chrono>
+#include <cmath>
 #include <optional>
 
 #include "qt/TQQtImages.h"
+#include "qt/TQQtScreen.h"
 #include "src/resources/BNImage.h"
 
 // ---- Clock --------------------------------------------------------------------------------
@@ -62,6 +64,18 @@ void TQQtViewHost::displayNow() {
         _widget->repaint();
     else
         setNeedsDisplay();
+}
+
+std::optional<CGRect> TQQtViewHost::convertRectToScreen(const CGRect& rect) const {
+    if (!hasWindow()) return std::nullopt;
+    // View points have y up from the widget's bottom edge.
+    const QPoint topLeft = _widget->mapToGlobal(QPoint(0, 0));
+    const double top = _widget->height() - (rect.origin.y + rect.size.height);
+    const QRect global(static_cast<int>(std::lround(topLeft.x() + rect.origin.x)),
+                       static_cast<int>(std::lround(topLeft.y() + top)),
+                       static_cast<int>(std::lround(rect.size.width)),
+                       static_cast<int>(std::lround(rect.size.height)));
+    return TQQtScreenRectOfGlobalRect(global);
 }
 
 Qt::CursorShape TQQtViewHost::cursorShape(RWCursor cursor) {

@@ -64,6 +64,9 @@ public:
     void setCursor(RWCursor cursor) override;
     void setCursorHidden(bool hidden) override;
     CGPoint convertPointFromWindow(const CGPoint& pointInWindow) const override;
+    std::optional<CGRect> convertRectToScreen(const CGRect& rect) const override;
+    // The widget's frame is one image: any rectangle redraws the whole.
+    void setNeedsDisplayInRect(const CGRect&) override { setNeedsDisplay(); }
     std::optional<RWEvent> nextEventMatchingMask(RWEventMask mask) override;
     void addTrackingArea(const RWTrackingAreaPtr& area) override;
     void removeTrackingArea(const RWTrackingArea& area) override;

@@ -36,11 +36,22 @@ void TQQtTextField::syncFromModel() {
     }
     const QString text = m ? QString::fromStdString(m->stringValue()) : QString();
     if (this->text() != text) setText(text);
+    if (m && m->isAllTextSelected()) selectAll();
     setPlaceholderText(m ? QString::fromStdString(m->placeholderString()) : QString());
 }
 
 void TQQtTextField::endEditing() {
     if (const std::shared_ptr<RWTextField> m = model()) m->userEndEditing(text().toStdString());
+}
+
+bool TQQtTextField::commitEditing() {
+    const std::shared_ptr<RWTextField> m = model();
+    if (!m) return true;
+    if (!hasAcceptableInput()) {
+        syncFromModel();
+        return false;
+    }
+    return !m->userEndEditing(text().toStdString(), false).has_value();
 }
 
 void TQQtTextField::focusOutEvent(QFocusEvent* event) {

@@ -4,7 +4,7 @@
 // formatter would refuse while it is typed cannot be typed, and only text it accepts ends an
 // edit. An ended edit (Return, or leaving the field) is the model's userEndEditing; text the
 // model refuses, or a field left with text that is not acceptable, shows the model's value
-// again.
+// again. While the model has its whole text selected, so has the line.
 
 #include <QLineEdit>
 #include <QValidator>
@@ -30,6 +30,11 @@ private:
 class TQQtTextField final : public QLineEdit, public TQQtControlBinding<RWTextField> {
 public:
     explicit TQQtTextField(QWidget* parent = nullptr);
+
+    // Ends the edit in progress with the line's text, without the model's action: false when
+    // the text is not acceptable or the model refuses it (the line then shows the model's
+    // value again).
+    bool commitEditing();
 
 protected:
     void syncFromModel() override;

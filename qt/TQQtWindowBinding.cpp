@@ -2,11 +2,14 @@
 
 #include <QCloseEvent>
 
+#include "qt/TQQtScreen.h"
+
 TQQtWindowBinding::TQQtWindowBinding(RWWindow& window, QWidget* widget)
     : QObject(widget), _window(window), _widget(widget) {
     // The model starts from what the widget shows.
     if (_widget) {
         _window.setIsVisible(_widget->isVisible());
+        takeFrameFromWidget();
         _widget->installEventFilter(this);
     }
     _window.addObserver(this);
@@ -23,7 +26,17 @@ void TQQtWindowBinding::windowDidChange(RWWindow& window) {
         _widget->setVisible(window.isVisible());
 }
 
+void TQQtWindowBinding::takeFrameFromWidget() {
+    if (!_widget || !_widget->isVisible()) return;
+    const QRect global(_widget->mapToGlobal(QPoint(0, 0)), _widget->size());
+    const CGRect frame = TQQtScreenRectOfGlobalRect(global);
+    if (!(frame == _window.frame())) _window.setFrame(frame);
+}
+
 bool TQQtWindowBinding::eventFilter(QObject* watched, QEvent* event) {
+    if (watched == _widget && (event->type() == QEvent::Move || event->type() == QEvent::Resize ||
+                               event->type() == QEvent::Show))
+        takeFrameFromWidget();
     // Shown or hidden by Qt (the application shows its main window): the model follows.
     if (watched == _widget && (event->type() == QEvent::Show || event->type() == QEvent::Hide) &&
         !_closing)
