@@ -1,5 +1,11 @@
 #include "host/TQHostAppDelegate.h"
 
+#include <algorithm>
+#include <cmath>
+
+#include "platform/ui/RWExtendedTimecode.h"
+#include "platform/ui/RWTimecodeFormatter.h"
+
 TQHostAppDelegate::TQHostAppDelegate(TQHostObjectFamily family)
     : _scene(family),
       _sceneRoot(&_scene.root()),
@@ -67,7 +73,9 @@ bool TQHostAppDelegate::setFrameDuration(const CMTime& duration) {
 }
 
 bool TQHostAppDelegate::setDisplayRange(const CMTimeRange& range) {
-    if (!_clock.setPlayRange(range)) return false;
+    // The clock's test of a range, without making it the play range.
+    TQHostPlaybackClock probe;
+    if (!probe.setPlayRange(range)) return false;
     _displayRange = range;
     _notifications.post(kTQNotifyPlayRangeChanged);
     return true;
@@ -87,6 +95,55 @@ void TQHostAppDelegate::tick(const CMTime& elapsed) {
     if (!_clock.tick(elapsed)) return;
     syncObjectTimes();
     _notifications.post(kTQNotifyHostTimeChanged);
+}
+
+bool TQHostAppDelegate::movePlayhead(const CMTime& time) {
+    const CMTime before = _clock.currentTime();
+    if (!_clock.setCurrentTime(time)) return false;
+    syncObjectTimes();
+    if (CMTimeCompare(before, time) != 0) _notifications.post(kTQNotifyHostTimeChanged);
+    return true;
+}
+
+int64_t TQHostAppDelegate::frameIndexOf(const CMTime& time) const {
+    const double frames = CMTimeGetSeconds(time) / CMTimeGetSeconds(_frameDuration);
+    if (!std::isfinite(frames)) return 0;
+    // The clock's timescale cannot hold every frame start exactly (1/30 s is 8738.13 of its
+    // ticks): a time within a hair of a frame's start is that frame.
+    const double nearest = std::round(frames);
+    return static_cast<int64_t>(std::fabs(frames - nearest) < 1e-4 ? nearest : std::floor(frames));
+}
+
+bool TQHostAppDelegate::stepFrames(int64_t frames) {
+    const CMTimeRange range = _clock.playRange();
+    const int64_t first = frameIndexOf(range.start);
+    // The last frame that starts inside the range.
+    const int64_t last = std::max(first, frameIndexOf(CMTimeRangeGetEnd(range)) - 1);
+    const int64_t target = std::clamp(frameIndexOf(_clock.currentTime()) + frames, first, last);
+    return movePlayhead(_frameDuration * static_cast<double>(target));
+}
+
+bool TQHostAppDelegate::goToStart() { return movePlayhead(_clock.playRange().start); }
+
+bool TQHostAppDelegate::goToEnd() {
+    const CMTimeRange range = _clock.playRange();
+    const int64_t last =
+        std::max(frameIndexOf(range.start), frameIndexOf(CMTimeRangeGetEnd(range)) - 1);
+    return movePlayhead(_frameDuration * static_cast<double>(last));
+}
+
+std::string TQHostAppDelegate::timeText(const CMTime& time) const {
+    if (!CMTIME_IS_NUMERIC(time)) return std::string();
+    const int64_t frame = frameIndexOf(time);
+    if (_displayTimeAsFrames)
+        return std::to_string(frame + static_cast<int64_t>(_firstFrameNumber));
+    RWTimecodeFormatter formatter;
+    formatter.setAllowsNegative(true);
+    formatter.setFrameDuration(_frameDuration);
+    return formatter
+        .stringForTimecode(RWExtendedTimecode::withFrameNumber(
+            frame + static_cast<int64_t>(_startTimecode), _frameDuration, false))
+        .value_or(std::string());
 }
 
 void TQHostAppDelegate::syncObjectTimes() {

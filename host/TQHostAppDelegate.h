@@ -13,12 +13,14 @@
 //   kTQNotifySceneChanged            objects were added to or removed from the scene
 //   kTQNotifySceneReset              the scene was emptied or its object family changed
 //   kTQNotifyPlayRangeChanged        the display range changed
+//   kTQNotifyHostTimeChanged         also: the transport or the ruler moved the playhead
 //   kTQNotifyChannelsChanged         an undo or redo restored channels
 // Setting the playhead through setCurrentTime posts nothing: the framework, which calls it,
 // posts kTQNotifyTimeChanged itself.
 
 #include <cstddef>
 #include <cstdint>
+#include <string>
 
 #include "host/TQHostChangeTracker.h"
 #include "host/TQHostNotificationCenter.h"
@@ -59,8 +61,14 @@ public:
     // --- Time ---
     // A frame duration that is not a positive numeric time is refused.
     bool setFrameDuration(const CMTime& duration);
-    // Also the range that playback loops in. Refused as TQHostPlaybackClock refuses it.
+    // The range the editor shows (its zoom and pan change it). Refused as
+    // TQHostPlaybackClock refuses a play range. Posts kTQNotifyPlayRangeChanged.
     bool setDisplayRange(const CMTimeRange& range);
+    // The range that playback loops in, and that the transport's start and end are: the
+    // document's length, whatever part of it the editor shows. Refused as the clock refuses
+    // it; the playhead is not moved.
+    bool setPlayRange(const CMTimeRange& range) { return _clock.setPlayRange(range); }
+    CMTimeRange playRange() const { return _clock.playRange(); }
     void setFirstFrameNumber(uint32_t frame) { _firstFrameNumber = frame; }
     void setStartTimecode(uint32_t frames) { _startTimecode = frames; }
     // Refused when not a positive numeric time: a drawn timeline divides by it.
@@ -73,6 +81,18 @@ public:
     void stop() { _clock.stop(); }
     // Advances playback; posts kTQNotifyHostTimeChanged when the playhead moved.
     void tick(const CMTime& elapsed);
+    // The host's own moves of the playhead (a transport, a ruler): each posts
+    // kTQNotifyHostTimeChanged when the playhead moved. A non-numeric time is refused.
+    bool movePlayhead(const CMTime& time);
+    // By whole frames (negative: back) from the frame the playhead is in, kept within the
+    // play range: the first frame of the range at least, its last frame at most.
+    bool stepFrames(int64_t frames);
+    // The first frame of the play range, and its last.
+    bool goToStart();
+    bool goToEnd();
+    // A time as this host shows times: the frame number counted from firstFrameNumber, or
+    // the timecode counted from startTimecode, as shouldDisplayTimeAsFrames says.
+    std::string timeText(const CMTime& time) const;
     size_t abortCount() const { return _abortCount; }
     bool isEventCoalescingSuppressed() const { return _coalescingSuppressed > 0; }
 
@@ -173,6 +193,8 @@ private:
     void channelWillChange(TQChannelBase& channel) override;
     // Object roots keep the scene's current time for their own lookups.
     void syncObjectTimes();
+    // The frame a time is in, on the frame grid from time 0.
+    int64_t frameIndexOf(const CMTime& time) const;
 
     TQHostScene _scene;
     TQChannelBase* _sceneRoot;  // cached: sceneChannelRoot is called constantly

@@ -54,7 +54,7 @@ size_t TQHostDenseKeyframesOfChannel(const TQHostDenseSceneSpec& spec, size_t in
 // Appends the objects ("Dense 1", "Dense 2", ...) to the scene.
 void TQHostPopulateDenseScene(TQHostScene& scene, const TQHostDenseSceneSpec& spec);
 
-// Replaces the host's scene by the dense scene in the given family: display range 0 to
+// Replaces the host's scene by the dense scene in the given family: display and play range 0 to
 // `seconds`, frame duration 1/30 s, playhead at 0, the first object selected; undo history and
 // modified set start empty, and kTQNotifySceneChanged is posted.
 void TQHostLoadDenseScene(TQHostAppDelegate& host, TQHostObjectFamily family,

@@ -26,6 +26,7 @@ void TQHostProject::newDocument(TQHostObjectFamily family) {
     _host.resetScene(family);
     _host.setFrameDuration(CMTimeMake(1, 30));
     _host.setDisplayRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(10, 1)));
+    _host.setPlayRange(_host.displayRange());
     _host.setFirstFrameNumber(0);
     _host.setStartTimecode(0);
     _host.setSecondsPerTextStep(CMTimeMake(1, 1));
@@ -96,6 +97,7 @@ std::optional<BNSerializerError> TQHostProject::commit(std::optional<BNSerialize
     for (auto& object : loaded->objects) host.scene().adoptObject(std::move(object));
     host.setFrameDuration(loaded->frameDuration);
     host.setDisplayRange(loaded->displayRange);
+    host.setPlayRange(loaded->displayRange);
     host.setFirstFrameNumber(loaded->firstFrameNumber);
     host.setStartTimecode(loaded->startTimecode);
     host.setSecondsPerTextStep(loaded->secondsPerTextStep);

@@ -40,7 +40,7 @@ inline constexpr int kTQHostSampleFrames = 6 * kTQHostSampleFramesPerSecond;
 // Appends the four objects of the piece, in the order above, to the scene.
 void TQHostPopulateSampleScene(TQHostScene& scene);
 
-// Replaces the host's scene by the piece in the given family: display range 0-6 s, frame
+// Replaces the host's scene by the piece in the given family: display and play range 0-6 s, frame
 // duration 1/30 s, playhead at 0, the title selected; undo history and modified set start
 // empty, and kTQNotifySceneChanged is posted.
 void TQHostLoadSampleScene(TQHostAppDelegate& host, TQHostObjectFamily family);

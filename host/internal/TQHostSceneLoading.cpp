@@ -8,6 +8,7 @@ void TQHostLoadBuiltScene(TQHostAppDelegate& host, TQHostObjectFamily family,
     host.resetScene(family);
     host.setFrameDuration(frameDuration);
     host.setDisplayRange(displayRange);
+    host.setPlayRange(displayRange);
     populate(host.scene());
     host.setCurrentTime(kCMTimeZero);
     if (!host.scene().objects().empty()) host.selectObject(host.scene().objects().front());

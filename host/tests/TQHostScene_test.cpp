@@ -193,4 +193,41 @@ TEST_F(HostDelegate, selectionAndTime__answerAndPostTheHostWords) {
     host.removeNotificationReceiver(&words);
 }
 
+TEST_F(HostDelegate, transport__movesOnFramesInsideThePlayRangeAndTellsTheTime) {
+    struct Words : TQNotificationReceiver {
+        std::vector<TQNotificationWord> seen;
+        void notify(TQNotificationWord word) override { seen.push_back(word); }
+    } words;
+    host.addNotificationReceiver(&words);
+    // The editor's range is a zoom into the piece; playback keeps to the piece.
+    ASSERT_TRUE(host.setPlayRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(2, 1))));
+    ASSERT_TRUE(host.setDisplayRange(CMTimeRangeMake(CMTimeMake(1, 2), CMTimeMake(1, 2))));
+    EXPECT_EQ(CMTimeGetSeconds(host.playRange().duration), 2.0);
+    words.seen.clear();
+
+    // 1/30 s cannot be held by the clock's timescale: the playhead is in frame 1 all the same.
+    host.setCurrentTime(TQTarnTimeForChannelSeconds(1.0 / 30.0, TQHostPlaybackClock::kTimescale));
+    EXPECT_TRUE(host.stepFrames(1));
+    EXPECT_EQ(host.currentTime(), CMTimeMake(2, 30));
+    EXPECT_TRUE(host.stepFrames(-100));
+    EXPECT_EQ(host.currentTime(), kCMTimeZero) << "not before the play range";
+    EXPECT_TRUE(host.goToEnd());
+    EXPECT_EQ(host.currentTime(), CMTimeMake(59, 30)) << "the last frame of the play range";
+    EXPECT_TRUE(host.stepFrames(1));
+    EXPECT_TRUE(host.goToStart());
+    EXPECT_EQ(words.seen, (std::vector<TQNotificationWord>(4, kTQNotifyHostTimeChanged)))
+        << "a word for each move but the step past the end";
+    EXPECT_FALSE(host.movePlayhead(kCMTimeInvalid));
+
+    const CMTime frame12 = CMTimeMake(12, 30);
+    EXPECT_EQ(host.timeText(frame12), "00:00:00:12");
+    host.setStartTimecode(30 * 3600);
+    EXPECT_EQ(host.timeText(frame12), "01:00:00:12");
+    host.setDisplayTimeAsFrames(true);
+    host.setFirstFrameNumber(1);
+    EXPECT_EQ(host.timeText(frame12), "13");
+    EXPECT_EQ(host.timeText(kCMTimeInvalid), "");
+    host.removeNotificationReceiver(&words);
+}
+
 }  // namespace
