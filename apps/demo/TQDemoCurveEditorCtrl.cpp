@@ -1,6 +1,7 @@
 #include "apps/demo/TQDemoCurveEditorCtrl.h"
 
 #include "src/editor/TQCurveEditorView.h"
+#include "src/panels/TQTimingMoveController.h"
 
 namespace {
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTQCurveEditorTimescale); }
@@ -43,4 +44,10 @@ bool TQDemoCurveEditorCtrl::redo() {
     const bool done = _host.redo();
     if (done) restored();
     return done;
+}
+
+bool TQDemoCurveEditorCtrl::runValuePanel(TQCurveEditorValueWindow& window) {
+    const RWWindow* parent = window.parentWindow ? window.parentWindow : _editorWindow;
+    return TQCurveEditorValueController::openWithLocationValueInWindow(
+        window.location, &window.value, parent, window.parentRect);
 }

@@ -2,7 +2,8 @@
 // The demo's controller: the full editor's controller, with what a host adds to it. The
 // horizontal zoom and pan of the view become the host's display range, which comes back to
 // the view; an undo or redo of the host's history, which restores channels wholesale, is
-// followed by the word that every cached curve is stale.
+// followed by the word that every cached curve is stale. A keypoint's value is typed into the
+// framework's value panel.
 //
 // Lifetime: the host is not owned and must outlive the controller; the controller hears the
 // host's words from construction until it dies. Two-phase like its base: construct, then
@@ -24,10 +25,19 @@ public:
     bool undo();
     bool redo();
 
+    // The window the value panel of a double-clicked keypoint is placed in; not owned.
+    void setEditorWindow(RWWindow* window) { _editorWindow = window; }
+
+protected:
+    // The value panel of the framework (TQCurveEditorValueController), at the click, kept
+    // inside the curves.
+    bool runValuePanel(TQCurveEditorValueWindow& window) override;
+
 private:
     void applyDisplayRange(const CMTimeRange& range);
     // After a restore: the selection's handles again, and every curve sampled again.
     void restored();
 
     TQHostAppDelegate& _host;
+    RWWindow* _editorWindow = nullptr;
 };

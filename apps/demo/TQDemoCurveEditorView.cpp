@@ -9,6 +9,18 @@ struct BoxState {
 
 }  // namespace
 
+void TQDemoCurveEditorView::drawOverlays(const CGRect& bounds) {
+    const double scale = windowBackingScale();
+    const CGPoint bottom = getPointWorld(bounds.origin);
+    const CGPoint top = getPointWorld(CGPointMake(bounds.origin.x + bounds.size.width * scale,
+                                                  bounds.origin.y + bounds.size.height * scale));
+    const auto x = static_cast<float>(CMTimeGetSeconds(getCurveEditorCurrentTime()));
+    _primitives.push_back(HXDLine::lineFromStart(
+        {x, static_cast<float>(bottom.y), 0.0f}, {x, static_cast<float>(top.y), 0.0f},
+        thinLineWidth() * 2.0f, drawingColor(kPlayheadColor), false));
+    TQCurveEditorView::drawOverlays(bounds);
+}
+
 void TQDemoCurveEditorView::registerBoxUndo(TQHostAppDelegate& host) {
     host.registerUndoClient(undoObject(), this);
 }

@@ -8,6 +8,7 @@
 #include <QFileDialog>
 #include <QFileInfo>
 #include <QGuiApplication>
+#include <QGridLayout>
 #include <QHBoxLayout>
 #include <QKeySequence>
 #include <QLabel>
@@ -21,13 +22,17 @@
 #include <QToolBar>
 
 #include "apps/demo/TQDemoInspector.h"
+#include "apps/demo/TQDemoScenePreview.h"
+#include "apps/demo/TQDemoTransport.h"
 #include "qt/TQQtCurveViewWidget.h"
 #include "qt/TQQtMenu.h"
 #include "qt/TQQtOutlineView.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
+#include "qt/TQQtTimeRuler.h"
 #include "qt/TQQtWindowBinding.h"
 #include "qt/TQQtZoomScroller.h"
+#include "src/panels/TQTimingMoveController.h"
 
 namespace {
 
@@ -47,6 +52,8 @@ std::string fileSystemPath(const QString& path) { return QFile::encodeName(path)
 
 TQDemoWindow::TQDemoWindow() {
     installDefaultPrompts();
+    // Before the widgets: the ruler and the bar are bound to its models.
+    _transport = new TQDemoTransport(_host, this);
     buildWidgets();
     buildMenus();
     _document.loadSample();
@@ -66,6 +73,7 @@ TQDemoWindow::TQDemoWindow() {
     _windowBinding = new TQQtWindowBinding(_editorWindow, this);
     // Filters run last installed first: this one asks before the binding closes the editor.
     installEventFilter(this);
+    _controller.setEditorWindow(&_editorWindow);
     refreshObjectList();
     refreshTitle();
     _editMenu->refresh();
@@ -74,7 +82,7 @@ TQDemoWindow::TQDemoWindow() {
     statusBar()->showMessage(
         tr("Pick objects on the left and a curve set above. Click or band keypoints and drag "
            "them (Shift: one axis); the box tool puts a box around a band. Ctrl+Z undoes."));
-    resize(1100, 620);
+    resize(1280, 720);
     _curveWidget->setFocus();
 }
 
@@ -88,6 +96,8 @@ TQDemoWindow::~TQDemoWindow() {
     _view.unregisterBoxUndo(_host);
     QObject::disconnect(_objectList, nullptr, this, nullptr);
     delete _windowBinding;
+    _controller.setEditorWindow(nullptr);
+    _transport->pause();
     _curveWidget->setView(nullptr);
     _channelListView->setOutline(nullptr);
     _scroller->setModel(nullptr);
@@ -106,21 +116,33 @@ void TQDemoWindow::buildWidgets() {
     _channelListView = new TQQtOutlineView(splitter);
     _channelListView->setMinimumWidth(220);
     auto* editor = new QWidget(splitter);
-    auto* editorLayout = new QHBoxLayout(editor);
+    // The ruler over the curves only, so that both map time to the same x.
+    auto* editorLayout = new QGridLayout(editor);
     editorLayout->setContentsMargins(0, 0, 0, 0);
     editorLayout->setSpacing(0);
+    _timeRuler = _transport->makeRuler(editor);
     _curveWidget = new TQQtCurveViewWidget(editor);
     _curveWidget->setMinimumSize(320, 200);
     _scroller = new TQQtZoomScroller(editor);
-    editorLayout->addWidget(_curveWidget, 1);
-    editorLayout->addWidget(_scroller);
-    splitter->addWidget(_objectList);
+    editorLayout->addWidget(_timeRuler, 0, 0);
+    editorLayout->addWidget(_curveWidget, 1, 0);
+    editorLayout->addWidget(_scroller, 1, 1);
+    editorLayout->setRowStretch(1, 1);
+    editorLayout->setColumnStretch(0, 1);
+    // The scene at the playhead, under the object list.
+    auto* side = new QSplitter(Qt::Vertical, splitter);
+    side->addWidget(_objectList);
+    _scenePreview = new TQDemoScenePreview(_host, side);
+    side->addWidget(_scenePreview);
+    side->setStretchFactor(0, 1);
+    side->setStretchFactor(1, 0);
+    splitter->insertWidget(0, side);
     splitter->addWidget(_channelListView);
     splitter->addWidget(editor);
     splitter->setStretchFactor(0, 0);
     splitter->setStretchFactor(1, 0);
     splitter->setStretchFactor(2, 1);
-    splitter->setSizes({140, 320, 740});
+    splitter->setSizes({220, 300, 760});
     setCentralWidget(splitter);
     connect(_objectList, &QListWidget::itemSelectionChanged, this, [this] { objectsChosen(); });
 
@@ -133,6 +155,10 @@ void TQDemoWindow::buildWidgets() {
     _curveSetPopUp = new TQQtPopUpButton(bar);
     _curveSetPopUp->setMinimumWidth(150);
     bar->addWidget(_curveSetPopUp);
+
+    QToolBar* transport = addToolBar(tr("Transport"));
+    transport->setMovable(false);
+    _transport->makeToolBarWidgets(transport);
 
     _curveWidget->setView(&_view);
 }
@@ -228,6 +254,41 @@ void TQDemoWindow::buildMenus() {
         // The user's choice is the preference from now on, and the document's setting.
         _document.project().editorState().setAutoZoom(_view.autoZoom() != 0);
     });
+    buildTimeMenu();
+}
+
+void TQDemoWindow::buildTimeMenu() {
+    QMenu* time = menuBar()->addMenu(tr("&Time"));
+    auto add = [&](const QString& title, const QKeySequence& keys, auto&& run) {
+        QAction* action = time->addAction(title);
+        action->setShortcut(keys);
+        connect(action, &QAction::triggered, this, run);
+        return action;
+    };
+    add(tr("&Play / Pause"), QKeySequence(Qt::CTRL | Qt::Key_P),
+        [this] { _transport->togglePlayback(); });
+    add(tr("Pre&vious Frame"), QKeySequence(Qt::Key_Comma), [this] { _transport->stepFrames(-1); });
+    add(tr("&Next Frame"), QKeySequence(Qt::Key_Period), [this] { _transport->stepFrames(1); });
+    add(tr("Go to &Start"), QKeySequence(Qt::Key_Home), [this] { _transport->goToStart(); });
+    add(tr("Go to &End"), QKeySequence(Qt::Key_End), [this] { _transport->goToEnd(); });
+    time->addSeparator();
+    add(tr("Move Keypoints &By Frames..."), QKeySequence(Qt::CTRL | Qt::Key_T),
+        [this] { moveSelectedKeypointsInTime(true); });
+    add(tr("Move Keypoints &To Frame..."), QKeySequence(Qt::CTRL | Qt::SHIFT | Qt::Key_T),
+        [this] { moveSelectedKeypointsInTime(false); });
+}
+
+void TQDemoWindow::moveSelectedKeypointsInTime(bool isDelta) {
+    if (!_view.hasSelectedKeypoint()) {
+        statusBar()->showMessage(tr("Select keypoints to move first."), 4000);
+        return;
+    }
+    double frames = 0.0;
+    bool delta = isDelta;
+    if (!TQTimingMoveController::openWithEvent(nullptr, _view.timingMoveParentRect(), &frames,
+                                               &delta))
+        return;
+    _view.moveSelectedKeypointsInTime(frames, isDelta);
 }
 
 void TQDemoWindow::fillAnimationMenu(QMenu& menu) {
@@ -263,6 +324,12 @@ bool TQDemoWindow::eventFilter(QObject* watched, QEvent* event) {
 
 void TQDemoWindow::frameAll(bool includeTime) {
     _view.frameAll(includeTime ? 1 : 0);
+    // The host's display range leads the view horizontally: it takes a framed span, and the
+    // ruler with it.
+    if (includeTime) {
+        const CGRect& framed = _view.getCurrentViewVolume();
+        _controller.didSetViewContentsHorizontalOrigin(framed.origin.x, framed.size.width);
+    }
     _controller.updateUI();
 }
 
@@ -447,6 +514,7 @@ void TQDemoWindow::notify(TQNotificationWord word) {
     // Any word may follow a change of the history (a drag's end, an undo) or of the sets:
     // both are cheap to refresh.
     refreshTitle();
+    if (word & (kTQNotifyHostTimeChanged | kTQNotifyTimeChanged)) _view.currentFrameChanged();
     _editMenu->refresh();
     if (_inspector) _inspector->notify(word);
 }

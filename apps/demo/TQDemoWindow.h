@@ -19,6 +19,11 @@
 // document that was open stays as it was. The dialogs go through prompts() so that tests can
 // answer them.
 //
+// The curves are a timeline: a time ruler over them sets the playhead, which the view draws;
+// the transport bar plays the piece on the host's clock, and a preview beside the object list
+// shows the scene at the playhead. The Time menu moves the selected keypoints by or to a
+// typed number of frames (as typing a number in the curves does).
+//
 // The window owns the host (and so the scene), the controller, the view and the control
 // models; Qt owns the widgets. Notification words reach the controller first, then the
 // window, which keeps the list, the title and the menus in step.
@@ -43,8 +48,11 @@
 
 class QAction;
 class QListWidget;
+class TQDemoScenePreview;
+class TQDemoTransport;
 class TQQtCurveViewWidget;
 class TQQtOutlineView;
+class TQQtTimeRuler;
 class TQQtPopUpButton;
 class TQQtSegmentedControl;
 class TQQtWindowBinding;
@@ -89,6 +97,15 @@ public:
     QAction* deleteAction() const { return _delete; }
     // The inspector of the selected object, with its heads-up window.
     TQDemoInspector* inspector() const { return _inspector; }
+    TQDemoTransport& transport() const { return *_transport; }
+    TQQtTimeRuler* timeRuler() const { return _timeRuler; }
+    TQDemoScenePreview* scenePreview() const { return _scenePreview; }
+    RWWindow& editorWindow() { return _editorWindow; }
+
+    // The Time menu's command: the timing move panel under the top of the curves, then the
+    // selected keypoints moved by (isDelta) or to the typed number of frames. Nothing without
+    // a selected keypoint.
+    void moveSelectedKeypointsInTime(bool isDelta);
 
     // Fits the shown curves into the view, in value and, unless told not to, in time.
     void frameAll(bool includeTime = true);
@@ -144,6 +161,8 @@ private:
     // The Animation menu, built for the selected channels each time it opens.
     void fillAnimationMenu(QMenu& menu);
 
+    void buildTimeMenu();
+
     // Declared first: everything below refers to it, so it dies last.
     TQHostAppDelegate _host;
     TQDemoCurveEditorView _view;
@@ -178,6 +197,9 @@ private:
     QAction* _delete = nullptr;
     TQQtWindowBinding* _windowBinding = nullptr;
     TQDemoInspector* _inspector = nullptr;
+    TQDemoTransport* _transport = nullptr;
+    TQQtTimeRuler* _timeRuler = nullptr;
+    TQDemoScenePreview* _scenePreview = nullptr;
     bool _refreshingList = false;
     bool _framedOnce = false;
 };

@@ -4,7 +4,7 @@
 // menu offers, and the menu's Undo gives every channel back exactly.
 #include <gtest/gtest.h>
 
-#include <QDialogButtonBox>
+#include <QElapsedTimer>
 #include <QLineEdit>
 #include <QListWidget>
 #include <QMenu>
@@ -13,11 +13,15 @@
 
 #include <set>
 
+#include "apps/demo/TQDemoScenePreview.h"
+#include "apps/demo/TQDemoTransport.h"
 #include "apps/demo/tests/DemoWindowFixture.h"
 #include "host/TQHostSampleScene.h"
+#include "platform/channels/TQChannelRef.h"
 #include "qt/TQQtModal.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
+#include "qt/TQQtTimeRuler.h"
 #include "qt/TQQtZoomScroller.h"
 
 namespace demo_test {
@@ -158,8 +162,12 @@ TEST_F(DemoWindowTest, double_click_on_a_keypoint__types_its_value_in_the_panel_
         QDialog* dialog = modal.activeDialog();
         if (!dialog) return;
         panelShown = true;
-        dialog->findChild<QLineEdit*>("value")->setText("12.5");
-        dialog->findChild<QDialogButtonBox*>()->button(QDialogButtonBox::Ok)->click();
+        // Typed over the selected value, then OK.
+        QTest::keyClicks(dialog->findChild<QLineEdit*>(), "12.5");
+        for (QPushButton* button : dialog->findChildren<QPushButton*>())
+            if (button->text() == QLatin1String("OK")) button->click();
+        // Whatever happened, the run must end.
+        if (modal.activeDialog()) modal.abortModal();
     });
     QTest::mouseDClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
     QTest::mouseRelease(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
@@ -180,6 +188,92 @@ TEST_F(DemoWindowTest, double_click_on_a_keypoint__types_its_value_in_the_panel_
     EXPECT_EQ(window.editMenu()->undoAction()->text().toStdString(), "Undo Move Keypoint");
     window.editMenu()->undoAction()->trigger();
     EXPECT_EQ(changedCount(before), 0u) << "Undo must take the typed value back";
+}
+
+TEST_F(DemoWindowTest, transport_and_ruler__play_step_and_scrub_on_the_hosts_clock) {
+    TQDemoTransport& transport = window.transport();
+    TQHostAppDelegate& host = window.host();
+    transport.buttons()->userClickSegment(TQDemoTransport::kPlay);
+    ASSERT_TRUE(host.isPlaying());
+    EXPECT_EQ(transport.buttons()->labelForSegment(TQDemoTransport::kPlay), "Pause");
+    QElapsedTimer waited;
+    waited.start();
+    while (transport.ticks() < 3 && waited.elapsed() < 2000) QCoreApplication::processEvents();
+    ASSERT_GE(transport.ticks(), 3) << "the playback timer must tick the host";
+    EXPECT_GT(CMTimeGetSeconds(host.currentTime()), 0.0);
+    EXPECT_EQ(transport.ruler()->currentTime(), host.currentTime()) << "the ruler follows";
+    EXPECT_EQ(transport.timeField()->stringValue(), host.timeText(host.currentTime()));
+
+    transport.buttons()->userClickSegment(TQDemoTransport::kGoToStart);
+    EXPECT_FALSE(host.isPlaying()) << "the transport's moves pause playback";
+    EXPECT_FALSE(transport.playbackTimer().isActive());
+    transport.buttons()->userClickSegment(TQDemoTransport::kNextFrame);
+    EXPECT_EQ(host.currentTime(), CMTimeMake(1, 30));
+    transport.buttons()->userClickSegment(TQDemoTransport::kGoToEnd);
+    EXPECT_EQ(host.currentTime(), CMTimeMake(179, 30));
+    EXPECT_EQ(transport.timeField()->stringValue(), "00:00:05:29");
+
+    // A press on the ruler puts the playhead on the frame under it.
+    TQQtTimeRuler* ruler = window.timeRuler();
+    const CMTime target = CMTimeMake(45, 30);
+    const int x =
+        static_cast<int>(std::lround(transport.ruler()->xForTime(target, ruler->width()) + 0.5));
+    QTest::mouseClick(ruler, Qt::LeftButton, Qt::NoModifier, QPoint(x, ruler->height() / 2));
+    EXPECT_EQ(host.currentTime(), target);
+}
+
+TEST_F(DemoWindowTest, preview__poses_come_from_the_channels_at_the_playhead) {
+    TQHostAppDelegate& host = window.host();
+    host.movePlayhead(CMTimeMake(24, 30));  // the title at rest
+    TQChannelObjectRootBase* title = host.scene().objectNamed(kTQHostSampleTitleObject);
+    TQDemoScenePreview::Pose pose = window.scenePreview()->poseOf(*title);
+    EXPECT_NEAR(pose.x, 0.0, 1e-6);
+    EXPECT_NEAR(pose.y, 110.0, 1e-6);
+    EXPECT_NEAR(pose.scaleX, 0.95, 1e-6);
+    EXPECT_NEAR(pose.opacity, 1.0, 1e-6);
+    // The lower third's keys are in its own time, a second later.
+    const TQChannelObjectRootBase* bar = host.scene().objectNamed(kTQHostSampleOffsetObject);
+    host.movePlayhead(CMTimeMake(30 + 30, 30));
+    EXPECT_NEAR(window.scenePreview()->poseOf(*bar).x, -560.0, 1e-6);
+    EXPECT_NEAR(window.scenePreview()->poseOf(*bar).y, -380.0, 1e-6) << "set without a key";
+
+    // An edit of the curve moves the picture.
+    auto* x = dynamic_cast<TQChannel*>(
+        TQChannelRef(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position)[0])
+            .getChannel(static_cast<TQChannelBase*>(title)));
+    const CMTime now = CMTimeMake(60, 30);
+    x->offsetCurve(&now, 250.0);
+    EXPECT_NEAR(window.scenePreview()->poseOf(*title).x, 250.0, 1e-6);
+}
+
+TEST_F(DemoWindowTest, time_menu__moves_the_selected_keypoints_by_typed_frames_as_one_step) {
+    TQQtModalService modal;
+    modal.install();
+    const auto before = snapshot();
+    window.curveView().selectAll();
+    std::vector<double> times;
+    TQChannel* first = shownChannels().front();
+    for (TQKeyframeHandle h : first->getKeyframes(false)) {
+        CMTime t = kCMTimeInvalid;
+        first->getKeyframe(h, &t, nullptr);
+        times.push_back(CMTimeGetSeconds(t));
+    }
+    QTimer::singleShot(0, [&] {
+        QDialog* dialog = modal.activeDialog();
+        if (!dialog) return;
+        QTest::keyClicks(dialog->findChild<QLineEdit*>(), "5");
+        QTest::keyClick(dialog->findChild<QLineEdit*>(), Qt::Key_Return);
+        if (modal.activeDialog()) modal.abortModal();
+    });
+    window.moveSelectedKeypointsInTime(true);
+    for (size_t i = 0; i < times.size(); ++i) {
+        CMTime t = kCMTimeInvalid;
+        first->getKeyframe(first->getKeyframes(false)[i], &t, nullptr);
+        EXPECT_NEAR(CMTimeGetSeconds(t), std::round(times[i] * 30.0 + 5.0) / 30.0, 1e-9) << i;
+    }
+    EXPECT_EQ(window.editMenu()->undoAction()->text().toStdString(), "Undo Move Keypoint");
+    window.editMenu()->undoAction()->trigger();
+    EXPECT_EQ(changedCount(before), 0u) << "one step takes every keypoint back";
 }
 
 }  // namespace
