@@ -50,22 +50,24 @@ private:
 // The dense scene of `spec` in a view of width x height points at scale 1 that shows its whole
 // span by the world height from -1 to `top`, through the reference host. Every channel is in
 // the controller's set, auto-zoom and auto-pan are off so that gestures leave the volume
-// alone, and one frame has been drawn, so that hit tests have primitives.
-struct TQBenchGestureView {
+// alone, and one frame has been drawn, so that hit tests have primitives. The view and the
+// controller are the base classes unless a benchmark names others.
+template <class View, class Controller>
+struct TQBenchViewScene {
     TQHostAppDelegate host;
-    TQCurveEditorCtrlBase ctrl;
+    Controller ctrl;
     TQCurveSetMutablePtr set = std::make_shared<TQCurveSetMutable>();
     RWManualClock clock;
     RWManualTimer timer{clock};
     RWStubViewHost viewHost;
-    TQCurveEditorViewBase view;
+    View view;
     TQBenchDiscardingEncoder encoder;
     std::vector<TQChannel*> channels;
 
     // Past the view's 1/30 s gate on drag steps.
     static constexpr double kStep = 0.05;
 
-    TQBenchGestureView(const TQHostDenseSceneSpec& spec, double width, double height, double top)
+    TQBenchViewScene(const TQHostDenseSceneSpec& spec, double width, double height, double top)
         : viewHost(width, height, 1.0), encoder(width, height) {
         ctrl.init();
         ctrl.setAppDelegate(&host);
@@ -102,3 +104,5 @@ struct TQBenchGestureView {
         view.mouseDragged(at(RWEventType::LeftMouseDragged, t, v, mods));
     }
 };
+
+using TQBenchGestureView = TQBenchViewScene<TQCurveEditorViewBase, TQCurveEditorCtrlBase>;

@@ -21,8 +21,7 @@ int whole(double v) { return static_cast<int>(std::lround(v)); }
 
 QRect TQQtGlobalRectOfScreenRect(const CGRect& rect) {
     const double top = flipHeight() - (rect.origin.y + rect.size.height);
-    return QRect(whole(rect.origin.x), whole(top), whole(rect.size.width),
-                 whole(rect.size.height));
+    return QRect(whole(rect.origin.x), whole(top), whole(rect.size.width), whole(rect.size.height));
 }
 
 CGRect TQQtScreenRectOfGlobalRect(const QRect& rect) {

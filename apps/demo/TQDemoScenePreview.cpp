@@ -12,10 +12,10 @@
 
 namespace {
 
-constexpr TQNotificationWord kRepaintWords =
-    kTQNotifyHostTimeChanged | kTQNotifyTimeChanged | kTQNotifyChannelsChanging |
-    kTQNotifyChannelsChanged | kTQNotifyCurvesInvalidated | kTQNotifySceneChanged |
-    kTQNotifySceneReset;
+constexpr TQNotificationWord kRepaintWords = kTQNotifyHostTimeChanged | kTQNotifyTimeChanged |
+                                             kTQNotifyChannelsChanging | kTQNotifyChannelsChanged |
+                                             kTQNotifyCurvesInvalidated | kTQNotifySceneChanged |
+                                             kTQNotifySceneReset;
 
 // A colour per object, after the curve colours' hues.
 QColor colourOf(size_t index) {

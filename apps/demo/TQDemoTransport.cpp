@@ -18,11 +18,8 @@ struct SegmentText {
     const char* description;
 };
 constexpr SegmentText kSegments[] = {
-    {"|<", "Go to the start"},
-    {"<", "One frame back"},
-    {"Play", "Play"},
-    {">", "One frame forward"},
-    {">|", "Go to the end"},
+    {"|<", "Go to the start"},  {"<", "One frame back"}, {"Play", "Play"},
+    {">", "One frame forward"}, {">|", "Go to the end"},
 };
 
 }  // namespace
@@ -93,9 +90,10 @@ TQQtTimeRuler* TQDemoTransport::makeRuler(QWidget* parent) {
 void TQDemoTransport::play() {
     if (_host.isPlaying()) return;
     _host.play();
-    // The rate of the host's frames: a tick a frame.
+    // A tick a frame, rounded up to whole milliseconds so that each tick's redraw passes the
+    // view's gate of one frame in 1/30 s (a tick early would have every other one held back).
     const double frame = CMTimeGetSeconds(_host.getFrameDuration());
-    _timer.start(static_cast<int>(std::lround(1000.0 * (frame > 0.0 ? frame : 1.0 / 30.0))));
+    _timer.start(static_cast<int>(std::ceil(1000.0 * (frame > 0.0 ? frame : 1.0 / 30.0))));
     _sinceTick.start();
     refresh();
 }

@@ -39,9 +39,7 @@ private:
     const TQHostAppDelegate& _host;
 };
 
-class TQDemoTransport final : public QObject,
-                              public RWActionTarget,
-                              public TQNotificationReceiver {
+class TQDemoTransport final : public QObject, public RWActionTarget, public TQNotificationReceiver {
 public:
     // The transport's segments, in order.
     enum Segment : int64_t { kGoToStart, kPreviousFrame, kPlay, kNextFrame, kGoToEnd };

@@ -17,6 +17,7 @@
 // converts to its toolkit's coordinates.
 
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -39,6 +40,15 @@ public:
     const std::vector<std::shared_ptr<RWControl>>& subviews() const { return _subviews; }
     // Null is ignored.
     void addSubview(std::shared_ptr<RWControl> control);
+    // The first control of that class (that `matches`, when given), or null.
+    template <class Control>
+    std::shared_ptr<Control> subview(
+        const std::function<bool(const Control&)>& matches = {}) const {
+        for (const std::shared_ptr<RWControl>& control : _subviews)
+            if (auto found = std::dynamic_pointer_cast<Control>(control))
+                if (!matches || matches(*found)) return found;
+        return nullptr;
+    }
 
 private:
     CGRect _frame;

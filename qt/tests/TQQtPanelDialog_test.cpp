@@ -1,5 +1,5 @@
 // The number panels on Qt: each runs as a dialog at the place the caller gives, with the key
-// or number in its field, and ends as the user ends it; the time ruler's widget, both ways.
+// or number in its field, and ends as the user ends it; the time ruler's widget.
 #include <gtest/gtest.h>
 
 #include <QPushButton>
@@ -58,35 +58,20 @@ TEST_F(QtPanelDialogTest, opens_at_the_point_with_the_number_selected_and_return
     EXPECT_EQ(value, -12.0);
 }
 
-TEST_F(QtPanelDialogTest, cancel_after_typing_and_escape_leave_the_number) {
+TEST_F(QtPanelDialogTest, cancel_escape_and_ok_on_an_unfinished_number_leave_the_number) {
     // Cancel takes no focus from the field, so the edit does not end and answer OK first.
     EXPECT_FALSE(openWith([](QDialog& dialog) {
         QTest::keyClicks(line(dialog), "7");
         button(dialog, "Cancel")->click();
     }));
     EXPECT_FALSE(openWith([](QDialog& dialog) {
-        QTest::keyClicks(line(dialog), "7");
+        QTest::keyClicks(line(dialog), "7e");
+        button(dialog, "OK")->click();
+        EXPECT_TRUE(dialog.isVisible()) << "\"7e\" is no number: the panel stays";
+        EXPECT_EQ(line(dialog)->text(), "2.5") << "the number stands again";
         QTest::keyClick(&dialog, Qt::Key_Escape);
     }));
     EXPECT_EQ(value, 2.5);
-}
-
-TEST_F(QtPanelDialogTest, an_opening_key_is_typed_and_ok_on_an_unfinished_number_waits) {
-    const RWEvent key = RWEvent::keyEvent(RWEventType::KeyDown, "4");
-    const bool accepted = openWith(
-        [](QDialog& dialog) {
-            EXPECT_EQ(line(dialog)->text(), "4");
-            EXPECT_TRUE(line(dialog)->selectedText().isEmpty()) << "the key is not selected";
-            QTest::keyClicks(line(dialog), "e");
-            button(dialog, "OK")->click();
-            EXPECT_TRUE(dialog.isVisible()) << "\"4e\" is no number: the panel stays";
-            EXPECT_EQ(line(dialog)->text(), "4") << "the number stands again";
-            QTest::keyClicks(line(dialog), "0");
-            button(dialog, "OK")->click();
-        },
-        &key);
-    EXPECT_TRUE(accepted);
-    EXPECT_EQ(value, 40.0);
 }
 
 TEST(QtTimeRuler, a_press_and_a_drag_set_the_models_time) {
@@ -104,10 +89,6 @@ TEST(QtTimeRuler, a_press_and_a_drag_set_the_models_time) {
     EXPECT_EQ(model->currentTime(), CMTimeMake(75, 30));
     QTest::mouseRelease(&widget, Qt::LeftButton, Qt::NoModifier, QPoint(250, 10));
     EXPECT_FALSE(model->isTracking());
-    // The model's time shows: the widget paints its playhead there.
-    model->setCurrentTime(CMTimeMake(2, 1));
-    const QImage image = widget.grab().toImage();
-    EXPECT_EQ(image.pixelColor(200, 2).red(), 232) << "the playhead's marker at 2 s";
 }
 
 }  // namespace

@@ -43,14 +43,14 @@ std::optional<TQNumberPanelOutlets> TQInstantiateNumberPanelView(const std::stri
     auto field = std::make_shared<RWTextField>();
     field->setEditable(true);
     field->setPlaceholderString(layout->placeholder);
-    field->setFrame(CGRectMake(kMargin, kMargin + kRowHeight + kGap, kWidth - 2.0 * kMargin,
-                               kRowHeight));
+    field->setFrame(
+        CGRectMake(kMargin, kMargin + kRowHeight + kGap, kWidth - 2.0 * kMargin, kRowHeight));
     view->addSubview(field);
     const double buttonWidth = (kWidth - 2.0 * kMargin - kGap) / 2.0;
     view->addSubview(button("Cancel", "cancelNotify:", RWButton::kEscapeKey, owner,
                             CGRectMake(kMargin, kMargin, buttonWidth, kRowHeight)));
-    view->addSubview(button("OK", "okNotify:", RWButton::kReturnKey, owner,
-                            CGRectMake(kMargin + buttonWidth + kGap, kMargin, buttonWidth,
-                                       kRowHeight)));
+    view->addSubview(
+        button("OK", "okNotify:", RWButton::kReturnKey, owner,
+               CGRectMake(kMargin + buttonWidth + kGap, kMargin, buttonWidth, kRowHeight)));
     return TQNumberPanelOutlets{std::move(view), std::move(field)};
 }

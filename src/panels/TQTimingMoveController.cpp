@@ -140,15 +140,13 @@ bool TQTimingMoveController::openWithLocation(const CGPoint& location, double* v
 
 bool TQCurveEditorValueController::openWithEvent(const RWEvent* event, const CGRect& parentRect,
                                                  double* timeValue, bool* timeIsDelta) {
-    return controllerOfEntry<TQCurveEditorValueController, 0>()
-        .openWithEventParentRectValueIsDelta(event, parentRect, timeValue, timeIsDelta);
+    return controllerOfEntry<TQCurveEditorValueController, 0>().openWithEventParentRectValueIsDelta(
+        event, parentRect, timeValue, timeIsDelta);
 }
 
 bool TQCurveEditorValueController::openWithLocation(const CGPoint& location, double* value) {
-    return controllerOfEntry<TQCurveEditorValueController, 1>()
-        .openWithEventParentRectValueIsDelta(nullptr,
-                                             CGRectMake(location.x, location.y, 0.0, 0.0), value,
-                                             nullptr);
+    return controllerOfEntry<TQCurveEditorValueController, 1>().openWithEventParentRectValueIsDelta(
+        nullptr, CGRectMake(location.x, location.y, 0.0, 0.0), value, nullptr);
 }
 
 bool TQCurveEditorValueController::openWithLocationValueInWindow(const CGPoint& location,
@@ -175,6 +173,7 @@ CGPoint TQCurveEditorValueController::getPanelLocation(CGPoint p, const CGRect& 
 
 void TQCurveEditorValueController::valueFieldChanged() {
     if (!_pValueField) return;
-    const bool isNumber = RWDecimalFormatter::numberFromString(_pValueField->stringValue()).has_value();
+    const bool isNumber =
+        RWDecimalFormatter::numberFromString(_pValueField->stringValue()).has_value();
     stopModalWithCode(isNumber ? RWModalResponseOK : RWModalResponseCancel);
 }

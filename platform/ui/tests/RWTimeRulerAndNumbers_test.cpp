@@ -1,5 +1,4 @@
-// The time ruler as a user drives it, the number formatter of the number panels, typing into
-// a field whose text is selected, and which window takes the keys.
+// The time ruler as a user drives it, and the number formatter of the number panels.
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -8,11 +7,8 @@
 #include <string>
 #include <vector>
 
-#include "platform/ui/RWButton.h"
 #include "platform/ui/RWDecimalFormatter.h"
-#include "platform/ui/RWTextField.h"
 #include "platform/ui/RWTimeRuler.h"
-#include "platform/ui/RWWindow.h"
 
 namespace {
 
@@ -34,10 +30,17 @@ TEST(RWDecimalFormatter, readsWholeFiniteNumbersAndLetPartsOfThemBeTyped) {
         std::optional<double> number;
         bool mayStand;  // as a partial text
     } cases[] = {
-        {"12", 12.0, true},       {" -0.5 ", -0.5, true},   {"+3", 3.0, true},
-        {".25", 0.25, true},      {"1e-3", 0.001, true},    {"-", std::nullopt, true},
-        {"1e", std::nullopt, true}, {"", std::nullopt, true}, {"1..2", std::nullopt, false},
-        {"1a", std::nullopt, false}, {"1 2", std::nullopt, false},
+        {"12", 12.0, true},
+        {" -0.5 ", -0.5, true},
+        {"+3", 3.0, true},
+        {".25", 0.25, true},
+        {"1e-3", 0.001, true},
+        {"-", std::nullopt, true},
+        {"1e", std::nullopt, true},
+        {"", std::nullopt, true},
+        {"1..2", std::nullopt, false},
+        {"1a", std::nullopt, false},
+        {"1 2", std::nullopt, false},
         {"1e999", std::nullopt, true},  // beyond the doubles
         {"nan", std::nullopt, false},
     };
@@ -57,52 +60,6 @@ TEST(RWDecimalFormatter, readsWholeFiniteNumbersAndLetPartsOfThemBeTyped) {
     EXPECT_EQ(numbers.stringForObjectValue(std::numeric_limits<double>::infinity()), std::nullopt);
 }
 
-TEST(RWTextField, typedKeysReplaceASelectedTextAndFollowAnUnselectedOne) {
-    RWDecimalFormatter numbers;
-    Recorder target;
-    auto field = std::make_shared<RWTextField>();
-    field->setTarget(&target);
-    field->setAction("changed:");
-    field->setEditable(true);
-    field->setFormatter(&numbers);
-    field->setDoubleValue(42.0);
-    field->selectText();
-    field->insertText("-");
-    EXPECT_EQ(field->stringValue(), "-") << "the selected number is replaced";
-    field->insertText("7");
-    EXPECT_EQ(field->doubleValue(), -7.0) << "then the keys follow";
-    EXPECT_TRUE(target.actions.empty()) << "typing is no end of the edit";
-
-    // An edit that ends without its action (a button settles the field first).
-    EXPECT_EQ(field->userEndEditing("8", false), std::nullopt);
-    EXPECT_EQ(field->doubleValue(), 8.0);
-    EXPECT_TRUE(target.actions.empty());
-}
-
-TEST(RWWindow, oneKeyWindowAndAFirstResponderFromItsContent) {
-    RWPanel a;
-    RWPanel b;
-    auto content = std::make_shared<RWView>(CGRectMake(0, 0, 120, 40));
-    auto field = std::make_shared<RWTextField>();
-    content->addSubview(field);
-    a.setContentView(content);
-    EXPECT_EQ(a.frame().size, CGSizeMake(120, 40)) << "the frame takes the content's size";
-    EXPECT_FALSE(a.makeFirstResponder(std::make_shared<RWButton>("elsewhere")));
-    EXPECT_TRUE(a.makeFirstResponder(field));
-    EXPECT_EQ(a.firstResponder(), field);
-
-    a.makeKeyAndOrderFront();
-    EXPECT_TRUE(a.isKeyWindow());
-    b.makeKeyAndOrderFront();
-    EXPECT_TRUE(b.isKeyWindow() && !a.isKeyWindow()) << "one key window at a time";
-    b.close();
-    EXPECT_FALSE(b.isKeyWindow()) << "a hidden window takes no keys";
-
-    a.setFrame(CGRectMake(300, 200, 120, 40));
-    EXPECT_EQ(a.convertRectToScreen(CGRectMake(10, 5, 1, 1)), CGRectMake(310, 205, 1, 1));
-    EXPECT_NE(a.windowNumber(), b.windowNumber());
-}
-
 class RWTimeRulerTest : public ::testing::Test {
 protected:
     void SetUp() override {
@@ -114,16 +71,6 @@ protected:
     Recorder target;
     std::shared_ptr<RWTimeRuler> ruler = std::make_shared<RWTimeRuler>();
 };
-
-TEST_F(RWTimeRulerTest, geometry__theRangeAcrossTheWidth) {
-    EXPECT_EQ(ruler->xForTime(CMTimeMake(-1, 1), 600.0), 0.0);
-    EXPECT_EQ(ruler->xForTime(CMTimeMake(2, 1), 600.0), 300.0);
-    EXPECT_NEAR(seconds(ruler->timeForX(450.0, 600.0)), 3.5, 1e-6);
-    // An empty range or width maps everything to the start.
-    EXPECT_EQ(ruler->xForTime(CMTimeMake(2, 1), 0.0), 0.0);
-    ruler->setDisplayRange(CMTimeRangeMake(kCMTimeZero, kCMTimeZero));
-    EXPECT_EQ(seconds(ruler->timeForX(100.0, 600.0)), 0.0);
-}
 
 TEST_F(RWTimeRulerTest, labelTimes__multiplesOfTheStepThinnedToFit) {
     auto labels = [&](double width, double spacing) {

@@ -3,7 +3,6 @@
 // modal service.
 #include <gtest/gtest.h>
 
-#include <cmath>
 #include <memory>
 #include <string>
 
@@ -12,6 +11,12 @@
 #include "src/panels/TQTimingMoveController.h"
 
 namespace {
+
+// A button of a panel, by its title, as the user finds it.
+std::shared_ptr<RWButton> button(RWWindow& panel, const std::string& title) {
+    return panel.contentView()->subview<RWButton>(
+        [&](const RWButton& b) { return b.title() == title; });
+}
 
 class NumberPanels : public ::testing::Test {
 protected:
@@ -26,58 +31,18 @@ protected:
         back.modal = previous;
         RWInstallServices(back);
     }
-    static std::shared_ptr<RWTextField> fieldOf(RWWindow& panel) {
-        for (const auto& control : panel.contentView()->subviews())
-            if (auto field = std::dynamic_pointer_cast<RWTextField>(control)) return field;
-        return nullptr;
-    }
-    static void click(RWWindow& panel, const std::string& title) {
-        for (const auto& control : panel.contentView()->subviews())
-            if (auto b = std::dynamic_pointer_cast<RWButton>(control); b && b->title() == title)
-                b->userClick();
-    }
     // The user presses Return on this text in the field, the panel's formatter taken off first
     // when `raw` (as a host's own field without one would be).
     void pushReturnWith(const std::string& text, bool raw = false) {
         modal.pushScript([text, raw](RWWindow& panel, RWModalService&) {
-            if (raw) fieldOf(panel)->setFormatter(nullptr);
-            fieldOf(panel)->userEndEditing(text);
+            if (raw) panel.contentView()->subview<RWTextField>()->setFormatter(nullptr);
+            panel.contentView()->subview<RWTextField>()->userEndEditing(text);
         });
     }
 
     RWScriptedModal modal;
     RWModalService* previous = nullptr;
 };
-
-TEST_F(NumberPanels, placement__centredBelowARectOrHangingFromAPoint) {
-    CGRect frame = CGRectZero;
-    const auto note = [&](RWWindow& panel, RWModalService& m) {
-        frame = panel.frame();
-        EXPECT_TRUE(panel.isVisible() && panel.isKeyWindow()) << "the panel takes the keys";
-        EXPECT_EQ(panel.firstResponder(), fieldOf(panel));
-        m.stopModalWithCode(RWModalResponseCancel);
-    };
-    double value = 1.0;
-    modal.pushScript(note);
-    TQTimingMoveController::openWithEvent(nullptr, CGRectMake(100.0, 500.0, 301.0, 40.0), &value,
-                                          nullptr);
-    // x + r(301 / 2) - r(width / 2), whole points; the top at the rectangle's y.
-    EXPECT_EQ(frame.origin.x, 100.0 + 151.0 - std::floor(frame.size.width / 2.0 + 0.5));
-    EXPECT_EQ(frame.origin.y + frame.size.height, 500.0);
-
-    modal.pushScript(note);
-    TQTimingMoveController::openWithLocation(CGPointMake(40.0, 300.0), &value);
-    EXPECT_EQ(frame.origin, CGPointMake(40.0, 300.0 - frame.size.height));
-
-    // Kept inside the window's rectangle, then taken to the screen.
-    RWWindow window;
-    window.setFrame(CGRectMake(1000.0, 2000.0, 800.0, 600.0));
-    modal.pushScript(note);
-    TQCurveEditorValueController::openWithLocationValueInWindow(
-        CGPointMake(-50.0, 590.0), &value, &window, CGRectMake(10.0, 20.0, 700.0, 500.0));
-    EXPECT_EQ(frame.origin, CGPointMake(1000.0 + 10.0, 2000.0 + 520.0 - frame.size.height));
-    EXPECT_EQ(value, 1.0) << "cancelled: the number stays";
-}
 
 TEST_F(NumberPanels, getPanelLocation__keepsThePanelInsideTheParentFrame) {
     TQCurveEditorValueController controller;
@@ -97,6 +62,20 @@ TEST_F(NumberPanels, getPanelLocation__keepsThePanelInsideTheParentFrame) {
     };
     for (const auto& c : cases)
         EXPECT_EQ(controller.getPanelLocation(c.point, parent), c.expected) << c.what;
+
+    // The class method takes the kept point to the screen through the window.
+    RWWindow window;
+    window.setFrame(CGRectMake(1000.0, 2000.0, 800.0, 600.0));
+    CGRect frame = CGRectZero;
+    modal.pushScript([&](RWWindow& panel, RWModalService& m) {
+        frame = panel.frame();
+        m.stopModalWithCode(RWModalResponseCancel);
+    });
+    double value = 1.0;
+    EXPECT_FALSE(TQCurveEditorValueController::openWithLocationValueInWindow(
+        CGPointMake(50.0, 900.0), &value, &window, parent));
+    EXPECT_EQ(frame.origin, CGPointMake(1000.0 + 100.0, 2000.0 + 500.0 - frame.size.height));
+    EXPECT_EQ(value, 1.0) << "cancelled: the number stays";
 }
 
 TEST_F(NumberPanels, answers__okReturnCancelAndCloseForBothPanels) {
@@ -104,9 +83,9 @@ TEST_F(NumberPanels, answers__okReturnCancelAndCloseForBothPanels) {
     double value = 4.0;
     std::string shown;
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        shown = fieldOf(panel)->stringValue();
-        fieldOf(panel)->insertText("5");
-        click(panel, "OK");
+        shown = panel.contentView()->subview<RWTextField>()->stringValue();
+        panel.contentView()->subview<RWTextField>()->insertText("5");
+        button(panel, "OK")->userClick();
     });
     const RWEvent key = RWEvent::keyEvent(RWEventType::KeyDown, "-");
     EXPECT_TRUE(TQTimingMoveController::openWithEvent(&key, CGRectZero, &value, nullptr));
@@ -115,16 +94,17 @@ TEST_F(NumberPanels, answers__okReturnCancelAndCloseForBothPanels) {
 
     // Without an event the number is shown, selected, and Return on a new one answers it.
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        shown = fieldOf(panel)->stringValue();
-        EXPECT_TRUE(fieldOf(panel)->isAllTextSelected());
-        fieldOf(panel)->userEndEditing("2.5");
+        shown = panel.contentView()->subview<RWTextField>()->stringValue();
+        EXPECT_TRUE(panel.contentView()->subview<RWTextField>()->isAllTextSelected());
+        panel.contentView()->subview<RWTextField>()->userEndEditing("2.5");
     });
     EXPECT_TRUE(TQCurveEditorValueController::openWithLocation(CGPointZero, &value));
     EXPECT_EQ(shown, "-5");
     EXPECT_EQ(value, 2.5);
 
     // Cancel, the user's close and a run nothing could show leave the number alone.
-    modal.pushScript([&](RWWindow& panel, RWModalService&) { click(panel, "Cancel"); });
+    modal.pushScript(
+        [&](RWWindow& panel, RWModalService&) { button(panel, "Cancel")->userClick(); });
     modal.pushScript([&](RWWindow& panel, RWModalService&) { EXPECT_TRUE(panel.performClose()); });
     modal.pushScript([&](RWWindow&, RWModalService& m) { m.abortModal(); });
     for (int i = 0; i < 3; ++i)
@@ -137,8 +117,8 @@ TEST_F(NumberPanels, textThatIsNoNumber__keepsThePanelOpenOrIsRefusedByTheValueP
     // The panel's own field refuses it: the run goes on until the user cancels.
     std::optional<std::string> why;
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        why = fieldOf(panel)->userEndEditing("1e");
-        click(panel, "OK");
+        why = panel.contentView()->subview<RWTextField>()->userEndEditing("1e");
+        button(panel, "OK")->userClick();
     });
     EXPECT_TRUE(TQTimingMoveController::openWithLocation(CGPointZero, &value));
     EXPECT_TRUE(why.has_value()) << "a number must be complete to end the edit";
@@ -154,8 +134,8 @@ TEST_F(NumberPanels, textThatIsNoNumber__keepsThePanelOpenOrIsRefusedByTheValueP
 
     // After a run the field has no formatter left; the next run gives it one again.
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        EXPECT_NE(fieldOf(panel)->formatter(), nullptr);
-        click(panel, "Cancel");
+        EXPECT_NE(panel.contentView()->subview<RWTextField>()->formatter(), nullptr);
+        button(panel, "Cancel")->userClick();
     });
     TQTimingMoveController::openWithLocation(CGPointZero, &value);
 }
