@@ -76,23 +76,13 @@ void TQQtTimeRuler::paintEvent(QPaintEvent*) {
 }
 
 void TQQtTimeRuler::mousePressEvent(QMouseEvent* event) {
-    const std::shared_ptr<RWTimeRuler> m = model();
-    if (!m || event->button() != Qt::LeftButton) {
+    if (!deliverLeft(event, event->button() == Qt::LeftButton, &RWTimeRuler::userPress))
         QWidget::mousePressEvent(event);
-        return;
-    }
-    event->accept();
-    m->userPress(event->position().x(), width());
 }
 
 void TQQtTimeRuler::mouseMoveEvent(QMouseEvent* event) {
-    const std::shared_ptr<RWTimeRuler> m = model();
-    if (!m || !(event->buttons() & Qt::LeftButton)) {
+    if (!deliverLeft(event, (event->buttons() & Qt::LeftButton) != 0, &RWTimeRuler::userDrag))
         QWidget::mouseMoveEvent(event);
-        return;
-    }
-    event->accept();
-    m->userDrag(event->position().x(), width());
 }
 
 void TQQtTimeRuler::mouseReleaseEvent(QMouseEvent* event) {
@@ -103,4 +93,13 @@ void TQQtTimeRuler::mouseReleaseEvent(QMouseEvent* event) {
     }
     event->accept();
     m->userRelease();
+}
+
+bool TQQtTimeRuler::deliverLeft(QMouseEvent* event, bool isLeft,
+                                void (RWTimeRuler::*gesture)(double, double)) {
+    const std::shared_ptr<RWTimeRuler> m = model();
+    if (!m || !isLeft) return false;
+    event->accept();
+    ((*m).*gesture)(event->position().x(), width());
+    return true;
 }

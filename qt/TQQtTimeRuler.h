@@ -26,4 +26,8 @@ protected:
     void mousePressEvent(QMouseEvent* event) override;
     void mouseMoveEvent(QMouseEvent* event) override;
     void mouseReleaseEvent(QMouseEvent* event) override;
+
+private:
+    // A gesture of the left button at the event's x, to the model; false when it is not one.
+    bool deliverLeft(QMouseEvent* event, bool isLeft, void (RWTimeRuler::*gesture)(double, double));
 };

@@ -162,11 +162,14 @@ TEST_F(HostDelegate, channelAtAReusedAddress__isTrackedAndUndoneAsAChannelOfItsO
     EXPECT_EQ(second->numberOfKeyframes(), 0u) << "the step captured the new channel too";
 }
 
+// The words the host posts, in order.
+struct Words : TQNotificationReceiver {
+    std::vector<TQNotificationWord> seen;
+    void notify(TQNotificationWord word) override { seen.push_back(word); }
+};
+
 TEST_F(HostDelegate, selectionAndTime__answerAndPostTheHostWords) {
-    struct Words : TQNotificationReceiver {
-        std::vector<TQNotificationWord> seen;
-        void notify(TQNotificationWord word) override { seen.push_back(word); }
-    } words;
+    Words words;
     host.addNotificationReceiver(&words);
 
     EXPECT_TRUE(host.objectsSelectedInScene());
@@ -194,10 +197,7 @@ TEST_F(HostDelegate, selectionAndTime__answerAndPostTheHostWords) {
 }
 
 TEST_F(HostDelegate, transport__movesOnFramesInsideThePlayRangeAndTellsTheTime) {
-    struct Words : TQNotificationReceiver {
-        std::vector<TQNotificationWord> seen;
-        void notify(TQNotificationWord word) override { seen.push_back(word); }
-    } words;
+    Words words;
     host.addNotificationReceiver(&words);
     // The editor's range is a zoom into the piece; playback keeps to the piece.
     ASSERT_TRUE(host.setPlayRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(2, 1))));

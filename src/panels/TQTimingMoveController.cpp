@@ -29,6 +29,16 @@ Controller& controllerOfEntry() {
     return *controller;
 }
 
+// The panel of one entry point, opened.
+template <class Controller, int Entry>
+bool openEntry(const RWEvent* event, const CGRect& parentRect, double* value, bool* isDelta) {
+    return controllerOfEntry<Controller, Entry>().openWithEventParentRectValueIsDelta(
+        event, parentRect, value, isDelta);
+}
+
+// A point as the rectangle a panel hangs from, with no width to centre on.
+CGRect pointRect(const CGPoint& p) { return CGRectMake(p.x, p.y, 0.0, 0.0); }
+
 }  // namespace
 
 TQTimingMoveController::~TQTimingMoveController() {
@@ -127,26 +137,22 @@ void TQTimingMoveController::valueFieldChanged() { stopModalWithCode(RWModalResp
 
 bool TQTimingMoveController::openWithEvent(const RWEvent* event, const CGRect& parentRect,
                                            double* timeValue, bool* timeIsDelta) {
-    return controllerOfEntry<TQTimingMoveController, 0>().openWithEventParentRectValueIsDelta(
-        event, parentRect, timeValue, timeIsDelta);
+    return openEntry<TQTimingMoveController, 0>(event, parentRect, timeValue, timeIsDelta);
 }
 
 bool TQTimingMoveController::openWithLocation(const CGPoint& location, double* value) {
-    return controllerOfEntry<TQTimingMoveController, 1>().openWithEventParentRectValueIsDelta(
-        nullptr, CGRectMake(location.x, location.y, 0.0, 0.0), value, nullptr);
+    return openEntry<TQTimingMoveController, 1>(nullptr, pointRect(location), value, nullptr);
 }
 
 // ---- Value panel ---------------------------------------------------------------------------
 
 bool TQCurveEditorValueController::openWithEvent(const RWEvent* event, const CGRect& parentRect,
                                                  double* timeValue, bool* timeIsDelta) {
-    return controllerOfEntry<TQCurveEditorValueController, 0>().openWithEventParentRectValueIsDelta(
-        event, parentRect, timeValue, timeIsDelta);
+    return openEntry<TQCurveEditorValueController, 0>(event, parentRect, timeValue, timeIsDelta);
 }
 
 bool TQCurveEditorValueController::openWithLocation(const CGPoint& location, double* value) {
-    return controllerOfEntry<TQCurveEditorValueController, 1>().openWithEventParentRectValueIsDelta(
-        nullptr, CGRectMake(location.x, location.y, 0.0, 0.0), value, nullptr);
+    return openEntry<TQCurveEditorValueController, 1>(nullptr, pointRect(location), value, nullptr);
 }
 
 bool TQCurveEditorValueController::openWithLocationValueInWindow(const CGPoint& location,
@@ -157,8 +163,8 @@ bool TQCurveEditorValueController::openWithLocationValueInWindow(const CGPoint& 
     const CGPoint inWindow = controller.getPanelLocation(location, rect);
     const CGRect local = CGRectMake(inWindow.x, inWindow.y, 1.0, 1.0);
     const CGRect onScreen = window ? window->convertRectToScreen(local) : local;
-    return controller.openWithEventParentRectValueIsDelta(
-        nullptr, CGRectMake(onScreen.origin.x, onScreen.origin.y, 0.0, 0.0), value, nullptr);
+    return controller.openWithEventParentRectValueIsDelta(nullptr, pointRect(onScreen.origin),
+                                                          value, nullptr);
 }
 
 CGPoint TQCurveEditorValueController::getPanelLocation(CGPoint p, const CGRect& r) const {

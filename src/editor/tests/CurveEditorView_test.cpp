@@ -8,15 +8,11 @@
 #include <set>
 #include <vector>
 
-#include "host/TQHostAppDelegate.h"
 #include "host/TQHostSampleScene.h"
 #include "platform/channels/TQChannelRef.h"
 #include "platform/draw/testing/HXDRecordingEncoder.h"
 #include "platform/ui/RWButton.h"
-#include "platform/ui/testing/RWTestDoubles.h"
-#include "src/editor/TQCurveEditorCtrl.h"
-#include "src/editor/TQCurveEditorView.h"
-#include "tests/support/TQRecordingAppDelegate.h"
+#include "src/editor/tests/EditorFixture.h"
 
 namespace {
 
@@ -31,19 +27,6 @@ std::shared_ptr<RWButton> button(RWWindow& panel, const std::string& title) {
 
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTQCurveEditorTimescale); }
 
-// The controller as a host extends it: a horizontal zoom of the view becomes the display
-// range, which comes back to the view; and it notes every range it is told of.
-class HostLikeCtrl : public TQCurveEditorCtrl {
-public:
-    void displayRangeChangedTo(CMTimeRange range) override { ranges.push_back(range); }
-    void didSetViewContentsHorizontalOrigin(double origin, double duration) override {
-        const CMTime start = seconds(origin);
-        const CMTime length = seconds(duration);
-        if (_view) _view->setDisplayRange(&start, &length);
-    }
-    std::vector<CMTimeRange> ranges;
-};
-
 // A host whose frame duration and text step can be anything, zero included.
 class OddTimeHost : public TQRecordingAppDelegate {
 public:
@@ -54,27 +37,11 @@ public:
     CMTime textStep = kCMTimeZero;
 };
 
-class TimelineTest : public ::testing::Test {
+class TimelineTest : public editor_test::EditorFixture {
 protected:
     void SetUp() override {
-        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
-        recorder.forwardTo(&host);
-        view.setViewHost(&viewHost);
-        view.setClock(&clock);
-        view.setTimer(&timer);
-        const CMTimeRange range = host.displayRange();
-        view.setTotalRange(&range.start, &range.duration);
-        ctrl.init();
-        ctrl.setAppDelegate(&recorder);
-        ctrl.setView(&view);
-        TQCurveEditorOutlets outlets;
-        outlets.verticalScroller = std::make_shared<RWZoomScroller>();
-        outlets.tools = std::make_shared<RWSegmentedControl>();
-        outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
-        ctrl.connectOutlets(outlets);
-        ctrl.setupController();
-        ctrl.viewDidLoad();
-        host.addNotificationReceiver(&ctrl);
+        EditorFixture::SetUp();
+        ctrl.followsZoom = true;
         // The title and the logo, as a user would show them.
         host.setSelectedObjects({host.scene().objectNamed(kTQHostSampleTitleObject),
                                  host.scene().objectNamed(kTQHostSampleBehaviorObject)});
@@ -90,10 +57,7 @@ protected:
         RWServiceSet back;
         back.modal = previousModal;
         RWInstallServices(back);
-        host.removeNotificationReceiver(&ctrl);
-        ctrl.setView(nullptr);
-        view.setController(nullptr);
-        view.setViewHost(nullptr);
+        EditorFixture::TearDown();
     }
 
     bool frame() {
@@ -156,16 +120,9 @@ protected:
         return out;
     }
 
-    TQHostAppDelegate host;
-    TQRecordingAppDelegate recorder;
-    RWStubViewHost viewHost{800.0, 400.0, 1.0};
-    RWManualClock clock;
-    RWManualTimer timer{clock};
     RWScriptedModal modal;
     RWModalService* previousModal = nullptr;
     HXDRecordingEncoder encoder{800, 400};
-    TQCurveEditorView view;
-    HostLikeCtrl ctrl;
 };
 
 TEST_F(TimelineTest, displayRangeModified__takesTheVolumeFromTheRangeAndTellsTheController) {

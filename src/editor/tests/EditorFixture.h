@@ -68,7 +68,19 @@ public:
         log->push_back("refreshPopUp");
         TQCurveEditorCtrl::refreshPopUp();
     }
+    // The ranges the view reports, unlogged.
+    void displayRangeChangedTo(CMTimeRange range) override { ranges.push_back(range); }
+    // With followsZoom, as a host does: a horizontal zoom of the view becomes the display
+    // range, which comes back to the view.
+    void didSetViewContentsHorizontalOrigin(double origin, double duration) override {
+        if (!followsZoom || !_view) return;
+        const CMTime start = TQTarnTimeForChannelSeconds(origin, kTQCurveEditorTimescale);
+        const CMTime length = TQTarnTimeForChannelSeconds(duration, kTQCurveEditorTimescale);
+        _view->setDisplayRange(&start, &length);
+    }
     Log* log = nullptr;
+    std::vector<CMTimeRange> ranges;
+    bool followsZoom = false;
 };
 
 // A channel list that shows every channel item of the selected set, one row each in order.
