@@ -21,7 +21,9 @@ constexpr double kGap = 6.0;
 
 std::shared_ptr<RWButton> button(const char* title, const char* action, const char* key,
                                  RWActionTarget* owner, const CGRect& frame) {
-    auto b = std::make_shared<RWButton>(title);
+    auto b = std::make_shared<RWButton>();
+    b->setTitle(title);
+    b->setButtonType(RWButton::kPushButton);
     b->setTarget(owner);
     b->setAction(action);
     b->setKeyEquivalent(key);
