@@ -64,9 +64,16 @@ TQDemoTransport::TQDemoTransport(TQHostAppDelegate& host, QObject* parent)
 }
 
 TQDemoTransport::~TQDemoTransport() {
-    _host.removeNotificationReceiver(this);
+    detachFromHost();
     _buttons->setTarget(nullptr);
     _ruler->setTarget(nullptr);
+}
+
+void TQDemoTransport::detachFromHost() {
+    if (!_attached) return;
+    _timer.stop();
+    _host.removeNotificationReceiver(this);
+    _attached = false;
 }
 
 void TQDemoTransport::makeToolBarWidgets(QToolBar* bar) {

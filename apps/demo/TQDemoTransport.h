@@ -53,6 +53,9 @@ public:
 
     void play();
     void pause();
+    // Stops hearing the host: the window calls it before its host goes, since Qt deletes this
+    // child only after the window's members.
+    void detachFromHost();
     void togglePlayback();
     bool isPlaying() const { return _host.isPlaying(); }
     void stepFrames(int64_t frames);
@@ -75,6 +78,7 @@ private:
     void tick();
 
     TQHostAppDelegate& _host;
+    bool _attached = true;
     TQDemoTimeFormatter _formatter{_host};
     std::shared_ptr<RWSegmentedControl> _buttons;
     std::shared_ptr<RWTextField> _timeField;

@@ -93,11 +93,15 @@ TQDemoWindow::~TQDemoWindow() {
     // Its rows refer to the host's channels: it goes while they are there.
     delete _inspector;
     _inspector = nullptr;
+    // So does the preview, which hears the host.
+    delete _scenePreview;
+    _scenePreview = nullptr;
     _view.unregisterBoxUndo(_host);
     QObject::disconnect(_objectList, nullptr, this, nullptr);
     delete _windowBinding;
     _controller.setEditorWindow(nullptr);
     _transport->pause();
+    _transport->detachFromHost();
     _curveWidget->setView(nullptr);
     _channelListView->setOutline(nullptr);
     _scroller->setModel(nullptr);
