@@ -77,6 +77,8 @@ public:
     HXDTexture* nextDrawable() override;
     void beginEncoding(HXDTexture& target, const HXDColor& clearColor) override;
     void endEncoding() override;
+    void encodePrimitives(std::span<const std::shared_ptr<HXDDrawPrimitive>> primitives,
+                          const HXDRenderingContext& context) override;
 
     void encodeMultiline(const HXDMultiline& multiline,
                          const HXDRenderingContext& context) override;
@@ -123,6 +125,8 @@ private:
     // (nothing drawn) otherwise.
     bool drawWholeRun(QPainter& painter, const QRectF& guard, double widthPixels,
                       Qt::PenJoinStyle join);
+    // Appends the points, less those a stroke would not show (within kFlatness of the line).
+    static void appendFlattened(const std::vector<QPointF>& points, QPolygonF& out);
     // Moves the phase on by a distance in pixels without drawing.
     static void advancePhase(StipplePhase& phase, double distance, double step);
     void drawSegment(QPainter& painter, const QPointF& a, const QPointF& b, const HXDColor& ca,

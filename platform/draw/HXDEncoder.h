@@ -4,7 +4,7 @@
 //
 //   HXDTexture* target = encoder.nextDrawable();      // null: no target now, skip the frame
 //   encoder.beginEncoding(*target, backgroundColour);  // clears the target
-//   for (p : primitives) p->encodeWithEncoder(encoder, *controller.renderingContext());
+//   encoder.encodePrimitives(primitives, *controller.renderingContext());
 //   encoder.endEncoding();                             // finishes and presents
 //
 // Every encode operation receives the frame's rendering context: its projection maps the
@@ -16,6 +16,9 @@
 // primitive's blending as a GPU pipeline would, and converts them if its painter wants
 // straight colours.
 
+#include <memory>
+#include <span>
+
 #include "platform/draw/HXDDataType.h"
 
 class HXDTexture;
@@ -26,6 +29,7 @@ class HXDQuadTexture;
 class HXDScreenspaceQuad;
 class HXDMesh;
 class HXDText;
+class HXDDrawPrimitive;
 
 class HXDEncoder {
 public:
@@ -38,6 +42,12 @@ public:
     virtual void beginEncoding(HXDTexture& target, const HXDColor& clearColor) = 0;
     // Ends the frame and presents it.
     virtual void endEncoding() = 0;
+
+    // Encodes the primitives in order, nulls skipped. The default has each encode itself here;
+    // an encoder may do the work on another thread while the caller waits (primitives are
+    // only read, and nothing of the caller's runs meanwhile).
+    virtual void encodePrimitives(std::span<const std::shared_ptr<HXDDrawPrimitive>> primitives,
+                                  const HXDRenderingContext& context);
 
     virtual void encodeMultiline(const HXDMultiline& multiline,
                                  const HXDRenderingContext& context) = 0;

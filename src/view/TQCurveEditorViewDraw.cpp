@@ -113,18 +113,14 @@ bool TQCurveEditorViewBase::displayLayer(HXDEncoder* encoder) {
     }
     _backgroundPrimitives.clear();
     drawBackground();
-    for (const auto& primitive : _backgroundPrimitives)
-        if (primitive)
-            primitive->encodeWithEncoder(*encoder, *_renderController->renderingContext());
+    encoder->encodePrimitives(_backgroundPrimitives, *_renderController->renderingContext());
 
     _primitives.clear();
     _keypointsPrimitives.clear();
     _selectionPrimitives.clear();
     drawProjection();
     drawCurveEditor();
-    const HXDRenderingContext& context = *_renderController->renderingContext();
-    for (const auto& primitive : _primitives)
-        if (primitive) primitive->encodeWithEncoder(*encoder, context);
+    encoder->encodePrimitives(_primitives, *_renderController->renderingContext());
 
     encoder->endEncoding();
     // The target belongs to the frame; the projection stays for conversions and picks.
