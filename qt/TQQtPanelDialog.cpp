@@ -11,6 +11,7 @@
 #include "qt/TQQtButton.h"
 #include "qt/TQQtScreen.h"
 #include "qt/TQQtTextField.h"
+#include "qt/TQQtValueControls.h"
 #include "qt/TQQtWindowBinding.h"
 
 namespace {
@@ -37,7 +38,20 @@ TQQtPanelDialog::TQQtPanelDialog(RWWindow& window, QWidget* parent)
             if (auto field = std::dynamic_pointer_cast<RWTextField>(control)) {
                 auto* line = new TQQtTextField(this);
                 line->setModel(field);
+                // A field nobody types in is a label.
+                if (!field->isEditable()) {
+                    line->setFrame(false);
+                    line->setFocusPolicy(Qt::NoFocus);
+                }
                 widget = line;
+            } else if (auto slider = std::dynamic_pointer_cast<RWSlider>(control)) {
+                auto* bound = new TQQtSlider(this);
+                bound->setModel(slider);
+                widget = bound;
+            } else if (auto scrubber = std::dynamic_pointer_cast<RWScrubber>(control)) {
+                auto* bound = new TQQtScrubber(this);
+                bound->setModel(scrubber);
+                widget = bound;
             } else if (auto button = std::dynamic_pointer_cast<RWButton>(control)) {
                 auto* push = new TQQtButton(this);
                 push->setModel(button);

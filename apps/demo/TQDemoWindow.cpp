@@ -2,6 +2,7 @@
 
 #include <QAbstractEventDispatcher>
 #include <QAction>
+#include <QApplication>
 #include <QDir>
 #include <QEvent>
 #include <QFile>
@@ -27,11 +28,13 @@
 #include "qt/TQQtCurveViewWidget.h"
 #include "qt/TQQtMenu.h"
 #include "qt/TQQtOutlineView.h"
+#include "qt/TQQtPanelDialog.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
 #include "qt/TQQtTimeRuler.h"
 #include "qt/TQQtWindowBinding.h"
 #include "qt/TQQtZoomScroller.h"
+#include "src/editor/TQCurveEditorPanels.h"
 #include "src/panels/TQTimingMoveController.h"
 
 namespace {
@@ -68,7 +71,10 @@ TQDemoWindow::TQDemoWindow() {
     // was left open; the host closes it (see eventLoopDidGoIdle).
     connect(QAbstractEventDispatcher::instance(), &QAbstractEventDispatcher::aboutToBlock, this,
             [this] {
-                if (QGuiApplication::mouseButtons() == Qt::NoButton) _host.eventLoopDidGoIdle();
+                // A modal panel's run holds its step open until the panel goes.
+                if (QGuiApplication::mouseButtons() == Qt::NoButton &&
+                    !QApplication::activeModalWidget())
+                    _host.eventLoopDidGoIdle();
             });
     _windowBinding = new TQQtWindowBinding(_editorWindow, this);
     // Filters run last installed first: this one asks before the binding closes the editor.
@@ -99,6 +105,9 @@ TQDemoWindow::~TQDemoWindow() {
     _view.unregisterBoxUndo(_host);
     QObject::disconnect(_objectList, nullptr, this, nullptr);
     delete _windowBinding;
+    // Its binding observes the generate panel, which goes with the controller.
+    delete _generateDialog;
+    _generateDialog = nullptr;
     _controller.setEditorWindow(nullptr);
     _transport->pause();
     _transport->detachFromHost();
@@ -198,6 +207,13 @@ void TQDemoWindow::setUpController() {
     _channelListController.awakeFromNib();
     outlets.channels = _channelList.get();
     outlets.channelsList = &_channelListController;
+    // The simplify panel runs modally (the modal service shows it); the generate panel stays
+    // beside the editor, shown and hidden with its model.
+    TQInstantiateSimplifyPanel(outlets, &_controller);
+    TQInstantiateGeneratePanel(outlets, &_controller);
+    _panelPlacer = std::make_unique<TQDemoPanelPlacer>(
+        _editorWindow, std::vector{outlets.reducePanel, outlets.generatePanel});
+    _generateDialog = new TQQtPanelDialog(*outlets.generatePanel, this);
     _controller.connectOutlets(outlets);
     _controller.setupController();
     _controller.viewDidLoad();
@@ -211,6 +227,33 @@ void TQDemoWindow::setUpController() {
                                   "Transform keypoints with a box"};
     for (int64_t i = 0; i < tools.segmentCount() && i < 3; ++i)
         tools.setAccessibilityDescription(descriptions[i], i);
+}
+
+// ---- Panels --------------------------------------------------------------------------------
+
+TQDemoPanelPlacer::TQDemoPanelPlacer(RWWindow& editorWindow,
+                                     std::vector<std::shared_ptr<RWPanel>> panels)
+    : _editorWindow(editorWindow), _panels(std::move(panels)) {
+    for (const std::shared_ptr<RWPanel>& panel : _panels)
+        if (panel) panel->addObserver(this);
+}
+
+TQDemoPanelPlacer::~TQDemoPanelPlacer() {
+    for (const std::shared_ptr<RWPanel>& panel : _panels)
+        if (panel) panel->removeObserver(this);
+}
+
+void TQDemoPanelPlacer::windowDidChange(RWWindow& window) {
+    const bool visible = window.isVisible();
+    bool& wasVisible = _visible[&window];
+    const bool appearing = visible && !wasVisible;
+    wasVisible = visible;
+    if (!appearing) return;
+    const CGRect editor = _editorWindow.frame();
+    const CGRect panel = window.frame();
+    window.setFrameOrigin(
+        CGPointMake(editor.origin.x + (editor.size.width - panel.size.width) / 2.0,
+                    editor.origin.y + (editor.size.height - panel.size.height) / 2.0));
 }
 
 void TQDemoWindow::buildMenus() {

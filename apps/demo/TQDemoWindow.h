@@ -22,7 +22,10 @@
 // The curves are a timeline: a time ruler over them sets the playhead, which the view draws;
 // the transport bar plays the piece on the host's clock, and a preview beside the object list
 // shows the scene at the playhead. The Time menu moves the selected keypoints by or to a
-// typed number of frames (as typing a number in the curves does).
+// typed number of frames (as typing a number in the curves does). The Animation menu, like
+// the list's Menu column, holds the animation menu of the selected channels, with Simplify
+// (a modal panel that previews on the channel itself) and Generate Keyframes (a panel beside
+// the editor that bakes cycles of the extrapolation).
 //
 // The window owns the host (and so the scene), the controller, the view and the control
 // models; Qt owns the widgets. Notification words reach the controller first, then the
@@ -34,8 +37,10 @@
 #include <QString>
 
 #include <functional>
+#include <map>
 #include <memory>
 #include <optional>
+#include <vector>
 
 #include "apps/demo/TQDemoCurveEditorCtrl.h"
 #include "apps/demo/TQDemoCurveEditorView.h"
@@ -52,12 +57,29 @@ class TQDemoScenePreview;
 class TQDemoTransport;
 class TQQtCurveViewWidget;
 class TQQtOutlineView;
+class TQQtPanelDialog;
 class TQQtTimeRuler;
 class TQQtPopUpButton;
 class TQQtSegmentedControl;
 class TQQtWindowBinding;
 class TQQtZoomScroller;
 class TQDemoInspector;
+
+// Centres each panel on the editor's window as it appears.
+class TQDemoPanelPlacer final : public RWWindowObserver {
+public:
+    TQDemoPanelPlacer(RWWindow& editorWindow, std::vector<std::shared_ptr<RWPanel>> panels);
+    ~TQDemoPanelPlacer() override;
+    TQDemoPanelPlacer(const TQDemoPanelPlacer&) = delete;
+    TQDemoPanelPlacer& operator=(const TQDemoPanelPlacer&) = delete;
+
+    void windowDidChange(RWWindow& window) override;
+
+private:
+    RWWindow& _editorWindow;
+    std::vector<std::shared_ptr<RWPanel>> _panels;
+    std::map<const RWWindow*, bool> _visible;
+};
 
 // The questions the File menu asks; each starts as the Qt dialog that asks it.
 struct TQDemoPrompts {
@@ -101,6 +123,8 @@ public:
     TQQtTimeRuler* timeRuler() const { return _timeRuler; }
     TQDemoScenePreview* scenePreview() const { return _scenePreview; }
     RWWindow& editorWindow() { return _editorWindow; }
+    // The generate panel's dialog (the simplify panel's is made by each modal run).
+    TQQtPanelDialog* generateDialog() const { return _generateDialog; }
 
     // The Time menu's command: the timing move panel under the top of the curves, then the
     // selected keypoints moved by (isDelta) or to the typed number of frames. Nothing without
@@ -184,6 +208,8 @@ private:
         std::make_shared<TQCurveEditorAnimMenuCell>(&_controller);
     // The Animation menu's model while it is shown.
     RWMenuPtr _animationMenu;
+    // Places the simplify and generate panels, which the controller shares.
+    std::unique_ptr<TQDemoPanelPlacer> _panelPlacer;
 
     // Owned by the window as Qt children.
     QListWidget* _objectList = nullptr;
@@ -196,6 +222,7 @@ private:
     QAction* _autoZoom = nullptr;
     QAction* _delete = nullptr;
     TQQtWindowBinding* _windowBinding = nullptr;
+    TQQtPanelDialog* _generateDialog = nullptr;
     TQDemoInspector* _inspector = nullptr;
     TQDemoTransport* _transport = nullptr;
     TQQtTimeRuler* _timeRuler = nullptr;

@@ -128,10 +128,13 @@ void TQCurveEditorCtrl::setupController() {
         if (panel) panel->setDelegate(this);
 
     // 4. The panels' ranges.
-    for (const auto& scrubber : {_tolerance, _smoothness})
-        if (scrubber) {
-            scrubber->setMinValue(0.0);
-            scrubber->setMaxValue(kSimplifyParameterMax);
+    for (RWValueControl* parameter : {static_cast<RWValueControl*>(_tolerance.get()),
+                                      static_cast<RWValueControl*>(_smoothness.get()),
+                                      static_cast<RWValueControl*>(_toleranceSlider.get()),
+                                      static_cast<RWValueControl*>(_smoothnessSlider.get())})
+        if (parameter) {
+            parameter->setMinValue(0.0);
+            parameter->setMaxValue(kSimplifyParameterMax);
         }
     for (RWValueControl* cycles : {static_cast<RWValueControl*>(_numberOfCyclesSlider.get()),
                                    static_cast<RWValueControl*>(_numberOfCycles.get())})
@@ -432,7 +435,9 @@ void TQCurveEditorCtrl::updateVerticalZoomScroller() {
 
 // ---- Window and view callbacks ---------------------------------------------------------------
 
-bool TQCurveEditorCtrl::windowShouldClose(RWWindow&) {
+bool TQCurveEditorCtrl::windowShouldClose(RWWindow& window) {
+    // The panels close freely; only the editor's own window takes the sets' items with it.
+    if (&window == _generatePanel.get() || &window == _reducePanel.get()) return true;
     for (const TQCurveSetPtr& set : {_selectedCurveSet, TQCurveSetPtr(_curveSetAnimated),
                                      _curveSetModified, TQCurveSetPtr(_curveSetAll)})
         if (set) set->reset();
@@ -629,6 +634,19 @@ constexpr NamedAction kActions[] = {
     {"animMenuPreviousKeyframe:", &TQCurveEditorCtrl::animMenuPreviousKeyframe},
     {"nextKeyframe:", &TQCurveEditorCtrl::nextKeyframe},
     {"previousKeyframe:", &TQCurveEditorCtrl::previousKeyframe},
+    {"animMenuSimplifyCurve:", &TQCurveEditorCtrl::animMenuSimplifyCurve},
+    {"reduceOk:", &TQCurveEditorCtrl::reduceOk},
+    {"reduceCancel:", &TQCurveEditorCtrl::reduceCancel},
+    {"setSmoothnessWithSlider:", &TQCurveEditorCtrl::setSmoothnessWithSlider},
+    {"setSmoothnessWithScrubber:", &TQCurveEditorCtrl::setSmoothnessWithScrubber},
+    {"setToleranceWithSlider:", &TQCurveEditorCtrl::setToleranceWithSlider},
+    {"setToleranceWithScrubber:", &TQCurveEditorCtrl::setToleranceWithScrubber},
+    {"animMenuGeneratePreKeypoints:", &TQCurveEditorCtrl::animMenuGeneratePreKeypoints},
+    {"animMenuGeneratePostKeypoints:", &TQCurveEditorCtrl::animMenuGeneratePostKeypoints},
+    {"generateOk:", &TQCurveEditorCtrl::generateOk},
+    {"generateCancel:", &TQCurveEditorCtrl::generateCancel},
+    {"setNumberOfCylesWithSlider:", &TQCurveEditorCtrl::setNumberOfCylesWithSlider},
+    {"setNumberOfCylesWithScrubber:", &TQCurveEditorCtrl::setNumberOfCylesWithScrubber},
     {"copy:", &TQCurveEditorCtrl::copy},
     {"cut:", &TQCurveEditorCtrl::cut},
     {"paste:", &TQCurveEditorCtrl::paste},

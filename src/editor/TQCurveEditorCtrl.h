@@ -158,6 +158,7 @@ public:
     // ---- Window and view callbacks ----
 
     // Forgets the items of the selected set and of Animated, Modified and All; answers true.
+    // The simplify and generate panels close without that.
     bool windowShouldClose(RWWindow& window) override;
     // The generate and simplify panels end their modal run; the new-set panel cancels.
     void windowWillClose(RWWindow& window) override;
@@ -240,6 +241,48 @@ public:
     void menuCopy(RWActionSender* sender = nullptr) { copy(sender); }
     void menuCut(RWActionSender* sender = nullptr) { cut(sender); }
     void menuPaste(RWActionSender* sender = nullptr) { paste(sender); }
+
+    // ---- Simplify and generate (TQCurveEditorCtrlSimplify.cpp) ----
+    //
+    // Simplify: a modal panel with tolerance and smoothness (each a slider and a scrubber
+    // bound both ways, whole numbers 0 to 10), previewed on the real channel. Every change of
+    // a control starts again from a clone of the channel taken when the panel opened; Cancel
+    // puts that clone back, keypoints and tangents as they were. The panel's previews and its
+    // OK make one undo step, which the run holds open until the panel goes: undoing it brings
+    // back the curve of the moment the panel opened.
+    //
+    // Generate: a panel beside the editor (not modal) with a number of cycles, baked into
+    // keypoints before or after the existing ones by OK, in one undo step.
+
+    // The selected channel's panel opens, tolerance 1 and smoothness 0, and runs until OK,
+    // Cancel or a close; nothing happens without a selected channel or a panel.
+    void animMenuSimplifyCurve(RWActionSender* sender = nullptr);
+    // The update once more with the present values, then the panel closes.
+    void reduceOk(RWActionSender* sender = nullptr);
+    // The curve of the moment the panel opened, then the panel closes.
+    void reduceCancel(RWActionSender* sender = nullptr);
+    // Each copies its control's whole value to its twin, then updates the preview.
+    void setSmoothnessWithSlider(RWActionSender* sender = nullptr);
+    void setSmoothnessWithScrubber(RWActionSender* sender = nullptr);
+    void setToleranceWithSlider(RWActionSender* sender = nullptr);
+    void setToleranceWithScrubber(RWActionSender* sender = nullptr);
+    // The channel back to the clone, then simplified over its keyframes' span with the
+    // panel's values, in the step of the run. A channel that has left the selected set is
+    // only restored. Nothing while no panel is open.
+    void _updateSimplifyResult();
+    // The generate panel for the selected channel, before (pre) or after (post) its
+    // keyframes, with one cycle.
+    void animMenuGeneratePreKeypoints(RWActionSender* sender = nullptr);
+    void animMenuGeneratePostKeypoints(RWActionSender* sender = nullptr);
+    // Bakes the cycles when the channel is still in the selected set; the panel goes either
+    // way, its count back to 1.
+    void generateOk(RWActionSender* sender = nullptr);
+    void generateCancel(RWActionSender* sender = nullptr);
+    // Copy the whole number of cycles across; nothing is previewed.
+    void setNumberOfCylesWithSlider(RWActionSender* sender = nullptr);
+    void setNumberOfCylesWithScrubber(RWActionSender* sender = nullptr);
+    // The simplify panel's clone, while the panel is open (null otherwise).
+    const TQChannel* initialCurve() const { return _initialCurve.get(); }
 
     // ---- Time moves of selected keypoints (TQCurveEditorCtrlTimeMoves.cpp) ----
     //
@@ -407,6 +450,11 @@ protected:
     // One channel's announced change inside the open step, its curve marked dirty after.
     template <class Change>
     void changeChannel(TQCurveEditorChannelItem& item, TQChannel& channel, Change&& change);
+    // The generate panel's shape: the direction, the selected channel, one cycle, shown.
+    void openGeneratePanel(uint32_t direction);
+    // Both panels' common ending: the controls back to their defaults, the panel hidden.
+    void closeSimplifyPanel();
+    void closeGeneratePanel();
     // A scroller pan of the view by a fraction of its range.
     void panVertically(double fraction);
 
