@@ -82,10 +82,10 @@ void TQCurveEditorCtrl::_updateSimplifyResult() {
     if (auto* item = dynamic_cast<TQCurveEditorChannelItem*>(held.get())) {
         // Without a host there is no frame grid: the channel library then changes nothing.
         const CMTime frame = _pAppDelegate ? _pAppDelegate->getFrameDuration() : CMTime{};
-        const double tolerance = wholeValue(_tolerance.get(), _toleranceSlider.get(),
-                                            kDefaultTolerance);
-        const int smoothness = wholeValue(_smoothness.get(), _smoothnessSlider.get(),
-                                          kDefaultSmoothness);
+        const double tolerance =
+            wholeValue(_tolerance.get(), _toleranceSlider.get(), kDefaultTolerance);
+        const int smoothness =
+            wholeValue(_smoothness.get(), _smoothnessSlider.get(), kDefaultSmoothness);
         announcedStep(_pAppDelegate, "Undo Simplify", *_currChan, [&](TQChannel& c) {
             c.simplifyCurve(c.getKeyframeMinTime(), c.getKeyframeMaxTime(), frame,
                             kTQSimplifyBezier, smoothness, tolerance, kTQSimplifyOnFrames);

@@ -45,7 +45,9 @@ std::shared_ptr<RWPanel> panelOfHeight(const char* titleKey, double height) {
     return panel;
 }
 
-double heightFor(int rows) { return kMargin + kRowHeight + kMargin + rows * (kRowHeight + kRowGap); }
+double heightFor(int rows) {
+    return kMargin + kRowHeight + kMargin + rows * (kRowHeight + kRowGap);
+}
 
 // The bottom of a parameter row, counted from the buttons' row.
 double rowBottom(int row) { return kMargin + (row + 1) * (kRowHeight + kRowGap) + kGap; }
@@ -88,8 +90,8 @@ ParameterRow addParameterRow(RWView& content, int row, const char* labelKey,
 }
 
 // Cancel and OK at the bottom right.
-void addButtons(RWView& content, const char* cancelKey, const char* cancelAction,
-                const char* okKey, const char* okAction, RWActionTarget* owner) {
+void addButtons(RWView& content, const char* cancelKey, const char* cancelAction, const char* okKey,
+                const char* okAction, RWActionTarget* owner) {
     auto button = [&](const char* key, const char* action, const char* equivalent, double x) {
         auto b = std::make_shared<RWButton>();
         b->setTitle(TQLocalizedString(key));
@@ -110,12 +112,12 @@ void addButtons(RWView& content, const char* cancelKey, const char* cancelAction
 void TQInstantiateSimplifyPanel(TQCurveEditorOutlets& outlets, RWActionTarget* owner) {
     std::shared_ptr<RWPanel> panel = panelOfHeight("Simplify Panel Title", heightFor(2));
     RWView& content = *panel->contentView();
-    const ParameterRow tolerance =
-        addParameterRow(content, 1, "Simplify Panel Tolerance", "setToleranceWithSlider:",
-                        "setToleranceWithScrubber:", kParameterTicks, owner);
-    const ParameterRow smoothness =
-        addParameterRow(content, 0, "Simplify Panel Smoothness", "setSmoothnessWithSlider:",
-                        "setSmoothnessWithScrubber:", kParameterTicks, owner);
+    const ParameterRow tolerance = addParameterRow(
+        content, 1, "Simplify Panel Tolerance",
+        "setToleranceWithSlider:", "setToleranceWithScrubber:", kParameterTicks, owner);
+    const ParameterRow smoothness = addParameterRow(
+        content, 0, "Simplify Panel Smoothness",
+        "setSmoothnessWithSlider:", "setSmoothnessWithScrubber:", kParameterTicks, owner);
     addButtons(content, "Simplify Panel Cancel", "reduceCancel:", "Simplify Panel OK",
                "reduceOk:", owner);
     outlets.reducePanel = std::move(panel);
@@ -128,9 +130,9 @@ void TQInstantiateSimplifyPanel(TQCurveEditorOutlets& outlets, RWActionTarget* o
 void TQInstantiateGeneratePanel(TQCurveEditorOutlets& outlets, RWActionTarget* owner) {
     std::shared_ptr<RWPanel> panel = panelOfHeight("Generate Panel Title", heightFor(1));
     RWView& content = *panel->contentView();
-    const ParameterRow cycles =
-        addParameterRow(content, 0, "Generate Panel Cycles", "setNumberOfCylesWithSlider:",
-                        "setNumberOfCylesWithScrubber:", kCycleTicks, owner);
+    const ParameterRow cycles = addParameterRow(
+        content, 0, "Generate Panel Cycles",
+        "setNumberOfCylesWithSlider:", "setNumberOfCylesWithScrubber:", kCycleTicks, owner);
     addButtons(content, "Generate Panel Cancel", "generateCancel:", "Generate Panel OK",
                "generateOk:", owner);
     // It floats beside the editor while the user goes on working.
