@@ -17,10 +17,19 @@ TQQtSlider::TQQtSlider(QWidget* parent) : QSlider(Qt::Horizontal, parent) {
     syncFromModel();
 }
 
+int TQQtSlider::positions() const {
+    // A slider that keeps to its marks moves from mark to mark, so that a drag sends one
+    // action per mark crossed and not one per pixel.
+    const RWSlider* m = model().get();
+    if (m && m->allowsTickMarkValuesOnly() && m->numberOfTickMarks() > 1)
+        return int(m->numberOfTickMarks() - 1);
+    return kResolution;
+}
+
 double TQQtSlider::valueAt(int position) const {
     const RWSlider* m = model().get();
     if (!m) return 0.0;
-    return m->minValue() + (m->maxValue() - m->minValue()) * position / kResolution;
+    return m->minValue() + (m->maxValue() - m->minValue()) * position / positions();
 }
 
 void TQQtSlider::syncFromModel() {
@@ -28,12 +37,13 @@ void TQQtSlider::syncFromModel() {
     const RWSlider* m = model().get();
     setEnabled(m && m->isEnabled());
     if (!m) return;
+    const int n = positions();
+    setRange(0, n);
     const double span = m->maxValue() - m->minValue();
-    setValue(span > 0.0 ? int(std::lround((m->doubleValue() - m->minValue()) / span * kResolution))
-                        : 0);
+    setValue(span > 0.0 ? int(std::lround((m->doubleValue() - m->minValue()) / span * n)) : 0);
     const int64_t ticks = m->numberOfTickMarks();
     setTickPosition(ticks > 0 ? QSlider::TicksBelow : QSlider::NoTicks);
-    if (ticks > 1) setTickInterval(std::max(1, int(kResolution / (ticks - 1))));
+    if (ticks > 1) setTickInterval(std::max(1, int(n / (ticks - 1))));
 }
 
 // ---- Scrubber ------------------------------------------------------------------------------

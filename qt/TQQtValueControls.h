@@ -3,7 +3,8 @@
 //
 // TQQtSlider, a QSlider over a fixed resolution from the model's minimum to its maximum, with
 // the model's tick marks; a move is the model's userSetSliderValue (which keeps to the tick
-// mark values when the model says so).
+// mark values when the model says so). A slider that keeps to its marks has one position per
+// mark.
 //
 // TQQtScrubber, a QDoubleSpinBox: the model's range and value, its text through the model's
 // formatter when it has one. Typing a value is userSetDoubleValue; the arrows and the wheel
@@ -26,6 +27,8 @@ protected:
     void syncFromModel() override;
 
 private:
+    // Positions past the first: one per mark for a slider that keeps to its marks.
+    int positions() const;
     double valueAt(int position) const;
 };
 

@@ -29,7 +29,6 @@ protected:
     }
     void SetUp() override {
         EditorFixture::SetUp();
-        previous.modal = RWApplicationServices().modal;
         RWInstallServices({.modal = &modal});
         host.selectObject(object(kTQHostSampleTitleObject));
         ctrl.showAll();
@@ -46,7 +45,7 @@ protected:
         host.undoStack().clear();
     }
     void TearDown() override {
-        RWInstallServices(previous);
+        RWResetServices();
         EditorFixture::TearDown();
     }
     TQChannel& c() const { return *item->channel(); }
@@ -59,7 +58,6 @@ protected:
     TQCurveEditorOutlets panels;
     TQCurveEditorChannelItemPtr item;
     RWScriptedModal modal;
-    RWServiceSet previous;
 };
 
 TEST_F(SimplifyGenerate, simplify__moves_start_from_the_opening_curve_ok_is_one_step_cancel_none) {
@@ -104,7 +102,6 @@ TEST_F(SimplifyGenerate, generate__bakes_the_panels_cycles_after_the_keyframes_i
     ctrl.animMenuGeneratePostKeypoints();
     EXPECT_TRUE(modal.runs().empty() && panels.generatePanel->isVisible()) << "not modal";
     panels.numberOfCyclesSlider->userSetSliderValue(3.0);
-    EXPECT_EQ(panels.numberOfCycles->intValue(), 3);
     press(*panels.generatePanel, "generateOk:");
     EXPECT_TRUE(c() == *want);
     EXPECT_EQ(panels.numberOfCyclesSlider->intValue(), 1) << "one cycle when it reappears";
