@@ -59,12 +59,10 @@ void TQCurveEditorCtrl::animMenuSimplifyCurve(RWActionSender*) {
     _reducePanel->makeKeyAndOrderFront();
     _currChan = channel;
     _initialCurve.reset(initial);
-    for (RWValueControl* tolerance : {static_cast<RWValueControl*>(_tolerance.get()),
-                                      static_cast<RWValueControl*>(_toleranceSlider.get())})
-        if (tolerance) tolerance->setDoubleValue(kDefaultTolerance);
-    for (RWValueControl* smoothness : {static_cast<RWValueControl*>(_smoothness.get()),
-                                       static_cast<RWValueControl*>(_smoothnessSlider.get())})
-        if (smoothness) smoothness->setDoubleValue(kDefaultSmoothness);
+    setWholeValue(_tolerance.get(), kDefaultTolerance);
+    setWholeValue(_toleranceSlider.get(), kDefaultTolerance);
+    setWholeValue(_smoothness.get(), kDefaultSmoothness);
+    setWholeValue(_smoothnessSlider.get(), kDefaultSmoothness);
     // Each preview's step nests in this one, so that the panel leaves a single step, whose
     // "before" is the curve of this moment; a Cancel leaves it empty, and the host drops it.
     const TQCaptureGuard session(_pAppDelegate, "Undo Simplify");
