@@ -53,12 +53,10 @@ void TQCurveEditorCtrl::animMenuSimplifyCurve(RWActionSender*) {
     // preview on.
     if (!channel || !_reducePanel) return;
     std::unique_ptr<TQChannelBase> clone(channel->cloneChannel());
-    auto* initial = dynamic_cast<TQChannel*>(clone.get());
-    if (!initial) return;
-    clone.release();
+    if (!dynamic_cast<TQChannel*>(clone.get())) return;
     _reducePanel->makeKeyAndOrderFront();
     _currChan = channel;
-    _initialCurve.reset(initial);
+    _initialCurve.reset(static_cast<TQChannel*>(clone.release()));
     setWholeValue(_tolerance.get(), kDefaultTolerance);
     setWholeValue(_toleranceSlider.get(), kDefaultTolerance);
     setWholeValue(_smoothness.get(), kDefaultSmoothness);
