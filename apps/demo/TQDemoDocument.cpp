@@ -1,8 +1,11 @@
 #include "apps/demo/TQDemoDocument.h"
 
+#include <algorithm>
 #include <filesystem>
+#include <vector>
 
 #include "apps/demo/TQDemoInspector.h"
+#include "host/TQHostDenseScene.h"
 #include "host/TQHostSampleScene.h"
 
 namespace {
@@ -52,6 +55,20 @@ void TQDemoDocument::loadSample() {
         // The title and the bouncing logo: the piece's two busiest objects.
         _host.setSelectedObjects({_host.scene().objectNamed(kTQHostSampleTitleObject),
                                   _host.scene().objectNamed(kTQHostSampleBehaviorObject)});
+    }
+    _path.clear();
+    markSaved();
+}
+
+void TQDemoDocument::loadStress() {
+    {
+        const LoadingScope loading(_loading);
+        _project.newDocument(kFamily);
+        TQHostLoadDenseScene(_host, kFamily, TQHostStressSceneSpec());
+        const std::vector<TQChannelObjectRootBase*> objects = _host.scene().objects();
+        const std::vector<TQChannelBase*> firstTwo(
+            objects.begin(), objects.begin() + std::min<std::ptrdiff_t>(2, std::ssize(objects)));
+        _host.setSelectedObjects(firstTwo);
     }
     _path.clear();
     markSaved();

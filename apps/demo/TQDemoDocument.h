@@ -46,6 +46,9 @@ public:
     // the editor is set up, whose start builds the (empty) custom sets and takes the
     // settings: only the scene, the time settings and a fresh editor state are made here.
     void loadSample();
+    // The stress scene in memory (100 objects of 30 channels, 1,000,000 keyframes), untitled
+    // and unmodified, its first two objects selected. Called where loadSample would be.
+    void loadStress();
     // An empty scene, untitled.
     void newDocument();
     // All or nothing: on failure the document and the editor stay exactly as they were.

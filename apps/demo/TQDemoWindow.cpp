@@ -53,13 +53,16 @@ std::string fileSystemPath(const QString& path) { return QFile::encodeName(path)
 
 }  // namespace
 
-TQDemoWindow::TQDemoWindow() {
+TQDemoWindow::TQDemoWindow(bool stress) {
     installDefaultPrompts();
     // Before the widgets: the ruler and the bar are bound to its models.
     _transport = new TQDemoTransport(_host, this);
     buildWidgets();
     buildMenus();
-    _document.loadSample();
+    if (stress)
+        _document.loadStress();
+    else
+        _document.loadSample();
     setUpController();
     _document.applyEditorState();
     _autoZoom->setChecked(_view.autoZoom() != 0);

@@ -97,7 +97,8 @@ class TQDemoWindow final : public QMainWindow,
                            public TQNotificationReceiver,
                            public TQQtUndoHistory {
 public:
-    TQDemoWindow();
+    // With `stress`, the window opens on the stress scene instead of the sample piece.
+    explicit TQDemoWindow(bool stress = false);
     ~TQDemoWindow() override;
 
     TQHostAppDelegate& host() { return _host; }

@@ -2,6 +2,8 @@
 //
 //   vce_demo                    opens the window on the sample piece, untitled
 //   vce_demo --open FILE        opens the window on the project FILE
+//   vce_demo --stress           opens the window on the stress scene (100 objects, 3,000
+//                               channels, 1,000,000 keyframes), untitled
 //   vce_demo --screenshot FILE  draws the window offscreen once the project is loaded, writes
 //                               it to FILE (PNG) and exits; needs no display
 //   vce_demo --measure-playback SECONDS
@@ -44,9 +46,10 @@ void settle(int milliseconds) {
 }
 
 int usage(const char* program) {
-    std::fprintf(stderr,
-                 "usage: %s [--open FILE] [--screenshot FILE | --measure-playback SECONDS]\n",
-                 program);
+    std::fprintf(
+        stderr,
+        "usage: %s [--open FILE | --stress] [--screenshot FILE | --measure-playback SECONDS]\n",
+        program);
     return 2;
 }
 
@@ -90,12 +93,15 @@ int main(int argc, char** argv) {
     QString screenshot;
     QString project;
     double measureSeconds = 0.0;
+    bool stress = false;
     for (int i = 1; i < argc; ++i) {
         const QString arg = QString::fromLocal8Bit(argv[i]);
         if (arg == QLatin1String("--screenshot") || arg == QLatin1String("--open")) {
             if (i + 1 >= argc || argv[i + 1][0] == '\0') return usage(argv[0]);
             (arg == QLatin1String("--open") ? project : screenshot) =
                 QString::fromLocal8Bit(argv[++i]);
+        } else if (arg == QLatin1String("--stress")) {
+            stress = true;
         } else if (arg == QLatin1String("--measure-playback")) {
             bool ok = false;
             if (i + 1 < argc) measureSeconds = QString::fromLocal8Bit(argv[++i]).toDouble(&ok);
@@ -127,7 +133,8 @@ int main(int argc, char** argv) {
     TQQtModalService modal;
     modal.install();
 
-    TQDemoWindow window;
+    if (stress && !project.isEmpty()) return usage(argv[0]);
+    TQDemoWindow window(stress);
     if (!screenshot.isEmpty()) {
         // No one could answer a dialog offscreen: a file that cannot be read ends the run.
         window.prompts().showError = [](const QString& text, const QString& detail) {
