@@ -672,5 +672,12 @@ bool TQCurveEditorCtrl::validateMenuItem(RWMenuItem& item) {
         if (item.action() == action) return false;
     // The pop-up's sets can always be chosen; the context menus are the base's to judge.
     if (_curveSetsPopUp && item.menu() && item.menu() == _curveSetsPopUp->menu().get()) return true;
+    const std::string& action = item.action();
+    if ((action == "cut:" || action == "delete:" || action == "copy:") &&
+        !selectedChannels().empty())
+        return true;
+    // Beyond the channels' selection, a paste needs something to paste.
+    if (action == "paste:") return canPaste();
+    if (action == "nextKeyframe:" || action == "previousKeyframe:") return true;
     return TQCurveEditorCtrlBase::validateMenuItem(item);
 }

@@ -39,6 +39,7 @@
 #include "src/contract/TQNotificationWords.h"
 #include "src/curvesets/TQAutomaticCurveSets.h"
 #include "src/editor/TQCurveEditorListOutlets.h"
+#include "src/editor/TQKeypointClipboard.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
 
 class TQCurveEditorView;
@@ -234,13 +235,30 @@ public:
     void animMenuPreviousKeyframe(RWActionSender* sender = nullptr);
     void nextKeyframe(RWActionSender* sender = nullptr) { animMenuNextKeyframe(sender); }
     void previousKeyframe(RWActionSender* sender = nullptr) { animMenuPreviousKeyframe(sender); }
-    // The clipboard's actions, taken so that the editor answers them in the responder chain.
+
+    // ---- Clipboard (TQCurveEditorCtrlClipboard.cpp) ----
+    //
+    // Keypoints through the application's pasteboard (TQKeypointClipboard.h). Each action
+    // reads the view's selection when it runs, validated first, so an item chosen after its
+    // channel went away copies or cuts nothing of it.
+
+    // The selected keypoints onto the pasteboard; with none, the pasteboard keeps what it held.
     virtual void copy(RWActionSender* sender = nullptr);
+    // Copies, then deletes the unlocked keypoints of the selection in one undo step.
     virtual void cut(RWActionSender* sender = nullptr);
+    // pasteKeypoints; its answer is kept for the host (lastPasteResult).
     virtual void paste(RWActionSender* sender = nullptr);
     void menuCopy(RWActionSender* sender = nullptr) { copy(sender); }
     void menuCut(RWActionSender* sender = nullptr) { cut(sender); }
     void menuPaste(RWActionSender* sender = nullptr) { paste(sender); }
+    // The pasteboard's keypoints at the playhead, their spacing kept, each group into the
+    // shown channel it was copied from (by reference; a selected one first when several
+    // objects show it) or else into the next selected channel of its kind. One undo step;
+    // the pasted keypoints become the selection. Anything refused changes nothing.
+    TQPasteResult pasteKeypoints();
+    TQPasteResult lastPasteResult() const { return _lastPasteResult; }
+    // Whether the pasteboard holds keypoints (not whether they would paste).
+    bool canPaste() const;
 
     // ---- Simplify and generate (TQCurveEditorCtrlSimplify.cpp) ----
     //
@@ -426,7 +444,15 @@ public:
     // auto-zoom switch), then the base's.
     bool performAction(const std::string& action, RWActionSender& sender) override;
     // New and Manage stay disabled: the panels behind them are not this controller's to run.
+    // Cut, Delete and Copy want a selected channel, Paste keypoints on the pasteboard; the
+    // keyframe jumps are always offered.
     bool validateMenuItem(RWMenuItem& item) override;
+    // Copy, Cut and Paste before Delete in the keypoint menu, and as the background menu.
+    void buildKeyframeMenu() override;
+    void buildDefaultMenu() override;
+    // Cut, Delete and Paste want an unlocked keypoint selected; Copy a modifiable channel.
+    bool validateKeyframeMenuItem(RWMenuItem& item) override;
+    bool validateDefaultMenuItem(RWMenuItem& item) override;
 
 protected:
     // Sample count of a refresh: the view's width, truncated.
@@ -457,6 +483,13 @@ protected:
     void closeGeneratePanel();
     // A scroller pan of the view by a fraction of its range.
     void panVertically(double fraction);
+    // The keypoints of the list's live entries, grouped by channel; empty without any.
+    TQKeypointClip clipOfSelection(const TQCurveSelectionList& list) const;
+    // The view's selection validated and copied; answers it, or null when nothing was copied.
+    TQCurveSelectionList* copySelectedKeypoints();
+    // The channel item each group of the clip pastes into, in the clip's order; null where
+    // there is none.
+    std::vector<TQCurveEditorChannelItem*> pasteTargets(const TQKeypointClip& clip) const;
 
     // ---- Fields, in declaration order ----
     std::shared_ptr<RWZoomScroller> _verticalScroller;
@@ -508,6 +541,7 @@ protected:
     std::optional<std::vector<TQCurveSetPtr>> _curveSetsTemp;
     bool _curveSetValid = true;
     bool _useRelativeCurveSets = true;
+    TQPasteResult _lastPasteResult = TQPasteResult::kPasted;
 
 private:
     // The observation of the pop-up's will-pop-up notification, while it lasts.

@@ -1,6 +1,6 @@
 // The commands of the animation menu on whole channels: interpolation, extrapolation, lock,
 // animation on and off, a keyframe at the playhead added or deleted, reset, back to the ghost;
-// the playhead to the next or previous keyframe; the clipboard's actions.
+// the playhead to the next or previous keyframe.
 
 #include "src/editor/TQCurveEditorCtrl.h"
 
@@ -229,11 +229,3 @@ void TQCurveEditorCtrl::animMenuPreviousKeyframe(RWActionSender*) {
         [](const TQChannel& c, CMTime& t) { return c.previousKeyframeTime(&t, false); },
         [](CMTime t, CMTime best) { return CMTimeCompare(t, best) >= 0; });
 }
-
-// ---- Clipboard ------------------------------------------------------------------------------
-
-void TQCurveEditorCtrl::copy(RWActionSender*) {}
-
-void TQCurveEditorCtrl::cut(RWActionSender*) {}
-
-void TQCurveEditorCtrl::paste(RWActionSender*) {}
