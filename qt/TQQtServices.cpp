@@ -256,6 +256,7 @@ TQQtServiceInstaller::TQQtServiceInstaller()
     RWServiceSet mine;
     mine.clock = &_clock;
     mine.timer = &_timer;
+    mine.pasteboard = &_pasteboard;
     RWInstallServices(mine);
     HXDTextMetrics::setShared(&_metrics);
 }
@@ -264,6 +265,7 @@ TQQtServiceInstaller::~TQQtServiceInstaller() {
     RWServiceSet back;
     back.clock = _previous.clock;
     back.timer = _previous.timer;
+    back.pasteboard = _previous.pasteboard;
     RWInstallServices(back);
     // The estimate, if that is what was there, behaves the same installed as not.
     HXDTextMetrics::setShared(_previousMetrics);

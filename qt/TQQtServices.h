@@ -1,6 +1,6 @@
 #pragma once
 // The platform services of platform/ui on Qt: a monotonic clock, delayed calls on the Qt
-// event loop, and the view host of a QWidget.
+// event loop, the view host of a QWidget, and (TQQtPasteboard.h) the system clipboard.
 //
 // Coordinates. The views think in points with the origin at the bottom left and y up; a
 // QWidget has its origin at the top left and y down. Qt's logical pixels are our points and
@@ -19,6 +19,7 @@
 
 #include "platform/ui/RWServices.h"
 #include "qt/TQQtPainterEncoder.h"
+#include "qt/TQQtPasteboard.h"
 #include "src/resources/GDCursor.h"
 
 // Seconds since the clock was made, on the monotonic clock Qt's timers use.
@@ -109,9 +110,9 @@ private:
     std::vector<RWTrackingAreaPtr> _trackingAreas;
 };
 
-// Installs a Qt clock, a Qt timer and the Qt text metrics (so that text boxes are measured
-// with the font the painter draws with) as the process-wide services for its lifetime, and
-// puts back what was installed before. Make one after the QApplication, on the main thread.
+// Installs a Qt clock, a Qt timer, the system clipboard as the pasteboard and the Qt text
+// metrics (so that text boxes are measured with the font the painter draws with) as the
+// process-wide services for its lifetime, and puts back what was installed before. Make one after the QApplication, on the main thread.
 class TQQtServiceInstaller {
 public:
     TQQtServiceInstaller();
@@ -121,10 +122,12 @@ public:
 
     TQQtClock& clock() { return _clock; }
     TQQtTimerService& timer() { return _timer; }
+    TQQtPasteboard& pasteboard() { return _pasteboard; }
 
 private:
     TQQtClock _clock;
     TQQtTimerService _timer;
+    TQQtPasteboard _pasteboard;
     TQQtTextMetrics _metrics;
     RWServiceSet _previous;
     const HXDTextMetrics* _previousMetrics;

@@ -77,8 +77,7 @@ TQKeypointClip TQCurveEditorCtrl::clipOfSelection(const TQCurveSelectionList& li
         if (!CMTIME_IS_NUMERIC(axis)) continue;
         auto [group, added] = groupOfCurve.try_emplace(entry->getCurveId(), clip.channels.size());
         if (added)
-            clip.channels.push_back(
-                {item->channelRef()->getText(), TQChannelKind(*channel), {}});
+            clip.channels.push_back({item->channelRef()->getText(), TQChannelKind(*channel), {}});
         clip.channels[group->second].keys.push_back(
             keyframeState(*channel, entry->getHandle(), axis, value));
         earliest = CMTimeMinimum(earliest, axis);

@@ -22,8 +22,7 @@
 #include "platform/channels/TQChannel.h"
 #include "platform/ui/RWServices.h"
 
-inline constexpr const char* kTQKeypointClipboardType =
-    "application/x-vantacurveeditor-keypoints";
+inline constexpr const char* kTQKeypointClipboardType = "application/x-vantacurveeditor-keypoints";
 inline constexpr const char* kTQPlainTextClipboardType = "text/plain";
 
 struct TQKeypointClipChannel {
@@ -31,7 +30,6 @@ struct TQKeypointClipChannel {
     std::string kind;  // class name of the channel (TQChannelKind)
     // Times relative to the clip's earliest keypoint (axis time), in time order.
     std::vector<TQKeyframeState> keys;
-    friend bool operator==(const TQKeypointClipChannel&, const TQKeypointClipChannel&) = default;
 };
 
 struct TQKeypointClip {

@@ -1,0 +1,41 @@
+// Keypoints through the system clipboard: both forms go out together, other programs see the
+// readable one as text, and what another program puts there is not taken for keypoints.
+
+#include <gtest/gtest.h>
+
+#include <QClipboard>
+#include <QGuiApplication>
+#include <QMimeData>
+
+#include "qt/TQQtServices.h"
+#include "src/editor/TQKeypointClipboard.h"
+
+namespace {
+
+TEST(QtPasteboardTest, keypoints__both_forms_on_the_clipboard_and_read_back) {
+    TQQtServiceInstaller services;
+    RWPasteboard& board = *RWApplicationServices().pasteboard;
+    ASSERT_EQ(&board, &services.pasteboard());
+    TQKeypointClip clip;
+    TQKeyframeState key;
+    key.value = 2.5;
+    key.broken = true;
+    clip.channels.push_back({"./1/100", "TQChannel", {key}});
+    const int64_t before = board.changeCount();
+
+    TQPutKeypointClip(board, clip);
+    EXPECT_GT(board.changeCount(), before);
+    const QMimeData* data = QGuiApplication::clipboard()->mimeData();
+    ASSERT_TRUE(data);
+    EXPECT_TRUE(data->hasFormat(kTQKeypointClipboardType)) << "the first form kept by the second";
+    EXPECT_EQ(QGuiApplication::clipboard()->text().toStdString(), TQDescribeKeypointClip(clip));
+    const TQKeypointClipReading read = TQTakeKeypointClip(board);
+    ASSERT_EQ(read.status, TQKeypointClipRead::kOk);
+    EXPECT_EQ(TQWriteKeypointClip(read.clip), TQWriteKeypointClip(clip));
+
+    QGuiApplication::clipboard()->setText("another program's text");
+    EXPECT_EQ(TQTakeKeypointClip(board).status, TQKeypointClipRead::kNone);
+    EXPECT_EQ(board.stringForType("text/plain"), "another program's text");
+}
+
+}  // namespace
