@@ -14,8 +14,7 @@ QString formatOf(const std::string& type) { return QString::fromStdString(type);
 }  // namespace
 
 TQQtPasteboard::TQQtPasteboard() {
-    _changed = QObject::connect(clipboard(), &QClipboard::dataChanged,
-                                [this] { ++_changeCount; });
+    _changed = QObject::connect(clipboard(), &QClipboard::dataChanged, [this] { ++_changeCount; });
 }
 
 TQQtPasteboard::~TQQtPasteboard() { QObject::disconnect(_changed); }

@@ -36,6 +36,7 @@
 #include "qt/TQQtZoomScroller.h"
 #include "src/editor/TQCurveEditorPanels.h"
 #include "src/panels/TQTimingMoveController.h"
+#include "src/resources/TQStrings.h"
 
 namespace {
 
@@ -277,6 +278,7 @@ void TQDemoWindow::buildMenus() {
 
     _editMenu = new TQQtEditMenu(this, this);
     menuBar()->addMenu(_editMenu->menu());
+    buildClipboardActions(*_editMenu->menu());
     _editMenu->menu()->addSeparator();
     QAction* all = _editMenu->menu()->addAction(tr("Select &All"));
     all->setShortcut(QKeySequence(Qt::CTRL | Qt::Key_A));
@@ -381,6 +383,47 @@ void TQDemoWindow::frameAll(bool includeTime) {
         _controller.didSetViewContentsHorizontalOrigin(framed.origin.x, framed.size.width);
     }
     _controller.updateUI();
+}
+
+void TQDemoWindow::buildClipboardActions(QMenu& edit) {
+    edit.addSeparator();
+    struct Command {
+        QAction** field;
+        const char* key;
+        QKeySequence::StandardKey shortcut;
+        const char* action;
+    };
+    const Command commands[] = {
+        {&_copy, "Curve Editor Menu Copy", QKeySequence::Copy, "copy:"},
+        {&_cut, "Curve Editor Menu Cut", QKeySequence::Cut, "cut:"},
+        {&_paste, "Curve Editor Menu Paste", QKeySequence::Paste, "paste:"},
+    };
+    for (const Command& c : commands) {
+        QAction* action = edit.addAction(QString::fromStdString(TQLocalizedString(c.key)));
+        action->setShortcut(c.shortcut);
+        action->setData(QString(c.action));
+        *c.field = action;
+    }
+    connect(_copy, &QAction::triggered, this, [this] { _controller.copy(); });
+    connect(_cut, &QAction::triggered, this, [this] { _controller.cut(); });
+    connect(_paste, &QAction::triggered, this, [this] { pasteKeypoints(); });
+    // The menu shows what the editor would do now; closed, the shortcuts stay live and each
+    // command judges for itself (a refused paste says why in the status bar).
+    connect(&edit, &QMenu::aboutToShow, this, [this] {
+        for (QAction* action : {_copy, _cut, _paste}) {
+            RWMenuItem item(action->text().toStdString(), action->data().toString().toStdString());
+            action->setEnabled(_controller.validateMenuItem(item));
+        }
+    });
+    connect(&edit, &QMenu::aboutToHide, this, [this] {
+        for (QAction* action : {_copy, _cut, _paste}) action->setEnabled(true);
+    });
+}
+
+void TQDemoWindow::pasteKeypoints() {
+    _controller.paste();
+    if (const char* refusal = TQPasteRefusalKey(_controller.lastPasteResult()))
+        statusBar()->showMessage(QString::fromStdString(TQLocalizedString(refusal)), 6000);
 }
 
 void TQDemoWindow::deleteSelection() {

@@ -7,8 +7,10 @@
 // automatic and custom set. The automatic sets follow the objects selected, through the
 // controller's notify. View > Frame All fits the shown curves; View > Auto Zoom lets the view
 // fit them vertically at every frame (the scroller is disabled meanwhile). The Edit menu undoes
-// and redoes through the host's history and names the step it would undo; Delete deletes the
-// selected keypoints, or with the box tool forgets the box. In the curves, a right click opens
+// and redoes through the host's history and names the step it would undo; Copy, Cut and Paste
+// take keypoints through the system clipboard (pasted at the playhead; a refused paste says
+// why in the status bar); Delete deletes the selected keypoints, or with the box tool forgets
+// the box. In the curves, a right click opens
 // the menu of what lies under the pointer and the arrows nudge the selection (the curve
 // widget's key map).
 //
@@ -52,6 +54,7 @@
 #include "src/channellist/TQCurveEditorListController.h"
 
 class QAction;
+class QMenu;
 class QListWidget;
 class TQDemoScenePreview;
 class TQDemoTransport;
@@ -118,6 +121,9 @@ public:
     TQQtZoomScroller* verticalScroller() const { return _scroller; }
     QAction* autoZoomAction() const { return _autoZoom; }
     QAction* deleteAction() const { return _delete; }
+    QAction* copyAction() const { return _copy; }
+    QAction* cutAction() const { return _cut; }
+    QAction* pasteAction() const { return _paste; }
     // The inspector of the selected object, with its heads-up window.
     TQDemoInspector* inspector() const { return _inspector; }
     TQDemoTransport& transport() const { return *_transport; }
@@ -179,6 +185,10 @@ private:
     void installDefaultPrompts();
     // With the box tool, forgets the box; with the others, deletes the selected keypoints.
     void deleteSelection();
+    // Copy, Cut and Paste of keypoints, after Undo and Redo in the Edit menu.
+    void buildClipboardActions(QMenu& edit);
+    // The editor's paste; a refusal is told in the status bar.
+    void pasteKeypoints();
     // After the document was replaced: the controls and the view follow it.
     void documentReplaced();
     // Saves to the path, or names the failure in an error dialog.
@@ -222,6 +232,9 @@ private:
     TQQtEditMenu* _editMenu = nullptr;
     QAction* _autoZoom = nullptr;
     QAction* _delete = nullptr;
+    QAction* _copy = nullptr;
+    QAction* _cut = nullptr;
+    QAction* _paste = nullptr;
     TQQtWindowBinding* _windowBinding = nullptr;
     TQQtPanelDialog* _generateDialog = nullptr;
     TQDemoInspector* _inspector = nullptr;

@@ -34,8 +34,8 @@ protected:
         ASSERT_TRUE(set);
         // Two unlocked channels of one kind.
         for (uint32_t i = 0; i < set->numberOfChannelItems() && !itemB; ++i) {
-            auto item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(
-                set->channeItemAtIndex(i));
+            auto item =
+                std::dynamic_pointer_cast<TQCurveEditorChannelItem>(set->channeItemAtIndex(i));
             TQChannel* c = item ? item->channel() : nullptr;
             if (!c || c->isLocked(true) || dynamic_cast<TQChannelFixedInterpolation*>(c)) continue;
             if (!itemA)
@@ -113,9 +113,8 @@ TEST_F(KeypointClipboard, paste_into_another_channel__exact_keypoints_at_the_pla
         s.time = b()->toChannelTime(&axis);
         states.push_back(s);
     }
-    std::sort(states.begin(), states.end(), [](const auto& x, const auto& y) {
-        return CMTimeCompare(x.time, y.time) < 0;
-    });
+    std::sort(states.begin(), states.end(),
+              [](const auto& x, const auto& y) { return CMTimeCompare(x.time, y.time) < 0; });
     ASSERT_TRUE(want->setKeyframeStates(states));
     const Copy aBefore = copyOf(a());
     recorder.clearCalls();
@@ -168,7 +167,7 @@ TEST_F(KeypointClipboard, refused_paste__changes_nothing_and_says_why) {
     ctrl.copy();
     const std::string good = *board.stringForType(kTQKeypointClipboardType);
     auto ours = [&](std::string text) {
-        return [text] (RWPasteboard& p) { p.setString(text, kTQKeypointClipboardType); };
+        return [text](RWPasteboard& p) { p.setString(text, kTQKeypointClipboardType); };
     };
     auto edited = [&](const std::string& from, const std::string& to) {
         std::string text = good;
