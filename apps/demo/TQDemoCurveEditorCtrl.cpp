@@ -51,3 +51,9 @@ bool TQDemoCurveEditorCtrl::runValuePanel(TQCurveEditorValueWindow& window) {
     return TQCurveEditorValueController::openWithLocationValueInWindow(
         window.location, &window.value, parent, window.parentRect);
 }
+
+void TQDemoCurveEditorCtrl::paste(RWActionSender* sender) {
+    TQCurveEditorCtrl::paste(sender);
+    if (lastPasteResult() != TQPasteResult::kPasted && _pasteRefused)
+        _pasteRefused(lastPasteResult());
+}

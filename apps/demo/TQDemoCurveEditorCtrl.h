@@ -3,11 +3,13 @@
 // horizontal zoom and pan of the view become the host's display range, which comes back to
 // the view; an undo or redo of the host's history, which restores channels wholesale, is
 // followed by the word that every cached curve is stale. A keypoint's value is typed into the
-// framework's value panel.
+// framework's value panel. A refused paste is told to the window.
 //
 // Lifetime: the host is not owned and must outlive the controller; the controller hears the
 // host's words from construction until it dies. Two-phase like its base: construct, then
 // init(), the delegate, the view, the outlets, setupController and viewDidLoad.
+
+#include <functional>
 
 #include "host/TQHostAppDelegate.h"
 #include "src/editor/TQCurveEditorCtrl.h"
@@ -28,6 +30,12 @@ public:
     // The window the value panel of a double-clicked keypoint is placed in; not owned.
     void setEditorWindow(RWWindow* window) { _editorWindow = window; }
 
+    // Every paste, from the Edit menu or a context menu, tells a refusal through this.
+    void paste(RWActionSender* sender = nullptr) override;
+    void setPasteRefused(std::function<void(TQPasteResult)> told) {
+        _pasteRefused = std::move(told);
+    }
+
 protected:
     // The value panel of the framework (TQCurveEditorValueController), at the click, kept
     // inside the curves.
@@ -40,4 +48,5 @@ private:
 
     TQHostAppDelegate& _host;
     RWWindow* _editorWindow = nullptr;
+    std::function<void(TQPasteResult)> _pasteRefused;
 };

@@ -406,7 +406,11 @@ void TQDemoWindow::buildClipboardActions(QMenu& edit) {
     }
     connect(_copy, &QAction::triggered, this, [this] { _controller.copy(); });
     connect(_cut, &QAction::triggered, this, [this] { _controller.cut(); });
-    connect(_paste, &QAction::triggered, this, [this] { pasteKeypoints(); });
+    connect(_paste, &QAction::triggered, this, [this] { _controller.paste(); });
+    _controller.setPasteRefused([this](TQPasteResult result) {
+        if (const char* refusal = TQPasteRefusalKey(result))
+            statusBar()->showMessage(QString::fromStdString(TQLocalizedString(refusal)), 6000);
+    });
     // The menu shows what the editor would do now; closed, the shortcuts stay live and each
     // command judges for itself (a refused paste says why in the status bar).
     connect(&edit, &QMenu::aboutToShow, this, [this] {
@@ -418,12 +422,6 @@ void TQDemoWindow::buildClipboardActions(QMenu& edit) {
     connect(&edit, &QMenu::aboutToHide, this, [this] {
         for (QAction* action : {_copy, _cut, _paste}) action->setEnabled(true);
     });
-}
-
-void TQDemoWindow::pasteKeypoints() {
-    _controller.paste();
-    if (const char* refusal = TQPasteRefusalKey(_controller.lastPasteResult()))
-        statusBar()->showMessage(QString::fromStdString(TQLocalizedString(refusal)), 6000);
 }
 
 void TQDemoWindow::deleteSelection() {

@@ -187,8 +187,6 @@ private:
     void deleteSelection();
     // Copy, Cut and Paste of keypoints, after Undo and Redo in the Edit menu.
     void buildClipboardActions(QMenu& edit);
-    // The editor's paste; a refusal is told in the status bar.
-    void pasteKeypoints();
     // After the document was replaced: the controls and the view follow it.
     void documentReplaced();
     // Saves to the path, or names the failure in an error dialog.

@@ -1,5 +1,6 @@
-// Keypoints through the system clipboard: both forms go out together, other programs see the
-// readable one as text, and what another program puts there is not taken for keypoints.
+// Keypoints through the system clipboard: both forms go out together and the private one
+// reads back exactly, other programs see the readable one as text, and what another program
+// puts there is not taken for keypoints.
 
 #include <gtest/gtest.h>
 
@@ -17,10 +18,19 @@ TEST(QtPasteboardTest, keypoints__both_forms_on_the_clipboard_and_read_back) {
     RWPasteboard& board = *RWApplicationServices().pasteboard;
     ASSERT_EQ(&board, &services.pasteboard());
     TQKeypointClip clip;
-    TQKeyframeState key;
-    key.value = 2.5;
-    key.broken = true;
-    clip.channels.push_back({"./1/100", "TQChannel", {key}});
+    // Doubles at the edges of what a double holds, and every state off its default.
+    TQKeyframeState key{.time = CMTimeMake(7, 30),
+                        .value = -0.0,
+                        .inU = 5e-324,
+                        .inV = 1.7976931348623157e308,
+                        .outU = 0.1,
+                        .outV = -1.0 / 3.0,
+                        .interpolation = kTQInterpolationEaseIn,
+                        .locked = true,
+                        .enabled = false,
+                        .broken = true,
+                        .scaled = true};
+    clip.channels.push_back({"./1/100", "TQChannelAngle", {TQKeyframeState{}, key}});
     const int64_t before = board.changeCount();
 
     TQPutKeypointClip(board, clip);
@@ -31,6 +41,7 @@ TEST(QtPasteboardTest, keypoints__both_forms_on_the_clipboard_and_read_back) {
     EXPECT_EQ(QGuiApplication::clipboard()->text().toStdString(), TQDescribeKeypointClip(clip));
     const TQKeypointClipReading read = TQTakeKeypointClip(board);
     ASSERT_EQ(read.status, TQKeypointClipRead::kOk);
+    // The form is exact, so a clip read back writes the same text.
     EXPECT_EQ(TQWriteKeypointClip(read.clip), TQWriteKeypointClip(clip));
 
     QGuiApplication::clipboard()->setText("another program's text");

@@ -5,11 +5,9 @@
 // offer these commands are enabled when they can act.
 
 #include <algorithm>
-#include <cmath>
 #include <functional>
 #include <memory>
 #include <string>
-#include <tuple>
 
 #include "platform/channels/TQChannelTypes.h"
 #include "src/editor/tests/EditorFixture.h"
@@ -91,6 +89,9 @@ protected:
     bool enabled(const char* action) {
         RWMenuItem item(action, action);
         return ctrl.validateMenuItem(item);
+    }
+    bool enabled(const RWMenuPtr& menu, int64_t index) {
+        return ctrl.validateMenuItem(*menu->itemAtIndex(index));
     }
 
     RWMemoryPasteboard board;
@@ -218,32 +219,6 @@ TEST_F(KeypointClipboard, refused_paste__changes_nothing_and_says_why) {
     EXPECT_EQ(host.undoStack().undoCount(), 0u);
 }
 
-TEST_F(KeypointClipboard, private_form__reads_back_every_double_and_state_exactly) {
-    TQKeypointClip clip;
-    TQKeyframeState s;
-    s.time = CMTimeMake(7, 30);
-    s.value = -0.0;
-    s.inU = 5e-324;
-    s.inV = 1.7976931348623157e308;
-    s.outU = 0.1;
-    s.outV = -1.0 / 3.0;
-    s.interpolation = kTQInterpolationEaseIn;
-    s.broken = s.scaled = s.locked = true;
-    s.enabled = false;
-    clip.channels.push_back({"./1/100", "TQChannelAngle", {TQKeyframeState{}, s}});
-    const TQKeypointClipReading read = TQReadKeypointClip(TQWriteKeypointClip(clip));
-    ASSERT_EQ(read.status, TQKeypointClipRead::kOk);
-    ASSERT_EQ(read.clip.channels.size(), 1u);
-    const TQKeyframeState& r = read.clip.channels[0].keys[1];
-    EXPECT_TRUE(std::signbit(r.value));
-    EXPECT_EQ(r.inU, s.inU);
-    EXPECT_EQ(r.inV, s.inV);
-    EXPECT_EQ(r.outV, s.outV);
-    EXPECT_TRUE(CMTimeCompare(r.time, s.time) == 0);
-    EXPECT_EQ(std::tie(r.interpolation, r.broken, r.scaled, r.locked, r.enabled),
-              std::tie(s.interpolation, s.broken, s.scaled, s.locked, s.enabled));
-}
-
 TEST_F(KeypointClipboard, validation__by_channels_keypoints_locks_and_the_pasteboard) {
     ctrl.deselectAllChannels();
     view.getSelection()->reset();
@@ -263,17 +238,17 @@ TEST_F(KeypointClipboard, validation__by_channels_keypoints_locks_and_the_pasteb
     for (int64_t i = 0; i < 4; ++i) firstFour.push_back(keys->itemAtIndex(i)->action());
     EXPECT_EQ(firstFour,
               (std::vector<std::string>{"menuCopy:", "menuCut:", "menuPaste:", "menuDelete:"}));
-    auto keyItem = [&](int64_t i) { return ctrl.validateMenuItem(*keys->itemAtIndex(i)); };
-    EXPECT_TRUE(keyItem(0) && keyItem(1) && keyItem(2) && keyItem(3));
+    EXPECT_TRUE(enabled(keys, 0) && enabled(keys, 1) && enabled(keys, 2) && enabled(keys, 3));
     a()->setKeyframeLocked(a()->getKeyframe(sec(1)), true);
-    EXPECT_TRUE(keyItem(0)) << "a locked keypoint can be copied";
-    EXPECT_FALSE(keyItem(1) || keyItem(2) || keyItem(3)) << "but not cut, pasted on or deleted";
+    EXPECT_TRUE(enabled(keys, 0)) << "a locked keypoint can be copied";
+    EXPECT_FALSE(enabled(keys, 1) || enabled(keys, 2) || enabled(keys, 3))
+        << "not cut, pasted on, deleted";
 
     const RWMenuPtr& background = ctrl.getDefaultMenu();
     ASSERT_EQ(background->numberOfItems(), 3);
     board.clearContents();
-    EXPECT_TRUE(ctrl.validateMenuItem(*background->itemAtIndex(0)));
-    EXPECT_FALSE(ctrl.validateMenuItem(*background->itemAtIndex(2))) << "nothing to paste";
+    EXPECT_TRUE(enabled(background, 0));
+    EXPECT_FALSE(enabled(background, 2)) << "nothing to paste";
 }
 
 }  // namespace
