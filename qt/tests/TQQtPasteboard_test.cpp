@@ -1,12 +1,11 @@
 // Keypoints through the system clipboard: both forms go out together and the private one
-// reads back exactly, other programs see the readable one as text, and what another program
-// puts there is not taken for keypoints.
+// reads back exactly; other programs see the readable one as text, and their text is not
+// taken for keypoints.
 
 #include <gtest/gtest.h>
 
 #include <QClipboard>
 #include <QGuiApplication>
-#include <QMimeData>
 
 #include "qt/TQQtServices.h"
 #include "src/editor/TQKeypointClipboard.h"
@@ -14,10 +13,8 @@
 namespace {
 
 TEST(QtPasteboardTest, keypoints__both_forms_on_the_clipboard_and_read_back) {
-    TQQtServiceInstaller services;
+    const TQQtServiceInstaller services;
     RWPasteboard& board = *RWApplicationServices().pasteboard;
-    ASSERT_EQ(&board, &services.pasteboard());
-    TQKeypointClip clip;
     // Doubles at the edges of what a double holds, and every state off its default.
     TQKeyframeState key{.time = CMTimeMake(7, 30),
                         .value = -0.0,
@@ -30,23 +27,18 @@ TEST(QtPasteboardTest, keypoints__both_forms_on_the_clipboard_and_read_back) {
                         .enabled = false,
                         .broken = true,
                         .scaled = true};
+    TQKeypointClip clip;
     clip.channels.push_back({"./1/100", "TQChannelAngle", {TQKeyframeState{}, key}});
-    const int64_t before = board.changeCount();
 
     TQPutKeypointClip(board, clip);
-    EXPECT_GT(board.changeCount(), before);
-    const QMimeData* data = QGuiApplication::clipboard()->mimeData();
-    ASSERT_TRUE(data);
-    EXPECT_TRUE(data->hasFormat(kTQKeypointClipboardType)) << "the first form kept by the second";
     EXPECT_EQ(QGuiApplication::clipboard()->text().toStdString(), TQDescribeKeypointClip(clip));
     const TQKeypointClipReading read = TQTakeKeypointClip(board);
-    ASSERT_EQ(read.status, TQKeypointClipRead::kOk);
+    ASSERT_EQ(read.status, TQKeypointClipRead::kOk) << "the first form kept beside the second";
     // The form is exact, so a clip read back writes the same text.
     EXPECT_EQ(TQWriteKeypointClip(read.clip), TQWriteKeypointClip(clip));
 
     QGuiApplication::clipboard()->setText("another program's text");
     EXPECT_EQ(TQTakeKeypointClip(board).status, TQKeypointClipRead::kNone);
-    EXPECT_EQ(board.stringForType("text/plain"), "another program's text");
 }
 
 }  // namespace
