@@ -2,7 +2,7 @@
 // with broken, scaled handles land in another channel exactly as they were, spaced as they
 // were from the playhead, in one step that undo and redo walk exactly; what the pasteboard
 // holds that is not ours, is damaged or has nowhere to go changes nothing; and the items that
-// offer these commands are enabled when they can act.
+// offer these commands are enabled when they can act (a cut, one named step, enables Paste).
 
 #include <algorithm>
 #include <memory>
@@ -51,7 +51,6 @@ protected:
         }
         b()->deleteAllKeyframes(kCMTimeZero);
         b()->setKeyframe(sec(0.5), 1.0);
-        host.undoStack().clear();
     }
     void TearDown() override {
         RWResetServices();
@@ -117,18 +116,6 @@ TEST_F(KeypointClipboard, paste_into_another_channel__exact_keypoints_at_the_pla
     EXPECT_EQ(a()->numberOfKeyframes(), 5u);
 }
 
-TEST_F(KeypointClipboard, cut__copies_the_selection_and_deletes_the_unlocked_in_one_step) {
-    a()->setKeyframeLocked(a()->getKeyframe(sec(3)), true);
-    const Copy before = copyOf(a());
-    selectKeypoints({1.0, 3.0});
-    ctrl.cut();
-    EXPECT_TRUE(!a()->getKeyframe(sec(1)) && a()->getKeyframe(sec(3))) << "the locked one stays";
-    EXPECT_EQ(TQTakeKeypointClip(board).clip.keyCount(), 2u);
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Cut Keypoints"));
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(*a() == *before);
-}
-
 TEST_F(KeypointClipboard, refused_paste__changes_nothing_and_says_why) {
     selectKeypoints({1.0, 2.0});
     ctrl.copy();
@@ -137,11 +124,8 @@ TEST_F(KeypointClipboard, refused_paste__changes_nothing_and_says_why) {
         std::string text = good;
         return text.replace(text.find(from), from.size(), to);
     };
-    struct Row {
-        std::string ours;  // under our type; empty: another program's text only
-        TQPasteResult result;
-    };
-    std::vector<Row> rows = {
+    // What lies under our type (nothing: another program's text only), and the answer.
+    std::vector<std::pair<std::string, TQPasteResult>> rows = {
         {"", TQPasteResult::kNothingToPaste},
         {"hello", TQPasteResult::kDamaged},
         {edited(" 10 ", " nan "), TQPasteResult::kDamaged},
@@ -154,14 +138,14 @@ TEST_F(KeypointClipboard, refused_paste__changes_nothing_and_says_why) {
         rows.push_back({good.substr(0, cut), TQPasteResult::kDamaged});
     const Copy beforeA = copyOf(a()), beforeB = copyOf(b());
     ctrl.deselectAllChannels();
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.ours);
+    for (const auto& [ours, result] : rows) {
+        SCOPED_TRACE(ours);
         board.clearContents();
         board.setString("1 2 3", "text/plain");
-        if (!row.ours.empty()) board.setString(row.ours, kTQKeypointClipboardType);
+        if (!ours.empty()) board.setString(ours, kTQKeypointClipboardType);
         recorder.clearCalls();
         ctrl.paste();
-        EXPECT_EQ(ctrl.lastPasteResult(), row.result);
+        EXPECT_EQ(ctrl.lastPasteResult(), result);
         EXPECT_TRUE(*a() == *beforeA && *b() == *beforeB && recorder.bracketSequence().empty());
     }
     board.setString(good, kTQKeypointClipboardType);
@@ -177,14 +161,17 @@ TEST_F(KeypointClipboard, validation__by_channels_keypoints_locks_and_the_pasteb
         << "no channel selected, nothing to paste";
     EXPECT_TRUE(enabled("nextKeyframe:") && enabled("previousKeyframe:"));
     itemA->select(1);
-    selectKeypoints({1.0});
-    ctrl.copy();
+    selectKeypoints({1.0, 2.0});
+    ctrl.cut();
+    EXPECT_FALSE(a()->getKeyframe(sec(1)) || a()->getKeyframe(sec(2)));
+    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Cut Keypoints"));
     EXPECT_TRUE(enabled("copy:") && enabled("cut:") && enabled("delete:") && enabled("paste:"));
 
     // The keypoint menu begins Copy, Cut, Paste, Delete.
     const RWMenuPtr& keys = ctrl.getKeyframeMenu();
+    selectKeypoints({3.0});
     EXPECT_TRUE(enabled(keys, 1) && enabled(keys, 2) && enabled(keys, 3));
-    a()->setKeyframeLocked(a()->getKeyframe(sec(1)), true);
+    a()->setKeyframeLocked(a()->getKeyframe(sec(3)), true);
     EXPECT_TRUE(enabled(keys, 0)) << "a locked keypoint can be copied";
     EXPECT_FALSE(enabled(keys, 1) || enabled(keys, 2) || enabled(keys, 3));
     board.clearContents();
