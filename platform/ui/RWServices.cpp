@@ -11,6 +11,11 @@ bool RWPasteboard::setString(const std::string& text, const std::string& type) {
     return setData(std::vector<uint8_t>(text.begin(), text.end()), type);
 }
 
+void RWPasteboard::declareTypes(const std::vector<std::string>& types) {
+    clearContents();
+    for (const std::string& type : types) setData({}, type);
+}
+
 std::optional<std::string> RWPasteboard::stringForType(const std::string& type) const {
     auto data = dataForType(type);
     if (!data) return std::nullopt;

@@ -145,6 +145,9 @@ public:
     virtual std::vector<std::string> types() const = 0;
 
     bool setString(const std::string& text, const std::string& type);
+    // Empties the pasteboard and names the types it holds, with empty payloads: a drag whose
+    // data travels elsewhere declares only what it carries.
+    void declareTypes(const std::vector<std::string>& types);
     std::optional<std::string> stringForType(const std::string& type) const;
     // The first type of the list that the pasteboard holds.
     std::optional<std::string> availableTypeFromArray(const std::vector<std::string>& wanted) const;

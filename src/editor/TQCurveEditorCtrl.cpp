@@ -12,6 +12,7 @@
 #include <unordered_set>
 
 #include "src/editor/TQCurveEditorView.h"
+#include "src/editor/TQCurveSetManagerList.h"
 #include "src/panels/TQEditorControls.h"
 #include "src/resources/TQStrings.h"
 
@@ -52,6 +53,10 @@ TQCurveEditorCtrl::~TQCurveEditorCtrl() {
     _curveSets.clear();
     for (const std::shared_ptr<RWPanel>& panel : {_reducePanel, _generatePanel, _curveSetNewPanel})
         if (panel && panel->delegate() == this) panel->setDelegate(nullptr);
+    if (_curveSetManagerList && _curveSetManagerList->controller() == this) {
+        _curveSetManagerList->setController(nullptr);
+        _curveSetManagerList->setDelegate(nullptr);
+    }
 }
 
 // ---- Lifecycle -------------------------------------------------------------------------------
@@ -618,6 +623,16 @@ constexpr NamedAction kActions[] = {
     {"showOpacity:", &TQCurveEditorCtrl::showOpacity},
     {"showRetiming:", &TQCurveEditorCtrl::showRetiming},
     {"showCustom:", &TQCurveEditorCtrl::showCustom},
+    {"showCurveSet:", &TQCurveEditorCtrl::showCurveSet},
+    {"curveSetManagerApply:", &TQCurveEditorCtrl::curveSetManagerApply},
+    {"curveSetManagerDone:", &TQCurveEditorCtrl::curveSetManagerDone},
+    {"curveSetManagerCancel:", &TQCurveEditorCtrl::curveSetManagerCancel},
+    {"plusMinusPressed:", &TQCurveEditorCtrl::plusMinusPressed},
+    {"curveSetManagerNew:", &TQCurveEditorCtrl::curveSetManagerNew},
+    {"curveSetManagerDelete:", &TQCurveEditorCtrl::curveSetManagerDelete},
+    {"curveSetManagerDuplicate:", &TQCurveEditorCtrl::curveSetManagerDuplicate},
+    {"showNewCurveSet:", &TQCurveEditorCtrl::showNewCurveSet},
+    {"newCurveSetOk:", &TQCurveEditorCtrl::newCurveSetOk},
     {"newCurveSetCancel:", &TQCurveEditorCtrl::newCurveSetCancel},
     {"animMenuSetCurveInterpolation:", &TQCurveEditorCtrl::animMenuSetCurveInterpolation},
     {"animMenuSetCurvePreExtrapolation:", &TQCurveEditorCtrl::animMenuSetCurvePreExtrapolation},
@@ -654,8 +669,6 @@ constexpr NamedAction kActions[] = {
     {"menuCut:", &TQCurveEditorCtrl::menuCut},
     {"menuPaste:", &TQCurveEditorCtrl::menuPaste},
 };
-// Items whose panels this controller does not run.
-constexpr const char* kPanelActions[] = {"showNewCurveSet:", "showCurveSet:"};
 }  // namespace
 
 bool TQCurveEditorCtrl::performAction(const std::string& action, RWActionSender& sender) {
@@ -668,8 +681,9 @@ bool TQCurveEditorCtrl::performAction(const std::string& action, RWActionSender&
 }
 
 bool TQCurveEditorCtrl::validateMenuItem(RWMenuItem& item) {
-    for (const char* action : kPanelActions)
-        if (item.action() == action) return false;
+    // The panels' entries work once their panels are connected.
+    if (item.action() == "showNewCurveSet:") return _curveSetNewPanel != nullptr;
+    if (item.action() == "showCurveSet:") return _curveSetManagerPanel != nullptr;
     // The pop-up's sets can always be chosen; the context menus are the base's to judge.
     if (_curveSetsPopUp && item.menu() && item.menu() == _curveSetsPopUp->menu().get()) return true;
     const std::string& action = item.action();

@@ -32,6 +32,7 @@
 
 #include "platform/ui/RWPopUpButton.h"
 #include "platform/ui/RWSegmentedControl.h"
+#include "platform/ui/RWTableView.h"
 #include "platform/ui/RWTextField.h"
 #include "platform/ui/RWValueControls.h"
 #include "platform/ui/RWWindow.h"
@@ -44,6 +45,7 @@
 
 class TQCurveEditorView;
 class TQCurveSetListSerializer;
+class TQCurveSetManagerList;
 
 // The controls of the editor, as a host connects them.
 struct TQCurveEditorOutlets {
@@ -57,7 +59,7 @@ struct TQCurveEditorOutlets {
 
     std::shared_ptr<RWPopUpButton> curveSetsPopUp;
     std::shared_ptr<RWPanel> curveSetManagerPanel;
-    TQEditorCurveSetManagerTable* curveSetManagerList = nullptr;
+    TQCurveSetManagerList* curveSetManagerList = nullptr;
     RWControlPtr curveSetManagerApply;
     std::shared_ptr<RWSegmentedControl> plusMinusSegmentedControl;
     RWControlPtr curveSetManagerDuplicate;
@@ -83,10 +85,16 @@ struct TQCurveEditorOutlets {
 
 class TQCurveEditorCtrl : public TQCurveEditorCtrlBase,
                           public TQNotificationReceiver,
-                          public RWWindowDelegate {
+                          public RWWindowDelegate,
+                          public RWTableViewDataSource,
+                          public RWTableViewDelegate {
 public:
     // The private drag type of the manager's rows.
     static constexpr const char* kPrivateDragType = "TQCurveEditorPrivateDrag";
+    // The columns of the manager's table.
+    static constexpr const char* kNameColumn = "Name";
+    static constexpr const char* kRelativeColumn = "Relative";
+    static constexpr const char* kShortcutColumn = "Shortcut";
     // The tool switch's images, by tool id.
     static constexpr const char* kToolImageNames[] = {"K_KeyframeEditor_EditKeyframes",
                                                       "K_KeyframeEditor_SketchKeyframes",
@@ -163,9 +171,6 @@ public:
     bool windowShouldClose(RWWindow& window) override;
     // The generate and simplify panels end their modal run; the new-set panel cancels.
     void windowWillClose(RWWindow& window) override;
-    // The new-set panel's Cancel: ends its modal run, hides it, updates the controls and the
-    // pop-up.
-    void newCurveSetCancel(RWActionSender* sender = nullptr);
     // The reference width from the display range, and the custom sets sampled at the view's
     // width.
     void viewDidResize() override;
@@ -435,17 +440,66 @@ public:
     // ---- The curve set pop-up ----
 
     // Rebuilds the pop-up's menu: the automatic sets, the sets by property when offered, the
-    // custom sets, New and Manage; the selected set's item selected and its title shown.
+    // custom sets, New and Manage; the selected set's item selected and its title shown. Each
+    // set's shortcut stands beside it, as a plain key.
     virtual void refreshPopUp();
+
+    // ---- The curve set panels (TQCurveEditorCtrlSetPanels.cpp) ----
+    //
+    // The manager runs modally on working copies of the custom sets; the sets as they were
+    // wait in _curveSetsTemp until Done keeps the copies or Cancel puts the originals back.
+
+    // Opens the manager and returns when it has stopped.
+    void showCurveSet(RWActionSender* sender = nullptr);
+    // The set of the table's selected row becomes the shown one; the panel stays open.
+    void curveSetManagerApply(RWActionSender* sender = nullptr);
+    // Keeps the edits and closes, unless a rename was just refused.
+    void curveSetManagerDone(RWActionSender* sender = nullptr);
+    // Puts every set back as it was when the manager opened, and closes.
+    void curveSetManagerCancel(RWActionSender* sender = nullptr);
+    // The add and remove pair: segment 0 adds, any other removes.
+    void plusMinusPressed(RWActionSender* sender);
+    void curveSetManagerNew(RWActionSender* sender = nullptr);
+    // Removing the last set shows All.
+    void curveSetManagerDelete(RWActionSender* sender = nullptr);
+    void curveSetManagerDuplicate(RWActionSender* sender = nullptr);
+    bool isManagingCurveSets() const { return _curveSetsTemp.has_value(); }
+    // Opens the new-set panel, its name field holding the untitled name.
+    void showNewCurveSet(RWActionSender* sender = nullptr);
+    // A copy of the shown set under the field's name (the untitled one for a blank name),
+    // shown, as one undo step.
+    void newCurveSetOk(RWActionSender* sender = nullptr);
+    // The new-set panel's Cancel: ends its modal run, hides it, updates the controls and the
+    // pop-up.
+    void newCurveSetCancel(RWActionSender* sender = nullptr);
+
+    // The manager's table: one row per custom set.
+    int64_t numberOfRowsInTableView(RWTableView& table) override;
+    RWObjectValue objectValueForTableColumn(RWTableView& table, const RWTableColumn& column,
+                                            int64_t row) override;
+    // A name taken by another row raises the one alert and is refused; a blank name or a
+    // shortcut another set has is refused without one.
+    void setObjectValue(RWTableView& table, const RWObjectValue& value, const RWTableColumn& column,
+                        int64_t row) override;
+    void willDisplayCell(RWTableView& table, RWCell& cell, const RWTableColumn& column,
+                         int64_t row) override;
+    // The rows travel in _draggedRows; the pasteboard only names the private type.
+    bool writeRows(RWTableView& table, const std::vector<int64_t>& rows,
+                   RWPasteboard& pasteboard) override;
+    // Every drop lands between rows.
+    uint64_t validateDrop(RWTableView& table, RWDraggingInfo& info, int64_t row,
+                          RWTableViewDropOperation operation) override;
+    bool acceptDrop(RWTableView& table, RWDraggingInfo& info, int64_t row,
+                    RWTableViewDropOperation operation) override;
 
     // ---- Target and action ----
 
     // The actions above by name (the pop-up's items, the tool switch, the scroller, the
     // auto-zoom switch), then the base's.
     bool performAction(const std::string& action, RWActionSender& sender) override;
-    // New and Manage stay disabled: the panels behind them are not this controller's to run.
-    // Cut, Delete and Copy want a selected channel, Paste keypoints on the pasteboard; the
-    // keyframe jumps are always offered.
+    // New and Manage are enabled while their panels are connected. Cut, Delete and Copy want a
+    // selected channel, Paste keypoints on the pasteboard; the keyframe jumps are always
+    // offered.
     bool validateMenuItem(RWMenuItem& item) override;
     // Copy, Cut and Paste before Delete in the keypoint menu, and as the background menu.
     void buildKeyframeMenu() override;
@@ -458,7 +512,13 @@ protected:
     // Sample count of a refresh: the view's width, truncated.
     uint32_t refreshSampleCount() const;
     // The show... actions' common shape.
-    void showCurveSet(const TQCurveSetPtr& set);
+    void showSelectedCurveSet(const TQCurveSetPtr& set);
+    // Whether another set than `except` (automatic or custom) has the shortcut.
+    bool isShortcutTaken(const BNString& shortcut, const TQCurveSet* except) const;
+    // Selects a row of the manager's table and scrolls to it.
+    void selectManagerRow(int64_t row);
+    // The custom set at a row of the manager's table, or null.
+    TQCurveSetPtr curveSetAtRow(int64_t row) const;
     // On an automatic set: a new custom set named with the untitled text and the next number,
     // selected. Answers the selected set.
     TQCurveSetPtr customSetForAdding();
@@ -502,7 +562,7 @@ protected:
     float _oldKnobValue = 0.0f;
     std::shared_ptr<RWPopUpButton> _curveSetsPopUp;
     std::shared_ptr<RWPanel> _curveSetManagerPanel;
-    TQEditorCurveSetManagerTable* _curveSetManagerList = nullptr;  // not owned
+    TQCurveSetManagerList* _curveSetManagerList = nullptr;  // not owned
     RWControlPtr _curveSetManagerApply;
     std::shared_ptr<RWSegmentedControl> _plusMinusSegmentedControl;
     RWControlPtr _curveSetManagerDuplicate;
@@ -539,6 +599,8 @@ protected:
     std::shared_ptr<TQCurveSetRetiming> _curveSetRetiming;
     // While the manager runs: the custom sets as they were before it opened.
     std::optional<std::vector<TQCurveSetPtr>> _curveSetsTemp;
+    // While the manager runs: the set shown when it opened, for Cancel to show again.
+    TQCurveSetPtr _shownBeforeManaging;
     bool _curveSetValid = true;
     bool _useRelativeCurveSets = true;
     TQPasteResult _lastPasteResult = TQPasteResult::kPasted;

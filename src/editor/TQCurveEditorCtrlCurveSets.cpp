@@ -1,6 +1,6 @@
 // The curve set side of the full editor's controller: the automatic sets, the ordered list of
 // custom sets, the selected set, creating, cloning and filling sets, and the pop-up that
-// offers them all.
+// offers them all. The panels that manage the sets are in TQCurveEditorCtrlSetPanels.cpp.
 
 #include <algorithm>
 #include <array>
@@ -64,31 +64,31 @@ void TQCurveEditorCtrl::refreshCurveSet(const TQCurveSetPtr& set) {
     updateUI();
 }
 
-void TQCurveEditorCtrl::showCurveSet(const TQCurveSetPtr& set) {
+void TQCurveEditorCtrl::showSelectedCurveSet(const TQCurveSetPtr& set) {
     if (set == _selectedCurveSet) return;
     setSelectedCurveSet(set);
     refreshSelectedCurveSet();
     updateUI();
 }
 
-void TQCurveEditorCtrl::showAll(RWActionSender*) { showCurveSet(_curveSetAll); }
-void TQCurveEditorCtrl::showAnimated(RWActionSender*) { showCurveSet(_curveSetAnimated); }
-void TQCurveEditorCtrl::showModified(RWActionSender*) { showCurveSet(_curveSetModified); }
-void TQCurveEditorCtrl::showActive(RWActionSender*) { showCurveSet(_curveSetCurrent); }
-void TQCurveEditorCtrl::showPosition(RWActionSender*) { showCurveSet(_curveSetPosition); }
-void TQCurveEditorCtrl::showRotation(RWActionSender*) { showCurveSet(_curveSetRotation); }
-void TQCurveEditorCtrl::showScale(RWActionSender*) { showCurveSet(_curveSetScale); }
-void TQCurveEditorCtrl::showShear(RWActionSender*) { showCurveSet(_curveSetShear); }
-void TQCurveEditorCtrl::showPivot(RWActionSender*) { showCurveSet(_curveSetPivot); }
-void TQCurveEditorCtrl::showOpacity(RWActionSender*) { showCurveSet(_curveSetOpacity); }
-void TQCurveEditorCtrl::showRetiming(RWActionSender*) { showCurveSet(_curveSetRetiming); }
+void TQCurveEditorCtrl::showAll(RWActionSender*) { showSelectedCurveSet(_curveSetAll); }
+void TQCurveEditorCtrl::showAnimated(RWActionSender*) { showSelectedCurveSet(_curveSetAnimated); }
+void TQCurveEditorCtrl::showModified(RWActionSender*) { showSelectedCurveSet(_curveSetModified); }
+void TQCurveEditorCtrl::showActive(RWActionSender*) { showSelectedCurveSet(_curveSetCurrent); }
+void TQCurveEditorCtrl::showPosition(RWActionSender*) { showSelectedCurveSet(_curveSetPosition); }
+void TQCurveEditorCtrl::showRotation(RWActionSender*) { showSelectedCurveSet(_curveSetRotation); }
+void TQCurveEditorCtrl::showScale(RWActionSender*) { showSelectedCurveSet(_curveSetScale); }
+void TQCurveEditorCtrl::showShear(RWActionSender*) { showSelectedCurveSet(_curveSetShear); }
+void TQCurveEditorCtrl::showPivot(RWActionSender*) { showSelectedCurveSet(_curveSetPivot); }
+void TQCurveEditorCtrl::showOpacity(RWActionSender*) { showSelectedCurveSet(_curveSetOpacity); }
+void TQCurveEditorCtrl::showRetiming(RWActionSender*) { showSelectedCurveSet(_curveSetRetiming); }
 
 void TQCurveEditorCtrl::showCustom(RWActionSender* sender) {
     if (!sender) return;
     const int64_t index = sender->tag();
     // A tag out of range (a menu older than the list) selects nothing.
     if (index < 0 || index >= static_cast<int64_t>(_curveSets.size())) return;
-    showCurveSet(_curveSets[static_cast<size_t>(index)]);
+    showSelectedCurveSet(_curveSets[static_cast<size_t>(index)]);
 }
 
 // ---- The custom list -------------------------------------------------------------------------
@@ -308,11 +308,14 @@ void TQCurveEditorCtrl::refreshPopUp() {
     const std::shared_ptr<RWPopUpButton> popUp = _curveSetsPopUp;
     if (!popUp) return;
     popUp->removeAllItems();
-    // Every item enabled with an empty key equivalent and this controller as target;
-    // `keepMask` leaves the default modifier mask, which only All, Active, New and Manage keep.
+    // Every item enabled with this controller as target, and the set's shortcut as its key
+    // equivalent: the menu ignores key equivalents, so the key is shown, never taken. `keepMask`
+    // leaves the default modifier mask, which only All, Active, New and Manage keep: the
+    // others' keys are plain keys.
     auto add = [&](const BNString& title, const char* action, const TQCurveSetPtr& set,
                    bool keepMask) {
-        auto item = std::make_shared<RWMenuItem>(title, action, "");
+        auto item =
+            std::make_shared<RWMenuItem>(title, action, set ? set->curveSetShortcut() : BNString());
         item->setTarget(this);
         item->setEnabled(true);
         if (!keepMask) item->setKeyEquivalentModifierMask(0);
@@ -345,11 +348,8 @@ void TQCurveEditorCtrl::refreshPopUp() {
             ->setTag(static_cast<int64_t>(i));
     }
     popUp->addItem(RWMenuItem::separatorItem());
-    // The new-set and manager panels are not run by this controller: shown, disabled.
-    add(TQLocalizedString("Curve Editor Curve Set New"), "showNewCurveSet:", nullptr, true)
-        ->setEnabled(false);
-    add(TQLocalizedString("Curve Editor Curve Set Manage"), "showCurveSet:", nullptr, true)
-        ->setEnabled(false);
+    add(TQLocalizedString("Curve Editor Curve Set New"), "showNewCurveSet:", nullptr, true);
+    add(TQLocalizedString("Curve Editor Curve Set Manage"), "showCurveSet:", nullptr, true);
     if (popUp->numberOfItems() > 0) {
         if (popUp->indexOfSelectedItem() == -1) popUp->selectItemAtIndex(0);
         if (const RWMenuItemPtr selected = popUp->selectedItem())

@@ -1,8 +1,8 @@
 #pragma once
-// What the full editor's controller asks of the channel list beside its curves, of the list's
-// controller, and of the table of the curve set manager. Those views come with their own
-// modules and implement these interfaces; until one is connected its outlet is null and the
-// controller does without it (each use tests the outlet).
+// What the full editor's controller asks of the channel list beside its curves and of the
+// list's controller. Those views come with their own module and implement these interfaces;
+// until one is connected its outlet is null and the controller does without it (each use
+// tests the outlet).
 //
 // Rows are indexes from 0; a row of -1 means the item is not shown.
 
@@ -39,16 +39,4 @@ public:
     virtual void update() = 0;
     // Redraws the values of a row, leaving its title alone.
     virtual void refreshRowWithoutTitle(int64_t row) = 0;
-};
-
-// The table of the curve set manager panel (TQCurveSetManagerList).
-class TQEditorCurveSetManagerTable {
-public:
-    virtual ~TQEditorCurveSetManagerTable() = default;
-    virtual void setAllowsEmptySelection(bool allows) = 0;
-    virtual void setController(TQCurveEditorCtrl* controller) = 0;
-    virtual void registerForDraggedTypes(const std::vector<std::string>& types) = 0;
-    // The controller is the table's delegate and data source.
-    virtual void setDelegate(TQCurveEditorCtrl* delegate) = 0;
-    virtual void setFocusRingType(int64_t type) = 0;
 };
