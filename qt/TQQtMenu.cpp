@@ -21,6 +21,12 @@ void fill(QMenu& into, const RWMenuPtr& menu, const TQQtMenuChoice& chosen) {
         }
         QAction* action = into.addAction(title);
         action->setEnabled(item->isEnabled());
+        if (!item->keyEquivalent().empty()) {
+            // Shown beside the title; the shortcut works only while the menu itself is up.
+            action->setShortcut(TQQtKeySequenceOfKeyEquivalent(
+                item->keyEquivalent(), item->keyEquivalentModifierMask()));
+            action->setShortcutContext(Qt::WidgetShortcut);
+        }
         // Qt's check marks know on and off only: a mixed item shows a dash instead.
         action->setCheckable(item->state() == RWOnState);
         action->setChecked(item->state() == RWOnState);
@@ -34,6 +40,19 @@ void fill(QMenu& into, const RWMenuPtr& menu, const TQQtMenuChoice& chosen) {
 }
 
 }  // namespace
+
+QKeySequence TQQtKeySequenceOfKeyEquivalent(const std::string& key, uint64_t modifierMask) {
+    // Command is the key of shortcuts here, as in the views (TQQtEvents.h).
+    int modifiers = 0;
+    if (modifierMask & RWEventModifierFlagCommand) modifiers |= Qt::CTRL;
+    if (modifierMask & RWEventModifierFlagShift) modifiers |= Qt::SHIFT;
+    if (modifierMask & RWEventModifierFlagOption) modifiers |= Qt::ALT;
+    if (modifierMask & RWEventModifierFlagControl) modifiers |= Qt::META;
+    const QString text = QString::fromStdString(key).toUpper();
+    const QKeySequence plain(text);
+    if (text.isEmpty() || plain.isEmpty()) return {};
+    return QKeySequence(plain[0].key() | Qt::KeyboardModifiers(modifiers));
+}
 
 void TQQtFillMenu(QMenu& into, const RWMenuPtr& menu, const TQQtMenuChoice& chosen) {
     into.clear();

@@ -5,10 +5,12 @@
 #include <QDoubleValidator>
 #include <QLineEdit>
 #include <QLocale>
+#include <QMessageBox>
 #include <QVBoxLayout>
 
 #include <cmath>
 
+#include "platform/ui/RWAlert.h"
 #include "qt/TQQtPanelDialog.h"
 #include "src/engine/TQCurveEditorCtrlBase.h"
 
@@ -46,7 +48,9 @@ void TQQtModalService::registerDialog(const std::string& windowTitle, DialogFact
 
 RWModalResponse TQQtModalService::runModalForWindow(RWWindow& window) {
     std::unique_ptr<QDialog> dialog;
-    if (const auto found = _factories.find(window.title()); found != _factories.end())
+    if (auto* alert = dynamic_cast<RWAlert*>(&window))
+        dialog = makeAlertDialog(*alert);
+    else if (const auto found = _factories.find(window.title()); found != _factories.end())
         dialog = found->second(window);
     if (!dialog && TQQtPanelDialog::canShow(window))
         dialog = std::make_unique<TQQtPanelDialog>(window, QApplication::activeWindow());
@@ -64,6 +68,18 @@ void TQQtModalService::stopModalWithCode(RWModalResponse code) {
     if (_runs.empty() || _runs.back().stopped) return;
     _runs.back().stopped = true;
     _runs.back().dialog->done(dialogCode(code));
+}
+
+std::unique_ptr<QDialog> TQQtModalService::makeAlertDialog(RWAlert& alert) {
+    auto box = std::make_unique<QMessageBox>(QApplication::activeWindow());
+    box->setIcon(alert.alertStyle() == RWAlertStyleCritical        ? QMessageBox::Critical
+                 : alert.alertStyle() == RWAlertStyleInformational ? QMessageBox::Information
+                                                                   : QMessageBox::Warning);
+    box->setWindowTitle(QString::fromStdString(alert.messageText()));
+    box->setText(QString::fromStdString(alert.messageText()));
+    box->setInformativeText(QString::fromStdString(alert.informativeText()));
+    box->setStandardButtons(QMessageBox::Ok);
+    return box;
 }
 
 std::unique_ptr<QDialog> TQQtModalService::makeValueDialog(RWWindow& window) {

@@ -11,7 +11,8 @@
 // The first stop of a run decides its answer: a later one (a field that ends its edit as the
 // dialog goes away after Cancel) changes nothing.
 //
-// Built in: "TQCurveEditorValueView", the number panel of a keypoint's value
+// Built in: an alert (RWAlert) as a QMessageBox with one OK button, whatever its title;
+// "TQCurveEditorValueView", the number panel of a keypoint's value
 // (TQCurveEditorValueWindow), placed at the point the window names in the active window.
 //
 // Not installed by TQQtServiceInstaller: a test that drives gestures must not block in a
@@ -27,6 +28,8 @@
 #include <vector>
 
 #include "platform/ui/RWServices.h"
+
+class RWAlert;
 
 class TQQtModalService final : public RWModalService {
 public:
@@ -52,6 +55,7 @@ public:
     // The dialog of the innermost run, or null.
     QDialog* activeDialog() const { return _runs.empty() ? nullptr : _runs.back().dialog.data(); }
 
+    static std::unique_ptr<QDialog> makeAlertDialog(RWAlert& alert);
     // The value panel: a line that takes a number, OK and Cancel.
     static std::unique_ptr<QDialog> makeValueDialog(RWWindow& window);
 

@@ -7,9 +7,13 @@
 #include <cmath>
 
 #include "platform/ui/RWButton.h"
+#include "platform/ui/RWSegmentedControl.h"
+#include "platform/ui/RWTableView.h"
 #include "platform/ui/RWTextField.h"
 #include "qt/TQQtButton.h"
 #include "qt/TQQtScreen.h"
+#include "qt/TQQtSegmentedControl.h"
+#include "qt/TQQtTableView.h"
 #include "qt/TQQtTextField.h"
 #include "qt/TQQtValueControls.h"
 #include "qt/TQQtWindowBinding.h"
@@ -58,6 +62,15 @@ TQQtPanelDialog::TQQtPanelDialog(RWWindow& window, QWidget* parent)
                 push->setFocusPolicy(Qt::NoFocus);
                 push->setClickGate([this] { return settleTextFields(); });
                 widget = push;
+            } else if (auto table = std::dynamic_pointer_cast<RWTableView>(control)) {
+                auto* view = new TQQtTableView(this);
+                view->setTable(table);
+                widget = view;
+            } else if (auto segments = std::dynamic_pointer_cast<RWSegmentedControl>(control)) {
+                auto* row = new TQQtSegmentedControl(this);
+                row->setModel(segments);
+                row->setFocusPolicy(Qt::NoFocus);
+                widget = row;
             }
             if (!widget) continue;
             // Content points have y up; the dialog's have y down.

@@ -1,10 +1,11 @@
 #pragma once
 // A window of platform/ui with laid-out content (RWWindow::contentView) as a QDialog, what the
 // modal service shows for the framework's panels. Each control of the content becomes the
-// widget bound to it (text fields, buttons, sliders, scrubbers) at its frame, a text field
-// that is not editable shown as a label without a frame; the dialog sits at the window's
-// frame on the screen (TQQtScreen.h), without a title bar or border of the window manager
-// when the window's style mask is 0, and the window's first responder takes the focus.
+// widget bound to it (text fields, buttons, sliders, scrubbers, tables, segmented controls) at
+// its frame, a text field that is not editable shown as a label without a frame; the dialog
+// sits at the window's frame on the screen (TQQtScreen.h), without a title bar or border of
+// the window manager when the window's style mask is 0, and the window's first responder takes
+// the focus.
 //
 // Keys: Return outside a text field and Escape anywhere click the buttons that have them as
 // key equivalents (a text field ends its edit with Return, sending its own action). A click

@@ -35,6 +35,7 @@
 #include "qt/TQQtWindowBinding.h"
 #include "qt/TQQtZoomScroller.h"
 #include "src/editor/TQCurveEditorPanels.h"
+#include "src/editor/TQCurveSetPanelViews.h"
 #include "src/panels/TQTimingMoveController.h"
 #include "src/resources/TQStrings.h"
 
@@ -218,6 +219,8 @@ void TQDemoWindow::setUpController() {
     _panelPlacer = std::make_unique<TQDemoPanelPlacer>(
         _editorWindow, std::vector{outlets.reducePanel, outlets.generatePanel});
     _generateDialog = new TQQtPanelDialog(*outlets.generatePanel, this);
+    // The pop-up's New and Manage entries run these, as dialogs of the modal service.
+    TQInstantiateCurveSetPanels(&_controller, outlets);
     _controller.connectOutlets(outlets);
     _controller.setupController();
     _controller.viewDidLoad();

@@ -167,6 +167,8 @@ public:
 
     // ---- First responder ----
     virtual bool acceptsFirstResponder() const { return true; }
+    // The delete key on the table (not in an edit); nothing unless a subclass says otherwise.
+    virtual void delete_(RWActionSender* sender) { (void)sender; }
 
     // ---- The user ----
     void userSelectRows(const RWIndexSet& rows);

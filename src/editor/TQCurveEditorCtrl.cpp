@@ -456,13 +456,6 @@ void TQCurveEditorCtrl::windowWillClose(RWWindow& window) {
         newCurveSetCancel();
 }
 
-void TQCurveEditorCtrl::newCurveSetCancel(RWActionSender*) {
-    RWApplicationServices().modal->stopModal();
-    if (_curveSetNewPanel) _curveSetNewPanel->setIsVisible(false);
-    updateUI();
-    refreshPopUp();
-}
-
 void TQCurveEditorCtrl::viewDidResize() {
     if (TQCurveEditorView* timeline = curveEditorView()) {
         const CMTimeRange range = timeline->getDisplayRange();

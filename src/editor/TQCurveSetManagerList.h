@@ -31,7 +31,7 @@ public:
     // The delete key: the selected row's set leaves the controller's list straight away. The
     // row above is selected then; deleting row 0 asks for one far past the end, which selects
     // nothing. Unlike the panel's remove button, an emptied list leaves the shown set alone.
-    void delete_(RWActionSender* sender = nullptr);
+    void delete_(RWActionSender* sender = nullptr) override;
 
 private:
     TQCurveEditorCtrl* _mainCurveEditorController = nullptr;  // not owned
