@@ -23,8 +23,8 @@ void fill(QMenu& into, const RWMenuPtr& menu, const TQQtMenuChoice& chosen) {
         action->setEnabled(item->isEnabled());
         if (!item->keyEquivalent().empty()) {
             // Shown beside the title; the shortcut works only while the menu itself is up.
-            action->setShortcut(TQQtKeySequenceOfKeyEquivalent(
-                item->keyEquivalent(), item->keyEquivalentModifierMask()));
+            action->setShortcut(TQQtKeySequenceOfKeyEquivalent(item->keyEquivalent(),
+                                                               item->keyEquivalentModifierMask()));
             action->setShortcutContext(Qt::WidgetShortcut);
         }
         // Qt's check marks know on and off only: a mixed item shows a dash instead.

@@ -84,8 +84,8 @@ bool TQQtTableModel::setData(const QModelIndex& index, const QVariant& value, in
 Qt::ItemFlags TQQtTableModel::flags(const QModelIndex& index) const {
     // Between rows (and past the last) the rows may land.
     if (!_table || !index.isValid()) return Qt::ItemIsDropEnabled;
-    Qt::ItemFlags flags = Qt::ItemIsEnabled | Qt::ItemIsSelectable | Qt::ItemIsDragEnabled |
-                          Qt::ItemIsDropEnabled;
+    Qt::ItemFlags flags =
+        Qt::ItemIsEnabled | Qt::ItemIsSelectable | Qt::ItemIsDragEnabled | Qt::ItemIsDropEnabled;
     const RWTableColumn* column = _table->tableColumnAt(index.column());
     if (!column || !column->isEditable()) return flags;
     if (dynamic_cast<const RWButtonCell*>(column->dataCell().get()))
@@ -127,8 +127,8 @@ bool TQQtTableModel::canDropMimeData(const QMimeData* data, Qt::DropAction, int,
     return false;
 }
 
-bool TQQtTableModel::dropMimeData(const QMimeData* data, Qt::DropAction action, int row,
-                                  int column, const QModelIndex& parent) {
+bool TQQtTableModel::dropMimeData(const QMimeData* data, Qt::DropAction action, int row, int column,
+                                  const QModelIndex& parent) {
     if (!canDropMimeData(data, action, row, column, parent)) return false;
     // On a row: the gap above it. Past the rows: the end.
     const int target = row >= 0 ? row : parent.isValid() ? parent.row() : rowCount();
@@ -155,7 +155,8 @@ TQQtTableView::TQQtTableView(QWidget* parent)
     connect(selectionModel(), &QItemSelectionModel::selectionChanged, this, [this] {
         if (_syncing || !table()) return;
         RWIndexSet rows;
-        for (const QModelIndex& index : selectionModel()->selectedRows()) rows.addIndex(index.row());
+        for (const QModelIndex& index : selectionModel()->selectedRows())
+            rows.addIndex(index.row());
         table()->userSelectRows(rows);
         syncSelection();  // what the table kept
     });

@@ -46,9 +46,7 @@ RWCell* RWTableView::preparedCellAtColumn(int64_t column, int64_t row) {
 
 // ---- Selection -------------------------------------------------------------------------------
 
-int64_t RWTableView::selectedRow() const {
-    return _selection.lastIndex();
-}
+int64_t RWTableView::selectedRow() const { return _selection.lastIndex(); }
 
 void RWTableView::selectRowIndexes(const RWIndexSet& rows, bool byExtendingSelection) {
     RWIndexSet next = byExtendingSelection ? _selection : RWIndexSet();

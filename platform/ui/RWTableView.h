@@ -51,8 +51,8 @@ class RWTableViewDataSource {
 public:
     virtual ~RWTableViewDataSource() = default;
     virtual int64_t numberOfRowsInTableView(RWTableView& table) = 0;
-    virtual RWObjectValue objectValueForTableColumn(RWTableView& table,
-                                                    const RWTableColumn& column, int64_t row) = 0;
+    virtual RWObjectValue objectValueForTableColumn(RWTableView& table, const RWTableColumn& column,
+                                                    int64_t row) = 0;
     // The user changed a cell: the text typed into it, or a check box's new state.
     virtual void setObjectValue(RWTableView& table, const RWObjectValue& value,
                                 const RWTableColumn& column, int64_t row) {

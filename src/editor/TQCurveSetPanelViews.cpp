@@ -81,21 +81,21 @@ void instantiateManager(RWActionTarget* owner, TQCurveEditorOutlets& outlets) {
     pair->setFrame(CGRectMake(kMargin, kMargin, kPairWidth, kRowHeight));
     content->addSubview(pair);
 
-    auto duplicate = button("Curve Editor Curve Set Duplicate", "curveSetManagerDuplicate:", "",
-                            owner, CGRectMake(kMargin + kPairWidth + kGap, kMargin,
-                                              kButtonWidth + 10.0, kRowHeight));
+    auto duplicate =
+        button("Curve Editor Curve Set Duplicate", "curveSetManagerDuplicate:", "", owner,
+               CGRectMake(kMargin + kPairWidth + kGap, kMargin, kButtonWidth + 10.0, kRowHeight));
     content->addSubview(duplicate);
     double x = kManagerWidth - kMargin - kButtonWidth;
-    content->addSubview(button("Curve Editor Curve Set Done", "curveSetManagerDone:",
-                               RWButton::kReturnKey, owner,
+    content->addSubview(button("Curve Editor Curve Set Done",
+                               "curveSetManagerDone:", RWButton::kReturnKey, owner,
                                CGRectMake(x, kMargin, kButtonWidth, kRowHeight)));
     x -= kButtonWidth + kGap;
     auto apply = button("Curve Editor Curve Set Apply", "curveSetManagerApply:", "", owner,
                         CGRectMake(x, kMargin, kButtonWidth, kRowHeight));
     content->addSubview(apply);
     x -= kButtonWidth + kGap;
-    content->addSubview(button("Curve Editor Curve Set Cancel", "curveSetManagerCancel:",
-                               RWButton::kEscapeKey, owner,
+    content->addSubview(button("Curve Editor Curve Set Cancel",
+                               "curveSetManagerCancel:", RWButton::kEscapeKey, owner,
                                CGRectMake(x, kMargin, kButtonWidth, kRowHeight)));
 
     outlets.curveSetManagerList = table.get();
@@ -121,9 +121,9 @@ void instantiateNewSet(RWActionTarget* owner, TQCurveEditorOutlets& outlets) {
                               kNewWidth - 2 * kMargin - kLabelWidth - kGap, kRowHeight));
     content->addSubview(name);
     const double okX = kNewWidth - kMargin - kButtonWidth;
-    auto cancel = button("Curve Editor Curve Set Cancel", "newCurveSetCancel:",
-                         RWButton::kEscapeKey, owner,
-                         CGRectMake(okX - kGap - kButtonWidth, kMargin, kButtonWidth, kRowHeight));
+    auto cancel =
+        button("Curve Editor Curve Set Cancel", "newCurveSetCancel:", RWButton::kEscapeKey, owner,
+               CGRectMake(okX - kGap - kButtonWidth, kMargin, kButtonWidth, kRowHeight));
     auto ok = button("Curve Editor Curve Set OK", "newCurveSetOk:", RWButton::kReturnKey, owner,
                      CGRectMake(okX, kMargin, kButtonWidth, kRowHeight));
     content->addSubview(cancel);

@@ -1,0 +1,262 @@
+// The curve set panels of the full editor on the sample project, worked as a user works them:
+// the manager's table and buttons inside its modal run (a scripted modal service plays the
+// user), the duplicate-name alert, the new-set panel, and the pop-up that opens them.
+#include <gtest/gtest.h>
+
+#include "platform/ui/RWButton.h"
+#include "src/editor/TQCurveSetManagerList.h"
+#include "src/editor/TQCurveSetPanelViews.h"
+#include "src/editor/tests/EditorFixture.h"
+
+namespace editor_test {
+namespace {
+
+// What a user can tell of a custom set: everything the manager may change.
+struct SetForm {
+    std::string name, shortcut;
+    bool relative = false;
+    std::vector<const TQChannelBase*> channels;
+    friend bool operator==(const SetForm&, const SetForm&) = default;
+};
+
+class CurveSetPanels : public EditorFixture {
+protected:
+    void connect(TQCurveEditorOutlets& outlets) override {
+        TQInstantiateCurveSetPanels(&ctrl, outlets);
+        list = outlets.curveSetManagerList;
+        manager = outlets.curveSetManagerPanel;
+        newPanel = outlets.curveSetNewPanel;
+        RWServiceSet services;
+        services.modal = &modal;
+        RWInstallServices(services);
+    }
+    void TearDown() override {
+        EditorFixture::TearDown();
+        RWResetServices();
+    }
+
+    // Bounce (title's opacity and x position), Fades (opacity, key "f"), Spin (relative).
+    void makeSets() {
+        TQChannelObjectRootBase* title = object(kTQHostSampleTitleObject);
+        auto channel = [&](const char* path) {
+            return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(title));
+        };
+        ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("Bounce"));
+        ctrl.appendChannelToCurveSet(channel("./1/200/202"));
+        ctrl.appendChannelToCurveSet(channel("./1/100/101/1"));
+        ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("Fades"));
+        ctrl.appendChannelToCurveSet(channel("./1/200/202"));
+        ctrl.selectedCurveSet()->setCurveSetShortcut("F");
+        ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("Spin"));
+        ctrl.appendChannelToCurveSet(channel("./1/100/109/3"));
+        ctrl.selectedCurveSet()->setRelative(true);
+    }
+    std::vector<SetForm> forms() const {
+        std::vector<SetForm> out;
+        for (const TQCurveSetPtr& set : ctrl.curveSets()) {
+            SetForm form{set->curveSetName(), set->curveSetShortcut(), set->isRelative(), {}};
+            for (const TQCurveEditorItemPtr& item : set->allItems())
+                form.channels.push_back(item->channelBase());
+            out.push_back(form);
+        }
+        return out;
+    }
+    std::vector<std::string> names() const {
+        std::vector<std::string> out;
+        for (const SetForm& form : forms()) out.push_back(form.name);
+        return out;
+    }
+
+    // ---- The user in the manager ----
+    void press(RWPanel& panel, const std::string& action) {
+        auto button = panel.contentView()->subview<RWButton>(
+            [&](const RWButton& b) { return b.action() == action; });
+        ASSERT_NE(button, nullptr) << action;
+        button->userClick();
+    }
+    void plusMinus(int64_t segment) {
+        manager->contentView()->subview<RWSegmentedControl>()->userClickSegment(segment);
+    }
+    void select(int64_t row) { list->userSelectRows(RWIndexSet{row}); }
+    void type(const char* column, int64_t row, const std::string& text) {
+        ASSERT_TRUE(list->editColumn(list->columnWithIdentifier(column), row));
+        list->userEndEditing(text);
+    }
+    bool drag(int64_t from, int64_t to) {
+        return list->userBeginDragRows(RWIndexSet{from}) && list->userDropAtRow(to);
+    }
+    // Opens the manager and plays `user` inside its run.
+    void manage(std::function<void()> user) {
+        modal.pushScript([user](RWWindow&, RWModalService&) { user(); });
+        choose("Manage Curve Sets…");
+    }
+
+    RWScriptedModal modal;
+    TQCurveSetManagerList* list = nullptr;
+    std::shared_ptr<RWPanel> manager, newPanel;
+};
+
+TEST_F(CurveSetPanels, manager__cancel_after_many_edits_gives_back_every_set_and_the_shown_one) {
+    makeSets();
+    choose("Fades");
+    const std::vector<TQCurveSetPtr> originals = ctrl.curveSets();
+    const TQCurveSetPtr shown = ctrl.selectedCurveSet();
+    const std::vector<SetForm> before = forms();
+    manage([&] {
+        EXPECT_EQ(list->selectedRow(), 1) << "the shown set's row";
+        type(TQCurveEditorCtrl::kNameColumn, 1, "Fading");
+        EXPECT_TRUE(drag(0, 3));
+        select(0);
+        plusMinus(1);
+        press(*manager, "curveSetManagerDuplicate:");
+        plusMinus(0);
+        type(TQCurveEditorCtrl::kShortcutColumn, 0, "k");
+        list->userSetObjectValue(list->columnWithIdentifier(TQCurveEditorCtrl::kRelativeColumn),
+                                 0, RWObjectValue(0));
+        EXPECT_EQ(names(),
+                  (std::vector<std::string>{"Spin", "Bounce", "Spin Copy", "Untitled Set"}))
+            << "the working copies took every edit";
+        EXPECT_EQ(originals[0]->curveSetName(), "Bounce") << "the originals wait aside";
+        press(*manager, "curveSetManagerCancel:");
+    });
+    EXPECT_EQ(modal.runs(), std::vector<std::string>{"Curve Sets"});
+    EXPECT_EQ(ctrl.curveSets(), originals) << "the very sets that were there";
+    EXPECT_EQ(forms(), before);
+    EXPECT_EQ(ctrl.selectedCurveSet(), shown) << "the renamed copy must not stay shown";
+    EXPECT_EQ(ctrl.curveSetsPopUp()->title(), "Fades");
+
+    manage([&] {
+        select(2);
+        press(*manager, "curveSetManagerApply:");
+        EXPECT_EQ(ctrl.selectedCurveSet()->curveSetName(), "Spin");
+        press(*manager, "curveSetManagerCancel:");
+    });
+    EXPECT_EQ(ctrl.selectedCurveSet(), originals[2]) << "Apply's choice stays, on the original";
+
+    SCOPED_TRACE("an automatic set shown, every custom set removed, then Cancel");
+    choose("Animated");
+    manage([&] {
+        for (int i = 0; i < 3; ++i) {
+            select(0);
+            plusMinus(1);
+        }
+        EXPECT_EQ(ctrl.selectedCurveSet(), ctrl.curveSetAll()) << "an emptied list shows All";
+        press(*manager, "curveSetManagerCancel:");
+    });
+    EXPECT_EQ(ctrl.curveSets(), originals);
+    EXPECT_EQ(ctrl.selectedCurveSet(), ctrl.curveSetAnimated());
+}
+
+TEST_F(CurveSetPanels, manager__done_keeps_reorders_and_refuses_bad_names_and_keys) {
+    makeSets();
+    manage([&] {
+        // Drops land between rows; a drop on its own place, or outside, changes nothing.
+        EXPECT_TRUE(drag(0, 2));
+        EXPECT_EQ(names(), (std::vector<std::string>{"Fades", "Bounce", "Spin"}));
+        EXPECT_EQ(list->selectedRow(), 1) << "the dropped row is selected";
+        EXPECT_TRUE(drag(2, 0));
+        EXPECT_EQ(names(), (std::vector<std::string>{"Spin", "Fades", "Bounce"}));
+        EXPECT_TRUE(drag(1, 1) && drag(1, 2));
+        ASSERT_TRUE(list->userBeginDragRows(RWIndexSet{0}));
+        list->userEndDrag();
+        EXPECT_FALSE(list->userDropAtRow(2)) << "that drag has ended";
+        EXPECT_EQ(names(), (std::vector<std::string>{"Spin", "Fades", "Bounce"}));
+
+        for (const char* blank : {"", "   "}) type(TQCurveEditorCtrl::kNameColumn, 0, blank);
+        EXPECT_EQ(modal.runs().size(), 1u) << "a blank name is refused without the alert";
+        type(TQCurveEditorCtrl::kNameColumn, 0, "Bounce");
+        EXPECT_EQ(modal.runs().back(), "Duplicate Curve Set Name") << "the one alert";
+        press(*manager, "curveSetManagerDone:");
+        EXPECT_TRUE(ctrl.isManagingCurveSets()) << "Done waits for a name that is free";
+        type(TQCurveEditorCtrl::kNameColumn, 0, "Twirl");
+
+        // A key is one character, free among all the sets, automatic ones included.
+        for (const char* refused : {"u", "F", "ab"}) type(TQCurveEditorCtrl::kShortcutColumn, 2, refused);
+        type(TQCurveEditorCtrl::kShortcutColumn, 2, "B");
+        type(TQCurveEditorCtrl::kShortcutColumn, 1, "");
+        press(*manager, "curveSetManagerDone:");
+    });
+    EXPECT_FALSE(ctrl.isManagingCurveSets());
+    EXPECT_FALSE(manager->isVisible());
+    const std::vector<SetForm> after = forms();
+    EXPECT_EQ(names(), (std::vector<std::string>{"Twirl", "Fades", "Bounce"}));
+    EXPECT_EQ(after[2].shortcut, "b");
+    EXPECT_EQ(after[1].shortcut, "");
+
+    SCOPED_TRACE("the delete key on row 0 selects no row and leaves the shown set alone");
+    choose("Twirl");
+    recorder.clearCalls();
+    manage([&] {
+        select(0);
+        list->delete_();
+        EXPECT_EQ(list->selectedRow(), -1);
+        const auto& calls = recorder.calls();
+        EXPECT_EQ(std::count_if(calls.begin(), calls.end(),
+                                [](const TQDelegateCall& c) {
+                                    return c.word == kTQNotifyChannelsChanged;
+                                }),
+                  1)
+            << "the list's word for a removed set";
+        press(*manager, "curveSetManagerDone:");
+    });
+    EXPECT_EQ(names(), (std::vector<std::string>{"Fades", "Bounce"}));
+    EXPECT_EQ(ctrl.selectedCurveSet()->curveSetName(), "Twirl");
+}
+
+TEST_F(CurveSetPanels, pop_up__automatic_then_custom_sets_with_their_keys_and_both_panels) {
+    makeSets();
+    ctrl.curveSetsPopUp()->userWillPopUp();
+    RWMenu& menu = *ctrl.curveSetsPopUp()->menu();
+    menu.update();
+    std::vector<std::string> shown;
+    for (const RWMenuItemPtr& item : menu.itemArray())
+        if (!item->isSeparatorItem())
+            shown.push_back(item->title() + (item->keyEquivalent().empty() ? "" : ":") +
+                            item->keyEquivalent() + (item->isEnabled() ? "" : " (off)"));
+    EXPECT_EQ(shown, (std::vector<std::string>{"All", "Animated:u", "Modified:y", "Active",
+                                               "Position:p", "Rotation:r", "Scale:s", "Shear:h",
+                                               "Pivot:a", "Opacity:o", "Retiming:t", "Bounce",
+                                               "Fades:f", "Spin", "New Curve Set…",
+                                               "Manage Curve Sets…"}));
+    EXPECT_EQ(menu.itemWithTitle("Fades")->keyEquivalentModifierMask(), 0u) << "a plain key";
+    EXPECT_FALSE(menu.performKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, "f"))) << "keys never reach the pop-up's items";
+}
+
+TEST_F(CurveSetPanels, new_set__holds_exactly_the_shown_channels_as_one_undo_step) {
+    host.setSelectedObjects({object(kTQHostSampleTitleObject)});
+    choose("Position");
+    const std::vector<const TQChannelBase*> position = shownChannels();
+    ASSERT_FALSE(position.empty());
+    auto typeAndPress = [&](std::string name, const char* action) {
+        modal.pushScript([this, name, action](RWWindow& window, RWModalService&) {
+            auto field = window.contentView()->subview<RWTextField>(
+                [](const RWTextField& f) { return f.isEditable(); });
+            EXPECT_EQ(field->stringValue(), "Untitled Set");
+            field->insertText(name);
+            press(*newPanel, action);
+        });
+        choose("New Curve Set…");
+    };
+    recorder.clearCalls();
+    typeAndPress("Slides", "newCurveSetOk:");
+    ASSERT_EQ(ctrl.curveSets().size(), 1u);
+    const TQCurveSetPtr made = ctrl.curveSets()[0];
+    EXPECT_EQ(ctrl.selectedCurveSet(), made);
+    EXPECT_EQ(made->curveSetName(), "Slides");
+    EXPECT_FALSE(made->isRelative()) << "a new set keeps the channels it was made with";
+    EXPECT_EQ(shownChannels(), position);
+    host.setSelectedObjects({object(kTQHostSampleBehaviorObject)});
+    EXPECT_EQ(shownChannels(), position) << "and does not follow the selection";
+    ASSERT_EQ(recorder.count("addToUndo"), 1u);
+    EXPECT_EQ(ctrl.curveSetsPopUp()->title(), "Slides");
+
+    typeAndPress("   ", "newCurveSetOk:");
+    EXPECT_EQ(ctrl.selectedCurveSet()->curveSetName(), "Untitled Set") << "a blank name";
+    typeAndPress("Never", "newCurveSetCancel:");
+    EXPECT_EQ(ctrl.curveSets().size(), 2u);
+    EXPECT_EQ(modal.runs(), std::vector<std::string>(3, "New Curve Set"));
+    EXPECT_FALSE(newPanel->isVisible());
+}
+
+}  // namespace
+}  // namespace editor_test
