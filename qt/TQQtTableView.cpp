@@ -155,7 +155,7 @@ TQQtTableView::TQQtTableView(QWidget* parent)
     connect(selectionModel(), &QItemSelectionModel::selectionChanged, this, [this] {
         if (_syncing || !table()) return;
         RWIndexSet rows;
-        for (const QModelIndex& index : selectionModel()->selectedRows())
+        for (const QModelIndex& index : selectionModel()->selectedIndexes())
             rows.addIndex(index.row());
         table()->userSelectRows(rows);
         syncSelection();  // what the table kept

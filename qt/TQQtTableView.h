@@ -73,6 +73,7 @@ public:
     TQQtTableModel* tableModel() const { return _model; }
     // The editor of the cell being edited, or null.
     QWidget* editor() const { return _editor; }
+    using QTableView::edit;
 
     // RWTableViewObserver
     void tableWillReload(RWTableView&) override;

@@ -111,8 +111,8 @@ TEST_F(CurveSetPanels, manager__cancel_after_many_edits_gives_back_every_set_and
         press(*manager, "curveSetManagerDuplicate:");
         plusMinus(0);
         type(TQCurveEditorCtrl::kShortcutColumn, 0, "k");
-        list->userSetObjectValue(list->columnWithIdentifier(TQCurveEditorCtrl::kRelativeColumn),
-                                 0, RWObjectValue(0));
+        list->userSetObjectValue(list->columnWithIdentifier(TQCurveEditorCtrl::kRelativeColumn), 0,
+                                 RWObjectValue(0));
         EXPECT_EQ(names(),
                   (std::vector<std::string>{"Spin", "Bounce", "Spin Copy", "Untitled Set"}))
             << "the working copies took every edit";
@@ -171,7 +171,8 @@ TEST_F(CurveSetPanels, manager__done_keeps_reorders_and_refuses_bad_names_and_ke
         type(TQCurveEditorCtrl::kNameColumn, 0, "Twirl");
 
         // A key is one character, free among all the sets, automatic ones included.
-        for (const char* refused : {"u", "F", "ab"}) type(TQCurveEditorCtrl::kShortcutColumn, 2, refused);
+        for (const char* refused : {"u", "F", "ab"})
+            type(TQCurveEditorCtrl::kShortcutColumn, 2, refused);
         type(TQCurveEditorCtrl::kShortcutColumn, 2, "B");
         type(TQCurveEditorCtrl::kShortcutColumn, 1, "");
         press(*manager, "curveSetManagerDone:");
@@ -191,10 +192,9 @@ TEST_F(CurveSetPanels, manager__done_keeps_reorders_and_refuses_bad_names_and_ke
         list->delete_();
         EXPECT_EQ(list->selectedRow(), -1);
         const auto& calls = recorder.calls();
-        EXPECT_EQ(std::count_if(calls.begin(), calls.end(),
-                                [](const TQDelegateCall& c) {
-                                    return c.word == kTQNotifyChannelsChanged;
-                                }),
+        EXPECT_EQ(std::count_if(
+                      calls.begin(), calls.end(),
+                      [](const TQDelegateCall& c) { return c.word == kTQNotifyChannelsChanged; }),
                   1)
             << "the list's word for a removed set";
         press(*manager, "curveSetManagerDone:");
@@ -213,13 +213,13 @@ TEST_F(CurveSetPanels, pop_up__automatic_then_custom_sets_with_their_keys_and_bo
         if (!item->isSeparatorItem())
             shown.push_back(item->title() + (item->keyEquivalent().empty() ? "" : ":") +
                             item->keyEquivalent() + (item->isEnabled() ? "" : " (off)"));
-    EXPECT_EQ(shown, (std::vector<std::string>{"All", "Animated:u", "Modified:y", "Active",
-                                               "Position:p", "Rotation:r", "Scale:s", "Shear:h",
-                                               "Pivot:a", "Opacity:o", "Retiming:t", "Bounce",
-                                               "Fades:f", "Spin", "New Curve Set…",
-                                               "Manage Curve Sets…"}));
+    EXPECT_EQ(shown, (std::vector<std::string>{
+                         "All", "Animated:u", "Modified:y", "Active", "Position:p", "Rotation:r",
+                         "Scale:s", "Shear:h", "Pivot:a", "Opacity:o", "Retiming:t", "Bounce",
+                         "Fades:f", "Spin", "New Curve Set…", "Manage Curve Sets…"}));
     EXPECT_EQ(menu.itemWithTitle("Fades")->keyEquivalentModifierMask(), 0u) << "a plain key";
-    EXPECT_FALSE(menu.performKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, "f"))) << "keys never reach the pop-up's items";
+    EXPECT_FALSE(menu.performKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, "f")))
+        << "keys never reach the pop-up's items";
 }
 
 TEST_F(CurveSetPanels, new_set__holds_exactly_the_shown_channels_as_one_undo_step) {
