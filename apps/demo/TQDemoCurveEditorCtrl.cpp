@@ -9,9 +9,50 @@ CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTQCurveEditorT
 
 TQDemoCurveEditorCtrl::TQDemoCurveEditorCtrl(TQHostAppDelegate& host) : _host(host) {
     _host.addNotificationReceiver(this);
+    _host.registerUndoClient(this, this);
 }
 
-TQDemoCurveEditorCtrl::~TQDemoCurveEditorCtrl() { _host.removeNotificationReceiver(this); }
+TQDemoCurveEditorCtrl::~TQDemoCurveEditorCtrl() {
+    _host.unregisterUndoClient(this);
+    _host.removeNotificationReceiver(this);
+}
+
+// ---- The curve sets in the history ------------------------------------------------------------
+
+TQDemoCurveEditorCtrl::SetsState TQDemoCurveEditorCtrl::setsState() const {
+    SetsState state;
+    for (const TQCurveSetPtr& set : _curveSets) {
+        if (set == _selectedCurveSet) state.shownIndex = static_cast<int64_t>(state.sets.size());
+        // Copies: a set's own content changes after the step (a channel removed from it).
+        if (set) state.sets.push_back(set->copy());
+    }
+    if (state.shownIndex < 0) state.shownAutomatic = _selectedCurveSet;
+    return state;
+}
+
+void TQDemoCurveEditorCtrl::newCurveSetOk(RWActionSender* sender) {
+    _setsBeforeNewSet = setsState();
+    TQCurveEditorCtrl::newCurveSetOk(sender);
+    _setsBeforeNewSet.reset();
+}
+
+std::any TQDemoCurveEditorCtrl::captureUndoState(uint32_t, uint32_t action) {
+    if (action == kTQUndoActionNewCurveSet && _setsBeforeNewSet) return *_setsBeforeNewSet;
+    return setsState();
+}
+
+void TQDemoCurveEditorCtrl::restoreUndoState(uint32_t, uint32_t, const std::any& state) {
+    const auto* sets = std::any_cast<SetsState>(&state);
+    if (!sets) return;
+    // Copies again, so that the memento stays as it was for a later redo.
+    _curveSets.clear();
+    for (const TQCurveSetPtr& set : sets->sets) _curveSets.push_back(set->copy());
+    const bool custom = sets->shownIndex >= 0 && sets->shownIndex < int64_t(_curveSets.size());
+    setSelectedCurveSet(custom ? _curveSets[size_t(sets->shownIndex)] : sets->shownAutomatic);
+    refreshSelectedCurveSet();
+    refreshPopUp();
+    updateUI();
+}
 
 void TQDemoCurveEditorCtrl::applyDisplayRange(const CMTimeRange& range) {
     _host.setDisplayRange(range);

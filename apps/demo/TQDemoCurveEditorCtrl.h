@@ -3,18 +3,21 @@
 // horizontal zoom and pan of the view become the host's display range, which comes back to
 // the view; an undo or redo of the host's history, which restores channels wholesale, is
 // followed by the word that every cached curve is stale. A keypoint's value is typed into the
-// framework's value panel. A refused paste is told to the window.
+// framework's value panel. A refused paste is told to the window. The custom curve sets are
+// part of the history: a new set and a channel removed from a set are undone and redone with
+// the other steps.
 //
 // Lifetime: the host is not owned and must outlive the controller; the controller hears the
 // host's words from construction until it dies. Two-phase like its base: construct, then
 // init(), the delegate, the view, the outlets, setupController and viewDidLoad.
 
 #include <functional>
+#include <optional>
 
 #include "host/TQHostAppDelegate.h"
 #include "src/editor/TQCurveEditorCtrl.h"
 
-class TQDemoCurveEditorCtrl final : public TQCurveEditorCtrl {
+class TQDemoCurveEditorCtrl final : public TQCurveEditorCtrl, public TQHostUndoClient {
 public:
     explicit TQDemoCurveEditorCtrl(TQHostAppDelegate& host);
     ~TQDemoCurveEditorCtrl() override;
@@ -26,6 +29,13 @@ public:
 
     bool undo();
     bool redo();
+
+    // The new-set panel's OK records its step after the set is made: the sets as they were
+    // are taken before, for that step.
+    void newCurveSetOk(RWActionSender* sender = nullptr) override;
+    // Copies of the custom sets and which set shows; restored as they were taken.
+    std::any captureUndoState(uint32_t type, uint32_t action) override;
+    void restoreUndoState(uint32_t type, uint32_t action, const std::any& state) override;
 
     // The window the value panel of a double-clicked keypoint is placed in; not owned.
     void setEditorWindow(RWWindow* window) { _editorWindow = window; }
@@ -46,7 +56,16 @@ private:
     // After a restore: the selection's handles again, and every curve sampled again.
     void restored();
 
+    struct SetsState {
+        std::vector<TQCurveSetPtr> sets;
+        // The custom set's index, or -1 and the automatic set that shows.
+        int64_t shownIndex = -1;
+        TQCurveSetPtr shownAutomatic;
+    };
+    SetsState setsState() const;
+
     TQHostAppDelegate& _host;
     RWWindow* _editorWindow = nullptr;
     std::function<void(TQPasteResult)> _pasteRefused;
+    std::optional<SetsState> _setsBeforeNewSet;
 };

@@ -42,7 +42,8 @@ public:
         board.declareTypes({"RowDrag"});
         return true;
     }
-    uint64_t validateDrop(RWTableView&, RWDraggingInfo&, int64_t, RWTableViewDropOperation) override {
+    uint64_t validateDrop(RWTableView&, RWDraggingInfo&, int64_t,
+                          RWTableViewDropOperation) override {
         return RWDragOperationMove;
     }
     bool acceptDrop(RWTableView& table, RWDraggingInfo&, int64_t row,

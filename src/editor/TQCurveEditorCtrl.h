@@ -468,7 +468,7 @@ public:
     void showNewCurveSet(RWActionSender* sender = nullptr);
     // A copy of the shown set under the field's name (the untitled one for a blank name),
     // shown, as one undo step.
-    void newCurveSetOk(RWActionSender* sender = nullptr);
+    virtual void newCurveSetOk(RWActionSender* sender = nullptr);
     // The new-set panel's Cancel: ends its modal run, hides it, updates the controls and the
     // pop-up.
     void newCurveSetCancel(RWActionSender* sender = nullptr);
