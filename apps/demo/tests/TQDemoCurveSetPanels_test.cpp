@@ -62,9 +62,9 @@ protected:
         for (const TQCurveSetPtr& set : window.controller().curveSets()) {
             out.push_back(set->curveSetName());
             for (const TQCurveEditorItemPtr& item : set->allItems())
-                out.back() += " " + TQChannelRef(item->channelBase(),
-                                                 window.host().sceneChannelRoot())
-                                        .getText();
+                out.back() +=
+                    " " +
+                    TQChannelRef(item->channelBase(), window.host().sceneChannelRoot()).getText();
         }
         return out;
     }
@@ -87,6 +87,8 @@ TEST_F(DemoCurveSetPanelsTest, new_and_managed_sets__are_saved_and_opened_with_t
         click(dialog, "OK");
     });
     EXPECT_EQ(shownChannels(), position) << "the new set holds what showed";
+    window.host().setSelectedObjects({window.host().scene().objects().back()});
+    EXPECT_EQ(shownChannels(), position) << "and does not follow the selection";
     EXPECT_EQ(window.curveSetPopUp()->text(), "Slides");
     emit window.editMenu()->menu()->aboutToShow();
     EXPECT_EQ(window.editMenu()->undoAction()->text(), "Undo New Curve Set");
