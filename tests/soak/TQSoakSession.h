@@ -1,7 +1,8 @@
 #pragma once
 // A seeded random session of a user in the full editor on the sample project, through the
-// reference host: gestures of the tools, menu commands, curve sets, object selection, undo
-// and redo, save and reopen. After every step the scene must hold together (keyframe times
+// reference host: gestures of the three tools, keys, menu and channel commands, the clipboard,
+// the simplify, generate and new-set panels, curve sets, object selection, undo and redo, save
+// and reopen. After every step the scene must hold together (keyframe times
 // strictly increasing, no value or handle that is not a number, every selected keypoint
 // resolving); at the end, undo to the start must give the scene it started from and redo to
 // the end the scene it ended with.
@@ -55,6 +56,13 @@ private:
     void undoOrRedo();
     void saveAndReopen();
     void frameAll();
+    void sketch();
+    void key();
+    void clipboard();
+    void channelCommand();
+    void simplify();
+    void generate();
+    void newCurveSet();
 
     std::string invariants();
     std::string undoesExactly(const TQChannelBase& before);
@@ -80,6 +88,9 @@ private:
     HXDRecordingEncoder _encoder{900, 500};
     TQCurveEditorView _view;
     TQCurveEditorCtrl _ctrl;
+    TQCurveEditorOutlets _panels;
+    // The panels' modal runs, each answered by the script the action pushes.
+    RWScriptedModal _modal;
     std::unique_ptr<TQChannelBase> _start;
     std::map<std::string, size_t> _counts;
     size_t _keypointPresses = 0;
