@@ -16,25 +16,16 @@
 
 namespace {
 
-constexpr double kSecondTolerance = 1e-6;
 constexpr double kPixelTolerance = 1.5;
-
-// A button of a panel, by its title, as the user finds it.
-std::shared_ptr<RWButton> button(RWWindow& panel, const std::string& title) {
-    return panel.contentView()->subview<RWButton>(
-        [&](const RWButton& b) { return b.title() == title; });
-}
 
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTQCurveEditorTimescale); }
 
-// A host whose frame duration and text step can be anything, zero included.
-class OddTimeHost : public TQRecordingAppDelegate {
+// A host whose frame duration and text step are zero.
+class ZeroTimeHost : public TQRecordingAppDelegate {
 public:
     using TQRecordingAppDelegate::TQRecordingAppDelegate;
-    CMTime getFrameDuration() override { return frame; }
-    CMTime secondsPerTextStep() override { return textStep; }
-    CMTime frame = kCMTimeZero;
-    CMTime textStep = kCMTimeZero;
+    CMTime getFrameDuration() override { return kCMTimeZero; }
+    CMTime secondsPerTextStep() override { return kCMTimeZero; }
 };
 
 class TimelineTest : public editor_test::EditorFixture {
@@ -43,8 +34,8 @@ protected:
         EditorFixture::SetUp();
         ctrl.followsZoom = true;
         // The title and the logo, as a user would show them.
-        host.setSelectedObjects({host.scene().objectNamed(kTQHostSampleTitleObject),
-                                 host.scene().objectNamed(kTQHostSampleBehaviorObject)});
+        host.setSelectedObjects(
+            {object(kTQHostSampleTitleObject), object(kTQHostSampleBehaviorObject)});
         view.setAutoZoom(0);
         previousModal = RWApplicationServices().modal;
         RWServiceSet mine;
@@ -65,30 +56,20 @@ protected:
         return view.displayLayer(&encoder);
     }
     void showRange(double start, double duration) {
-        const CMTime s = seconds(start);
-        const CMTime d = seconds(duration);
+        const CMTime s = seconds(start), d = seconds(duration);
         view.setDisplayRange(&s, &d);
     }
-    TQChannel* channel(const char* object, TQHostProperty property, size_t axis = 0) {
+    TQChannel* channel(const char* name, TQHostProperty property, size_t axis = 0) {
         const auto& paths = TQHostPropertyPaths(TQHostObjectFamily::Kestrel, property);
-        return dynamic_cast<TQChannel*>(
-            TQChannelRef(paths[axis]).getChannel(host.scene().objectNamed(object)));
+        return dynamic_cast<TQChannel*>(TQChannelRef(paths[axis]).getChannel(object(name)));
     }
-    // The stippled grid lines of the last frame, by world x.
-    std::vector<double> gridLines() const {
-        std::vector<double> xs;
-        for (const auto& p : view.primitives())
-            if (const auto* line = dynamic_cast<const HXDLine*>(p.get()); line && line->stippled())
-                xs.push_back(line->start().x);
-        return xs;
-    }
-    // The extent lines of the last frame: unstippled lines in the extent colour, by world x.
-    std::multiset<double> extentLines() const {
-        const HXDColor colour = TQCurveEditorViewBase::drawingColor(view.endpointsColor());
+    // The world x of the last frame's lines: stippled (the grid) or in the extent colour.
+    std::multiset<double> lines(bool grid) const {
+        const HXDColor extent = TQCurveEditorViewBase::drawingColor(view.endpointsColor());
         std::multiset<double> xs;
         for (const auto& p : view.primitives())
             if (const auto* line = dynamic_cast<const HXDLine*>(p.get());
-                line && !line->stippled() && line->color() == colour)
+                line && line->stippled() == grid && (grid || line->color() == extent))
                 xs.insert(std::round(line->start().x * 3000.0) / 3000.0);
         return xs;
     }
@@ -98,13 +79,15 @@ protected:
             if (const auto* t = dynamic_cast<const HXDText*>(p.get())) out.push_back(t);
         return out;
     }
-    // Every keypoint of the channel, selected in the view.
-    void selectKeypointsOf(TQChannel* c) {
+    // Every keypoint of the channel (or the one given), selected in the view.
+    void selectKeypointsOf(TQChannel* c, int only = -1) {
         const TQCurveEditorItemPtr item = ctrl.selectedCurveSet()->itemWithChannel(c);
         ASSERT_TRUE(item) << c->getName() << " is not shown";
-        for (TQKeyframeHandle h : c->getKeyframes(false)) {
+        const auto keys = c->getKeyframes(false);
+        for (size_t i = 0; i < keys.size(); ++i) {
+            if (only >= 0 && i != static_cast<size_t>(only)) continue;
             auto entry = std::make_shared<TQCurveSelection>();
-            entry->setHandle(h);
+            entry->setHandle(keys[i]);
             entry->setFlags(TQSelectionKeypoint);
             entry->setCurveId(item->channelId());
             view.getSelection()->addSelection(entry);
@@ -119,13 +102,27 @@ protected:
         }
         return out;
     }
+    // Opens the typing panel with a key; the script types more and ends with a button.
+    bool type(const char* key, const char* more, const char* button) {
+        modal.pushScript([=, this](RWWindow& panel, RWModalService&) {
+            shown = panel.contentView()->subview<RWTextField>()->stringValue();
+            panelFrame = panel.frame();
+            panel.contentView()->subview<RWTextField>()->insertText(more);
+            panel.contentView()
+                ->subview<RWButton>([&](const RWButton& b) { return b.title() == button; })
+                ->userClick();
+        });
+        return view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, key));
+    }
 
     RWScriptedModal modal;
     RWModalService* previousModal = nullptr;
     HXDRecordingEncoder encoder{800, 400};
+    std::string shown;
+    CGRect panelFrame = CGRectZero;
 };
 
-TEST_F(TimelineTest, displayRangeModified__takesTheVolumeFromTheRangeAndTellsTheController) {
+TEST_F(TimelineTest, display_range__drives_the_volume_and_the_grid_of_whole_seconds) {
     view.setSelectionViewVolume(CGRectMake(1.0, 1.0, 2.0, 2.0));
     auto* item = dynamic_cast<TQCurveEditorChannelItem*>(
         ctrl.selectedCurveSet()->channeItemAtIndex(0).get());
@@ -133,173 +130,116 @@ TEST_F(TimelineTest, displayRangeModified__takesTheVolumeFromTheRangeAndTellsThe
     item->setOriginalCurveDirty(0);
     viewHost.resetRedrawRequests();
     host.setSecondsPerTextStep(CMTimeMake(1, 2));
-
     showRange(-1.5, 4.0);
-
-    const CGRect& volume = view.getCurrentViewVolume();
-    EXPECT_NEAR(volume.origin.x, -1.5, kSecondTolerance);
-    EXPECT_NEAR(volume.size.width, 4.0, kSecondTolerance);
+    EXPECT_NEAR(view.getCurrentViewVolume().origin.x, -1.5, 1e-6);
+    EXPECT_NEAR(view.getCurrentViewVolume().size.width, 4.0, 1e-6);
     EXPECT_NEAR(view.zoomX(), 800.0 / 4.0, 1e-9) << "points per second of the view";
     EXPECT_EQ(view.gridSpacingX(), 0.5) << "the host's text step";
     EXPECT_EQ(view.getSelectionViewVolume(), CGRectZero) << "a rubber band is forgotten";
     EXPECT_EQ(item->originalCurveDirty(), 1) << "every curve is sampled again";
     EXPECT_GE(viewHost.redrawRequests(), 1);
     ASSERT_EQ(ctrl.ranges.size(), 1u);
-    EXPECT_NEAR(CMTimeGetSeconds(ctrl.ranges[0].start), -1.5, kSecondTolerance);
-    EXPECT_NEAR(CMTimeGetSeconds(ctrl.ranges[0].duration), 4.0, kSecondTolerance);
-}
+    EXPECT_EQ(ctrl.ranges[0].start, seconds(-1.5));
+    EXPECT_EQ(ctrl.ranges[0].duration, seconds(4.0));
+    const CMTime two = seconds(2.0);
+    view.setDisplayRange(nullptr, &two);
+    EXPECT_NEAR(view.getCurrentViewVolume().origin.x, -1.5, 1e-6) << "a missing part stays";
+    EXPECT_NEAR(view.getCurrentViewVolume().size.width, 2.0, 1e-6);
 
-TEST_F(TimelineTest, drawGrid__wholeSecondsFromZeroAtTheTextStep) {
-    // The range starts before zero: lines begin at 0, and run to the right edge (4.2 s).
+    // From a start before zero, lines begin at 0 and run to the right edge (4.2 s); a closer
+    // step lands on the same whole seconds.
     const struct {
         CMTime step;
-        std::vector<double> lines;
-    } cases[] = {
-        {CMTimeMake(1, 1), {0, 1, 2, 3, 4}},
-        {CMTimeMake(2, 1), {0, 2, 4}},
-        // A closer step lands on the same whole seconds.
-        {CMTimeMake(1, 4), {0, 1, 2, 3, 4}},
-        {CMTimeMake(1, 30), {0, 1, 2, 3, 4}},
-    };
+        std::multiset<double> lines;
+    } cases[] = {{CMTimeMake(1, 1), {0, 1, 2, 3, 4}},
+                 {CMTimeMake(2, 1), {0, 2, 4}},
+                 {CMTimeMake(1, 30), {0, 1, 2, 3, 4}}};
     for (const auto& c : cases) {
         ASSERT_TRUE(host.setSecondsPerTextStep(c.step));
         showRange(-1.8, 6.0);
         ASSERT_TRUE(frame());
-        EXPECT_EQ(gridLines(), c.lines) << "step " << CMTimeGetSeconds(c.step);
+        EXPECT_EQ(lines(true), c.lines) << "step " << CMTimeGetSeconds(c.step);
     }
-    // Each line spans the view, stippled, in the grid colour.
+    // Each line spans the view, in the grid colour.
     const auto* line = dynamic_cast<const HXDLine*>(view.primitives().front().get());
     ASSERT_TRUE(line && line->stippled());
     EXPECT_EQ(line->color(), TQCurveEditorViewBase::drawingColor(view.gridColor()));
     EXPECT_NEAR(view.getPointScreen(CGPointMake(0.0, line->start().y)).y, 400.0, kPixelTolerance);
     EXPECT_NEAR(view.getPointScreen(CGPointMake(0.0, line->end().y)).y, 0.0, kPixelTolerance);
-
     showRange(-6.0, 4.0);
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(gridLines().empty()) << "a view that ends before zero has no lines";
-}
+    EXPECT_TRUE(lines(true).empty()) << "a view that ends before zero has no lines";
 
-TEST_F(TimelineTest, zeroFrameDurationOrTextStep__neitherDividesNorLoops) {
-    OddTimeHost odd(&host);
-    ctrl.setAppDelegate(&odd);
+    SCOPED_TRACE("a zero frame duration and text step neither divide nor loop");
+    ZeroTimeHost zero(&host);
+    ctrl.setAppDelegate(&zero);
     showRange(0.0, 6.0);
     EXPECT_EQ(view.gridSpacingX(), 0.0);
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(gridLines().empty());
-    // The label's time falls back to seconds.
+    EXPECT_TRUE(lines(true).empty());
     EXPECT_EQ(view.getCoordinates(nullptr, seconds(0.4), 0.5),
               view.TQCurveEditorViewBase::getCoordinates(nullptr, seconds(0.4), 0.5));
-
-    // A typed number moves nothing: no frame is zero seconds long.
     TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
     const std::unique_ptr<TQChannelBase> before(x->cloneChannel());
     selectKeypointsOf(x);
     view.moveSelectedKeypointsInTime(12.0, false);
-    EXPECT_TRUE(*x == *before);
+    EXPECT_TRUE(*x == *before) << "no frame is zero seconds long";
     ctrl.setAppDelegate(&recorder);
 }
 
-TEST_F(TimelineTest, getCoordinates__framesOrTimecodeFromTheHostsFirstFrameAndStart) {
+TEST_F(TimelineTest, text__time_as_frames_or_timecode_value_labels_and_the_keypoint_label) {
     const CMTime frame12 = CMTimeMake(12, 30);
     host.setDisplayTimeAsFrames(true);
     host.setFirstFrameNumber(1);
     EXPECT_EQ(view.getCoordinates(nullptr, frame12, 0.5), "(13.0, 0.5)");
-
     host.setDisplayTimeAsFrames(false);
     host.setStartTimecode(30);
     EXPECT_EQ(view.getCoordinates(nullptr, frame12, 0.5), "(00:00:01:12, 0.5)");
-
     // An amplitude channel's value in decibels, without decimals.
-    TQChannelBase* object = host.scene().objectNamed(kTQHostSampleQuaternionObject);
-    auto* volume = dynamic_cast<TQChannel*>(
-        TQChannelRef(TQHostTypedPaths(TQHostObjectFamily::Kestrel).volume).getChannel(object));
-    auto item = std::make_shared<TQCurveEditorChannelItem>();
-    item->initWithChannel(volume, 10, &host, 0);
-    EXPECT_EQ(view.getCoordinates(item.get(), frame12, 0.5), "(00:00:01:12,-6)");
-}
+    auto* volume =
+        dynamic_cast<TQChannel*>(TQChannelRef(TQHostTypedPaths(TQHostObjectFamily::Kestrel).volume)
+                                     .getChannel(object(kTQHostSampleQuaternionObject)));
+    auto decibels = std::make_shared<TQCurveEditorChannelItem>();
+    decibels->initWithChannel(volume, 10, &host, 0);
+    EXPECT_EQ(view.getCoordinates(decibels.get(), frame12, 0.5), "(00:00:01:12,-6)");
 
-TEST_F(TimelineTest, drawCurveUnits__valueLabelsAtTheLeftEdgeForOneShownChannel) {
+    EXPECT_TRUE(texts().empty()) << "no value labels while no single channel is shown";
+    ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Opacity), true);
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(texts().empty()) << "no labels while no single channel is shown";
-
-    TQChannel* opacity = channel(kTQHostSampleTitleObject, TQHostProperty::Opacity);
-    ctrl.selectChannel(opacity, true);
-    ASSERT_TRUE(frame());
-    const TQCurveEditorItemPtr item = ctrl.selectedChannel();
-    auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
-    ASSERT_TRUE(channelItem);
+    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(ctrl.selectedChannel().get());
+    ASSERT_TRUE(item);
     const std::vector<const HXDText*> labels = texts();
     ASSERT_GE(labels.size(), 3u);
-    // Each label names the value of its row, at the step, from the bottom of the view up.
+    // Each names the value of its row, from the bottom up: three points in, then a point's
+    // nudge from the label and one from the text's place.
     const double step = view.gridSpacingY() * view.gridZoomY();
-    const double pixel = view.getCurrentViewVolume().size.height / 400.0;
     for (size_t i = 0; i < labels.size(); ++i) {
         const CGPoint at = labels[i]->position();
-        const CGPoint screen = view.getPointScreen(at);
-        // Three points in, then a point's nudge from the label and one from the text's place.
-        EXPECT_NEAR(screen.x, 3.0 + 1.0 + 1.0, kPixelTolerance) << "label " << i;
-        const double row = at.y - 2.0 / view.zoomY();
-        EXPECT_NEAR(std::remainder(row, step), 0.0, pixel) << "label " << i << " off the step";
-        EXPECT_EQ(
-            labels[i]->string(),
-            *view.getScale(channelItem, channelItem->offsetY() +
-                                            channelItem->scaleY() * std::round(row / step) * step));
-        if (i > 0) {
-            EXPECT_GT(at.y, labels[i - 1]->position().y);
-        }
+        EXPECT_NEAR(view.getPointScreen(at).x, 3.0 + 1.0 + 1.0, kPixelTolerance) << i;
+        const double row = std::round((at.y - 2.0 / view.zoomY()) / step) * step;
+        EXPECT_NEAR(at.y - 2.0 / view.zoomY(), row, view.getCurrentViewVolume().size.height / 400);
+        EXPECT_EQ(labels[i]->string(),
+                  *view.getScale(item, item->offsetY() + item->scaleY() * row));
+        EXPECT_TRUE(i == 0 || at.y > labels[i - 1]->position().y) << i;
     }
-}
 
-TEST_F(TimelineTest, drawEndpoints__oneLinePairPerObjectExtent) {
-    const double lastFrame = 6.0 - 1.0 / 30.0;
-    ctrl.showAll();
-    ASSERT_EQ(ctrl.numberOfRootItems(), 2u) << "the title and the logo are shown";
-    ASSERT_TRUE(frame());
-    EXPECT_TRUE(extentLines().empty()) << "nothing selected among two objects";
-
-    // Two channels of one object: its extent once.
-    ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Position, 0), true);
-    ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Position, 1), true);
-    ASSERT_TRUE(frame());
-    EXPECT_EQ(extentLines(), (std::multiset<double>{0.0, std::round(lastFrame * 3000) / 3000}));
-
-    // The lower third starts a second in: its extent adds its own pair.
-    host.setSelectedObjects({host.scene().objectNamed(kTQHostSampleTitleObject),
-                             host.scene().objectNamed(kTQHostSampleOffsetObject)});
-    ctrl.showAll();
-    ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Opacity), true);
-    ctrl.selectChannel(channel(kTQHostSampleOffsetObject, TQHostProperty::Opacity), true);
-    ASSERT_TRUE(frame());
-    EXPECT_EQ(extentLines(), (std::multiset<double>{0.0, 1.0, std::round(lastFrame * 3000) / 3000,
-                                                    std::round(lastFrame * 3000) / 3000}));
-}
-
-TEST_F(TimelineTest, keypointLabel__besideItsKeypointAfterEveryKindOfZoom) {
-    // The logo's last bounce, at 2.47 s: in view at every zoom below.
-    TQChannel* x = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
-    const TQCurveEditorItemPtr item = ctrl.selectedCurveSet()->itemWithChannel(x);
-    ASSERT_TRUE(item);
-    const TQKeyframeHandle key = x->getKeyframes(false)[6];
-    auto entry = std::make_shared<TQCurveSelection>();
-    entry->setHandle(key);
-    entry->setFlags(TQSelectionKeypoint);
-    entry->setCurveId(item->channelId());
-    view.getSelection()->addSelection(entry);
+    // The logo's last bounce, at 2.47 s: its label stays beside it through every zoom.
+    ctrl.deselectAllChannels();
+    TQChannel* y = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
+    const TQCurveEditorItemPtr bounce = ctrl.selectedCurveSet()->itemWithChannel(y);
+    selectKeypointsOf(y, 6);
     view.setPrintText(1);
-
     auto keypointOnScreen = [&] {
         CMTime t = kCMTimeInvalid;
         double v = 0.0;
-        x->getKeyframe(key, &t, &v);
+        y->getKeyframe(y->getKeyframes(false)[6], &t, &v);
         return view.getPointScreen(
-            CGPointMake(CMTimeGetSeconds(t), ctrl.convertFromChannelCoords(item.get(), v)));
+            CGPointMake(CMTimeGetSeconds(t), ctrl.convertFromChannelCoords(bounce.get(), v)));
     };
     auto expectBeside = [&](const char* after) {
         ASSERT_TRUE(frame());
         const CGPoint keypoint = keypointOnScreen();
-        ASSERT_TRUE(keypoint.x > 0.0 && keypoint.x < 700.0 && keypoint.y > 0.0 &&
-                    keypoint.y < 350.0)
-            << "the keypoint left the view after " << after;
+        ASSERT_TRUE(CGRectContainsPoint(CGRectMake(0, 0, 700, 350), keypoint)) << after;
         const HXDText* label = nullptr;
         for (const HXDText* text : texts())
             if (text->string().rfind("(", 0) == 0) label = text;
@@ -314,75 +254,74 @@ TEST_F(TimelineTest, keypointLabel__besideItsKeypointAfterEveryKindOfZoom) {
     view.setMouseOrigin(keypointOnScreen());
     view.zoom(-120.0, 0.0);
     expectBeside("a drag zoom");
-    view.frameAll(1);
-    expectBeside("framing everything");
 }
 
-// ---- Typed numbers ---------------------------------------------------------------------------
+TEST_F(TimelineTest, extent_lines__one_pair_per_object_of_the_selected_channels) {
+    const double last = std::round((6.0 - 1.0 / 30.0) * 3000) / 3000;
+    ctrl.showAll();
+    ASSERT_TRUE(frame());
+    EXPECT_TRUE(lines(false).empty()) << "nothing selected among two objects";
+    ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Position, 0), true);
+    ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Position, 1), true);
+    ASSERT_TRUE(frame());
+    EXPECT_EQ(lines(false), (std::multiset<double>{0.0, last})) << "two channels of one object";
+    // The lower third starts a second in: its extent adds its own pair.
+    host.setSelectedObjects({object(kTQHostSampleTitleObject), object(kTQHostSampleOffsetObject)});
+    ctrl.showAll();
+    ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Opacity), true);
+    ctrl.selectChannel(channel(kTQHostSampleOffsetObject, TQHostProperty::Opacity), true);
+    ASSERT_TRUE(frame());
+    EXPECT_EQ(lines(false), (std::multiset<double>{0.0, 1.0, last, last}));
+}
 
-TEST_F(TimelineTest, keyDown__aDigitMovesTheEarliestSelectedKeypointToThatFrame) {
+TEST_F(TimelineTest, typed_numbers__move_the_selected_keypoints_as_one_undo_step) {
     TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
     const std::unique_ptr<TQChannelBase> before(x->cloneChannel());
     const std::vector<double> times = keyTimes(x);
     selectKeypointsOf(x);
     viewHost.setScreenOrigin(CGPointMake(100.0, 200.0));
-    std::string shown;
-    CGRect panelFrame = CGRectZero;
-    modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        shown = panel.contentView()->subview<RWTextField>()->stringValue();
-        panelFrame = panel.frame();
-        panel.contentView()->subview<RWTextField>()->insertText(
-            "2");  // the user goes on typing: "12"
-        panel.contentView()->subview<RWTextField>()->userEndEditing(
-            panel.contentView()->subview<RWTextField>()->stringValue());
-    });
-    EXPECT_TRUE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "1")));
+    EXPECT_TRUE(type("1", "2", "OK"));  // the user goes on typing: "12"
     EXPECT_EQ(shown, "1") << "the key that opened the panel is in its field";
     // Centred on the view's top edge, hanging below it.
     EXPECT_EQ(panelFrame.origin.x + panelFrame.size.width / 2.0, 100.0 + 400.0);
     EXPECT_EQ(panelFrame.origin.y + panelFrame.size.height, 200.0 + 400.0);
-
+    // A digit puts the earliest keypoint on that frame; the others keep their distance.
     const std::vector<double> after = keyTimes(x);
     ASSERT_EQ(after.size(), times.size());
-    const double shift = 12.0 / 30.0 - times[0];
     for (size_t i = 0; i < times.size(); ++i)
-        EXPECT_NEAR(after[i], times[i] + shift, 1.0 / 30.0 / 2.0) << "keypoint " << i;
+        EXPECT_NEAR(after[i], times[i] + 12.0 / 30.0 - times[0], 1.0 / 60.0) << "keypoint " << i;
     EXPECT_EQ(host.undoDescription(), "Move Keypoint");
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(*x == *before) << "one undo step takes the move back exactly";
-}
 
-TEST_F(TimelineTest, keyDown__aSignMovesBySoManyFramesAndTextThatIsNoNumberChangesNothing) {
+    // A sign moves each keypoint onto the frame so many frames later.
+    view.getSelection()->reset();
     TQChannel* y = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
-    const std::vector<double> times = keyTimes(y);
+    const std::vector<double> yTimes = keyTimes(y);
     selectKeypointsOf(y);
-    modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        panel.contentView()->subview<RWTextField>()->insertText("6");
-        button(panel, "OK")->userClick();
-    });
-    EXPECT_TRUE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "+")));
-    const std::vector<double> moved = keyTimes(y);
-    // Each keypoint on the frame six frames later (each is put on the grid by itself).
-    for (size_t i = 0; i < times.size(); ++i)
-        EXPECT_NEAR(moved[i], std::round(times[i] * 30.0 + 6.0) / 30.0, 1e-9) << "keypoint " << i;
+    EXPECT_TRUE(type("+", "6", "OK"));
+    for (size_t i = 0; i < yTimes.size(); ++i)
+        EXPECT_NEAR(keyTimes(y)[i], std::round(yTimes[i] * 30.0 + 6.0) / 30.0, 1e-9) << i;
 
     // Text that is no number cannot end the edit; the panel stays until Cancel.
-    const std::unique_ptr<TQChannelBase> before(y->cloneChannel());
+    const std::unique_ptr<TQChannelBase> moved(y->cloneChannel());
     std::optional<std::string> refused;
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
         refused = panel.contentView()->subview<RWTextField>()->userEndEditing("-1e");
-        button(panel, "Cancel")->userClick();
+        panel.contentView()
+            ->subview<RWButton>([](const RWButton& b) { return b.title() == "Cancel"; })
+            ->userClick();
     });
     EXPECT_TRUE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "-")));
     EXPECT_TRUE(refused.has_value()) << "the field must refuse text that is no number";
-    EXPECT_TRUE(*y == *before);
+    EXPECT_TRUE(*y == *moved);
     EXPECT_EQ(host.undoDescription(), "Move Keypoint") << "no step for a cancelled panel";
 
     // Other keys go on; digits without a selected keypoint open nothing.
     EXPECT_FALSE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "a")));
     view.getSelection()->reset();
     EXPECT_TRUE(view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "5")));
-    EXPECT_EQ(modal.runs().size(), 2u) << "no panel without a selected keypoint";
+    EXPECT_EQ(modal.runs().size(), 3u) << "no panel without a selected keypoint";
 }
 
 }  // namespace
