@@ -34,8 +34,6 @@ TEST(Matrix, projections__conventionalRowsDepthRangesAndDegenerateExtents) {
     // The curve views draw with the zero-to-one projection of their view volume, near -1, far 1.
     const BNMatrix44f view = BNViewVolumeProjection(CGRectMake(0.0, -62.5, 100.0, 125.0));
     EXPECT_EQ(view, BNMatrix44f::orthoZeroToOne(0.0f, 100.0f, -62.5f, 62.5f, -1.0f, 1.0f));
-    EXPECT_EQ(view.at(2, 2), -0.5f);
-    EXPECT_EQ(view.at(2, 3), 0.5f);
     // Its translation is computed from the float edges, as the drawn frame has it.
     const BNMatrix44f far = BNViewVolumeProjection(CGRectMake(3600.1, 0.0, 0.3, 1.0));
     const float l = 3600.1f, r = static_cast<float>(3600.1 + 0.3);
@@ -57,28 +55,22 @@ TEST(Matrix, projections__conventionalRowsDepthRangesAndDegenerateExtents) {
 TEST(Matrix, algebra__productOrderTransposeColumnMajorAccessAndDeterminant) {
     const auto t = BNMatrix44d::translation(10.0, 20.0, 30.0);
     const auto s = BNMatrix44d::scaling(2.0, 3.0, 4.0);
-    EXPECT_EQ((t * s).transformPoint(1.0, 1.0, 1.0), (BNVector4Tmpl<double>{12, 23, 34, 1}))
-        << "scale first";
-    EXPECT_EQ((s * t).transformPoint(1.0, 1.0, 1.0), (BNVector4Tmpl<double>{22, 63, 124, 1}));
-    EXPECT_EQ(t.transformVector(1.0, 2.0, 3.0), (BNVector4Tmpl<double>{1, 2, 3, 0}))
-        << "a direction ignores translation";
+    using V = BNVector4Tmpl<double>;
+    EXPECT_EQ((t * s).transformPoint(1.0, 1.0, 1.0), (V{12, 23, 34, 1})) << "scale first";
+    EXPECT_EQ((s * t).transformPoint(1.0, 1.0, 1.0), (V{22, 63, 124, 1}));
+    EXPECT_EQ(t.transformVector(1.0, 2.0, 3.0), (V{1, 2, 3, 0})) << "a direction ignores moves";
     BNMatrix44d w = BNMatrix44d::identity();
     w.set(3, 2, 1.0);  // w' = z + 1
-    EXPECT_EQ(w.transformPoint(4.0, 6.0, 1.0), (BNVector4Tmpl<double>{2, 3, 0.5, 1}))
-        << "divided by w";
-    EXPECT_EQ(BNMatrix44d::identity() * t, t);
+    EXPECT_EQ(w.transformPoint(4.0, 6.0, 1.0), (V{2, 3, 0.5, 1})) << "divided by w";
 
     // GPU matrices are column-major: the transpose of the storage, translation in 12 to 14.
     float cm[16];
     const auto m = BNMatrix44f::orthoZeroToOne(10.0f, 20.0f, -5.0f, 5.0f, -1.0f, 1.0f);
     m.toColumnMajor(cm);
-    EXPECT_EQ(cm[12], m.at(0, 3));
-    EXPECT_EQ(cm[13], m.at(1, 3));
-    EXPECT_EQ(BNMatrix44f::fromColumnMajor(cm), m);
-    EXPECT_EQ(BNMatrix44f::fromColumnMajor(cm), m.transposed().transposed());
+    EXPECT_EQ((std::array{cm[12], cm[13], cm[1]}),
+              (std::array{m.at(0, 3), m.at(1, 3), m.at(1, 0)}));
     EXPECT_EQ(m.transposed().at(3, 0), m.at(0, 3));
-    EXPECT_EQ(BNMatrix44f(BNMatrix44d::scaling(0.5, 0.5, 0.5)),
-              BNMatrix44f::scaling(0.5f, 0.5f, 0.5f));
+    EXPECT_EQ(BNMatrix44f::fromColumnMajor(cm), m);
 
     // Indices outside 0..3 read as zero and write nowhere.
     BNMatrix44d g = BNMatrix44d::identity();
@@ -89,8 +81,6 @@ TEST(Matrix, algebra__productOrderTransposeColumnMajorAccessAndDeterminant) {
     EXPECT_EQ(g, BNMatrix44d::identity());
 
     EXPECT_NEAR(s.determinant(), 24.0, kExact);
-    EXPECT_NEAR(t.determinant(), 1.0, kExact);
-    EXPECT_NEAR(rows({0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1}).determinant(), -1.0, kExact);
     EXPECT_NEAR(rows({2, -1, 0, 3, 1, 4, 2, -2, 0, 5, -3, 1, 7, 0, 1, 0.5}).determinant(), 366.5,
                 1e-9);
 }
@@ -109,12 +99,6 @@ TEST(Matrix, invert__pivotsRowsAndTurnsSingularMatricesToZero) {
     }
     const auto clip = BNMatrix44d::ortho(3.0, 7.0, -2.0, 2.0, -1.0, 1.0).inverted();
     EXPECT_EQ(clip.transformPoint(-1.0, -1.0, 0.0), (BNVector4Tmpl<double>{3, -2, 0, 1}));
-    EXPECT_EQ(clip.transformPoint(1.0, 1.0, 0.0), (BNVector4Tmpl<double>{7, 2, 0, 1}));
-    BNMatrix44f swapped(std::array<float, 16>{0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 0, 1, 0, 0, 1, 0});
-    EXPECT_TRUE(swapped.invert());
-    EXPECT_EQ(swapped * BNMatrix44f(
-                            std::array<float, 16>{0, 1, 0, 0, 1, 0, 0, 0, 0, 0, 0, 1, 0, 0, 1, 0}),
-              BNMatrix44f::identity());
 
     // A rank-deficient row, a zero row, NaN or infinity, an inverse too large for a double, and
     // in single precision a row that is a sum of two others up to rounding: no inverse, and the
@@ -149,20 +133,20 @@ TEST(ViewProjection, roundTrip__worldToScreenToWorldWithinFloatRounding) {
         BNViewVolumeProjection(volume).toColumnMajor(cm);
         const BNMatrix44f p = BNMatrix44f::fromColumnMajor(cm);
         // A few float ulps of the larger of the volume's edges, in world units.
-        const double tolX =
-            16.0 * kFloatUlp * std::fmax(std::fabs(volume.origin.x), volume.size.width);
-        const double tolY =
-            16.0 * kFloatUlp * std::fmax(std::fabs(volume.origin.y), volume.size.height);
+        auto tol = [](double origin, double size) {
+            return 16.0 * kFloatUlp * std::fmax(std::fabs(origin), size);
+        };
         for (double fx : {0.0, 0.125, 0.5, 0.9}) {
             for (double fy : {0.0, 0.3, 1.0}) {
                 const CGPoint world{volume.origin.x + fx * volume.size.width,
                                     volume.origin.y + fy * volume.size.height};
                 const CGPoint screen = BNProjectionWorldToScreen(p, drawable, world);
-                EXPECT_NEAR(screen.x, fx * drawable.width, 1e-2) << volume.origin.x << " " << fx;
-                EXPECT_NEAR(screen.y, fy * drawable.height, 1e-2) << volume.origin.x << " " << fy;
+                SCOPED_TRACE(testing::Message() << volume.origin.x << " " << fx << " " << fy);
+                EXPECT_NEAR(screen.x, fx * drawable.width, 1e-2);
+                EXPECT_NEAR(screen.y, fy * drawable.height, 1e-2);
                 const CGPoint back = BNProjectionScreenToWorld(p, drawable, screen);
-                EXPECT_NEAR(back.x, world.x, tolX) << volume.origin.x << " " << fx;
-                EXPECT_NEAR(back.y, world.y, tolY) << volume.origin.x << " " << fy;
+                EXPECT_NEAR(back.x, world.x, tol(volume.origin.x, volume.size.width));
+                EXPECT_NEAR(back.y, world.y, tol(volume.origin.y, volume.size.height));
             }
         }
     }
