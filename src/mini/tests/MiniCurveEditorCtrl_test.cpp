@@ -17,29 +17,22 @@ namespace {
 class MiniCtrl : public MiniFixture {};
 
 TEST_F(MiniCtrl, setChannel__a_channel_or_a_folder_fills_the_private_set) {
-    {
-        editor.setChannel(gain);
-        EXPECT_EQ(ctrl().numberOfChannelItems(), 1u);
-        EXPECT_TRUE(ctrl()._linked);
-        EXPECT_EQ(ctrl().getCurrentTool(), TQTool::kEdit);
-        EXPECT_EQ(ctrl().selectedCurveSet()->curveSetName(),
-                  TQLocalizedString("Curve Editor Curve Set Untitled"));
-        EXPECT_EQ(editor.axisY().stringValue(), "Gain");
-        EXPECT_EQ(view().getController(), editor.controller());
-    }
-    {
-        editor.setChannel(gradient);
-        EXPECT_EQ(ctrl().numberOfChannelItems(), 2u) << "both components of the pair";
-        const auto item = ctrl().selectedCurveSet()->itemWithChannel(gradient->getXChannel());
-        ASSERT_NE(item, nullptr);
-        EXPECT_FALSE(static_cast<TQCurveEditorChannelItem&>(*item).drawProcessedCurve());
-    }
-    {
-        editor.setChannel(nullptr);
-        EXPECT_EQ(ctrl().numberOfChannelItems(), 0u) << "a null channel is an empty folder";
-        EXPECT_FALSE(editor.hasSelection());
-        EXPECT_EQ(CMTimeCompare(editor.getSelectedValueX(), kCMTimeZero), 0);
-    }
+    editor.setChannel(gain);
+    EXPECT_EQ(ctrl().numberOfChannelItems(), 1u);
+    EXPECT_TRUE(ctrl()._linked);
+    EXPECT_EQ(ctrl().getCurrentTool(), TQTool::kEdit);
+    EXPECT_EQ(ctrl().selectedCurveSet()->curveSetName(),
+              TQLocalizedString("Curve Editor Curve Set Untitled"));
+    EXPECT_EQ(editor.axisY().stringValue(), "Gain");
+    EXPECT_EQ(view().getController(), editor.controller());
+    editor.setChannel(gradient);
+    EXPECT_EQ(ctrl().numberOfChannelItems(), 2u) << "both components of the pair";
+    const auto item = ctrl().selectedCurveSet()->itemWithChannel(gradient->getXChannel());
+    ASSERT_NE(item, nullptr);
+    EXPECT_FALSE(static_cast<TQCurveEditorChannelItem&>(*item).drawProcessedCurve());
+    editor.setChannel(nullptr);
+    EXPECT_EQ(ctrl().numberOfChannelItems(), 0u) << "a null channel is an empty folder";
+    EXPECT_FALSE(editor.hasSelection());
 }
 
 TEST_F(MiniCtrl, defaultMenu__extrapolation_submenus_reflect_the_first_channel) {
@@ -74,79 +67,51 @@ TEST_F(MiniCtrl, defaultMenu__extrapolation_submenus_reflect_the_first_channel) 
     EXPECT_TRUE(ctrl().validateMenuItem(del));
 }
 
-struct MenuCommand {
-    const char* action;
-    int64_t tag;
-    const char* undoKey;
-    std::function<void(TQChannel& x, TQChannel& y)> expect;
-};
-
-void PrintTo(const MenuCommand& c, std::ostream* os) { *os << c.action << c.tag; }
-
-class MiniMenuCommand : public MiniFixture, public ::testing::WithParamInterface<MenuCommand> {};
-
-TEST_P(MiniMenuCommand, command__every_channel_in_one_undo_step) {
-    const MenuCommand& command = GetParam();
+TEST_F(MiniCtrl, menu_commands__every_channel_in_one_undo_step) {
     editor.setChannel(gradient);
-    const auto before = snapshot();
-    auto want = snapshot();
-    auto& wantPair =
-        static_cast<TQChannel2DOverRange&>(*TQChannelRef(gradient, object).getChannel(want.get()));
-    command.expect(*wantPair.getXChannel(), *wantPair.getYChannel());
-    recorder.clearCalls();
-
-    RWMenuItem sender("", command.action);
-    sender.setTag(command.tag);
-    ASSERT_TRUE(ctrl().performAction(command.action, sender));
-
-    EXPECT_TRUE(*object == *want);
-    EXPECT_EQ(recorder.captureBalance(), 0);
-    const auto seq = recorder.bracketSequence();
-    ASSERT_FALSE(seq.empty());
-    EXPECT_EQ(seq.back(), "postNotification(0x8)");
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString(command.undoKey));
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(*object == *before) << "undo gives the scene back exactly";
-}
-
-INSTANTIATE_TEST_SUITE_P(
-    Menu, MiniMenuCommand,
-    ::testing::Values(
-        MenuCommand{"menuSetCurvePreExtrapolation:", kTQExtrapolationRepeat,
-                    "Undo Set Pre Extrapolation",
-                    [](TQChannel& x, TQChannel& y) {
-                        x.setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationBefore);
-                        y.setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationBefore);
-                    }},
-        MenuCommand{"menuSetCurvePostExtrapolation:", kTQExtrapolationLinear,
-                    "Undo Set Post Extrapolation",
-                    [](TQChannel& x, TQChannel& y) {
-                        x.setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter);
-                        y.setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter);
-                    }},
-        MenuCommand{"menuSetCurveInterpolation:channel:", kTQInterpolationLinear,
-                    "Undo Set Interpolation",
-                    [](TQChannel& x, TQChannel& y) {
-                        x.setInterpolation(kTQInterpolationLinear);
-                        y.setInterpolation(kTQInterpolationLinear);
-                    }},
-        // Both follow the first channel's state, whatever their own.
-        MenuCommand{"menuLockChannel:channel:", 0, "Undo Lock Keypoint",
-                    [](TQChannel& x, TQChannel& y) {
-                        x.setLocked(true, true);
-                        y.setLocked(true, true);
-                    }}));
-
-TEST_F(MiniCtrl, menuLockChannel__all_take_the_opposite_of_the_first) {
-    editor.setChannel(gradient);
+    const struct {
+        const char* action;
+        int64_t tag;
+        const char* undoKey;
+        std::function<void(TQChannel&)> expect;
+    } rows[] = {
+        {"menuSetCurvePreExtrapolation:", kTQExtrapolationRepeat, "Undo Set Pre Extrapolation",
+         [](TQChannel& c) { c.setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationBefore); }},
+        {"menuSetCurvePostExtrapolation:", kTQExtrapolationLinear, "Undo Set Post Extrapolation",
+         [](TQChannel& c) { c.setExtrapolation(kTQExtrapolationLinear, kTQExtrapolationAfter); }},
+        {"menuSetCurveInterpolation:channel:", kTQInterpolationLinear, "Undo Set Interpolation",
+         [](TQChannel& c) { c.setInterpolation(kTQInterpolationLinear); }},
+        {"menuLockChannel:channel:", 0, "Undo Lock Keypoint",
+         [](TQChannel& c) { c.setLocked(true, true); }},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(row.action);
+        const auto before = snapshot();
+        auto want = snapshot();
+        auto& pair = static_cast<TQChannel2DOverRange&>(
+            *TQChannelRef(gradient, object).getChannel(want.get()));
+        row.expect(*pair.getXChannel());
+        row.expect(*pair.getYChannel());
+        recorder.clearCalls();
+        RWMenuItem sender("", row.action);
+        sender.setTag(row.tag);
+        ASSERT_TRUE(ctrl().performAction(row.action, sender));
+        EXPECT_TRUE(*object == *want);
+        EXPECT_EQ(recorder.captureBalance(), 0);
+        ASSERT_FALSE(recorder.bracketSequence().empty());
+        EXPECT_EQ(recorder.bracketSequence().back(), "postNotification(0x8)");
+        EXPECT_EQ(host.undoDescription(), TQLocalizedString(row.undoKey));
+        ASSERT_TRUE(host.undo());
+        EXPECT_TRUE(*object == *before) << "undo gives the scene back exactly";
+    }
+    // Locking: every channel takes the opposite of the first one's state, whatever its own.
     gradient->getYChannel()->setLocked(true, true);
-    RWMenuItem sender("", "menuLockChannel:channel:");
-    ctrl().performAction(sender.action(), sender);
-    EXPECT_TRUE(gradient->getXChannel()->isLocked(false));
-    EXPECT_TRUE(gradient->getYChannel()->isLocked(false));
-    ctrl().performAction(sender.action(), sender);
-    EXPECT_FALSE(gradient->getXChannel()->isLocked(false));
-    EXPECT_FALSE(gradient->getYChannel()->isLocked(false));
+    RWMenuItem lock("", "menuLockChannel:channel:");
+    for (const bool locked : {true, false}) {
+        ctrl().performAction(lock.action(), lock);
+        EXPECT_EQ(gradient->getXChannel()->isLocked(false), locked);
+        EXPECT_EQ(gradient->getYChannel()->isLocked(false), locked);
+    }
 }
 
 TEST_F(MiniCtrl, menuSetCurveInterpolation__checks_the_chosen_item_and_ignores_mixed) {
@@ -190,16 +155,15 @@ TEST_F(MiniCtrl, selection__mirrored_onto_items_and_read_by_the_rows) {
     EXPECT_EQ(ctrl().numberOfSelectedChannels(), 0u);
 }
 
-TEST_F(MiniCtrl, moveSelectedInY__primary_takes_the_value_others_keep_their_distance) {
+TEST_F(MiniCtrl, move__primary_takes_the_value_others_keep_their_distance_pairs_move_whole) {
     editor.setChannel(gain);
     selectKeys(gain, {0.5, 1.0});
     editor.setSelectedValueY(40.0);
     EXPECT_DOUBLE_EQ(keyValue(*gain, 0.5), 40.0);
     EXPECT_DOUBLE_EQ(keyValue(*gain, 1.0), 30.0);
     EXPECT_DOUBLE_EQ(keyValue(*gain, 0.0), 10.0) << "unselected keypoints stay";
-}
 
-TEST_F(MiniCtrl, moveSelectedInX__moves_a_linked_pair_as_a_whole) {
+    // In x a linked pair moves as a whole.
     editor.setChannel(gradient);
     TQChannel* x = gradient->getXChannel();
     TQChannel* y = gradient->getYChannel();
