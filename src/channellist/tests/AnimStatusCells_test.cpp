@@ -185,50 +185,42 @@ TEST_F(AnimStatusCells, validation__locked_mixed_and_several_channels) {
     list.selectRowIndexes(RWIndexSet{row}, false);
     list.selectRowIndexes(RWIndexSet{other}, true);
     host.setCurrentTime(sec(2));
-    RWMenuPtr menu = openMenu(row);
-    ASSERT_TRUE(menu);
-    {
-        SCOPED_TRACE("two channels, Linear and Bezier");
-        EXPECT_EQ(item(menu, "Anim Menu Interpolation Linear")->state(), RWMixedState);
-        EXPECT_EQ(item(menu, "Anim Menu Interpolation Bezier")->state(), RWMixedState);
-        EXPECT_EQ(item(menu, "Anim Menu Interpolation Constant")->state(), RWOffState);
-        EXPECT_FALSE(item(menu, "Anim Menu Simplify Channel")->isEnabled());
-        EXPECT_FALSE(item(menu, "Anim Menu Extrapolation Generate")->isEnabled());
-        EXPECT_TRUE(item(menu, "Anim Menu Delete Keyframe")->isEnabled()) << "both keyed at 2 s";
-        EXPECT_FALSE(item(menu, "Anim Menu Add Keyframe")->isEnabled());
-    }
-    {
-        SCOPED_TRACE("one channel whose keyframes differ marks each kind it holds");
-        channel->setKeyframeInterpolation(channel->getKeyframe(sec(1)), kTQInterpolationCatmullRom);
-        list.selectRowIndexes(RWIndexSet{row}, false);
-        menu = openMenu(row);
-        EXPECT_EQ(item(menu, "Anim Menu Interpolation Catmull Rom")->state(), RWMixedState);
-        EXPECT_EQ(item(menu, "Anim Menu Interpolation Linear")->state(), RWMixedState);
-        EXPECT_EQ(item(menu, "Anim Menu Interpolation Bezier")->state(), RWOffState);
-    }
-    {
-        SCOPED_TRACE("one of two locked: still Lock, and edits stay allowed");
-        second->setLocked(true);
-        list.selectRowIndexes(RWIndexSet{row, other}, false);
-        menu = openMenu(row);
-        const RWMenuItemPtr lock = item(menu, "Anim Menu Lock Channel");
-        ASSERT_TRUE(lock);
-        EXPECT_EQ(lock->state(), RWMixedState);
-        EXPECT_TRUE(item(menu, "Anim Menu Reset Channel")->isEnabled());
-    }
-    {
-        SCOPED_TRACE("all locked: Unlock, and nothing that edits");
-        channel->setLocked(true);
-        menu = openMenu(row);
-        ASSERT_TRUE(item(menu, "Anim Menu Unlock Channel"));
-        EXPECT_TRUE(item(menu, "Anim Menu Unlock Channel")->isEnabled());
-        for (const char* key :
-             {"Anim Menu Reset Channel", "Anim Menu Add Keyframe", "Anim Menu Delete Keyframe",
-              "Anim Menu Disable Animation", "Anim Menu Interpolation Linear",
-              "Anim Menu Extrapolation Repeat", "Anim Menu Simplify Channel"})
-            EXPECT_FALSE(item(menu, key)->isEnabled()) << key;
-        EXPECT_TRUE(item(menu, "Anim Menu Next Keyframe")->isEnabled()) << "moving time is fine";
-    }
+    // Each item's state or enabled flag: M mixed, 1 on, 0 off; + enabled, - disabled.
+    auto states = [&](std::initializer_list<const char*> keys) {
+        const RWMenuPtr menu = openMenu(row);
+        std::string out;
+        for (const char* key : keys) {
+            const RWMenuItemPtr i = item(menu, key);
+            if (!i) return out + "?" + key;
+            out += i->state() == RWMixedState ? 'M' : i->state() == RWOnState ? '1' : '0';
+            out += i->isEnabled() ? '+' : '-';
+        }
+        return out;
+    };
+    // Two channels, Linear and Bezier, both keyed at 2 s.
+    EXPECT_EQ(states({"Anim Menu Interpolation Linear", "Anim Menu Interpolation Bezier",
+                      "Anim Menu Interpolation Constant", "Anim Menu Simplify Channel",
+                      "Anim Menu Extrapolation Generate", "Anim Menu Delete Keyframe",
+                      "Anim Menu Add Keyframe"}),
+              "M+M+0+0-0-0+0-");
+    // One channel whose keyframes differ marks each kind it holds.
+    channel->setKeyframeInterpolation(channel->getKeyframe(sec(1)), kTQInterpolationCatmullRom);
+    list.selectRowIndexes(RWIndexSet{row}, false);
+    EXPECT_EQ(states({"Anim Menu Interpolation Catmull Rom", "Anim Menu Interpolation Linear",
+                      "Anim Menu Interpolation Bezier"}),
+              "M+M+0+");
+    // One of two locked: still Lock, mixed, and edits stay allowed.
+    second->setLocked(true);
+    list.selectRowIndexes(RWIndexSet{row, other}, false);
+    EXPECT_EQ(states({"Anim Menu Lock Channel", "Anim Menu Reset Channel"}), "M+0+");
+    // All locked: Unlock, and nothing that edits; moving time is fine.
+    channel->setLocked(true);
+    EXPECT_EQ(
+        states({"Anim Menu Unlock Channel", "Anim Menu Reset Channel", "Anim Menu Add Keyframe",
+                "Anim Menu Delete Keyframe", "Anim Menu Disable Animation",
+                "Anim Menu Interpolation Linear", "Anim Menu Extrapolation Repeat",
+                "Anim Menu Simplify Channel", "Anim Menu Next Keyframe"}),
+        "0+0-0-0-0-M-0-0-0+");
 }
 
 TEST_F(AnimStatusCells, folder_keyframes__hidden_children_do_not_count) {

@@ -3,19 +3,9 @@
 // the editor's items, the channels, the curve sets and the host's undo then hold.
 #include <gtest/gtest.h>
 
-#include <memory>
-#include <string>
-
-#include "host/TQHostAppDelegate.h"
-#include "host/TQHostSampleScene.h"
 #include "platform/ui/RWCommandsController.h"
-#include "platform/ui/testing/RWTestDoubles.h"
-#include "src/channellist/TQCurveEditorChannelList.h"
-#include "src/channellist/TQCurveEditorListController.h"
 #include "src/channellist/TQCurveEditorScrubberCell.h"
 #include "src/channellist/tests/ChannelListFixture.h"
-#include "src/editor/TQCurveEditorCtrl.h"
-#include "src/editor/TQCurveEditorView.h"
 #include "src/resources/TQStrings.h"
 
 namespace {
@@ -210,12 +200,9 @@ TEST_F(ChannelListTest, routing__byColumnAndModifier) {
         click(Ctrl::kValueColumn, 4, RWEventModifierFlagShift);
         EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{4}));
     }
-    {  // A press in Key selects the row (no status cell yet: nothing else happens).
-        click(Ctrl::kKeyColumn, 1);
-        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1}));
-        EXPECT_FALSE(controller.mouseDown());
-        EXPECT_EQ(controller.cellClickedChannel(), nullptr);
-    }
+    click(Ctrl::kKeyColumn, 1);  // no status cell here: the press only selects
+    EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1}));
+    EXPECT_EQ(controller.cellClickedChannel(), nullptr);
     {  // The arrows run a bound command instead of moving the selection.
         int ran = 0;
         auto command = std::make_shared<RWCommand>("next frame", 0xF703, 0, [&] {
@@ -237,23 +224,25 @@ TEST_F(ChannelListTest, hover__partsOfTheKeyCellAndTheirTips) {
     auto over = [&](double x) {
         moveTo(list.convertPointToWindow(CGPointMake(key.origin.x + x, key.origin.y + 5)));
     };
-    over(5);
-    EXPECT_EQ(controller.mouseInRow(), row);
-    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartPrevious);
-    EXPECT_EQ(controller.mouseInChan(), itemAt(row)->channelBase());
-    EXPECT_EQ(list.toolTip(), TQLocalizedString("Anim Tool Tip Previous Keyframe"));
-    over(25);
-    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartNext);
-    EXPECT_EQ(list.toolTip(), TQLocalizedString("Anim Tool Tip Next Keyframe"));
-    over(45);
-    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartAddOrDelete);
     CMTime now = host.currentTime();
-    EXPECT_EQ(list.toolTip(), TQLocalizedString(itemAt(row)->channel()->hasKeyframeAtTime(&now, 0)
-                                                    ? "Anim Tool Tip Delete Keyframe"
-                                                    : "Anim Tool Tip Add Keyframe"));
-    over(-30);
-    EXPECT_EQ(controller.mouseInPartIndex(), TQCurveEditorChannelList::kPartOutside);
-    EXPECT_EQ(list.toolTip(), std::nullopt);
+    const bool keyed = itemAt(row)->channel()->hasKeyframeAtTime(&now, 0);
+    using L = TQCurveEditorChannelList;
+    const struct {
+        double x;
+        int part;
+        const char* tip;
+    } parts[] = {{5, L::kPartPrevious, "Anim Tool Tip Previous Keyframe"},
+                 {25, L::kPartNext, "Anim Tool Tip Next Keyframe"},
+                 {45, L::kPartAddOrDelete,
+                  keyed ? "Anim Tool Tip Delete Keyframe" : "Anim Tool Tip Add Keyframe"},
+                 {-30, L::kPartOutside, nullptr}};
+    for (const auto& p : parts) {
+        over(p.x);
+        EXPECT_EQ(controller.mouseInRow(), row);
+        EXPECT_EQ(controller.mouseInPartIndex(), p.part) << p.x;
+        EXPECT_EQ(list.toolTip(), p.tip ? std::optional(TQLocalizedString(p.tip)) : std::nullopt);
+    }
+    EXPECT_EQ(controller.mouseInChan(), itemAt(row)->channelBase());
     list.mouseLeftView(RWEvent::mouseEvent(RWEventType::MouseExited, CGPointZero));
     EXPECT_EQ(controller.mouseInRow(), Ctrl::kNone);
     EXPECT_EQ(controller.mouseInChan(), nullptr);
