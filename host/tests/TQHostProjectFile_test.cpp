@@ -35,15 +35,14 @@ void expectSameNode(const TQChannelBase& a, const TQChannelBase& b, const std::s
     EXPECT_EQ(b.getChannelId(), a.getChannelId());
     EXPECT_EQ(TQChannelFactoryIdOf(&b), TQChannelFactoryIdOf(&a));
     EXPECT_TRUE(CMTimeIdentical(b.ownTimeOffset(), a.ownTimeOffset()));
-    EXPECT_TRUE(CMTimeIdentical(b.timeExtent().start, a.timeExtent().start));
-    EXPECT_TRUE(CMTimeIdentical(b.timeExtent().duration, a.timeExtent().duration));
+    EXPECT_TRUE(CMTimeIdentical(b.timeExtent().start, a.timeExtent().start) &&
+                CMTimeIdentical(b.timeExtent().duration, a.timeExtent().duration));
     EXPECT_EQ(b.getXAxisLabel(), a.getXAxisLabel());
     if (const auto* ca = dynamic_cast<const TQChannel*>(&a)) {
         const auto* cb = dynamic_cast<const TQChannel*>(&b);
         ASSERT_NE(cb, nullptr);
-        EXPECT_EQ(cb->getDefaultValue(), ca->getDefaultValue());
-        EXPECT_EQ(cb->sliderMaximum(), ca->sliderMaximum());
-        EXPECT_EQ(cb->isRigged(), ca->isRigged());
+        EXPECT_EQ(std::tuple(cb->getDefaultValue(), cb->sliderMaximum(), cb->isRigged()),
+                  std::tuple(ca->getDefaultValue(), ca->sliderMaximum(), ca->isRigged()));
     }
     const auto* fa = dynamic_cast<const TQChannelFolder*>(&a);
     if (!fa) return;
@@ -151,14 +150,16 @@ TEST(TQHostProjectFileTest, roundTrip__everyChannelFieldTimeSettingAndBothTrees)
         EXPECT_TRUE(*b[i] == *a[i]) << "object " << a[i]->getName() << " changed on the way";
         expectSameNode(*a[i], *b[i], a[i]->getName());
     }
-    EXPECT_TRUE(CMTimeIdentical(other.getFrameDuration(), host.getFrameDuration()));
-    EXPECT_TRUE(CMTimeIdentical(other.displayRange().start, host.displayRange().start));
-    EXPECT_TRUE(CMTimeIdentical(other.displayRange().duration, host.displayRange().duration));
-    EXPECT_TRUE(CMTimeIdentical(other.currentTime(), host.currentTime()));
-    EXPECT_EQ(other.firstFrameNumber(), 1u);
-    EXPECT_EQ(other.startTimecode(), 86400u);
-    EXPECT_TRUE(CMTimeIdentical(other.secondsPerTextStep(), host.secondsPerTextStep()));
-    EXPECT_TRUE(other.shouldDisplayTimeAsFrames());
+    // Times in their own timescales, the numbers and the flag.
+    auto timing = [](TQHostAppDelegate& h) {
+        std::string out;
+        for (const CMTime& t : {h.getFrameDuration(), h.displayRange().start,
+                                h.displayRange().duration, h.currentTime(), h.secondsPerTextStep()})
+            out += std::to_string(t.value) + "/" + std::to_string(t.timescale) + " ";
+        return out + std::to_string(h.firstFrameNumber()) + " " +
+               std::to_string(h.startTimecode()) + (h.shouldDisplayTimeAsFrames() ? " frames" : "");
+    };
+    EXPECT_EQ(timing(other), timing(host));
     const auto selected = other.selectedObjectsRootChannels();
     ASSERT_EQ(selected.size(), 2u);
     EXPECT_EQ(selected[0]->getChannelId(), a[2]->getChannelId()) << "selection order is kept";
@@ -169,20 +170,17 @@ TEST(TQHostProjectFileTest, roundTrip__everyChannelFieldTimeSettingAndBothTrees)
 
     const TQCurveEditorState& sa = project.editorState();
     const TQCurveEditorState& sb = reopened.editorState();
-    EXPECT_EQ(sb.autoZoom(), sa.autoZoom());
-    EXPECT_EQ(sb.snapping(), sa.snapping());
-    EXPECT_EQ(sb.snapshotChannels(), sa.snapshotChannels());
-    EXPECT_EQ(sb.displayAudioWaveform(), sa.displayAudioWaveform());
-    EXPECT_EQ(sb.lockKeyframesInTime(), sa.lockKeyframesInTime());
+    auto flags = [](const TQCurveEditorState& s) {
+        return std::vector<bool>{s.autoZoom(), s.snapping(), s.snapshotChannels(),
+                                 s.displayAudioWaveform(), s.lockKeyframesInTime()};
+    };
+    EXPECT_EQ(flags(sb), flags(sa));
     // The range travels as start and end, so its duration comes back equal, in the end's
     // timescale.
     EXPECT_TRUE(CMTimeIdentical(sb.displayRange().start, host.displayRange().start));
     EXPECT_EQ(sb.displayRange().duration, host.displayRange().duration);
     // The top edge makes the trip as a sum: y comes back through (y + h) - h.
-    EXPECT_EQ(sb.currentViewVolume().x, -0.5);
-    EXPECT_EQ(sb.currentViewVolume().width, 0.1);
-    EXPECT_EQ(sb.currentViewVolume().height, 1e-9);
-    EXPECT_EQ(sb.currentViewVolume().y, (2.0 + 1e-9) - 1e-9);
+    EXPECT_EQ(sb.currentViewVolume(), BNRect<double>(-0.5, (2.0 + 1e-9) - 1e-9, 0.1, 1e-9));
 
     const auto& la = project.curveSets();
     const auto& lb = reopened.curveSets();
@@ -192,9 +190,8 @@ TEST(TQHostProjectFileTest, roundTrip__everyChannelFieldTimeSettingAndBothTrees)
         SCOPED_TRACE(s);
         const TQCurveSetSerializer& x = *la.curveSets()[s];
         const TQCurveSetSerializer& y = *lb.curveSets()[s];
-        EXPECT_EQ(y._name, x._name);
-        EXPECT_EQ(y._shortcut, x._shortcut);
-        EXPECT_EQ(y._relative, x._relative);
+        EXPECT_EQ(y._name + "|" + y._shortcut + (y._relative ? "|relative" : ""),
+                  x._name + "|" + x._shortcut + (x._relative ? "|relative" : ""));
         ASSERT_EQ(y._channels.size(), x._channels.size());
         for (size_t i = 0; i < x._channels.size(); ++i) {
             EXPECT_EQ(y._channels[i]->getChannelRef(), x._channels[i]->getChannelRef());
