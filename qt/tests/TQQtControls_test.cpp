@@ -81,19 +81,6 @@ TEST(QtZoomScroller, knob_follows_the_model_and_gestures_reach_it) {
     EXPECT_EQ(target.actions.size(), actions) << "a disabled model takes no gesture";
 }
 
-TEST(QtZoomScroller, a_replacement_in_the_models_place_is_shown_by_the_same_widget) {
-    TQQtZoomScroller widget;
-    auto old = std::make_shared<RWZoomScroller>();
-    widget.setModel(old);
-    ASSERT_EQ(old->superview(), &widget);
-    auto replacement = std::make_shared<RWZoomScroller>();
-    replacement->setKnobProportion(0.5);
-    old->superview()->replaceSubview(*old, replacement);
-    EXPECT_EQ(widget.model(), replacement);
-    EXPECT_EQ(old->superview(), nullptr);
-    EXPECT_EQ(widget.pageStep(), TQQtZoomScroller::kResolution / 2);
-}
-
 TEST(QtSegmentedControl, buttons_show_the_segments_and_clicks_select_them) {
     Target target;
     auto model = wired<RWSegmentedControl>(target, "setCurrentTool:");
