@@ -62,11 +62,6 @@ protected:
         host.removeNotificationReceiver(&ctrl);
         view.setIsInCurveEditor(1);  // no auto-zoom in step 7 unless a row asks for it
         title = object(kTQHostSampleTitleObject);
-        logo = object(kTQHostSampleBehaviorObject);
-    }
-    TQChannel* channelOf(TQChannelBase* object, TQHostProperty property, size_t axis = 0) {
-        const BNString& path = TQHostPropertyPaths(family(), property)[axis];
-        return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(object));
     }
     // The set shown, the objects selected and the channels changed since the last reset.
     void state(void (TQCurveEditorCtrl::*show)(RWActionSender*),
@@ -80,13 +75,13 @@ protected:
 
     RecordingList list{ctrl, log};
     TQChannelObjectRootBase* title = nullptr;
-    TQChannelObjectRootBase* logo = nullptr;
 };
 
 TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
     using C = TQCurveEditorCtrl;
-    TQChannel* bounce = channelOf(logo, TQHostProperty::Position, 1);  // an unselected object's
-    TQChannel* pivot = channelOf(title, TQHostProperty::Pivot);        // no keys, default value
+    // An unselected object's channel, and one with no keys at its default value.
+    TQChannel* bounce = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
+    TQChannel* pivot = channel(kTQHostSampleTitleObject, TQHostProperty::Pivot);
     const std::string r = "resetModifiedChannels", sel = "objectsSelectedInScene",
                       mod = "modifiedChannels", ref = "refreshSelectedCurveSet",
                       tool = "currentToolChanged", beh = "updateIfModifiedByBehaviors";

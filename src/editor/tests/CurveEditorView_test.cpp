@@ -59,10 +59,6 @@ protected:
         const CMTime s = seconds(start), d = seconds(duration);
         view.setDisplayRange(&s, &d);
     }
-    TQChannel* channel(const char* name, TQHostProperty property, size_t axis = 0) {
-        const auto& paths = TQHostPropertyPaths(TQHostObjectFamily::Kestrel, property);
-        return dynamic_cast<TQChannel*>(TQChannelRef(paths[axis]).getChannel(object(name)));
-    }
     // The world x of the last frame's lines: stippled (the grid) or in the extent colour.
     std::multiset<double> lines(bool grid) const {
         const HXDColor extent = TQCurveEditorViewBase::drawingColor(view.endpointsColor());

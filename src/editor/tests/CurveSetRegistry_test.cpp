@@ -94,28 +94,27 @@ TEST_F(CurveSetRegistry, pop_up__sections_in_order_with_custom_sets_and_the_pane
 
 TEST_F(CurveSetRegistry, custom_sets__adding_cloning_and_merging) {
     TQChannelObjectRootBase* title = object(kTQHostSampleTitleObject);
-    auto channel = [&](const char* path) {
-        return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(title));
-    };
     {
         SCOPED_TRACE("adds while an automatic set shows start a custom set");
         gNewCurveSetIndex = 1;
         ctrl.showActive();
         ASSERT_TRUE(ctrl.canModifySelectedCurveSet()) << "Active takes channels by hand";
-        ctrl.appendChannelToCurveSet(channel("./1/200/202"));
-        ctrl.appendChannelToCurveSet(channel("./1/100/101/1"));
+        ctrl.appendChannelToCurveSet(channel("Title", "./1/200/202"));
+        ctrl.appendChannelToCurveSet(channel("Title", "./1/100/101/1"));
         const TQCurveSetPtr added = ctrl.selectedCurveSet();
         // "Untitled Set 1" asked for; a number 1 is dropped by the unique form.
         EXPECT_EQ(added->curveSetName(), "Untitled Set");
         EXPECT_EQ(gNewCurveSetIndex, 2u) << "the second add went into the same set";
-        EXPECT_EQ(shownChannels(), (std::vector<const TQChannelBase*>{channel("./1/200/202"),
-                                                                      channel("./1/100/101/1")}));
+        EXPECT_EQ(shownChannels(),
+                  (std::vector<const TQChannelBase*>{channel("Title", "./1/200/202"),
+                                                     channel("Title", "./1/100/101/1")}));
         ctrl.showAll();
-        ctrl.appendChannelToCurveSet(channel("./1/200/202"));
+        ctrl.appendChannelToCurveSet(channel("Title", "./1/200/202"));
         EXPECT_EQ(ctrl.selectedCurveSet()->curveSetName(), "Untitled Set 2");
         EXPECT_EQ(ctrl.getCurveSetById(added->curveSetId()), added);
-        ctrl.setChannelInList(channel("./1/100/105/1"));
-        EXPECT_EQ(shownChannels(), (std::vector<const TQChannelBase*>{channel("./1/100/105/1")}));
+        ctrl.setChannelInList(channel("Title", "./1/100/105/1"));
+        EXPECT_EQ(shownChannels(),
+                  (std::vector<const TQChannelBase*>{channel("Title", "./1/100/105/1")}));
     }
     {
         SCOPED_TRACE("a clone of the shown set is absolute, selected and named uniquely");

@@ -176,6 +176,13 @@ protected:
     virtual TQHostObjectFamily family() const { return TQHostObjectFamily::Kestrel; }
 
     TQChannelObjectRootBase* object(const char* name) { return host.scene().objectNamed(name); }
+    // An object's channel by its path, or by the family's path of a property.
+    TQChannel* channel(const char* objectName, const std::string& path) {
+        return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(object(objectName)));
+    }
+    TQChannel* channel(const char* objectName, TQHostProperty property, size_t axis = 0) {
+        return channel(objectName, TQHostPropertyPaths(family(), property)[axis]);
+    }
     // The channels the selected set shows, in order.
     std::vector<const TQChannelBase*> shownChannels() const {
         std::vector<const TQChannelBase*> out;

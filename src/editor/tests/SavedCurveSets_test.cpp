@@ -12,9 +12,6 @@ namespace {
 
 class SavedCurveSets : public EditorFixture {
 protected:
-    TQChannel* channel(const char* objectName, const char* path) {
-        return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(object(objectName)));
-    }
     std::string pathOf(const TQChannelBase* c) {
         return c ? TQChannelRef(c, host.sceneChannelRoot()).getText() : "(none)";
     }
