@@ -202,6 +202,7 @@ TEST_F(ChannelListTest, routing__byColumnAndModifier) {
     }
     click(Ctrl::kKeyColumn, 1);  // no status cell here: the press only selects
     EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1}));
+    EXPECT_FALSE(controller.mouseDown());
     EXPECT_EQ(controller.cellClickedChannel(), nullptr);
     {  // The arrows run a bound command instead of moving the selection.
         int ran = 0;
