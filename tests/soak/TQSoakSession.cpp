@@ -133,6 +133,7 @@ std::string TQSoakSession::step() {
         _lastDetail.clear();
         const bool history = e.run == &TQSoakSession::undoOrRedo;
         const std::unique_ptr<TQChannelBase> before = history ? nullptr : sceneCopy();
+        const size_t stepsBefore = _host.undoStack().undoCount();
         (this->*e.run)();
         frame();
         if (!_failure.empty()) return std::string(e.name) + ": " + _failure;
@@ -141,7 +142,11 @@ std::string TQSoakSession::step() {
         _trace.push_back(done);
         if (_trace.size() > kTraceLength) _trace.pop_front();
         std::string broken = invariants();
-        if (broken.empty() && before) broken = undoesExactly(*before);
+        if (broken.empty() && before) {
+            const size_t stepsAfter = _host.undoStack().undoCount();
+            broken =
+                undoesExactly(*before, stepsAfter > stepsBefore ? stepsAfter - stepsBefore : 0);
+        }
         if (broken.empty()) return broken;
         std::string report = "after " + done + ": " + broken + "\n  the steps up to it:";
         for (const std::string& t : _trace) report += " " + t + ";";
@@ -291,12 +296,10 @@ void TQSoakSession::sketch() {
 }
 
 void TQSoakSession::key() {
-    // A key tapped, as the key map sends it: the press, then the release. (Each press is an
-    // undo step of its own, so a held key's repeats would be several.)
-    // Left and right are left out: a sideways nudge onto a taken time leaves two keyframes
-    // there (no purge follows a nudge), and a box drag over such a pair is not undone exactly
-    // yet.
-    static const char* const kKeys[] = {"nudgeUp:", "nudgeDown:", "delete:"};
+    // A key held for a few repeats, then released, as the key map sends it (each repeat is an
+    // undo step of its own).
+    static const char* const kKeys[] = {
+        "nudgeUp:", "nudgeDown:", "nudgeLeft:", "nudgeRight:", "delete:"};
     const std::string action = kKeys[below(std::size(kKeys))];
     _lastDetail = action;
     RWMenuItem sender("", "", "");
@@ -304,7 +307,7 @@ void TQSoakSession::key() {
         _view.performAction(action, sender);
         return;
     }
-    _view.performAction(action, sender);
+    for (size_t i = 0, n = 1 + below(4); i < n; ++i) _view.performAction(action, sender);
     _view.performAction(action.substr(0, action.size() - 1) + "Finished:", sender);
 }
 
@@ -429,12 +432,17 @@ std::string TQSoakSession::invariants() {
 
 // A step that changed the scene is one undo step: undo gives the scene before it, redo the
 // scene after it.
-std::string TQSoakSession::undoesExactly(const TQChannelBase& before) {
+std::string TQSoakSession::undoesExactly(const TQChannelBase& before, size_t steps) {
     if (sceneIs(before)) return {};
     const std::unique_ptr<TQChannelBase> after = sceneCopy();
-    if (!_host.undo()) return "a change that cannot be undone";
+    // Some gestures are two steps (Option on a tangent breaks it with the press, then the drag
+    // moves it): the action's steps are undone together.
+    if (steps == 0) return "a change that cannot be undone";
+    for (size_t i = 0; i < steps; ++i)
+        if (!_host.undo()) return "a change that cannot be undone";
     const bool restored = sceneIs(before);
-    if (!_host.redo()) return "its undo cannot be redone";
+    for (size_t i = 0; i < steps; ++i)
+        if (!_host.redo()) return "its undo cannot be redone";
     _ctrl.validateSelection(_view.getSelection());
     _host.postNotification(kTQNotifyCurvesInvalidated);
     if (!restored) return "undo does not restore " + firstDifference(before, *after);

@@ -65,7 +65,7 @@ private:
     void newCurveSet();
 
     std::string invariants();
-    std::string undoesExactly(const TQChannelBase& before);
+    std::string undoesExactly(const TQChannelBase& before, size_t steps);
     std::unique_ptr<TQChannelBase> sceneCopy();
     // The scene holds the animation of `expected` (editor state aside).
     bool sceneIs(const TQChannelBase& expected);
