@@ -1,6 +1,7 @@
 // Picking: what the hit test of a frame answers at a point, what a click and a band take into
 // the selection, what the other tools take, and the selection repairs and commands.
 
+#include <sstream>
 #include <string>
 
 #include "src/view/tests/ViewMouseFixture.h"
@@ -36,18 +37,18 @@ std::string hitAt(const TQCurveEditorViewBase& view, const TQCurveEditorCtrlBase
     const auto item = ctrl.channelItemWithIdentifier(
         static_cast<uint32_t>(hits[0].extraInfo().objectForKey("ID")->unsignedLongValue()));
     const TQChannel* c = item ? dynamic_cast<const TQChannel*>(item->channelBase()) : nullptr;
-    std::string out = hits[0].hitID() == TQSelectionKeypoint     ? "key "
-                      : hits[0].hitID() == TQSelectionOutTangent ? "out "
-                      : hits[0].hitID() == TQSelectionInTangent  ? "in "
-                                                                 : "curve ";
-    out += c ? c->getName() : "?";
+    std::ostringstream out;
+    out << (hits[0].hitID() == TQSelectionKeypoint     ? "key "
+            : hits[0].hitID() == TQSelectionOutTangent ? "out "
+            : hits[0].hitID() == TQSelectionInTangent  ? "in "
+                                                       : "curve ")
+        << (c ? c->getName() : "?");
     if (const HXDNumber* h = hits[0].extraInfo().objectForKey("Handle")) {
         const auto keys = c ? c->getKeyframes(false) : std::vector<TQKeyframeHandle>{};
         for (size_t k = 0; k < keys.size(); ++k)
-            if (reinterpret_cast<uintptr_t>(keys[k]) == h->unsignedLongLongValue())
-                out += "#" + std::to_string(k);
+            if (reinterpret_cast<uintptr_t>(keys[k]) == h->unsignedLongLongValue()) out << "#" << k;
     }
-    return out;
+    return out.str();
 }
 
 TEST_F(ViewPick, hitTest__the_closest_thing_under_the_pointer_is_the_only_record) {
