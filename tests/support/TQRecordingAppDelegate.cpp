@@ -1,47 +1,7 @@
 #include "tests/support/TQRecordingAppDelegate.h"
 
 #include <algorithm>
-#include <array>
 #include <cstdio>
-
-namespace {
-
-constexpr std::array<std::string_view, 9> kBracketOperations = {"startCaptureModifiedChannels",
-                                                                "endCaptureModifiedChannels",
-                                                                "willChangeChannel",
-                                                                "didChangeChannel",
-                                                                "willSetChannelValue",
-                                                                "didSetChannelValue",
-                                                                "addChannelToUndo",
-                                                                "addToUndo",
-                                                                "postNotification"};
-
-bool isBracketOperation(std::string_view operation) {
-    return std::find(kBracketOperations.begin(), kBracketOperations.end(), operation) !=
-           kBracketOperations.end();
-}
-
-}  // namespace
-
-std::string TQDelegateCall::describe() const {
-    if (operation == "postNotification") {
-        char hex[16];
-        std::snprintf(hex, sizeof hex, "0x%x", static_cast<unsigned>(word));
-        return operation + "(" + hex + ")";
-    }
-    if (operation == "addToUndo")
-        return operation + "(" + std::to_string(type) + "," + std::to_string(action) + "," + text +
-               ")";
-    if (operation == "addChannelToUndo") return operation + "(" + channelName + "," + text + ")";
-    if (operation == "startCaptureModifiedChannels") return operation + "(" + text + ")";
-    if (channel || !channelName.empty()) return operation + "(" + channelName + ")";
-    if (operation == "setCurrentTime") {
-        char seconds[32];
-        std::snprintf(seconds, sizeof seconds, "%g", CMTimeGetSeconds(time));
-        return operation + "(" + seconds + ")";
-    }
-    return operation + "()";
-}
 
 TQDelegateCall& TQRecordingAppDelegate::record(std::string_view operation) {
     TQDelegateCall& call = _calls.emplace_back();
@@ -57,17 +17,44 @@ TQDelegateCall& TQRecordingAppDelegate::recordChannel(std::string_view operation
     return call;
 }
 
-std::vector<std::string> TQRecordingAppDelegate::describedCalls() const {
-    std::vector<std::string> out;
-    out.reserve(_calls.size());
-    for (const auto& call : _calls) out.push_back(call.describe());
-    return out;
-}
-
-std::vector<std::string> TQRecordingAppDelegate::bracketSequence() const {
-    std::vector<std::string> out;
-    for (const auto& call : _calls)
-        if (isBracketOperation(call.operation)) out.push_back(call.describe());
+std::string TQRecordingAppDelegate::bracketText() const {
+    std::vector<std::string> tokens;
+    for (const auto& c : _calls) {
+        const std::string& o = c.operation;
+        if (o == "startCaptureModifiedChannels") tokens.push_back("{" + c.text);
+        if (o == "endCaptureModifiedChannels") tokens.push_back("}");
+        if (o == "willChangeChannel") tokens.push_back("<" + c.channelName);
+        if (o == "didChangeChannel") tokens.push_back(c.channelName + ">");
+        if (o == "willSetChannelValue") tokens.push_back("(" + c.channelName);
+        if (o == "didSetChannelValue") tokens.push_back(c.channelName + ")");
+        if (o == "addChannelToUndo") tokens.push_back("+" + c.channelName + ":" + c.text);
+        if (o == "addToUndo")
+            tokens.push_back("+" + std::to_string(c.type) + "." + std::to_string(c.action) + ":" +
+                             c.text);
+        if (o == "postNotification") {
+            char hex[16];
+            std::snprintf(hex, sizeof hex, "!%x", static_cast<unsigned>(c.word));
+            tokens.push_back(hex);
+        }
+    }
+    // Greedy: at each place the group of up to eight calls that repeats over the most calls.
+    std::string out;
+    for (size_t i = 0; i < tokens.size();) {
+        size_t bestLength = 1, bestRepeats = 1;
+        for (size_t k = 1; k <= 8 && i + 2 * k <= tokens.size(); ++k) {
+            size_t r = 1;
+            while (
+                i + (r + 1) * k <= tokens.size() &&
+                std::equal(tokens.begin() + i, tokens.begin() + i + k, tokens.begin() + i + r * k))
+                ++r;
+            if (r > 1 && r * k > bestRepeats * bestLength) bestLength = k, bestRepeats = r;
+        }
+        std::string group;
+        for (size_t k = 0; k < bestLength; ++k) group += (k ? " " : "") + tokens[i + k];
+        out += (out.empty() ? "" : " ") +
+               (bestRepeats > 1 ? std::to_string(bestRepeats) + "*[" + group + "]" : group);
+        i += bestLength * bestRepeats;
+    }
     return out;
 }
 

@@ -29,10 +29,6 @@ struct TQDelegateCall {
     uint32_t action = 0;
     const void* object = nullptr;
     CMTime time = kCMTimeInvalid;
-
-    // "willChangeChannel(X)", "postNotification(0x8)", "startCaptureModifiedChannels(Undo
-    // Move Keypoint)", "addToUndo(2,0,Curve Editor Undo Remove Channel)", "currentTime()".
-    std::string describe() const;
 };
 
 class TQRecordingAppDelegate : public TQCurveEditorAppDelegate {
@@ -66,11 +62,14 @@ public:
     // --- Reading the record ---
     const std::vector<TQDelegateCall>& calls() const { return _calls; }
     void clearCalls() { _calls.clear(); }
-    // Every call, described.
-    std::vector<std::string> describedCalls() const;
-    // Only the calls of the edit bracket: start and end of capture, the four will/did
-    // announcements, the two undo recordings and postNotification, described.
-    std::vector<std::string> bracketSequence() const;
+    // The calls of the edit bracket (start and end of capture, the four will/did
+    // announcements, the two undo recordings and postNotification) as one short line a test
+    // can state whole: "{Move Keypoint" opens a
+    // capture and "}" ends it, "<A" and "A>" are will- and didChangeChannel, "(A" and "A)"
+    // will- and didSetChannelValue, "+A:Add Keypoint" addChannelToUndo, "+2.0:Box Edit"
+    // addToUndo (type.action), "!8" a posted word in hex. A group of calls repeated back to
+    // back is written once, as "3*[(A A)]".
+    std::string bracketText() const;
     size_t count(std::string_view operation) const;
     // Starts minus ends so far: 0 when every bracket that opened has closed.
     int captureBalance() const;

@@ -1,182 +1,233 @@
-// Every keypoint and tangent command of the menus, run as a user runs it on one scene through
-// the reference host: the channels end as wanted (the whole tree compared), the changed curves
-// are marked for a redraw, the host sees one balanced bracket under the command's name, and
-// undo gives back the scene exactly, redo the result.
+// The controller's edits, each a row run on a fresh scene through the reference host: what the
+// channels hold after it (every keyframe with its handles), what the host saw of it (the
+// bracket as one line, see bracketText), the order the channels moved their keyframes in,
+// the view's selection and the curves marked for a redraw are held in a recorded baseline
+// (baselines/edits.txt, see TextBaseline.h); every row is undone to the very scene it started
+// from and redone to the one it made.
 
 #include <functional>
+#include <map>
+#include <sstream>
 #include <string>
-#include <vector>
 
-#include "src/engine/tests/EngineFixture.h"
-#include "src/resources/TQStrings.h"
+#include "src/engine/TQEditBrackets.h"
+#include "tests/support/EngineFixture.h"
+#include "tests/support/TextBaseline.h"
 
-using namespace engine_test;
-
+namespace engine_test {
 namespace {
 
-// The present value goes into the initial value before a curve loses keypoints.
-void settle(TQChannel& c) { c.setInitialValue(c.getCurveValue(seconds(0), true), false); }
-TQKeyframeHandle at(TQChannel& c, double t) { return c.getKeyframe(seconds(t)); }
-void forXyz(TQChannelBase& root, const std::function<void(TQChannel&)>& edit) {
-    for (const char* n : {"X", "Y", "Z"}) edit(named(root, n));
-}
-
-struct Command {
-    const char* action;
-    const char* undoKey;
-    const char* dirty;  // items marked for a redraw, by channel name
-    std::function<void(TQChannelBase& want)> expect;
+struct Edit {
+    const char* name;
+    const char* scene;      // as build() reads it
+    const char* selection;  // as select() reads it
+    const char* script;     // "set-up steps | the edit's steps", separated by ";", see run()
+    bool onGrid = false;    // the controller puts times on the frame grid
 };
 
-void PrintTo(const Command& c, std::ostream* os) { *os << c.action; }
+void PrintTo(const Edit& e, std::ostream* os) { *os << e.name; }
 
-class CtrlCommands : public WithReferenceHost<EngineFixture>,
-                     public ::testing::WithParamInterface<Command> {
+class CtrlEdits : public WithReferenceHost<EngineFixture>,
+                  public ::testing::WithParamInterface<Edit> {
 protected:
-    void SetUp() override {
-        WithReferenceHost::SetUp();
-        a = addChannel("A", {{1, 1}, {2, 3}, {3, 2}});
-        b = addChannel("B", {{0, 10}, {4, 20}});
-        TQCompoundChannel* pos = addCompound("Pos", 3, true, {{1, 2}, {2, 5}});
-        for (TQChannel* c : {a, b, static_cast<TQChannel*>(pos->getChild(0))})
-            items.push_back(addItem(c));
-        a->setKeyframeLocked(at(*a, 1), true);
-        // The primary entry is unlocked and enabled; A's locked keypoint rides along.
-        selectInView({keypointEntry(items[0], 2), keypointEntry(items[2], 1),
-                      keypointEntry(items[1], 4), keypointEntry(items[0], 1),
-                      keypointEntry(items[1], 0)});
-        for (const auto& item : items) item->setOriginalCurveDirty(0);
-        recorder.clearCalls();
+    std::unique_ptr<TQCurveEditorCtrlBase> makeController() override {
+        if (GetParam().onGrid) return std::make_unique<FrameGridController>();
+        return EngineFixture::makeController();
     }
-    std::string dirtyItems() const {
-        std::string out;
-        for (const auto& item : items)
-            if (item->originalCurveDirty()) out += item->channel()->getName();
-        return out;
+    // Runs the steps: a name and its arguments, times in seconds, entries as select() reads
+    // them. The selection a step works on is the view's.
+    void run(const std::string& script) {
+        TQCurveEditorViewBase undrawn;
+        std::vector<std::string> a;
+        const auto N = [&](size_t i) { return i < a.size() ? std::stod(a[i]) : 0.0; };
+        const auto T = [&](size_t i) { return seconds(N(i)); };
+        const auto E = [&](size_t i) { return entry(a.at(i)); };
+        TQCurveSelectionList* s = view.getSelection();
+        const std::map<std::string, std::function<void()>> steps = {
+            {"menu",
+             [&] {
+                 RWMenuItem sender(a[0], a[0]);
+                 EXPECT_TRUE(ctrl().performAction(a[0], sender));
+             }},
+            {"select", [&] { select(a.empty() ? "" : a[0]); }},
+            {"move", [&] { ctrl().moveSelected(s, T(0), N(1), 1, char(N(2))); }},
+            {"nudge", [&] { ctrl().offsetSelected(s, T(0), N(1)); }},
+            {"offsetcurve", [&] { ctrl().offsetCurve(s, T(0), N(1)); }},
+            {"drag", [&] { drag(int(N(0)), N(1), N(2), N(3)); }},
+            {"add", [&] { ctrl().addVertex(E(0), T(1)); }},
+            {"addvalue", [&] { ctrl().addVertex(E(0), T(1), N(2), 1); }},
+            {"deletevertex", [&] { ctrl().deleteVertex(E(0).get(), T(1)); }},
+            {"tangent", [&] { ctrl().setTangents(E(0).get(), N(1), N(2)); }},
+            {"tangent45", [&] { ctrl().setTangents45(E(0).get(), N(1), N(2), char(N(3))); }},
+            {"tangents", [&] { ctrl().setTangentsSelected(s, N(0), N(1)); }},
+            {"tangents45", [&] { ctrl().setTangents45Selected(s, N(0), N(1), char(N(2))); }},
+            {"break", [&] { ctrl().breakTangents(E(0).get()); }},
+            {"breaks", [&] { ctrl().breakTangentsSelected(s); }},
+            {"weight", [&] { ctrl().weightTangents(E(0).get(), char(N(1))); }},
+            {"weights", [&] { ctrl().weightTangentsSelected(s, char(N(0))); }},
+            {"bezier", [&] { ctrl().setBezierPoint(E(0).get()); }},
+            {"beziers", [&] { ctrl().setBezierPointSelected(s); }},
+            {"flatten", [&] { ctrl().flattenSelected(s); }},
+            {"align", [&] { ctrl().alignTangentsSelected(s); }},
+            {"purge", [&] { ctrl().purgeSelected(s); }},
+            {"clean", [&] { ctrl().cleanSelection(s); }},
+            {"now", [&] { recorder.setCurrentTime(T(0)); }},
+            {"mouse", [&] { view.setMouseOrigin(view.getPointScreen(CGPointMake(N(0), N(1)))); }},
+            {"save", [&] { ctrl().saveTangents(E(0).get()); }},
+            {"negative", [&] { ctrl().allowNegativeRange(true); }},
+            {"linked", [&] { ctrl()._linked = true; }},
+            {"offset", [&] { object->setTimeOffset(T(0)); }},
+            {"remove",
+             [&] { item(a[0])->channel()->getParent()->removeChild(item(a[0])->channel()); }},
+            {"unlist", [&] { set->removeItemWithIdentifier(item(a[0])->channelId()); }},
+            {"movekey",
+             [&] {
+                 const CMTime from = T(1), to = T(2);
+                 item(a[0])->channel()->moveKeyframe(&from, &to, true);
+             }},
+            {"noview", [&] { ctrl().setView(nullptr); }},
+            {"undrawn", [&] { ctrl().setView(&undrawn); }},
+        };
+        std::istringstream in(script);
+        for (std::string step; std::getline(in, step, ';');) {
+            std::istringstream words(step);
+            std::string op, word;
+            words >> op;
+            a.clear();
+            while (words >> word) a.push_back(word);
+            if (op == "select") a = {step.substr(step.find("select") + 6)};
+            ASSERT_TRUE(steps.count(op)) << "no such step: " << step;
+            steps.at(op)();
+        }
+        ctrl().setView(&view);
     }
-
-    TQChannel* a = nullptr;
-    TQChannel* b = nullptr;
-    std::vector<TQCurveEditorChannelItemPtr> items;  // A, B, X
+    // A drag of `steps` steps as the view runs it, the anchor going from t0 by dt and dv a step.
+    void drag(int steps, double t0, double dt, double dv) {
+        TQCurveSelectionList* list = view.getSelection();
+        ctrl().validateSelection(list);
+        const TQChangeBracket gesture(ctrl(), list, "Undo Move Keypoint");
+        for (int step = 1; step <= steps; ++step) {
+            const TQModifyValueGuard values(ctrl(), list);
+            ctrl().moveSelected(list, seconds(t0 + dt * step), dv * step, 1, 0);
+        }
+    }
 };
 
-TEST_P(CtrlCommands, command__one_undo_step_that_restores_the_scene_exactly) {
-    const Command& command = GetParam();
+TEST_P(CtrlEdits, edit__as_recorded_and_undone_exactly) {
+    const Edit& e = GetParam();
+    build(e.scene);
+    select(e.selection);
+    const std::string script = e.script;
+    const size_t bar = script.find('|');
+    if (bar != script.npos) run(script.substr(0, bar));
+    for (const auto& i : items) i->setOriginalCurveDirty(0);
     const auto before = snapshot();
-    auto want = snapshot();
-    command.expect(*want);
-
-    RWMenuItem sender(command.action, command.action);
-    ASSERT_TRUE(ctrl().performAction(command.action, sender));
-
-    EXPECT_TRUE(sceneIs(*want));
-    EXPECT_EQ(dirtyItems(), command.dirty);
-    const auto seq = recorder.bracketSequence();
-    ASSERT_FALSE(seq.empty());
-    EXPECT_EQ(seq.front(),
-              "startCaptureModifiedChannels(" + TQLocalizedString(command.undoKey) + ")");
-    EXPECT_EQ(seq.back(), "postNotification(0x8)");
+    moves.clear();
+    recorder.clearCalls();
+    run(script.substr(bar == script.npos ? 0 : bar + 1));
+    std::string redraw;
+    for (const auto& i : items)
+        redraw += i->originalCurveDirty() ? i->channelBase()->getName() : "";
+    const size_t steps = host.undoStack().undoCount();
+    EXPECT_TRUE(tests_support::matchesBaselineBlock(
+        "edits", e.name,
+        "scene: " + sceneText(*object, true) + "\ncalls: " + recorder.bracketText() +
+            "\nmoves: " + moves + "\nselection: " + selectionText() + "\nredraw: " + redraw +
+            "\nundo steps: " + std::to_string(steps) + "\n",
+        "src/engine/tests/baselines"));
     EXPECT_EQ(recorder.captureBalance(), 0);
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString(command.undoKey));
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(*before)) << "undo";
-    ASSERT_TRUE(host.redo());
-    EXPECT_TRUE(sceneIs(*want)) << "redo";
+    // Edits made outside a bracket leave no step: the view brackets them.
+    const auto after = snapshot();
+    for (size_t i = 0; i < steps; ++i) ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(steps == 0 || sceneIs(*before)) << "undo";
+    for (size_t i = 0; i < steps; ++i) ASSERT_TRUE(host.redo());
+    EXPECT_TRUE(sceneIs(*after)) << "redo";
 }
+
+// The scene of the menu commands: A's first keypoint is locked; X is linked to Y and Z. The
+// primary entry is unlocked and enabled.
+constexpr const char* kMenuScene =
+    "A: 1=1L 2=3 3=2; B: 0=10 4=20; Pos.X: 1=2 2=5; Pos.Y: 1=2 2=5; Pos.Z: 1=2 2=5";
+constexpr const char* kMenuSelection = "A@2 X@1 B@4 A@1 B@0";
 
 INSTANTIATE_TEST_SUITE_P(
-    Menus, CtrlCommands,
+    Engine, CtrlEdits,
     ::testing::Values(
-        // A locked keypoint stays; a linked component takes its siblings along.
-        Command{"menuDelete:", "Undo Delete Keypoint", "ABX",
-                [](TQChannelBase& w) {
-                    TQChannel& wa = named(w, "A");
-                    settle(wa);
-                    wa.deleteKeyframe(at(wa, 2));
-                    TQChannel& wb = named(w, "B");
-                    settle(wb);
-                    wb.deleteKeyframe(at(wb, 0));
-                    wb.deleteKeyframe(at(wb, 4));
-                    forXyz(w, [](TQChannel& c) {
-                        settle(c);
-                        c.deleteKeyframe(at(c, 1));
-                    });
-                }},
-        // Taken frames are crossed; only the selected component is copied.
-        Command{"menuDuplicate:", "Undo Duplicate", "ABX",
-                [](TQChannelBase& w) {
-                    TQChannel& wa = named(w, "A");
-                    wa.cloneKeyframe(at(wa, 2), CMTimeMake(61, 30));
-                    wa.cloneKeyframe(at(wa, 1), CMTimeMake(31, 30));
-                    TQChannel& wb = named(w, "B");
-                    wb.cloneKeyframe(at(wb, 4), CMTimeMake(121, 30));
-                    wb.cloneKeyframe(at(wb, 0), CMTimeMake(1, 30));
-                    TQChannel& wx = named(w, "X");
-                    wx.cloneKeyframe(at(wx, 1), CMTimeMake(31, 30));
-                }},
-        // Each curve over its own span; one keypoint on X reverses nothing.
-        Command{"menuReverse:", "Undo Reverse", "AB",
-                [](TQChannelBase& w) {
-                    TQChannel& wa = named(w, "A");
-                    wa.reverseKeyframes(at(wa, 1), at(wa, 2));
-                    TQChannel& wb = named(w, "B");
-                    wb.reverseKeyframes(at(wb, 0), at(wb, 4));
-                }},
-        // Onto the segment arriving at each keypoint: none before the first.
-        Command{"menuEaseIn:", "Undo Ease In", "AB",
-                [](TQChannelBase& w) {
-                    TQChannel& wa = named(w, "A");
-                    wa.setKeyframeInterpolation(at(wa, 1), kTQInterpolationEaseIn);
-                    TQChannel& wb = named(w, "B");
-                    wb.setKeyframeInterpolation(at(wb, 0), kTQInterpolationEaseIn);
-                }},
-        // No redraw mark, unlike the ease-in: kept on purpose.
-        Command{"menuEaseOut:", "Undo Ease Out", "",
-                [](TQChannelBase& w) {
-                    for (auto [n, when] :
-                         {std::pair{"A", 2.0}, {"A", 1.0}, {"B", 4.0}, {"B", 0.0}, {"X", 1.0}}) {
-                        TQChannel& c = named(w, n);
-                        c.setKeyframeInterpolation(at(c, when), kTQInterpolationEaseOut);
-                    }
-                }},
-        Command{"menuEaseBoth:", "Undo Ease Both", "AB",
-                [](TQChannelBase& w) {
-                    TQChannel& wa = named(w, "A");
-                    wa.setKeyframeInterpolation(at(wa, 1), kTQInterpolationEaseBoth);
-                    wa.setKeyframeInterpolation(at(wa, 2), kTQInterpolationEaseOut);
-                    TQChannel& wb = named(w, "B");
-                    wb.setKeyframeInterpolation(at(wb, 0), kTQInterpolationEaseBoth);
-                    wb.setKeyframeInterpolation(at(wb, 4), kTQInterpolationEaseOut);
-                    TQChannel& wx = named(w, "X");
-                    wx.setKeyframeInterpolation(at(wx, 1), kTQInterpolationEaseOut);
-                }},
-        // All take the opposite of the primary entry; every linked component follows.
-        Command{"menuLockSelected:", "Undo Lock Keypoint", "",
-                [](TQChannelBase& w) {
-                    TQChannel& wa = named(w, "A");
-                    wa.setKeyframeLocked(at(wa, 2), true);
-                    TQChannel& wb = named(w, "B");
-                    for (double when : {0.0, 4.0}) wb.setKeyframeLocked(at(wb, when), true);
-                    forXyz(w, [](TQChannel& c) { c.setKeyframeLocked(at(c, 1), true); });
-                }},
-        // One state for all, the opposite of the primary entry's; no linked siblings here.
-        Command{"menuBreakTangent:", "Undo Break Tangents", "ABX",
-                [](TQChannelBase& w) {
-                    for (auto [n, when] :
-                         {std::pair{"A", 2.0}, {"A", 1.0}, {"B", 4.0}, {"B", 0.0}, {"X", 1.0}})
-                        named(w, n).setKeyframeTangentsBroken(at(named(w, n), when), true);
-                }},
-        Command{"menuDisableSelected:", "Undo Disable Keypoint", "ABX",
-                [](TQChannelBase& w) {
-                    for (const char* n : {"A", "B"})
-                        for (TQKeyframeHandle h : named(w, n).getKeyframes(false))
-                            named(w, n).setKeyframeEnabled(h, false);
-                    named(w, "A").setKeyframeEnabled(at(named(w, "A"), 3), true);
-                    forXyz(w, [](TQChannel& c) { c.setKeyframeEnabled(at(c, 1), false); });
-                }}),
-    [](const auto& p) {
-        std::string name = p.param.action;
-        return name.substr(0, name.size() - 1);
-    });
+        // Menus: a locked keypoint stays; a linked component takes its siblings along; taken
+        // frames are crossed when duplicating; each curve reverses over its own span; eases go
+        // onto the segment arriving at each keypoint; lock and disable take the opposite of
+        // the primary entry for all.
+        Edit{"menuDelete", kMenuScene, kMenuSelection, "menu menuDelete:"},
+        Edit{"menuDuplicate", kMenuScene, kMenuSelection, "menu menuDuplicate:"},
+        Edit{"menuReverse", kMenuScene, kMenuSelection, "menu menuReverse:"},
+        Edit{"menuEaseIn", kMenuScene, kMenuSelection, "menu menuEaseIn:"},
+        Edit{"menuEaseOut", kMenuScene, kMenuSelection, "menu menuEaseOut:"},
+        Edit{"menuEaseBoth", kMenuScene, kMenuSelection, "menu menuEaseBoth:"},
+        Edit{"menuLockSelected", kMenuScene, kMenuSelection, "menu menuLockSelected:"},
+        Edit{"menuDisableSelected", kMenuScene, kMenuSelection, "menu menuDisableSelected:"},
+        Edit{"menuBreakTangent", kMenuScene, kMenuSelection, "menu menuBreakTangent:"},
+        Edit{"menuAlignTangent", "A: 2=3(-0.3,0.2|0.5,0.1); B: 4=20(-1,0.5|1,0.1)", "A>2 B@4",
+             "menu menuAlignTangent:"},
+        Edit{"menuAddKeyframe", "A: 1=2", "A~", "mouse 0.5 0 | menu menuAddKeyframe:"},
+        // Each channel announced once per phase; each step measures from where the last left.
+        Edit{"drag", "A: 1=0 2=1; B: 1=0", "A@1 A@2 B@1", "drag 10 1 0.05 0.1"},
+        Edit{"vanishedChannel", "A: 1=0 2=1; Gone: 1=0; B: 1=0", "A@1 Gone@1 B@1 A@2",
+             "remove Gone | menu menuReverse:"},
+        Edit{"deleteLockedOnly", "A: 0=0 1=10L", "A@1", "menu menuDelete:"},
+        // Written before the first deletion: a second write would read a one-key curve.
+        Edit{"deleteAll", "A: 0=0 1=10", "A@1 A@0", "now 0.5 | menu menuDelete:"},
+        Edit{"duplicateOnTakenAndBetweenFrames", "A: 1=3 31/30=4; B: 1.01=7", "A@1 B@1.01",
+             "menu menuDuplicate:"},
+        Edit{"addToLinked", "Pos.X: 0=0 4=8; Pos.Y: 0=0 4=8; Pos.Z: 0=0 4=8", "",
+             "add X~ 2.01; addvalue X~ 3 6.5", true},
+        Edit{"deleteFromLinked", "Pos.X: 0=0 3=2 4=8; Pos.Y: 0=0 3=2 4=8; Pos.Z: 0=0 3=2 4=8", "",
+             "deletevertex Y@3 3"},
+        Edit{"purgeAndClean", "A: 1=1 2=2", "", "movekey A 1 2; select A@2 | clean; purge"},
+        // Moves: the anchor first; the one leading the direction of travel moves first.
+        Edit{"moveForward", "A*2: 1=0 2=0 3=0", "A@2 A@3 A@1", "move 3 0"},
+        Edit{"moveBackward", "A*2: 2=0 3=0 4=0", "A@3 A@4 A@2", "move 2 0"},
+        Edit{"moveStopsAtZero", "A*2: 0.5=0 1.5=0 4=0", "A@1.5 A@0.5", "move 0.5 0"},
+        Edit{"moveNegative", "A*2: 0.5=0 1.5=0", "A@1.5 A@0.5", "negative | move 0.5 0"},
+        // The anchor's V is 10 / 2 = 5: V 6 is one unit up on screen, for each curve.
+        Edit{"moveByScreenDistance", "A*2: 1=10; B*50: 2=100", "A@1 B@2", "move 1 6 1"},
+        // The first entry moves the compound, the second is found in the moved set, also when
+        // the object starts 2 s late on the axis.
+        Edit{"moveLinkedUnderOffset", "Pos.X: 1=0 3=0; Pos.Y: 1=0 3=0; Pos.Z: 1=0 3=0", "X@1 Y@1",
+             "linked; offset 2 | move 3.5 0; move 3.5 0.5 1"},
+        Edit{"moveSegment", "A*2: 1=0 3=1", "A~", "move 2 0.5; offsetcurve 2 0.25"},
+        Edit{"nudge", "A*4: 1=1 2=2", "A@1 A@2", "nudge 0 0.5; nudge 0.5 0"},
+        Edit{"nudgeSegment", "A: 1=0 3=1", "A~", "nudge 2 1"},
+        Edit{"nothingToMove", "A: 1=0", "A@1",
+             "select; move 1 0; nudge 1 0; offsetcurve 1 0; select A@1; unlist A; move 2 1"},
+        // A keypoint alone lands on a frame, a group keeps its spacing, a nudge is in frames.
+        Edit{"onTheFrameGrid", "A: 1=0; C: 1=0 1.25=0", "A@1",
+             "move 1.04667 0; select C@1 C@1.25; move 1.07333 0; nudge 0.04667 0", true},
+        // Tangents; 80 px a second and 200 a unit on screen.
+        Edit{"brokenHandleAlone", "A: 5=0(-0.5,-0.1|0.5,0.1)b", "", "tangent A>5 5.375 0.45"},
+        Edit{"pairFollowsOnScreen", "A: 5=0.3(-0.3,0.2|0.5,0.1)", "", "tangent A>5 5.6 0.5"},
+        Edit{"weightedPairKeepsLength", "A: 5=0.3(-0.3,0.2|0.5,0.1)s", "", "tangent A>5 5.6 0.5"},
+        Edit{"zeroHandlePulledOut", "A: 5=0(-0.5,-0.1|0,0)", "", "tangent A>5 5.4 0.3"},
+        Edit{"noViewWorldIsScreen", "A: 5=0(-0.5,-0.1|0.5,0.1)", "", "noview; tangent A>5 6 0.2"},
+        Edit{"undrawnViewNoNaN", "A: 5=0(-0.5,-0.1|0.5,0.1)", "",
+             "undrawn; tangent A>5 5.2 0.3; tangent45 A>5 5.2 0.3 0"},
+        Edit{"snap45", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 5.9 0.3 0"},
+        Edit{"snap45FromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
+             "save A>5; tangent45 A>5 5.5 0.5 1"},
+        // Selected keypoints copy the first handle's movement on its side; handle entries
+        // after the first are left alone.
+        Edit{"tangentsSelected",
+             "A: 2=0.2(-0.5,-0.1|0.5,0.1)b; B*2: 4=0.5(-0.2,-0.3|0.2,0.3)b; C: 6=0(-0.4,0|0.4,0)",
+             "A>2 B@4 C<6", "tangents 2.8 0.3"},
+        Edit{"tangents45Selected",
+             "A: 2=0.2(-0.5,-0.1|0.5,0.1); B*2: 4=0.5(-0.2,-0.3|0.2,0.3); C*0.5: "
+             "6=-0.1(-0.4,0|0.4,0)",
+             "A>2 B@4 C@6", "tangents45 2.75 0.485 0"},
+        // The list forms take one state for all; the single forms toggle.
+        Edit{"breakAndWeight", "A: 2=0(-0.5,0|0.5,0)b; B: 4=0(-0.5,0|0.5,0)", "A@2 B>4",
+             "breaks; break A@2; weight A@2 1; weights 0"},
+        Edit{"bezierPoints", "A: 1=0/1 2=1/1 3=0/1", "A@2 A@3", "beziers; bezier A@1"},
+        Edit{"flatten", "A: 1=0(-0.3,0.2|0.3,0.4)b 2=1(-0.3,0.2|0.3,0.4)b 3=0", "A@2", "flatten"}),
+    [](const auto& p) { return std::string(p.param.name); });
 
 }  // namespace
+}  // namespace engine_test

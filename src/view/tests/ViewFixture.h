@@ -1,27 +1,44 @@
 #pragma once
-// The engine fixture with a controller that does what the full editor's does with the
-// horizontal requests of the view: it applies them to the view's display range. It also
-// counts the view's calls on it.
+// The engine fixture seen through the view: a controller that applies the view's horizontal
+// requests to its display range (as the full editor's does) and records them, a recording
+// encoder for whole frames past the 1/30 s gate, frames as text for recorded baselines, and
+// gestures as RWEvent sequences at world points of the last frame. The stub host is 800 x 400
+// points at scale 1 with the view at the window's origin, so a window point is a pixel.
 
 #include <cmath>
+#include <cstdint>
+#include <cstdio>
+#include <sstream>
+#include <string>
 #include <vector>
 
-#include "src/engine/tests/EngineFixture.h"
+#include "platform/draw/HXDPrimitives.h"
+#include "platform/draw/testing/HXDRecordingEncoder.h"
+#include "src/resources/TQStrings.h"
+#include "tests/support/EngineFixture.h"
+#include "tests/support/TextBaseline.h"
 
 namespace view_test {
 
 using namespace engine_test;
+using tests_support::matchesBaseline;
 
 // Screen positions go through a single-precision matrix.
 inline constexpr double kPixelTolerance = 1e-3;
 inline constexpr double kWorldTolerance = 1e-5;
+// A time or value that went through the projection and back.
+inline constexpr double kDragTolerance = 1e-3;
+inline constexpr uint64_t kShift = RWEventModifierFlagShift;
+inline constexpr uint64_t kControl = RWEventModifierFlagControl;
+inline constexpr uint64_t kOption = RWEventModifierFlagOption;
+inline constexpr uint64_t kCommand = RWEventModifierFlagCommand;
+// Past the gate between two drag steps.
+inline constexpr double kStepSeconds = 0.05;
 
 class RangeController : public TQCurveEditorCtrlBase {
 public:
     void didSetViewContentsHorizontalOrigin(double origin, double andDuration) override {
-        ++originRequests;
-        const CMTime start = seconds(origin);
-        const CMTime duration = seconds(andDuration);
+        const CMTime start = seconds(origin), duration = seconds(andDuration);
         getView()->setDisplayRange(&start, &duration);
     }
     void didSetViewContentsHorizontalOffset(double offset) override {
@@ -29,32 +46,36 @@ public:
         const CMTime start = seconds(CMTimeGetSeconds(getView()->getDisplayRange().start) + offset);
         getView()->setDisplayRange(&start, nullptr);
     }
-    void currentViewVolumeChangedTo(const CGRect* volume) override {
-        ++volumeChanges;
-        lastVolume = *volume;
-    }
     void windowWasPanned(double fraction) override { panned.push_back(fraction); }
+    void selectionChangedTo(TQCurveSelectionList*) override { ++selectionChanges; }
 
-    int originRequests = 0;
     std::vector<double> offsets;
-    int volumeChanges = 0;
-    CGRect lastVolume = CGRectZero;
     std::vector<double> panned;
+    int selectionChanges = 0;
 };
+
+// Names an image of the view's tables: "key c/state/selected" or "tangent".
+inline std::string imageName(const TQCurveEditorViewBase& view, const HXDPixelTexture* texture) {
+    if (!texture) return "none";
+    if (texture == view.tangentAsset().texture.get()) return "tangent";
+    for (uint32_t k = 0; k < 64; ++k)
+        if (view.keyframeAsset(k / 8, k / 2 % 4, k % 2).texture.get() == texture)
+            return "key " + std::to_string(k / 8) + "/" + std::to_string(k / 2 % 4) + "/" +
+                   std::to_string(k % 2);
+    return "other";
+}
 
 class ViewFixture : public EngineFixture {
 protected:
     void SetUp() override {
         EngineFixture::SetUp();
-        const CMTime start = seconds(0.0);
-        const CMTime duration = seconds(10.0);
+        const CMTime start = seconds(0.0), duration = seconds(10.0);
         view.setDisplayRange(&start, &duration);
+        TQCurveEditorItem::resetColorIndex();  // colours as the baselines hold them
     }
-
     std::unique_ptr<TQCurveEditorCtrlBase> makeController() override {
         return std::make_unique<RangeController>();
     }
-
     RangeController& range() { return static_cast<RangeController&>(ctrl()); }
 
     // Words posted through the delegate, in order.
@@ -65,13 +86,170 @@ protected:
         return out;
     }
 
-    static void expectRectNear(const CGRect& actual, const CGRect& expected, double tolerance,
-                               const char* what) {
-        EXPECT_NEAR(actual.origin.x, expected.origin.x, tolerance) << what << ": x";
-        EXPECT_NEAR(actual.origin.y, expected.origin.y, tolerance) << what << ": y";
-        EXPECT_NEAR(actual.size.width, expected.size.width, tolerance) << what << ": width";
-        EXPECT_NEAR(actual.size.height, expected.size.height, tolerance) << what << ": height";
+    // Past the gate, one frame; answers whether it was drawn. Every frame must hand the
+    // encoder premultiplied colours only.
+    bool frame() {
+        clock.advance(1.0);
+        const bool drawn = view.displayLayer(&encoder);
+        for (const auto& fault : encoder.colourFaults)
+            ADD_FAILURE() << "colour (" << fault.color.red << ", " << fault.color.green << ", "
+                          << fault.color.blue << ", " << fault.color.alpha
+                          << ") is not premultiplied";
+        return drawn;
     }
+
+    // The pickable primitives of one hit id, in drawing order.
+    template <class T>
+    std::vector<const T*> pickable(uint32_t hitID) const {
+        std::vector<const T*> out;
+        for (const auto& p : view.selectionPrimitives())
+            if (p->hitInfo().hitID() == hitID)
+                if (const auto* t = dynamic_cast<const T*>(p.get())) out.push_back(t);
+        return out;
+    }
+
+    // A keyframe named as "A#1": the channel's name and its index in time order.
+    std::string keyName(TQKeyframeHandle h) const {
+        std::vector<TQChannelBase*> all;
+        object->getAllDescendantsFlattened(all, 0, true);
+        for (TQChannelBase* c : all) {
+            const auto keys = static_cast<TQChannel*>(c)->getKeyframes(false);
+            for (size_t i = 0; i < keys.size(); ++i)
+                if (keys[i] == h) return c->getName() + "#" + std::to_string(i);
+        }
+        return "?";
+    }
+
+    // The last frame as text, one line per primitive in drawing order: its kind, hit word,
+    // item and keyframe (numbered as keyName does), and what the eye sees of it (places in
+    // world units, colours, images by name, strings).
+    std::string frameText() const {
+        std::ostringstream out;
+        char buf[200];
+        const auto colour = [&](const HXDColor& c) {
+            std::snprintf(buf, sizeof buf, " rgba(%.3f %.3f %.3f %.3f)", c.red, c.green, c.blue,
+                          c.alpha);
+            return std::string(buf);
+        };
+        const auto point = [&](double x, double y) {
+            std::snprintf(buf, sizeof buf, " (%.4g %.4g)", x, y);
+            return std::string(buf);
+        };
+        for (const auto& p : view.primitives()) {
+            std::snprintf(buf, sizeof buf, "hit=%x", p->hitInfo().hitID());
+            out << buf;
+            const HXDExtraInfo& extra = p->hitInfo().extraInfo();
+            if (const HXDNumber* id = extra.objectForKey("ID")) {
+                const auto item =
+                    controllerPtr->channelItemWithIdentifier(uint32_t(id->integerValue()));
+                out << " " << (item && item->channelBase() ? item->channelBase()->getName() : "?");
+            }
+            if (const HXDNumber* h = extra.objectForKey("Handle"))
+                out << " key " << keyName(TQKeyframeHandle(h->unsignedLongLongValue()));
+            if (const HXDBlendingInfo& b = p->blendingInfo(); !(b == HXDBlendingInfo{})) {
+                std::snprintf(buf, sizeof buf, " blend(%d %d%d %d%d %d%d)", b.enabled,
+                              int(b.rgbOperation), int(b.alphaOperation), int(b.sourceRGB),
+                              int(b.destinationRGB), int(b.sourceAlpha), int(b.destinationAlpha));
+                out << buf;
+            }
+            if (const auto* m = dynamic_cast<const HXDMultiline*>(p.get())) {
+                const auto& v = m->vertices();
+                out << (dynamic_cast<const HXDLine*>(p.get()) ? " line" : " multiline")
+                    << " n=" << v.size() << " runs=" << m->numberOfRuns() << " w=" << m->width()
+                    << (m->antialiased() ? " aa" : "");
+                if (m->stippled()) {
+                    std::snprintf(buf, sizeof buf, " stipple=%x*%g", m->stipplePattern(),
+                                  m->stippleScale());
+                    out << buf;
+                }
+                if (m->loop()) out << " loop";
+                // Ends and three inner vertices stand for the shape.
+                for (size_t k :
+                     {size_t{0}, v.size() / 4, v.size() / 2, 3 * v.size() / 4, v.size() - 1})
+                    if (k < v.size()) out << point(v[k].start.x, v[k].start.y);
+                if (!v.empty()) out << colour(v.front().color) << colour(v.back().color);
+            } else if (const auto* q = dynamic_cast<const HXDQuadTexture*>(p.get())) {
+                const CGRect& r = q->destinationRect();
+                out << " image " << imageName(view, q->texture().get())
+                    << point(r.origin.x, r.origin.y) << point(r.size.width, r.size.height);
+            } else if (const auto* s = dynamic_cast<const HXDScreenspaceQuad*>(p.get())) {
+                out << " band" << point(s->frame().origin.x, s->frame().origin.y)
+                    << point(s->frame().size.width, s->frame().size.height) << colour(s->color());
+            } else if (const auto* t = dynamic_cast<const HXDText*>(p.get())) {
+                out << " text \"" << t->string() << "\"" << point(t->position().x, t->position().y)
+                    << colour(t->attributes().color);
+            } else {
+                out << " other";
+            }
+            out << "\n";
+        }
+        return out.str();
+    }
+
+    // The last frame against the recorded baseline `name`, after `before` (an earlier frame).
+    ::testing::AssertionResult frameMatches(const std::string& name,
+                                            const std::string& before = "") const {
+        return matchesBaseline(name, before + frameText(), "src/view/tests/baselines");
+    }
+
+    // ---- Gestures ----
+    RWEvent mouseAt(RWEventType type, const CGPoint& world, uint64_t mods,
+                    int64_t clicks = 1) const {
+        return RWEvent::mouseEvent(type, view.getPointScreen(world), mods, clicks);
+    }
+    void down(double t, double v, uint64_t mods = 0, int64_t clicks = 1) {
+        view.mouseDown(mouseAt(RWEventType::LeftMouseDown, CGPointMake(t, v), mods, clicks));
+    }
+    // One drag step, `after` seconds after the last (past the gate unless told otherwise).
+    void dragTo(double t, double v, uint64_t mods = 0, double after = kStepSeconds) {
+        clock.advance(after);
+        view.mouseDragged(mouseAt(RWEventType::LeftMouseDragged, CGPointMake(t, v), mods));
+    }
+    void up(double t, double v, uint64_t mods = 0) {
+        view.mouseUp(mouseAt(RWEventType::LeftMouseUp, CGPointMake(t, v), mods));
+    }
+    void click(double t, double v, uint64_t mods = 0, int64_t clicks = 1) {
+        down(t, v, mods, clicks);
+        up(t, v, mods);
+    }
+    // A gesture as a script: "d t v", "m t v" (a drag step past the gate), "q t v" (one
+    // inside it), "u t v", "c t v" (a click), "2 t v" (a double click), each point followed by
+    // its modifiers if any: s Shift, o Option, c Command, x Control. Steps are separated by
+    // "|".
+    void gesture(const std::string& script) {
+        std::istringstream in(script);
+        for (std::string step; std::getline(in, step, '|');) {
+            std::istringstream words(step);
+            char op = 0;
+            double t = 0, v = 0;
+            std::string mods;
+            words >> op >> t >> v >> mods;
+            uint64_t m = 0;
+            for (char c : mods)
+                m |= c == 's'   ? kShift
+                     : c == 'o' ? kOption
+                     : c == 'c' ? kCommand
+                     : c == 'x' ? kControl
+                                : 0;
+            if (op == 'd') down(t, v, m);
+            if (op == 'm') dragTo(t, v, m);
+            if (op == 'q') dragTo(t, v, m, 0.01);
+            if (op == 'u') up(t, v, m);
+            if (op == 'c') click(t, v, m);
+            if (op == '2') click(t, v, m, 2);
+        }
+    }
+
+    // The keyframe's time and value, or NaNs when the handle is stale.
+    static std::pair<double, double> keyOf(const TQCurveEditorChannelItemPtr& item,
+                                           TQKeyframeHandle h) {
+        CMTime t = kCMTimeInvalid;
+        double v = 0.0;
+        if (!item->channel()->getKeyframe(h, &t, &v)) return {NAN, NAN};
+        return {CMTimeGetSeconds(t), v};
+    }
+
+    HXDRecordingEncoder encoder{800, 400};
 };
 
 }  // namespace view_test

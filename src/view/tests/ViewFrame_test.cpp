@@ -1,129 +1,105 @@
-// Frames: what each draws, against recorded baselines (FrameBaseline.h), and the frame's own
+// Frames: what each draws, against recorded baselines (see ViewFixture), and the frame's own
 // rules: the 1/30 s gate and its one delayed redraw, the skipped frame, the images at the
 // backing scale, the fitting of a flat curve, value texts and which curves are fetched again.
 
 #include "platform/channels/TQChannelTypes.h"
 #include "src/resources/BNImage.h"
 #include "src/resources/TQKeyframeImages.h"
-#include "src/view/tests/ViewMouseFixture.h"
+#include "src/view/tests/ViewFixture.h"
 
 namespace view_test {
 namespace {
 
-class ViewFrame : public ViewMouseFixture {
-protected:
-    void SetUp() override {
-        ViewMouseFixture::SetUp();
-        TQCurveEditorItem::resetColorIndex();  // colours as the baselines hold them
-    }
-};
+class ViewFrame : public ViewFixture {};
 
 // Items drawn from the last to the first with the primary one on top, a disabled one not at
-// all, a channel that takes no keypoints without them; the ends dimmed and stippled; a curve that starts after the view puts every sample in
-// its first piece.
+// all, a channel that takes no keypoints without them; the ends dimmed and stippled; a curve
+// that starts after the view puts every sample in its first piece.
 TEST_F(ViewFrame, frame__order_pieces_and_dimmed_ends) {
-    auto a = linearItem("A", {{2.0, 0.0}, {6.0, 0.5}});
-    auto b = linearItem("B", {{1.0, 0.1}, {5.0, 0.6}});
-    linearItem("C", {{20.0, 0.0}, {30.0, 1.0}});
-    linearItem("Hidden", {{1.0, 0.3}, {5.0, 0.8}})->enableItem(0);
-    linearItem("Still", {{3.0, -0.5}, {7.0, -0.5}})->channel()->setAnimationEnabled(false);
-    b->select(1);
+    build(
+        "A: 2=0/1 6=0.5/1; B: 1=0.1/1 5=0.6/1; C: 20=0/1 30=1/1; Hidden: 1=0.3/1 5=0.8/1; "
+        "Still: 3=-0.5/1 7=-0.5/1");
+    item("Hidden")->enableItem(0);
+    item("Still")->channel()->setAnimationEnabled(false);
+    item("B")->select(1);
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(matchesBaseline("frame-order-and-ends", frameText()));
+    EXPECT_TRUE(frameMatches("frame-order-and-ends"));
     ASSERT_EQ(encoder.entries.size(), view.primitives().size());
     for (size_t i = 0; i < encoder.entries.size(); ++i)
-        ASSERT_EQ(encoder.entries[i].primitive, view.primitives()[i].get())
-            << "encoded out of order";
+        ASSERT_EQ(encoder.entries[i].primitive, view.primitives()[i].get()) << "out of order";
     const GDColor bg = view.backgroundColor();
     EXPECT_EQ(encoder.clearColor, HXD_sRGBA(bg.red, bg.green, bg.blue, bg.alpha));
     ASSERT_TRUE(frame());
-    EXPECT_EQ(view.keypointsPrimitives().at(a->channelId()).size(), 2u)
+    EXPECT_EQ(view.keypointsPrimitives().at(item("A")->channelId()).size(), 2u)
         << "each frame starts from empty lists";
 }
 
 // Each keypoint state shows its image; handles only on selected, enabled keypoints, none that
 // lies on its keypoint, lines stopping short of the keypoint; the primary keypoint's value
-// label, moved back inside near the top right corner.
+// label, moved back inside near the top right corner; a mapping of its own, which the frame
+// keeps: V = (value * 2 + 0.4) / 1; a locked channel shows no handles.
 TEST_F(ViewFrame, frame__keypoint_states_handles_and_label) {
-    auto states = linearItem("States", {{1, 0}, {2, 0}, {3, 0}, {4, 0}, {5, 0}, {6, 0}});
-    TQChannel* c = states->channel();
-    for (double t : {1.0, 2.0}) c->setKeyframeEnabled(c->getKeyframe(seconds(t)), false);
-    for (double t : {3.0, 4.0}) c->setKeyframeLocked(c->getKeyframe(seconds(t)), true);
-    TQChannel* bez = addChannel("Bezier", {{1.0, -0.5}, {5.0, -0.5}, {8.0, -0.5}});
-    for (TQKeyframeHandle h : bez->getKeyframes(false)) {
-        bez->setKeyframeTangentsBroken(h, true);
-        bez->setKeyframeInputTangents(h, -1.0, -0.25);
-        bez->setKeyframeOutputTangents(h, 2.0, 0.5);
-    }
-    bez->setKeyframeInputTangents(bez->getKeyframe(seconds(8.0)), -0.01, -0.001);
-    auto handles = addItem(bez);
-    auto corner = linearItem("Corner", {{1.0, 0.0}, {9.95, 0.98}});
-    selectInView({keypointEntry(corner, 9.95), keypointEntry(states, 1), keypointEntry(states, 3),
-                  keypointEntry(states, 5), keypointEntry(handles, 5), keypointEntry(handles, 8)});
+    build(
+        "States: 1=0/1! 2=0/1! 3=0/1L 4=0/1L 5=0/1 6=0/1; Bezier: 1=-0.5(-1,-0.25|2,0.5)b "
+        "5=-0.5(-1,-0.25|2,0.5)b 8=-0.5(-0.01,-0.001|2,0.5)b; Corner: 1=0/1 9.95=0.98/1");
+    select("Corner@9.95 States@1 States@3 States@5 Bezier@5 Bezier@8");
     view.setPrintText(1);
-    // A mapping of its own, which the frame keeps: V = (value * 2 + 0.4) / 1.
-    states->setScaleY(0.5);
-    states->setOffsetY(-0.2);
-    states->setUpdateScale(0);
+    item("States")->setScaleY(0.5);
+    item("States")->setOffsetY(-0.2);
+    item("States")->setUpdateScale(0);
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(matchesBaseline("frame-keypoints", frameText()));
-    bez->setLocked(true);
+    EXPECT_TRUE(frameMatches("frame-keypoints"));
+    item("Bezier")->channel()->setLocked(true);
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(pickable<HXDQuadTexture>(TQSelectionOutTangent).empty())
-        << "a locked channel shows no handles";
+    EXPECT_TRUE(pickable<HXDQuadTexture>(TQSelectionOutTangent).empty());
 }
 
 // A drag's ghost (only of a curve selected in the list), the processed curve hidden while the
 // mouse is down and back after, then the rubber band.
 TEST_F(ViewFrame, frame__ghost_processed_curve_and_band) {
-    auto item = linearItem("Ramp", {{2.0, 0.0}, {6.0, 0.5}});
-    linearItem("Other", {{2.0, 0.2}, {6.0, 0.7}});
-    item->channel()->addBehavior(std::make_unique<TQOscillateBehavior>(0.1, 1.0, 0.0));
-    item->setDrawProcessedCurve(1);
-    item->setNumberOfProcessedSamples(100);
-    item->setProcessedCurveDirty(1);
-    item->select(1);
+    build("Ramp: 2=0/1 6=0.5/1; Other: 2=0.2/1 6=0.7/1");
+    item("Ramp")->channel()->addBehavior(std::make_unique<TQOscillateBehavior>(0.1, 1.0, 0.0));
+    item("Ramp")->setDrawProcessedCurve(1);
+    item("Ramp")->setNumberOfProcessedSamples(100);
+    item("Ramp")->setProcessedCurveDirty(1);
+    item("Ramp")->select(1);
     ASSERT_TRUE(frame());
-    down(6.0, 0.5);
-    dragTo(6.5, 0.7);
+    gesture("d 6 .5|m 6.5 .7");
     ASSERT_TRUE(frame());
-    std::string text = frameText();
-    up(6.5, 0.7);
+    const std::string dragged = frameText() + "--\n";
+    gesture("u 6.5 .7");
     ASSERT_TRUE(frame());
-    down(1.0, 0.9);
-    dragTo(3.0, 0.6);
+    gesture("d 1 .9|m 3 .6");
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(matchesBaseline("frame-gesture", text + "--\n" + frameText()));
-    up(3.0, 0.6);
+    EXPECT_TRUE(frameMatches("frame-gesture", dragged));
+    gesture("u 3 .6");
 }
 
 // Selected keypoints are merged into a coarse sampling, once each.
 TEST_F(ViewFrame, frame__selected_keypoints_join_a_coarse_line) {
-    auto item = linearItem("Coarse", {{0.0, 0.0}, {1.0, 1.0}, {4.0, 4.0}});
+    build("Coarse: 0=0/1 1=1/1 4=4/1");
     ASSERT_TRUE(frame());
-    item->setNumberOfSamples(5);
-    item->refreshOriginalCurve(seconds(0.0), seconds(2.5));
+    const auto coarse = item("Coarse");
+    coarse->setNumberOfSamples(5);
+    coarse->refreshOriginalCurve(seconds(0.0), seconds(2.5));
     auto u = std::make_unique<CMTime[]>(5);
     auto v = std::make_unique<double[]>(5);
-    for (int i = 0; i < 5; ++i) {
-        u[i] = seconds(2.5 * i);
-        v[i] = std::min(2.5 * i, 4.0);
-    }
-    item->setSamplesU(std::move(u), 5);
-    item->setSamplesV(std::move(v), 5);
-    selectInView({keypointEntry(item, 0.0), keypointEntry(item, 1.0)});
+    for (int i = 0; i < 5; ++i) u[i] = seconds(2.5 * i), v[i] = std::min(2.5 * i, 4.0);
+    coarse->setSamplesU(std::move(u), 5);
+    coarse->setSamplesV(std::move(v), 5);
+    select("Coarse@0 Coarse@1");
     ASSERT_TRUE(frame());
-    EXPECT_TRUE(matchesBaseline("frame-coarse", frameText()));
+    EXPECT_TRUE(frameMatches("frame-coarse"));
 }
 
 TEST_F(ViewFrame, frame__backing_scale_two_doubles_images_and_keeps_thin_lines) {
-    linearItem("Ramp", {{2.0, 0.0}, {6.0, 0.5}});
+    build("Ramp: 2=0/1 6=0.5/1");
     viewHost.setBackingScaleFactor(2.0);
     view.viewDidChangeBackingProperties();
     HXDRecordingEncoder retina(1600, 800);
     clock.advance(1.0);
     ASSERT_TRUE(view.displayLayer(&retina));
-    EXPECT_TRUE(matchesBaseline("frame-retina", frameText()));
+    EXPECT_TRUE(frameMatches("frame-retina"));
     for (uint32_t k = 0; k < 8 * 4 * 2; ++k) {
         const KeyframeAsset& asset = view.keyframeAsset(k / 8, k / 2 % 4, k % 2);
         auto image = BNImageForResource(TQKeyframeImages::imageName(k / 8, k / 2 % 4, k % 2), 2.0);
@@ -172,40 +148,30 @@ TEST_F(ViewFrame, displayLayer__a_skipped_frame_restarts_the_gate_and_a_dead_vie
     EXPECT_EQ(host.redrawRequests(), 0) << "the block outlived its view and must not call it";
 }
 
-TEST_F(ViewFrame, drawCurveEditor__fits_a_flat_curve_at_zero_to_offset_zero) {
-    view.setGridSpacingY(25.0);
-    TQChannel* flat = addChannel("Zero", {});
-    flat->setInitialValue(0.0);
-    auto item = addItem(flat);
-    ASSERT_TRUE(frame());
-    EXPECT_FALSE(item->updateScale()) << "the frame runs the tick pass";
-    EXPECT_NEAR(item->scaleY(), 1.0, kValueTolerance);
-    EXPECT_NEAR(item->offsetY(), 0.0, kValueTolerance);
-}
-
-TEST_F(ViewFrame, getScale_and_getCoordinates__format_values_by_channel_type) {
-    auto plain = addItem(addChannel("Plain", {{0.0, 1.0}}));
-    EXPECT_EQ(view.getScale(plain.get(), 3.14159), "3.14");
-    auto* gain = static_cast<TQChannel*>(
-        object->addChild(std::make_unique<TQChannelDecibel>("Gain", nextChannelId++)));
-    auto decibels = addItem(gain);
+// Value texts by channel type; a flat curve at zero fitted to offset zero by the frame's tick
+// pass; only curves the host reports changed are fetched again.
+TEST_F(ViewFrame, values_fitting_and_refetching) {
+    build("Plain: 0=1; Zero: ; Changed: 1=0/1 5=0.5/1");
+    EXPECT_EQ(view.getScale(item("Plain").get(), 3.14159), "3.14");
+    auto decibels = addItem(static_cast<TQChannel*>(
+        object->addChild(std::make_unique<TQChannelDecibel>("Gain", nextChannelId++))));
     EXPECT_EQ(view.getScale(decibels.get(), 10.0), "20") << "amplitude 10 is 20 dB";
-    object->removeChild(gain);
-    EXPECT_FALSE(view.getScale(decibels.get(), 1.0).has_value()) << "an item whose channel is gone";
+    object->removeChild(decibels->channel());
+    EXPECT_FALSE(view.getScale(decibels.get(), 1.0).has_value()) << "its channel is gone";
     EXPECT_EQ(view.getCoordinates(nullptr, seconds(1.5), 0.25), "(1.500 s, 0.250)");
-}
-
-TEST_F(ViewFrame, setVisibleOriginalCurveDirty__marks_only_what_the_host_reports_changed) {
-    auto changed = linearItem("Changed", {{1.0, 0.0}, {5.0, 0.5}});
-    auto still = linearItem("Still", {{1.0, 0.0}, {5.0, 0.5}});
+    view.setGridSpacingY(25.0);
+    item("Zero")->setUpdateScale(1);
+    item("Zero")->setScaleY(3.0);
     ASSERT_TRUE(frame());
-    ASSERT_FALSE(changed->originalCurveDirty() || still->originalCurveDirty());
-    recorder.answers.modified = {changed->channel()};
+    EXPECT_EQ(std::vector({item("Zero")->scaleY(), item("Zero")->offsetY()}),
+              std::vector({1.0, 0.0}));
+    EXPECT_FALSE(item("Zero")->updateScale());
+    recorder.answers.modified = {item("Changed")->channel()};
     view.setVisibleOriginalCurveDirty(1);
-    EXPECT_TRUE(changed->originalCurveDirty());
-    EXPECT_FALSE(still->originalCurveDirty()) << "an unchanged curve keeps its samples";
+    EXPECT_TRUE(item("Changed")->originalCurveDirty());
+    EXPECT_FALSE(item("Plain")->originalCurveDirty()) << "an unchanged curve keeps its samples";
     view.setAllOriginalCurveDirty(1);
-    EXPECT_TRUE(still->originalCurveDirty());
+    EXPECT_TRUE(item("Plain")->originalCurveDirty());
 }
 
 }  // namespace

@@ -3,286 +3,197 @@
 
 #include <cmath>
 #include <functional>
+#include <iomanip>
+#include <map>
+#include <sstream>
 
 #include "src/view/tests/ViewFixture.h"
 
 namespace view_test {
 namespace {
 
-class ViewMappingTest : public ViewFixture {};
-
-TEST_F(ViewMappingTest, getPointScreen__mapsTheVolumeOntoDrawablePixels) {
-    const CGPoint centre = view.getPointScreen(CGPointMake(5.0, 0.0));
-    EXPECT_NEAR(centre.x, 400.0, kPixelTolerance);
-    EXPECT_NEAR(centre.y, 200.0, kPixelTolerance);
-    const CGPoint corner = view.getPointWorld(CGPointMake(800.0, 400.0));
-    EXPECT_NEAR(corner.x, 10.0, kWorldTolerance);
-    EXPECT_NEAR(corner.y, 1.0, kWorldTolerance);
-    const CGPoint size = view.getSizeWorld(CGPointMake(80.0, 40.0));
-    EXPECT_NEAR(size.x, 1.0, kWorldTolerance);
-    EXPECT_NEAR(size.y, 0.2, kWorldTolerance);
-    {
-        // 5.0031 s lies at 400.248 px: it snaps back to the pixel at 400.
-        const CGPoint snapped = view.adjustWorldPointToScreen(CGPointMake(5.0031, 0.0));
-        EXPECT_NEAR(snapped.x, 5.0, kWorldTolerance)
-            << "the point must move onto the nearest pixel";
+class ViewVolume : public ViewFixture {
+protected:
+    // Runs view operations: "zoom fx fy" (by factors, about the centre), "drag dx dy" (a zoom
+    // by a pointer drag about "at x y", in pixels), "pan dx dy" (pixels), "draw", "start t"
+    // (the display range and the volume from t), "wheel n" (n wheel events of a line queued
+    // behind one, and a key), "frame all|values", "auto", "due", "reset", "resetpan", and
+    // "A 1=0 2=1" (an enabled item with its mapping, as the draw pass leaves it). "?" notes the
+    // volume. Answers the notes, then the volume, the zoom factors (of the volume, then of
+    // the grid), the posted words and the requests to the controller (horizontal offsets,
+    // pans): "x y w h *zx *zy #gz !words >offset ~pan".
+    std::string run(const std::string& script) {
+        std::vector<std::string> a;
+        const auto N = [&](size_t i) { return std::stod(a.at(i)); };
+        std::ostringstream out;
+        out.precision(5);
+        const std::map<std::string, std::function<void()>> steps = {
+            {"zoom", [&] { view.zoomWithFactor(N(0), N(1)); }},
+            {"at", [&] { view.setMouseOrigin(CGPointMake(N(0), N(1))); }},
+            {"drag", [&] { view.zoom(N(0), N(1)); }},
+            {"pan", [&] { view.pan(N(0), N(1)); }},
+            {"draw", [&] { view.drawProjection(); }},
+            {"start",
+             [&] {
+                 const CMTime start = seconds(N(0));
+                 view.setDisplayRange(&start, nullptr);
+                 CGRect v = view.getCurrentViewVolume();
+                 v.origin.x = N(0);
+                 view.setCurrentViewVolume(v);
+                 view.drawProjection();
+             }},
+            {"wheel",
+             [&] {
+                 for (int i = 0; i < N(0); ++i)
+                     viewHost.queueEvent(RWEvent::scrollWheelEvent(0, 1));
+                 viewHost.queueEvent(RWEvent::keyEvent(RWEventType::KeyDown, "x"));
+                 view.scrollWheel(RWEvent::scrollWheelEvent(0.0, 1.0));
+                 out << "queued " << viewHost.queuedCount() << " / ";
+             }},
+            {"frame", [&] { view.frameAll(a.at(0) == "all"); }},
+            {"auto", [&] { view.performAutoZoom(false); }},
+            {"due", [&] { view.setNeedsAutoZoom(1); }},
+            {"reset", [&] { view.resetZoom(); }},
+            {"resetpan", [&] { view.resetPan(); }},
+            {"clear", [&] { recorder.clearCalls(); }},
+            {"off", [&] { item(a.at(0))->enableItem(0); }},
+        };
+        const auto volume = [&] {
+            const CGRect& v = view.getCurrentViewVolume();
+            out << v.origin.x << " " << v.origin.y << " " << v.size.width << " " << v.size.height;
+        };
+        std::istringstream in(script);
+        for (std::string step; std::getline(in, step, ';');) {
+            std::istringstream words(step);
+            std::string op, word;
+            words >> op;
+            a.clear();
+            while (words >> word) a.push_back(word);
+            if (op == "?") {
+                volume();
+                out << " / ";
+            } else if (steps.count(op)) {
+                steps.at(op)();
+            } else {
+                build(step);
+                item(op.substr(0, op.size() - 1))->enableItem(1);
+                view.computeVerticalTickMarks();
+            }
+        }
+        volume();
+        out << " *" << view.zoomX() << " *" << view.zoomY() << " #" << view.gridZoomY() << " !";
+        for (TQNotificationWord w : postedWords()) out << std::hex << w << " " << std::dec;
+        for (double o : range().offsets) out << ">" << o << " ";
+        for (double p : range().panned) out << "~" << p << " ";
+        return out.str();
     }
-    {
-        // Drawable pixels, not points: twice as many at a backing scale of 2.
-        viewHost.setBackingScaleFactor(2.0);
-        view.viewDidChangeBackingProperties();
-        const CGPoint scaled = view.getPointScreen(CGPointMake(5.0, 0.0));
-        EXPECT_NEAR(scaled.x, 800.0, kPixelTolerance);
-        EXPECT_NEAR(scaled.y, 400.0, kPixelTolerance);
+};
+
+// From the fixture's 0..10 s by -1..1 on 800 x 400 pixels.
+TEST_F(ViewVolume, operations__table) {
+    const struct {
+        const char* what;
+        const char* script;
+        const char* want;
+    } cases[] = {
+        {"vertical zoom clamps at 128 about the centre", "zoom 1 1000",
+         "0 -0.0078125 10 0.015625 *1 *128 #0.0078125 !1800 "},
+        {"and at 1/128", "zoom 1 0.001", "0 -128 10 256 *1 *0.0078125 #128 !1800 "},
+        {"x zoom about the reference centre", "zoom 2 1", "2.5 -1 5 2 *2 *1 #1 !1800 "},
+        // Wider in time, taller in value, about the pointer at (200, 100) px = (2.5, -0.5).
+        {"a drag zoom keeps the anchor under the pointer", "at 200 100; drag 40 -40",
+         "0.22727 -0.91667 9.0909 1.6667 *1.1 *1.2 #1 !1800 "},
+        // The factor would reach 200: the height stays, the anchor keeps its fraction.
+        {"a drag zoom past the limit", "zoom 1 100; draw; at 200 100; drag 0 -200",
+         "0 -0.01 10 0.02 *1 *128 #0.0078125 !1800 1800 "},
+        {"pan and back", "start 2; pan -80 -40; ?; draw; pan 80 40",
+         "3 -1.2 10 2 / 2 -1 10 2 *1 *1 #1 !1800 1800 >1 >-1 "},
+        {"a pan that would reach time zero moves only y", "start 0; pan 80 40",
+         "0 -0.8 10 2 *1 *1 #1 !1800 "},
+        // Four events of a line, four pixels a line: 16 px of 400; only wheel events taken.
+        {"queued wheel events fold into one pan", "wheel 3",
+         "queued 1 / 0 -0.92 10 2 *1 *1 #1 !1800 4 ~8 "},
+        // One keypoint each at 2 s: the display range widened by 5 % on each side; the
+        // factor is taken before the padding.
+        {"frame all on single keypoints", "A: 2=3; B: 2=5; zoom 1 4; clear; frame all",
+         "-0.5 2.9 11 2.2 *0.90909 *1 #1 !1800 "},
+        {"frame all spans enabled items only", "A: 1=0 2=1; B: 3=0; Off: 9=0; off Off; frame all",
+         "0.9 -0.05 2.2 1.1 *4.5455 *2 #0.5 !1800 "},
+        {"frame all never changes the height for one flat curve", "Flat: 1=0.5 4=0.5; frame values",
+         "0 -1 10 2 *1 *1 #1 !1800 "},
+        // 0..100 needs a factor of 1/50, short of the limit; the draw pass calls it: no word.
+        {"auto-zoom only when due", "A: 1=0 2=100; auto; ?; due; auto",
+         "0 -1 10 2 / 0 -5 10 110 *1 *0.02 #32 !"},
+        {"reset zoom", "zoom 2 4; draw; pan -80 -40; clear; reset",
+         "0 -1 10 2 *1 *1 #1 !1800 >0.5 "},
+        {"reset pan keeps the zoom", "zoom 1 2; draw; pan 0 -40; clear; resetpan",
+         "0 -1 10 1 *1 *2 #0.5 !1800 "},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.what);
+        TearDown();
+        items.clear();
+        SetUp();
+        view.resetZoom();  // the view outlives the fixture's set-up
+        recorder.clearCalls();
+        EXPECT_EQ(run(c.script), c.want);
     }
 }
 
-TEST_F(ViewMappingTest, conversions__answerForTheLastFrameUntilTheNextDraw) {
-    view.zoomWithFactor(1.0, 2.0);  // height 1, about the centre
-    const CGPoint before = view.getPointScreen(CGPointMake(5.0, 0.5));
-    EXPECT_NEAR(before.y, 300.0, kPixelTolerance) << "the zoom must not show before it is drawn";
+TEST_F(ViewVolume, mapping__onto_drawable_pixels_of_the_last_frame) {
+    const auto text = [](const CGPoint& p) {
+        return (std::ostringstream() << std::setprecision(6) << p.x << " " << p.y).str();
+    };
+    const auto screen = [&](double t, double v) {
+        return text(view.getPointScreen(CGPointMake(t, v)));
+    };
+    EXPECT_EQ(screen(5.0, 0.0), "400 200");
+    EXPECT_EQ(text(view.getPointWorld(CGPointMake(800.0, 400.0))), "10 1");
+    EXPECT_EQ(text(view.getSizeWorld(CGPointMake(80.0, 40.0))), "1 0.2");
+    // 5.0031 s lies at 400.248 px: it snaps back to the pixel at 400.
+    EXPECT_NEAR(view.adjustWorldPointToScreen(CGPointMake(5.0031, 0.0)).x, 5.0, kWorldTolerance);
+    // The zoom shows only when drawn.
+    view.zoomWithFactor(1.0, 2.0);
+    EXPECT_EQ(screen(5.0, 0.5), "400 300");
     view.drawProjection();
-    const CGPoint after = view.getPointScreen(CGPointMake(5.0, 0.5));
-    EXPECT_NEAR(after.y, 400.0, kPixelTolerance);
-}
-
-TEST_F(ViewMappingTest, conversions__beforeTheFirstFrameAreNotNumbers) {
+    EXPECT_EQ(screen(5.0, 0.5), "400 400");
+    // Drawable pixels, not points: twice as many at a backing scale of 2.
+    viewHost.setBackingScaleFactor(2.0);
+    view.viewDidChangeBackingProperties();
+    EXPECT_EQ(screen(5.0, 0.0), "800 400");
+    // Before the first frame conversions are not numbers, and snapping invents none.
     TQCurveEditorViewBase fresh;
     fresh.setViewHost(&viewHost);
     fresh.setCurrentViewVolume(CGRectMake(0, 0, 1, 1));
     EXPECT_TRUE(std::isnan(fresh.getPointWorld(CGPointMake(10, 10)).x));
     EXPECT_TRUE(std::isnan(fresh.getPointScreen(CGPointMake(0.5, 0.5)).y));
-    EXPECT_TRUE(std::isnan(fresh.adjustWorldPointToScreen(CGPointMake(0.5, 0.5)).x))
-        << "snapping a NaN pixel must neither crash nor invent a number";
+    EXPECT_TRUE(std::isnan(fresh.adjustWorldPointToScreen(CGPointMake(0.5, 0.5)).x));
 }
 
-// One operation on the volume from the fixture's 0..10 s by -1..1 on 800 x 400 pixels: the
-// volume it leaves (to the projection's precision), the zoom factors, and the words posted.
-struct VolumeCase {
-    const char* what;
-    std::function<void()> run;
-    CGRect want;
-    double zoomX, zoomY;
-    std::vector<TQNotificationWord> words;
-};
-
-class ViewVolume : public ViewFixture {
-protected:
-    // An enabled item with its mapping, as the draw pass leaves it.
-    void enabled(const char* name, std::initializer_list<std::pair<double, double>> keys) {
-        addItem(addChannel(name, keys))->enableItem(1);
-        view.computeVerticalTickMarks();
-    }
-    void startAt(double x) {
-        const CMTime start = seconds(x);
-        view.setDisplayRange(&start, nullptr);
-        CGRect v = view.getCurrentViewVolume();
-        v.origin.x = x;
-        view.setCurrentViewVolume(v);
-        view.drawProjection();
-    }
-};
-
-constexpr TQNotificationWord kVolume = kTQNotifyViewVolumeChanged;
-
-TEST_F(ViewVolume, operations__table) {
-    const VolumeCase cases[] = {
-        {"vertical zoom clamps at 128, about the centre",
-         [this] { view.zoomWithFactor(1.0, 1000.0); },
-         CGRectMake(0, -1.0 / 128, 10, 2.0 / 128),
-         1,
-         128,
-         {kVolume}},
-        {"and at 1/128",
-         [this] { view.zoomWithFactor(1.0, 0.001); },
-         CGRectMake(0, -128, 10, 256),
-         1,
-         1.0 / 128,
-         {kVolume}},
-        {"x zoom about the reference centre",
-         [this] { view.zoomWithFactor(2.0, 1.0); },
-         CGRectMake(2.5, -1, 5, 2),
-         2,
-         1,
-         {kVolume}},
-        // Wider in time, taller in value, about the pointer at (200, 100) px = (2.5, -0.5).
-        {"zoom keeps the anchor under the pointer",
-         [this] {
-             view.setMouseOrigin(CGPointMake(200.0, 100.0));
-             view.zoom(40.0, -40.0);
-         },
-         CGRectMake(2.5 - 2.5 / 1.1, -0.5 - 0.5 / 1.2, 10 / 1.1, 2 / 1.2),
-         1.1,
-         1.2,
-         {kVolume}},
-        // The factor would reach 200: the height stays, the anchor keeps its fraction.
-        {"zoom past the limit",
-         [this] {
-             view.zoomWithFactor(1.0, 100.0);
-             view.drawProjection();
-             view.setMouseOrigin(CGPointMake(200.0, 100.0));
-             view.zoom(0.0, -200.0);
-         },
-         CGRectMake(0, -0.01, 10, 0.02),
-         1,
-         128,
-         {kVolume, kVolume}},
-        {"pan and back",
-         [this] {
-             startAt(2.0);
-             view.pan(-80.0, -40.0);
-             EXPECT_EQ(view.getCurrentViewVolume().origin.y, -1.2);
-             view.drawProjection();
-             view.pan(80.0, 40.0);
-             EXPECT_EQ(range().offsets, (std::vector<double>{1.0, -1.0}));
-         },
-         CGRectMake(2, -1, 10, 2),
-         1,
-         1,
-         {kVolume, kVolume}},
-        {"a pan that would reach time zero moves only y",
-         [this] {
-             startAt(0.0);
-             view.pan(80.0, 40.0);
-             EXPECT_TRUE(range().offsets.empty());
-         },
-         CGRectMake(0, -0.8, 10, 2),
-         1,
-         1,
-         {kVolume}},
-        // Four events of a line, four pixels a line: 16 px of 400; one scroller update.
-        {"queued wheel events fold into one pan",
-         [this] {
-             for (int i = 0; i < 3; ++i) viewHost.queueEvent(RWEvent::scrollWheelEvent(0, 1));
-             viewHost.queueEvent(RWEvent::keyEvent(RWEventType::KeyDown, "x"));
-             view.scrollWheel(RWEvent::scrollWheelEvent(0.0, 1.0));
-             EXPECT_EQ(range().panned, std::vector<double>{8.0});
-             EXPECT_EQ(viewHost.queuedCount(), 1u) << "only wheel events are taken";
-         },
-         CGRectMake(0, -0.92, 10, 2),
-         1,
-         1,
-         {kVolume, kTQNotifyChannelsChanging}},
-        // One keypoint each at 2 s: the display range widened by 5 % on each side; the
-        // factor is taken before the padding.
-        {"frame all on single keypoints",
-         [this] {
-             enabled("A", {{2.0, 3.0}});
-             enabled("B", {{2.0, 5.0}});
-             view.zoomWithFactor(1.0, 4.0);
-             recorder.clearCalls();
-             view.frameAll(1);
-             EXPECT_GE(viewHost.redrawRequests(), 1);
-         },
-         CGRectMake(-0.5, 2.9, 11, 2.2),
-         10.0 / 11,
-         1,
-         {kVolume}},
-        {"frame all spans enabled items only",
-         [this] {
-             enabled("A", {{1.0, 0.0}, {2.0, 1.0}});
-             enabled("B", {{3.0, 0.0}});
-             addItem(addChannel("Disabled", {{9.0, 0.0}}))->enableItem(0);
-             view.frameAll(1);
-         },
-         CGRectMake(0.9, -0.05, 2.2, 1.1),
-         10 / 2.2,
-         2,
-         {kVolume}},
-        {"frame all never changes the height for one flat curve",
-         [this] {
-             enabled("Flat", {{1.0, 0.5}, {4.0, 0.5}});
-             view.frameAll(0);
-         },
-         CGRectMake(0, -1, 10, 2),
-         1,
-         1,
-         {kVolume}},
-        // 0..100 needs a factor of 1/50, short of the limit; the draw pass calls it: no word.
-        {"auto-zoom only when due",
-         [this] {
-             enabled("A", {{1.0, 0.0}, {2.0, 100.0}});
-             view.performAutoZoom(false);
-             EXPECT_EQ(view.getCurrentViewVolume(), CGRectMake(0, -1, 10, 2));
-             view.setNeedsAutoZoom(1);
-             view.performAutoZoom(false);
-             EXPECT_EQ(view.gridZoomY(), 32.0);
-         },
-         CGRectMake(0, -5, 10, 110),
-         1,
-         0.02,
-         {}},
-        {"reset zoom",
-         [this] {
-             view.zoomWithFactor(2.0, 4.0);
-             view.drawProjection();
-             view.pan(-80.0, -40.0);
-             recorder.clearCalls();
-             view.resetZoom();
-         },
-         CGRectMake(0, -1, 10, 2),
-         1,
-         1,
-         {kVolume}},
-        {"reset pan keeps the zoom",
-         [this] {
-             view.zoomWithFactor(1.0, 2.0);
-             view.drawProjection();
-             view.pan(0.0, -40.0);
-             recorder.clearCalls();
-             view.resetPan();
-         },
-         CGRectMake(0, -1, 10, 1),
-         1,
-         2,
-         {kVolume}},
-    };
-    for (const VolumeCase& c : cases) {
-        SCOPED_TRACE(c.what);
-        TearDown();
-        SetUp();
-        view.resetZoom();  // the view outlives the fixture's set-up
-        recorder.clearCalls();
-        c.run();
-        const CGRect& v = view.getCurrentViewVolume();
-        EXPECT_NEAR(v.origin.x, c.want.origin.x, kWorldTolerance);
-        EXPECT_NEAR(v.origin.y, c.want.origin.y, kWorldTolerance);
-        EXPECT_NEAR(v.size.width, c.want.size.width, kWorldTolerance);
-        EXPECT_NEAR(v.size.height, c.want.size.height, kWorldTolerance);
-        EXPECT_NEAR(view.zoomX(), c.zoomX, kWorldTolerance);
-        EXPECT_NEAR(view.zoomY(), c.zoomY, kWorldTolerance);
-        EXPECT_EQ(postedWords(), c.words);
-    }
-}
-
-TEST_F(ViewVolume, setVerticalZoom__with_zoom_one_shows_the_whole_range_whatever_the_percentage) {
-    addItem(addChannel("A", {{1.0, -3.0}, {2.0, 5.0}}));
+// With zoom one the scroller shows the whole range whatever the percentage; p = 0 is the top
+// of the range; the scroller does not touch the zoom factor.
+TEST_F(ViewVolume, setVerticalZoom__places_the_volume_in_the_whole_range) {
+    build("A: 1=-3 2=5");
+    item("A")->enableItem(1);
     view.computeVerticalTickMarks();
     for (double p : {0.0, 0.3, 1.0}) {
         // The range grows with the view's padding, so it is taken anew before each call.
         const CGRect max = ctrl().getMaxViewVolume();
         view.setVerticalZoom(1.0, p);
-        EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().origin.y, max.origin.y) << "p = " << p;
+        EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().origin.y, max.origin.y) << p;
         EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().size.height, max.size.height) << p;
     }
     const CGRect max = ctrl().getMaxViewVolume();
     view.setVerticalZoom(0.5, 0.0);
-    EXPECT_DOUBLE_EQ(CGRectGetMaxY(view.getCurrentViewVolume()), CGRectGetMaxY(max))
-        << "p = 0 is the top of the range";
-    EXPECT_DOUBLE_EQ(view.zoomY(), 1.0) << "the scroller does not touch the zoom factor";
+    EXPECT_DOUBLE_EQ(CGRectGetMaxY(view.getCurrentViewVolume()), CGRectGetMaxY(max));
+    EXPECT_DOUBLE_EQ(view.zoomY(), 1.0);
 }
 
-class ViewFramingTest : public ViewFixture {};
-
-TEST_F(ViewFramingTest, currentToolChanged__forgetsTheBoxAndPostsTheToolWord) {
+TEST_F(ViewVolume, tool_change_and_destruction) {
     viewHost.resetRedrawRequests();
     ctrl().setCurrentTool(TQTool::kBox);
-    EXPECT_EQ(view.fourCornerBoxInitialized(), 0);
     EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyToolChangedWord});
     EXPECT_EQ(viewHost.redrawRequests(), 1);
-}
-
-TEST_F(ViewFramingTest, destruction__detachesTheViewFromItsController) {
     auto doomed = std::make_unique<TQCurveEditorViewBase>();
     doomed->setController(&ctrl());
     ctrl().setView(doomed.get());

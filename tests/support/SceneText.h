@@ -1,0 +1,48 @@
+#pragma once
+// Channels as text, so that a test states the whole table a user would see after an edit.
+// keyText: "seconds=value" per keyframe in table order, then "/code" for an interpolation
+// other than Bezier, "!" disabled, "L" locked, and with handles "(inU,inV|outU,outV)" and "b"
+// broken, "s" scaled; a channel without keyframes shows its initial value, "(5)". sceneText:
+// "Name: keyText" for every channel under a root, joined by "; ". Numbers have six
+// significant digits unless told otherwise.
+
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "platform/channels/TQChannel.h"
+#include "platform/channels/TQChannelFolder.h"
+
+inline std::string keyText(const TQChannel& c, bool handles = false, int digits = 6) {
+    std::ostringstream out;
+    out.precision(digits);
+    for (TQKeyframeHandle h : c.getKeyframes(false)) {
+        CMTime t;
+        double v = 0, iu = 0, iv = 0, ou = 0, ov = 0;
+        c.getKeyframe(h, &t, &v);
+        out << (out.tellp() > 0 ? " " : "") << CMTimeGetSeconds(t) << "=" << v + 0.0;
+        if (c.getKeyframeInterpolation(h) != kTQInterpolationBezier)
+            out << "/" << c.getKeyframeInterpolation(h);
+        if (!c.getKeyframeEnabled(h)) out << "!";
+        if (c.getKeyframeLocked(h)) out << "L";
+        if (!handles) continue;
+        c.getKeyframeInputTangents(h, &iu, &iv);
+        c.getKeyframeOutputTangents(h, &ou, &ov);
+        // + 0.0 turns -0 into 0.
+        out << "(" << iu + 0.0 << "," << iv + 0.0 << "|" << ou + 0.0 << "," << ov + 0.0 << ")";
+        if (c.getKeyframeTangentsBroken(h)) out << "b";
+        if (c.getKeyframeTangentsScaled(h)) out << "s";
+    }
+    if (c.numberOfKeyframes() == 0) out << "(" << c.getInitialValue() + 0.0 << ")";
+    return out.str();
+}
+
+inline std::string sceneText(const TQChannelBase& root, bool handles = false) {
+    std::vector<TQChannelBase*> all;
+    static_cast<const TQChannelFolder&>(root).getAllDescendantsFlattened(all, 0, true);
+    std::string out;
+    for (const TQChannelBase* node : all)
+        if (const auto* c = dynamic_cast<const TQChannel*>(node))
+            out += (out.empty() ? "" : "; ") + c->getName() + ": " + keyText(*c, handles);
+    return out;
+}
