@@ -15,18 +15,17 @@
 
 #include "platform/channels/TQChannel.h"
 #include "tests/support/SceneText.h"
+#include "tests/support/StepScript.h"
 
 inline void editScript(TQChannel& c, const std::string& script) {
     // The arguments of the step being run, as numbers, words, times and keyframes.
-    std::vector<std::string> a;
+    tests_support::StepArgs a;
     CMTime t0, t1;
     TQKeyframeHandle k0 = nullptr, k1 = nullptr;
-    const auto N = [&](size_t i) {
-        return i < a.size() ? std::strtod(a[i].c_str(), nullptr) : 0.0;
-    };
-    const auto W = [&](size_t i) { return i < a.size() ? a[i] : std::string(); };
+    const auto N = [&](size_t i) { return a.number(i); };
+    const auto W = [&](size_t i) { return a.word(i); };
     const auto aligned = [&] { return W(3).find("aligned") != std::string::npos; };
-    const std::map<std::string, std::function<void()>> ops = {
+    const tests_support::Steps ops = {
         {"key", [&] { c.setKeyframe(t0, N(1), W(2) == "r"); }},
         {"add", [&] { c.addKeyframe(&t0); }},
         {"addaxis", [&] { c.addKeyframeAtAxisTime(&t0); }},
@@ -52,25 +51,18 @@ inline void editScript(TQChannel& c, const std::string& script) {
         {"initial", [&] { c.setInitialValue(N(0)); }},
         {"shift", [&] { c.setTimeOffset(t0); }},
     };
-    std::istringstream steps(script);
-    for (std::string step; std::getline(steps, step, ';');) {
-        std::istringstream in(step);
-        std::string op, word;
-        in >> op;
-        a.clear();
-        while (in >> word) a.push_back(word);
-        t0 = TQTarnTimeForChannelSeconds(N(0), 0x40000);
-        t1 = TQTarnTimeForChannelSeconds(N(1), 0x40000);
-        k0 = c.getKeyframe(t0);
-        k1 = c.getKeyframe(t1);
-        if (op == "=>" || op == "=>h") {
-            const size_t text = std::min(step.find(op) + op.size() + 1, step.size());
-            EXPECT_EQ(keyText(c, op == "=>h"), step.substr(text))
-                << "after the steps before" << step;
-        } else if (ops.count(op)) {
-            ops.at(op)();
-        } else {
-            ADD_FAILURE() << "no such step: " << step;
-        }
-    }
+    tests_support::runSteps(
+        script, a, ops,
+        [&](const std::string& name) {
+            if (name == "=>" || name == "=>h")
+                EXPECT_EQ(keyText(c, name == "=>h"), a.rest) << "after the steps before " << name;
+            else
+                ADD_FAILURE() << "no such step: " << name;
+        },
+        [&] {
+            t0 = TQTarnTimeForChannelSeconds(N(0), 0x40000);
+            t1 = TQTarnTimeForChannelSeconds(N(1), 0x40000);
+            k0 = c.getKeyframe(t0);
+            k1 = c.getKeyframe(t1);
+        });
 }

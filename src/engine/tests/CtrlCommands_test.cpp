@@ -12,6 +12,7 @@
 
 #include "src/engine/TQEditBrackets.h"
 #include "tests/support/EngineFixture.h"
+#include "tests/support/StepScript.h"
 #include "tests/support/TextBaseline.h"
 
 namespace engine_test {
@@ -38,18 +39,18 @@ protected:
     // them. The selection a step works on is the view's.
     void run(const std::string& script) {
         TQCurveEditorViewBase undrawn;
-        std::vector<std::string> a;
-        const auto N = [&](size_t i) { return i < a.size() ? std::stod(a[i]) : 0.0; };
+        tests_support::StepArgs a;
+        const auto N = [&](size_t i) { return a.number(i); };
         const auto T = [&](size_t i) { return seconds(N(i)); };
-        const auto E = [&](size_t i) { return entry(a.at(i)); };
+        const auto E = [&](size_t i) { return entry(a.words.at(i)); };
         TQCurveSelectionList* s = view.getSelection();
-        const std::map<std::string, std::function<void()>> steps = {
+        const tests_support::Steps steps = {
             {"menu",
              [&] {
-                 RWMenuItem sender(a[0], a[0]);
-                 EXPECT_TRUE(ctrl().performAction(a[0], sender));
+                 RWMenuItem sender(a.rest, a.rest);
+                 EXPECT_TRUE(ctrl().performAction(a.rest, sender));
              }},
-            {"select", [&] { select(a.empty() ? "" : a[0]); }},
+            {"select", [&] { select(a.rest); }},
             {"move", [&] { ctrl().moveSelected(s, T(0), N(1), 1, char(N(2))); }},
             {"nudge", [&] { ctrl().offsetSelected(s, T(0), N(1)); }},
             {"offsetcurve", [&] { ctrl().offsetCurve(s, T(0), N(1)); }},
@@ -78,27 +79,17 @@ protected:
             {"linked", [&] { ctrl()._linked = true; }},
             {"offset", [&] { object->setTimeOffset(T(0)); }},
             {"remove",
-             [&] { item(a[0])->channel()->getParent()->removeChild(item(a[0])->channel()); }},
-            {"unlist", [&] { set->removeItemWithIdentifier(item(a[0])->channelId()); }},
+             [&] { item(a.rest)->channel()->getParent()->removeChild(item(a.rest)->channel()); }},
+            {"unlist", [&] { set->removeItemWithIdentifier(item(a.rest)->channelId()); }},
             {"movekey",
              [&] {
                  const CMTime from = T(1), to = T(2);
-                 item(a[0])->channel()->moveKeyframe(&from, &to, true);
+                 item(a.word(0))->channel()->moveKeyframe(&from, &to, true);
              }},
             {"noview", [&] { ctrl().setView(nullptr); }},
             {"undrawn", [&] { ctrl().setView(&undrawn); }},
         };
-        std::istringstream in(script);
-        for (std::string step; std::getline(in, step, ';');) {
-            std::istringstream words(step);
-            std::string op, word;
-            words >> op;
-            a.clear();
-            while (words >> word) a.push_back(word);
-            if (op == "select") a = {step.substr(step.find("select") + 6)};
-            ASSERT_TRUE(steps.count(op)) << "no such step: " << step;
-            steps.at(op)();
-        }
+        tests_support::runSteps(script, a, steps);
         ctrl().setView(&view);
     }
     // A drag of `steps` steps as the view runs it, the anchor going from t0 by dt and dv a step.

@@ -23,8 +23,10 @@ struct Box {
     Box rightSideAt(double x) const { return {bl, CGPointMake(x, br.y), CGPointMake(x, tr.y), tl}; }
 };
 
+// The first keypoint's input handle has no length: mirrored, its output handle would point
+// back in time until the two trade places.
 constexpr const char* kKeys =
-    "1=0(-0.25,-0.125|0.25,0.125) 2=0.5(-0.25,-0.125|0.25,0.125) 3=1(-0.25,-0.125|0.25,0.125) "
+    "1=0(0,0|0.25,0.125) 2=0.5(-0.25,-0.125|0.25,0.125) 3=1(-0.25,-0.125|0.25,0.125) "
     "4=0.25(-0.25,-0.125|0.25,0.125) 5=0.75(-0.25,-0.125|0.25,0.125)";
 
 // Logs, at each write of a keyframe's time, where the keyframe stood before it.
@@ -112,7 +114,7 @@ TEST_F(CtrlDeform, deformSelected__ends_where_it_should_however_the_corners_got_
     EXPECT_EQ(keyText(*c, true),
               "-3=0.75(-0.25,0.125|0.25,-0.125) -2=0.25(-0.25,0.125|0.25,-0.125) "
               "-1=1(-0.25,0.125|0.25,-0.125) 0=0.5(-0.25,0.125|0.25,-0.125) "
-              "1=0(-0.25,0.125|0.25,-0.125)");
+              "1=0(-0.25,0.125|0,0)");
     for (double x : {-1.0, 1.0, 3.0, 5.0}) deform(box.rightSideAt(x));
     EXPECT_TRUE(*c == *unshifted);
 }

@@ -78,14 +78,6 @@ protected:
     }
     RangeController& range() { return static_cast<RangeController&>(ctrl()); }
 
-    // Words posted through the delegate, in order.
-    std::vector<TQNotificationWord> postedWords() const {
-        std::vector<TQNotificationWord> out;
-        for (const TQDelegateCall& call : recorder.calls())
-            if (call.operation == "postNotification") out.push_back(call.word);
-        return out;
-    }
-
     // Past the gate, one frame; answers whether it was drawn. Every frame must hand the
     // encoder premultiplied colours only.
     bool frame() {
@@ -96,16 +88,6 @@ protected:
                           << fault.color.blue << ", " << fault.color.alpha
                           << ") is not premultiplied";
         return drawn;
-    }
-
-    // The pickable primitives of one hit id, in drawing order.
-    template <class T>
-    std::vector<const T*> pickable(uint32_t hitID) const {
-        std::vector<const T*> out;
-        for (const auto& p : view.selectionPrimitives())
-            if (p->hitInfo().hitID() == hitID)
-                if (const auto* t = dynamic_cast<const T*>(p.get())) out.push_back(t);
-        return out;
     }
 
     // A keyframe named as "A#1": the channel's name and its index in time order.
@@ -192,30 +174,37 @@ protected:
         return matchesBaseline(name, before + frameText(), "src/view/tests/baselines");
     }
 
+    // What the view shows and asked for: its volume, its display range, the cursors it set
+    // (each change once), whether it waits to zoom to fit, and the controller's requests
+    // (horizontal offsets, pans, selection changes).
+    std::string viewText() {
+        std::ostringstream out;
+        out.precision(5);
+        const CGRect& v = view.getCurrentViewVolume();
+        out << "volume " << v.origin.x << " " << v.origin.y << " " << v.size.width << " "
+            << v.size.height << ", range " << CMTimeGetSeconds(view.getDisplayRange().start) << " "
+            << CMTimeGetSeconds(view.getDisplayRange().duration) << ", cursors";
+        for (size_t i = 0; i < viewHost.cursors().size(); ++i)
+            if (i == 0 || viewHost.cursors()[i] != viewHost.cursors()[i - 1])
+                out << " " << static_cast<int>(viewHost.cursors()[i]);
+        out << (view.needsAutoZoom() ? ", zoom due" : "") << ", offsets";
+        for (double o : range().offsets) out << " " << o;
+        out << ", pans";
+        for (double p : range().panned) out << " " << p + 0.0;
+        out << ", selection changes " << range().selectionChanges;
+        return out.str();
+    }
+
     // ---- Gestures ----
     RWEvent mouseAt(RWEventType type, const CGPoint& world, uint64_t mods,
                     int64_t clicks = 1) const {
         return RWEvent::mouseEvent(type, view.getPointScreen(world), mods, clicks);
     }
-    void down(double t, double v, uint64_t mods = 0, int64_t clicks = 1) {
-        view.mouseDown(mouseAt(RWEventType::LeftMouseDown, CGPointMake(t, v), mods, clicks));
-    }
-    // One drag step, `after` seconds after the last (past the gate unless told otherwise).
-    void dragTo(double t, double v, uint64_t mods = 0, double after = kStepSeconds) {
-        clock.advance(after);
-        view.mouseDragged(mouseAt(RWEventType::LeftMouseDragged, CGPointMake(t, v), mods));
-    }
-    void up(double t, double v, uint64_t mods = 0) {
-        view.mouseUp(mouseAt(RWEventType::LeftMouseUp, CGPointMake(t, v), mods));
-    }
-    void click(double t, double v, uint64_t mods = 0, int64_t clicks = 1) {
-        down(t, v, mods, clicks);
-        up(t, v, mods);
-    }
     // A gesture as a script: "d t v", "m t v" (a drag step past the gate), "q t v" (one
     // inside it), "u t v", "c t v" (a click), "2 t v" (a double click), each point followed by
-    // its modifiers if any: s Shift, o Option, c Command, x Control. Steps are separated by
-    // "|".
+    // its modifiers if any: s Shift, o Option, c Command, x Control; "k" and "K" press and
+    // release the space bar, "z" turns auto-zoom off, "D" detaches the controller. Steps are
+    // separated by "|".
     void gesture(const std::string& script) {
         std::istringstream in(script);
         for (std::string step; std::getline(in, step, '|');) {
@@ -226,27 +215,21 @@ protected:
             words >> op >> t >> v >> mods;
             uint64_t m = 0;
             for (char c : mods)
-                m |= c == 's'   ? kShift
-                     : c == 'o' ? kOption
-                     : c == 'c' ? kCommand
-                     : c == 'x' ? kControl
-                                : 0;
-            if (op == 'd') down(t, v, m);
-            if (op == 'm') dragTo(t, v, m);
-            if (op == 'q') dragTo(t, v, m, 0.01);
-            if (op == 'u') up(t, v, m);
-            if (op == 'c') click(t, v, m);
-            if (op == '2') click(t, v, m, 2);
+                m |= c == 's' ? kShift : c == 'o' ? kOption : c == 'c' ? kCommand : kControl;
+            const CGPoint p = CGPointMake(t, v);
+            if (op == 'd' || op == 'c' || op == '2')
+                view.mouseDown(mouseAt(RWEventType::LeftMouseDown, p, m, op == '2' ? 2 : 1));
+            if (op == 'm' || op == 'q') {
+                clock.advance(op == 'm' ? kStepSeconds : 0.01);
+                view.mouseDragged(mouseAt(RWEventType::LeftMouseDragged, p, m));
+            }
+            if (op == 'u' || op == 'c' || op == '2')
+                view.mouseUp(mouseAt(RWEventType::LeftMouseUp, p, m));
+            if (op == 'k') view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " "));
+            if (op == 'K') view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " "));
+            if (op == 'z') view.setAutoZoom(0);
+            if (op == 'D') view.setController(nullptr);
         }
-    }
-
-    // The keyframe's time and value, or NaNs when the handle is stale.
-    static std::pair<double, double> keyOf(const TQCurveEditorChannelItemPtr& item,
-                                           TQKeyframeHandle h) {
-        CMTime t = kCMTimeInvalid;
-        double v = 0.0;
-        if (!item->channel()->getKeyframe(h, &t, &v)) return {NAN, NAN};
-        return {CMTimeGetSeconds(t), v};
     }
 
     HXDRecordingEncoder encoder{800, 400};

@@ -67,25 +67,16 @@ TEST_F(ViewPick, hitTest__the_closest_thing_under_the_pointer_is_the_only_record
             << "at " << k.t << ", " << k.v << " + " << k.dx << ", " << k.dy;
 }
 
-// The sketch tool takes nothing; the box tool records the hit id, and takes keypoints during a
-// band; a record of an item that went is skipped, and a miss leaves the list.
-TEST_F(ViewPick, pick__other_tools_and_stale_records) {
+// The sketch tool takes nothing; a record of an item that went is skipped, and a miss leaves
+// the list.
+TEST_F(ViewPick, pick__the_sketch_tool_and_stale_records) {
     build("A: 2=0/1 5=0/1 8=0/1");
     ASSERT_TRUE(frame());
     const CGPoint onKey = view.getPointScreen(CGPointMake(5.0, 0.0));
     ctrl().setCurrentTool(TQTool::kSketch);
     view.pick(onKey);
     EXPECT_EQ(view.getCurrentSelection()->size() + view.getCurrentActivePart(), 0u);
-    ctrl().setCurrentTool(TQTool::kBox);
-    view.pick(onKey);
-    EXPECT_EQ(view.getCurrentSelection()->size(), 0u);
-    EXPECT_EQ(view.getCurrentActivePart(), TQSelectionKeypoint);
-    view.setSelecting(1);
-    view.pick(onKey);
-    EXPECT_EQ(view.getCurrentSelection()->size(), 1u);
-    view.setSelecting(0);
     ctrl().setCurrentTool(TQTool::kEdit);
-    view.getCurrentSelection()->reset();
     ctrl().removeChannelWithIdentifier(item("A")->channelId(), set);
     view.getCurrentSelection()->addSelection(entry("A@8"));
     view.pick(onKey);

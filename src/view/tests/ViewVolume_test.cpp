@@ -3,11 +3,11 @@
 
 #include <cmath>
 #include <functional>
-#include <iomanip>
 #include <map>
 #include <sstream>
 
 #include "src/view/tests/ViewFixture.h"
+#include "tests/support/StepScript.h"
 
 namespace view_test {
 namespace {
@@ -15,33 +15,31 @@ namespace {
 class ViewVolume : public ViewFixture {
 protected:
     // Runs view operations: "zoom fx fy" (by factors, about the centre), "drag dx dy" (a zoom
-    // by a pointer drag about "at x y", in pixels), "pan dx dy" (pixels), "draw", "start t"
-    // (the display range and the volume from t), "wheel n" (n wheel events of a line queued
-    // behind one, and a key), "frame all|values", "auto", "due", "reset", "resetpan", and
-    // "A 1=0 2=1" (an enabled item with its mapping, as the draw pass leaves it). "?" notes the
-    // volume. Answers the notes, then the volume, the zoom factors (of the volume, then of
-    // the grid), the posted words and the requests to the controller (horizontal offsets,
-    // pans): "x y w h *zx *zy #gz !words >offset ~pan".
+    // by a pointer drag about "at x y", in pixels), "pan dx dy" (pixels), "draw", "wheel n" (n
+    // wheel events of a line queued behind one, and a key), "frame all|values", "auto", "due",
+    // "reset", "resetpan", "scale s" (the backing scale), "A: 1=0 2=1" (an enabled item with its
+    // mapping, as the draw pass leaves it), "off A", and "clean" A's curve. Noted on the way:
+    // "screen t v", "world x y", "size x y" and "snap t v" (conversions through the last
+    // frame), "dirty" (A's curve) and "?" (the volume). Answers the notes, then the volume, the
+    // zoom factors (of the volume, then of the grid), the posted words (as bracketText has
+    // them) and the requests to the controller (horizontal offsets, pans):
+    // "x y w h *zx *zy #gz !word >offset ~pan".
     std::string run(const std::string& script) {
-        std::vector<std::string> a;
-        const auto N = [&](size_t i) { return std::stod(a.at(i)); };
+        tests_support::StepArgs a;
+        const auto N = [&](size_t i) { return a.number(i); };
         std::ostringstream out;
         out.precision(5);
-        const std::map<std::string, std::function<void()>> steps = {
+        const auto point = [&](const CGPoint& p) { out << p.x << " " << p.y << " / "; };
+        const auto volume = [&] {
+            const CGRect& v = view.getCurrentViewVolume();
+            out << v.origin.x << " " << v.origin.y << " " << v.size.width << " " << v.size.height;
+        };
+        const tests_support::Steps steps = {
             {"zoom", [&] { view.zoomWithFactor(N(0), N(1)); }},
             {"at", [&] { view.setMouseOrigin(CGPointMake(N(0), N(1))); }},
             {"drag", [&] { view.zoom(N(0), N(1)); }},
             {"pan", [&] { view.pan(N(0), N(1)); }},
             {"draw", [&] { view.drawProjection(); }},
-            {"start",
-             [&] {
-                 const CMTime start = seconds(N(0));
-                 view.setDisplayRange(&start, nullptr);
-                 CGRect v = view.getCurrentViewVolume();
-                 v.origin.x = N(0);
-                 view.setCurrentViewVolume(v);
-                 view.drawProjection();
-             }},
             {"wheel",
              [&] {
                  for (int i = 0; i < N(0); ++i)
@@ -50,39 +48,38 @@ protected:
                  view.scrollWheel(RWEvent::scrollWheelEvent(0.0, 1.0));
                  out << "queued " << viewHost.queuedCount() << " / ";
              }},
-            {"frame", [&] { view.frameAll(a.at(0) == "all"); }},
+            {"frame", [&] { view.frameAll(a.rest == "all"); }},
             {"auto", [&] { view.performAutoZoom(false); }},
             {"due", [&] { view.setNeedsAutoZoom(1); }},
             {"reset", [&] { view.resetZoom(); }},
             {"resetpan", [&] { view.resetPan(); }},
             {"clear", [&] { recorder.clearCalls(); }},
-            {"off", [&] { item(a.at(0))->enableItem(0); }},
+            {"off", [&] { item(a.rest)->enableItem(0); }},
+            {"?",
+             [&] {
+                 volume();
+                 out << " / ";
+             }},
+            {"screen", [&] { point(view.getPointScreen(CGPointMake(N(0), N(1)))); }},
+            {"world", [&] { point(view.getPointWorld(CGPointMake(N(0), N(1)))); }},
+            {"size", [&] { point(view.getSizeWorld(CGPointMake(N(0), N(1)))); }},
+            {"snap", [&] { point(view.adjustWorldPointToScreen(CGPointMake(N(0), N(1)))); }},
+            {"scale",
+             [&] {
+                 viewHost.setBackingScaleFactor(N(0));
+                 view.viewDidChangeBackingProperties();
+             }},
+            {"clean", [&] { item("A")->setOriginalCurveDirty(0); }},
+            {"dirty", [&] { out << (item("A")->originalCurveDirty() ? "dirty / " : "clean / "); }},
         };
-        const auto volume = [&] {
-            const CGRect& v = view.getCurrentViewVolume();
-            out << v.origin.x << " " << v.origin.y << " " << v.size.width << " " << v.size.height;
-        };
-        std::istringstream in(script);
-        for (std::string step; std::getline(in, step, ';');) {
-            std::istringstream words(step);
-            std::string op, word;
-            words >> op;
-            a.clear();
-            while (words >> word) a.push_back(word);
-            if (op == "?") {
-                volume();
-                out << " / ";
-            } else if (steps.count(op)) {
-                steps.at(op)();
-            } else {
-                build(step);
-                item(op.substr(0, op.size() - 1))->enableItem(1);
-                view.computeVerticalTickMarks();
-            }
-        }
+        tests_support::runSteps(script, a, steps, [&](const std::string& name) {
+            build(name + " " + a.rest);
+            item(name.substr(0, name.size() - 1))->enableItem(1);
+            view.computeVerticalTickMarks();
+        });
         volume();
-        out << " *" << view.zoomX() << " *" << view.zoomY() << " #" << view.gridZoomY() << " !";
-        for (TQNotificationWord w : postedWords()) out << std::hex << w << " " << std::dec;
+        out << " *" << view.zoomX() << " *" << view.zoomY() << " #" << view.gridZoomY() << " "
+            << recorder.bracketText() << " ";
         for (double o : range().offsets) out << ">" << o << " ";
         for (double p : range().panned) out << "~" << p << " ";
         return out.str();
@@ -105,14 +102,14 @@ TEST_F(ViewVolume, operations__table) {
          "0.22727 -0.91667 9.0909 1.6667 *1.1 *1.2 #1 !1800 "},
         // The factor would reach 200: the height stays, the anchor keeps its fraction.
         {"a drag zoom past the limit", "zoom 1 100; draw; at 200 100; drag 0 -200",
-         "0 -0.01 10 0.02 *1 *128 #0.0078125 !1800 1800 "},
-        {"pan and back", "start 2; pan -80 -40; ?; draw; pan 80 40",
-         "3 -1.2 10 2 / 2 -1 10 2 *1 *1 #1 !1800 1800 >1 >-1 "},
-        {"a pan that would reach time zero moves only y", "start 0; pan 80 40",
+         "0 -0.01 10 0.02 *1 *128 #0.0078125 2*[!1800] "},
+        {"pan and back", "pan -160 0; draw; pan -80 -40; ?; draw; pan 80 40",
+         "3 -1.2 10 2 / 2 -1 10 2 *1 *1 #1 3*[!1800] >2 >1 >-1 "},
+        {"a pan that would reach time zero moves only y", "pan 80 40",
          "0 -0.8 10 2 *1 *1 #1 !1800 "},
         // Four events of a line, four pixels a line: 16 px of 400; only wheel events taken.
         {"queued wheel events fold into one pan", "wheel 3",
-         "queued 1 / 0 -0.92 10 2 *1 *1 #1 !1800 4 ~8 "},
+         "queued 1 / 0 -0.92 10 2 *1 *1 #1 !1800 !4 ~8 "},
         // One keypoint each at 2 s: the display range widened by 5 % on each side; the
         // factor is taken before the padding.
         {"frame all on single keypoints", "A: 2=3; B: 2=5; zoom 1 4; clear; frame all",
@@ -123,11 +120,21 @@ TEST_F(ViewVolume, operations__table) {
          "0 -1 10 2 *1 *1 #1 !1800 "},
         // 0..100 needs a factor of 1/50, short of the limit; the draw pass calls it: no word.
         {"auto-zoom only when due", "A: 1=0 2=100; auto; ?; due; auto",
-         "0 -1 10 2 / 0 -5 10 110 *1 *0.02 #32 !"},
+         "0 -1 10 2 / 0 -5 10 110 *1 *0.02 #32  "},
         {"reset zoom", "zoom 2 4; draw; pan -80 -40; clear; reset",
          "0 -1 10 2 *1 *1 #1 !1800 >0.5 "},
         {"reset pan keeps the zoom", "zoom 1 2; draw; pan 0 -40; clear; resetpan",
          "0 -1 10 1 *1 *2 #0.5 !1800 "},
+        // 5.0031 s lies at 400.248 px: it snaps back to the pixel at 400.
+        {"conversions through the last frame",
+         "screen 5 0; world 800 400; size 80 40; snap 5.0031 0",
+         "400 200 / 10 1 / 1 0.2 / 5 0 / 0 -1 10 2 *1 *1 #1  "},
+        // The zoom shows only when drawn, and has every curve fetched again.
+        {"a zoom is seen once drawn",
+         "A: 1=0; clean; zoom 1 2; screen 5 .5; dirty; draw; screen 5 .5",
+         "400 300 / dirty / 400 400 / 0 -0.5 10 1 *1 *2 #0.5 !1800 "},
+        {"drawable pixels, twice as many at a backing scale of 2", "scale 2; screen 5 0",
+         "800 400 / 0 -1 10 2 *1 *1 #1  "},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
@@ -140,59 +147,18 @@ TEST_F(ViewVolume, operations__table) {
     }
 }
 
-TEST_F(ViewVolume, mapping__onto_drawable_pixels_of_the_last_frame) {
-    const auto text = [](const CGPoint& p) {
-        return (std::ostringstream() << std::setprecision(6) << p.x << " " << p.y).str();
-    };
-    const auto screen = [&](double t, double v) {
-        return text(view.getPointScreen(CGPointMake(t, v)));
-    };
-    EXPECT_EQ(screen(5.0, 0.0), "400 200");
-    EXPECT_EQ(text(view.getPointWorld(CGPointMake(800.0, 400.0))), "10 1");
-    EXPECT_EQ(text(view.getSizeWorld(CGPointMake(80.0, 40.0))), "1 0.2");
-    // 5.0031 s lies at 400.248 px: it snaps back to the pixel at 400.
-    EXPECT_NEAR(view.adjustWorldPointToScreen(CGPointMake(5.0031, 0.0)).x, 5.0, kWorldTolerance);
-    // The zoom shows only when drawn.
-    view.zoomWithFactor(1.0, 2.0);
-    EXPECT_EQ(screen(5.0, 0.5), "400 300");
-    view.drawProjection();
-    EXPECT_EQ(screen(5.0, 0.5), "400 400");
-    // Drawable pixels, not points: twice as many at a backing scale of 2.
-    viewHost.setBackingScaleFactor(2.0);
-    view.viewDidChangeBackingProperties();
-    EXPECT_EQ(screen(5.0, 0.0), "800 400");
-    // Before the first frame conversions are not numbers, and snapping invents none.
+// Before the first frame conversions are not numbers, and snapping invents none; a change of
+// tool redraws and posts its word; a view going detaches from its controller.
+TEST_F(ViewVolume, no_frame_a_tool_change_and_destruction) {
     TQCurveEditorViewBase fresh;
     fresh.setViewHost(&viewHost);
     fresh.setCurrentViewVolume(CGRectMake(0, 0, 1, 1));
     EXPECT_TRUE(std::isnan(fresh.getPointWorld(CGPointMake(10, 10)).x));
     EXPECT_TRUE(std::isnan(fresh.getPointScreen(CGPointMake(0.5, 0.5)).y));
     EXPECT_TRUE(std::isnan(fresh.adjustWorldPointToScreen(CGPointMake(0.5, 0.5)).x));
-}
-
-// With zoom one the scroller shows the whole range whatever the percentage; p = 0 is the top
-// of the range; the scroller does not touch the zoom factor.
-TEST_F(ViewVolume, setVerticalZoom__places_the_volume_in_the_whole_range) {
-    build("A: 1=-3 2=5");
-    item("A")->enableItem(1);
-    view.computeVerticalTickMarks();
-    for (double p : {0.0, 0.3, 1.0}) {
-        // The range grows with the view's padding, so it is taken anew before each call.
-        const CGRect max = ctrl().getMaxViewVolume();
-        view.setVerticalZoom(1.0, p);
-        EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().origin.y, max.origin.y) << p;
-        EXPECT_DOUBLE_EQ(view.getCurrentViewVolume().size.height, max.size.height) << p;
-    }
-    const CGRect max = ctrl().getMaxViewVolume();
-    view.setVerticalZoom(0.5, 0.0);
-    EXPECT_DOUBLE_EQ(CGRectGetMaxY(view.getCurrentViewVolume()), CGRectGetMaxY(max));
-    EXPECT_DOUBLE_EQ(view.zoomY(), 1.0);
-}
-
-TEST_F(ViewVolume, tool_change_and_destruction) {
     viewHost.resetRedrawRequests();
     ctrl().setCurrentTool(TQTool::kBox);
-    EXPECT_EQ(postedWords(), std::vector<TQNotificationWord>{kTQNotifyToolChangedWord});
+    EXPECT_EQ(recorder.bracketText(), "!4000008");
     EXPECT_EQ(viewHost.redrawRequests(), 1);
     auto doomed = std::make_unique<TQCurveEditorViewBase>();
     doomed->setController(&ctrl());
