@@ -40,9 +40,12 @@ inline void runSteps(const std::string& script, StepArgs& args, const Steps& ste
         args.rest = after < step.size() ? step.substr(after) : "";
         args.rest.erase(args.rest.find_last_not_of(' ') + 1);
         if (each) each();
-        if (steps.count(name)) steps.at(name)();
-        else if (otherwise) otherwise(name);
-        else ADD_FAILURE() << "no such step: " << step;
+        if (steps.count(name))
+            steps.at(name)();
+        else if (otherwise)
+            otherwise(name);
+        else
+            ADD_FAILURE() << "no such step: " << step;
     }
 }
 

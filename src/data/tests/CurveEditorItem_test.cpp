@@ -21,21 +21,20 @@ CMTime sec(double s) { return TQTarnTimeForChannelSeconds(s, 0x40000); }
 //       Extra (folder, id 300): Deep (1)
 class ItemFixture : public ::testing::Test {
 protected:
+    template <class T>
+    static T* add(TQChannelFolder* parent, const char* name, TQChannelId id) {
+        return static_cast<T*>(parent->addChild(std::make_unique<T>(name, id)));
+    }
     void SetUp() override {
         scene = std::make_unique<TQChannelFolder>("Scene", 0);
-        cube = static_cast<TQChannelObjectRootBase*>(
-            scene->addChild(std::make_unique<TQChannelObjectRootBase>("Cube", 7)));
-        opacity =
-            static_cast<TQChannel*>(cube->addChild(std::make_unique<TQChannel>("Opacity", 202)));
-        transform = static_cast<TQChannelFolder*>(
-            cube->addChild(std::make_unique<TQChannelFolder>("Transform", 100)));
-        position = static_cast<TQCompoundChannel*>(
-            transform->addChild(std::make_unique<TQCompoundChannel>("Position", 101)));
-        x = static_cast<TQChannel*>(position->addChild(std::make_unique<TQChannel>("X", 1)));
-        y = static_cast<TQChannel*>(position->addChild(std::make_unique<TQChannel>("Y", 2)));
-        extra = static_cast<TQChannelFolder*>(
-            transform->addChild(std::make_unique<TQChannelFolder>("Extra", 300)));
-        deep = static_cast<TQChannel*>(extra->addChild(std::make_unique<TQChannel>("Deep", 1)));
+        cube = add<TQChannelObjectRootBase>(scene.get(), "Cube", 7);
+        opacity = add<TQChannel>(cube, "Opacity", 202);
+        transform = add<TQChannelFolder>(cube, "Transform", 100);
+        position = add<TQCompoundChannel>(transform, "Position", 101);
+        x = add<TQChannel>(position, "X", 1);
+        y = add<TQChannel>(position, "Y", 2);
+        extra = add<TQChannelFolder>(transform, "Extra", 300);
+        deep = add<TQChannel>(extra, "Deep", 1);
         host.answers.sceneChannelRoot = scene.get();
         TQCurveEditorItem::resetColorIndex();
     }
@@ -71,9 +70,9 @@ TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
     EXPECT_EQ(channelItem(deep)->simpleName(), "Extra.Deep");
     EXPECT_EQ(channelItem(x)->simpleName(), "Cube.Transform.Position.X")
         << "a flagged root above the parent takes part";
-    auto* sized = transform->addChild(std::make_unique<TQChannel>("Cube Size", 5));
+    auto* sized = add<TQChannel>(transform, "Cube Size", 5);
     EXPECT_EQ(channelItem(sized)->simpleName(), "Cube Size") << "a name holding its root's stays";
-    auto* loose = scene->addChild(std::make_unique<TQChannel>("Loose", 900));
+    auto* loose = add<TQChannel>(scene.get(), "Loose", 900);
     EXPECT_EQ(channelItem(loose)->simpleName(), "Loose") << "outside any object";
     EXPECT_EQ(channelItem(loose)->rootName(), std::nullopt);
 }

@@ -203,8 +203,8 @@ protected:
     // A gesture as a script: "d t v", "m t v" (a drag step past the gate), "q t v" (one
     // inside it), "u t v", "c t v" (a click), "2 t v" (a double click), each point followed by
     // its modifiers if any: s Shift, o Option, c Command, x Control; "k" and "K" press and
-    // release the space bar, "z" turns auto-zoom off, "D" detaches the controller. Steps are
-    // separated by "|".
+    // release the space bar, "z" turns auto-zoom off, "b" takes the box tool, "D" detaches the
+    // controller. Steps are separated by "|".
     void gesture(const std::string& script) {
         std::istringstream in(script);
         for (std::string step; std::getline(in, step, '|');) {
@@ -229,6 +229,7 @@ protected:
             if (op == 'K') view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " "));
             if (op == 'z') view.setAutoZoom(0);
             if (op == 'D') view.setController(nullptr);
+            if (op == 'b') ctrl().setCurrentTool(TQTool::kBox);
         }
     }
 

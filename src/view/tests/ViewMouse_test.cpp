@@ -133,6 +133,8 @@ INSTANTIATE_TEST_SUITE_P(
         Gesture{"intoTheTopBand", kEnds, "", "d 2 0|m 2 .5|m 2 .95|u 2 .95"},
         Gesture{"pastTheRightEdge", kEnds, "", "z|d 9.5 0|m 10.5 0|u 10.5 0"},
         Gesture{"intoTheBottomBand", kEnds, "", "z|d 2 0|m 2 -.95|u 2 -.95"},
+        Gesture{"boxIntoTheBottomBand", kLinear, "",
+                "b|z|d 1 .9|m 4 0|m 9 -.5|u 9 -.5|d 5 .25|m 5 -.7|u 5 -.7"},
         // With the space bar a drag on nothing pans the display range by the pointer's
         // movement, the other way; with Command a drag rightward magnifies time about where it
         // began, leftward it shrinks; without it a drag on nothing is a band.
