@@ -285,6 +285,16 @@ protected:
         return list;
     }
 
+    // Keyframe times of the channel in seconds, in order.
+    static std::vector<double> keyTimes(const TQChannel* channel) {
+        std::vector<double> out;
+        for (TQKeyframeHandle h : channel->getKeyframes(false)) {
+            CMTime t = kCMTimeInvalid;
+            channel->getKeyframe(h, &t, nullptr);
+            out.push_back(CMTimeGetSeconds(t));
+        }
+        return out;
+    }
     static double keyValueAt(const TQChannel* channel, double t) {
         double v = 0.0;
         channel->getKeyframe(channel->getKeyframe(seconds(t)), nullptr, &v);

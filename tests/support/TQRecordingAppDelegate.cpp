@@ -3,6 +3,26 @@
 #include <algorithm>
 #include <cstdio>
 
+std::string TQDelegateCall::describe() const {
+    if (operation == "postNotification") {
+        char hex[16];
+        std::snprintf(hex, sizeof hex, "0x%x", static_cast<unsigned>(word));
+        return operation + "(" + hex + ")";
+    }
+    if (operation == "addToUndo")
+        return operation + "(" + std::to_string(type) + "," + std::to_string(action) + "," + text +
+               ")";
+    if (operation == "addChannelToUndo") return operation + "(" + channelName + "," + text + ")";
+    if (operation == "startCaptureModifiedChannels") return operation + "(" + text + ")";
+    if (channel || !channelName.empty()) return operation + "(" + channelName + ")";
+    if (operation == "setCurrentTime") {
+        char seconds[32];
+        std::snprintf(seconds, sizeof seconds, "%g", CMTimeGetSeconds(time));
+        return operation + "(" + seconds + ")";
+    }
+    return operation + "()";
+}
+
 TQDelegateCall& TQRecordingAppDelegate::record(std::string_view operation) {
     TQDelegateCall& call = _calls.emplace_back();
     call.operation = operation;
@@ -15,6 +35,17 @@ TQDelegateCall& TQRecordingAppDelegate::recordChannel(std::string_view operation
     call.channel = channel;
     call.channelName = channel ? channel->getName() : std::string("null");
     return call;
+}
+
+std::vector<std::string> TQRecordingAppDelegate::bracketSequence() const {
+    std::vector<std::string> out;
+    for (const auto& c : _calls)
+        for (const char* o :
+             {"startCaptureModifiedChannels", "endCaptureModifiedChannels", "willChangeChannel",
+              "didChangeChannel", "willSetChannelValue", "didSetChannelValue", "addChannelToUndo",
+              "addToUndo", "postNotification"})
+            if (c.operation == o) out.push_back(c.describe());
+    return out;
 }
 
 std::string TQRecordingAppDelegate::bracketText() const {

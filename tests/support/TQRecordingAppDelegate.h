@@ -29,6 +29,10 @@ struct TQDelegateCall {
     uint32_t action = 0;
     const void* object = nullptr;
     CMTime time = kCMTimeInvalid;
+
+    // "willChangeChannel(X)", "postNotification(0x8)", "startCaptureModifiedChannels(Undo
+    // Move Keypoint)", "addToUndo(2,0,Curve Editor Undo Remove Channel)", "currentTime()".
+    std::string describe() const;
 };
 
 class TQRecordingAppDelegate : public TQCurveEditorAppDelegate {
@@ -70,6 +74,8 @@ public:
     // addToUndo (type.action), "!8" a posted word in hex. A group of calls repeated back to
     // back is written once, as "3*[(A A)]".
     std::string bracketText() const;
+    // The same calls, each described.
+    std::vector<std::string> bracketSequence() const;
     size_t count(std::string_view operation) const;
     // Starts minus ends so far: 0 when every bracket that opened has closed.
     int captureBalance() const;

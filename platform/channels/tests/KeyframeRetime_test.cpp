@@ -85,42 +85,4 @@ TEST_F(KeyframeRetime, setKeyframeTime__keeps_order_and_handles_through_random_m
     }
 }
 
-TEST_F(KeyframeRetime, move_to_own_time_run__goes_after_the_others_there) {
-    const CMTime shared = ref.entries[3].time;
-    const TQKeyframeHandle first = ref.entries[3].handle;
-    const TQKeyframeHandle second = ref.entries[4].handle;
-    channel->setKeyframeTime(second, &shared);
-    ref.retime(second, shared);
-    expectOrder(*channel, ref, 0);
-    // The first of the run is set to the time it already has: it is not moved at all.
-    channel->setKeyframeTime(first, &shared);
-    expectOrder(*channel, ref, 1);
-    EXPECT_EQ(channel->getKeyframe(shared), second) << "a lookup by time answers the last arrival";
-}
-
-TEST_F(KeyframeRetime, moveKeyframe_replacing__deletes_only_the_keyframes_at_the_target) {
-    const CMTime target = ref.entries[8].time;
-    const TQKeyframeHandle stay = ref.entries[8].handle;
-    const TQKeyframeHandle mover = ref.entries[2].handle;
-    const TQKeyframeHandle other = ref.entries[5].handle;
-    channel->setKeyframeTime(other, &target);  // two keyframes wait at the target
-    const CMTime from = ref.entries[2].time;
-    channel->moveKeyframe(&from, &target, false);
-    EXPECT_FALSE(channel->getKeyframe(stay, nullptr, nullptr)) << "the keyframe there is replaced";
-    EXPECT_FALSE(channel->getKeyframe(other, nullptr, nullptr))
-        << "every keyframe there is replaced";
-    EXPECT_EQ(channel->getKeyframe(target), mover);
-    EXPECT_EQ(channel->numberOfKeyframes(), 10u);
-    const std::vector<TQKeyframeHandle> handles = channel->getKeyframes(false);
-    for (size_t i = 0; i < handles.size(); ++i) {
-        CMTime t = kCMTimeInvalid;
-        ASSERT_TRUE(channel->getKeyframe(handles[i], &t, nullptr)) << "position " << i;
-        if (i > 0) {
-            CMTime before = kCMTimeInvalid;
-            channel->getKeyframe(handles[i - 1], &before, nullptr);
-            EXPECT_LT(CMTimeCompare(before, t), 0) << "order broken at position " << i;
-        }
-    }
-}
-
 }  // namespace

@@ -94,23 +94,15 @@ TEST_F(SavedTreesTest, state__writesTopEdgeAndEndAndReadsThemBack) {
 }
 
 TEST_F(SavedTreesTest, state__partialViewVolumeKeepsTheOppositeEdges) {
-    {
-        TQCurveEditorState state;
-        state.setCurrentViewVolume(BNRect<double>(0, 0, 10, 5));
-        read("<curveeditor><currentviewvolume originx='2'/></curveeditor>", state);
-        expectRect(state.currentViewVolume(), 2, 0, 8, 5);  // the right edge stays at 10
-    }
-    {
+    // From (0, 1) by 10 x 5: the right edge stays at 10; the top edge stays at 6, or moves to 3.
+    for (const auto& [attribute, x, y, w, h] : {std::tuple{"originx='2'", 2, 1, 8, 5},
+                                                {"height='2'", 0, 4, 10, 2},
+                                                {"originy='3'", 0, -2, 10, 5}}) {
         TQCurveEditorState state;
         state.setCurrentViewVolume(BNRect<double>(0, 1, 10, 5));
-        read("<curveeditor><currentviewvolume height='2'/></curveeditor>", state);
-        expectRect(state.currentViewVolume(), 0, 4, 10, 2);  // the top edge stays at 6
-    }
-    {
-        TQCurveEditorState state;
-        state.setCurrentViewVolume(BNRect<double>(0, 1, 10, 5));
-        read("<curveeditor><currentviewvolume originy='3'/></curveeditor>", state);
-        expectRect(state.currentViewVolume(), 0, -2, 10, 5);  // the top edge moves to 3
+        read(std::string("<curveeditor><currentviewvolume ") + attribute + "/></curveeditor>",
+             state);
+        expectRect(state.currentViewVolume(), x, y, w, h);
     }
 }
 

@@ -92,6 +92,41 @@ TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
     }
 }
 
+// "Hidden in curve editors" reads backwards, deliberately: the flagged root itself, or a
+// flagged folder deeper down, is left out only when hidden channels are not ignored; a flagged
+// folder right under the root only when they are; a flagged channel right under the root only
+// when they are, deeper down either way.
+TEST_F(ItemFixture, folderItem__hiddenInCurveEditorsReadsBackwards) {
+    const auto shown = [&](TQChannelBase* flagged, char ignore) {
+        flagged->setFlag(kTQChannelFlagHiddenInCurveEditor);
+        auto root = std::make_shared<TQCurveEditorFolderItem>();
+        root->initWithChannel(cube, 0, &host, ignore);
+        std::string out;
+        for (const auto& c : root->children()) out += c->simpleName() + " ";
+        flagged->resetFlag(kTQChannelFlagHiddenInCurveEditor);
+        return out;
+    };
+    const struct {
+        TQChannelBase* flagged;
+        char ignore;
+        const char* want;
+    } rows[] = {
+        {cube, 0, ""},
+        {cube, 1, "Opacity Position.X Position.Y Extra.Deep "},
+        {transform, 0, "Opacity Position.X Position.Y Extra.Deep "},
+        {transform, 1, "Opacity "},
+        {extra, 0, "Opacity Position.X Position.Y "},
+        {extra, 1, "Opacity Position.X Position.Y Extra.Deep "},
+        {deep, 0, "Opacity Position.X Position.Y "},
+        {deep, 1, "Opacity Position.X Position.Y "},
+        {opacity, 0, "Opacity Position.X Position.Y Extra.Deep "},
+        {opacity, 1, "Position.X Position.Y Extra.Deep "},
+    };
+    for (const auto& r : rows)
+        EXPECT_EQ(shown(r.flagged, r.ignore), r.want)
+            << r.flagged->getName() << " ignoring " << int(r.ignore);
+}
+
 TEST_F(ItemFixture, colours__wrapAfterEight) {
     std::vector<TQCurveEditorChannelItemPtr> items;
     for (int i = 0; i < 9; ++i) items.push_back(channelItem(opacity));
@@ -103,7 +138,9 @@ TEST_F(ItemFixture, colours__wrapAfterEight) {
 TEST_F(ItemFixture, copy__newIdentitySameColourNoSamples) {
     opacity->setKeyframe(sec(0), 1.0);
     opacity->setKeyframe(sec(1), 2.0);
+    opacity->setKeyframeEnabled(opacity->setKeyframe(sec(9), 50.0), false);
     auto item = channelItem(opacity, 8);
+    EXPECT_EQ(item->minY() + 10 * item->maxY(), 21.0) << "of the enabled keyframes";
     item->setColorIndex(5);
     item->refreshOriginalCurve(kCMTimeZero, sec(0.25));
     ASSERT_NE(item->samplesV(), nullptr);

@@ -76,6 +76,11 @@ protected:
             {"mouse", [&] { view.setMouseOrigin(view.getPointScreen(CGPointMake(N(0), N(1)))); }},
             {"save", [&] { ctrl().saveTangents(E(0).get()); }},
             {"negative", [&] { ctrl().allowNegativeRange(true); }},
+            {"cycle",
+             [&] {
+                 item(a.rest)->channel()->setExtrapolation(kTQExtrapolationRepeat,
+                                                           kTQExtrapolationAfter);
+             }},
             {"linked", [&] { ctrl()._linked = true; }},
             {"offset", [&] { object->setTimeOffset(T(0)); }},
             {"remove",
@@ -127,7 +132,7 @@ TEST_P(CtrlEdits, edit__as_recorded_and_undone_exactly) {
             "\nundo steps: " + std::to_string(steps) + "\n",
         "src/engine/tests/baselines"));
     EXPECT_EQ(recorder.captureBalance(), 0);
-    // Edits made outside a bracket leave no step: the view brackets them.
+    // Edits made outside a bracket are one step the host makes of them.
     const auto after = snapshot();
     for (size_t i = 0; i < steps; ++i) ASSERT_TRUE(host.undo());
     EXPECT_TRUE(steps == 0 || sceneIs(*before)) << "undo";
@@ -167,6 +172,9 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"deleteLockedOnly", "A: 0=0 1=10L", "A@1", "menu menuDelete:"},
         // Written before the first deletion: a second write would read a one-key curve.
         Edit{"deleteAll", "A: 0=0 1=10", "A@1 A@0", "now 0.5 | menu menuDelete:"},
+        // Past the keyframes what was shown follows the extrapolation, linked components too.
+        Edit{"deleteAllPastTheEnd", "A: 0=0 1=10; Pos.X: 0=0 1=4; Pos.Y: 0=1 1=5",
+             "A@1 A@0 X@0 X@1", "now 1.3; cycle A; cycle Y | menu menuDelete:"},
         Edit{"duplicateOnTakenAndBetweenFrames", "A: 1=3 31/30=4; B: 1.01=7", "A@1 B@1.01",
              "menu menuDuplicate:"},
         Edit{"addToLinked", "Pos.X: 0=0 4=8; Pos.Y: 0=0 4=8; Pos.Z: 0=0 4=8", "",

@@ -199,7 +199,7 @@ TEST_F(CtrlMenus, actions__changeWhatTheKindNeedsInOneUndoStepThatGivesItBack) {
         std::vector<unsigned> got;
         for (TQKeyframeHandle h : item->channel()->getKeyframes(false))
             got.push_back(item->channel()->getKeyframeInterpolation(h));
-        EXPECT_EQ(got, c.want) << describe(*object);
+        EXPECT_EQ(got, c.want) << sceneText(*object);
         if (c.want.empty()) {  // the cleared channel shows what it showed at the playhead
             EXPECT_NEAR(item->channel()->getInitialValue(), 0.5, kValueTolerance);
         }

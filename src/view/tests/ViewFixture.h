@@ -48,10 +48,12 @@ public:
     }
     void windowWasPanned(double fraction) override { panned.push_back(fraction); }
     void selectionChangedTo(TQCurveSelectionList*) override { ++selectionChanges; }
+    void currentViewVolumeChangedTo(const CGRect*) override { ++volumeChanges; }
 
     std::vector<double> offsets;
     std::vector<double> panned;
     int selectionChanges = 0;
+    int volumeChanges = 0;
 };
 
 // Names an image of the view's tables: "key c/state/selected" or "tangent".
@@ -176,7 +178,7 @@ protected:
 
     // What the view shows and asked for: its volume, its display range, the cursors it set
     // (each change once), whether it waits to zoom to fit, and the controller's requests
-    // (horizontal offsets, pans, selection changes).
+    // (horizontal offsets, pans, selection and volume changes).
     std::string viewText() {
         std::ostringstream out;
         out.precision(5);
@@ -187,11 +189,13 @@ protected:
         for (size_t i = 0; i < viewHost.cursors().size(); ++i)
             if (i == 0 || viewHost.cursors()[i] != viewHost.cursors()[i - 1])
                 out << " " << static_cast<int>(viewHost.cursors()[i]);
-        out << (view.needsAutoZoom() ? ", zoom due" : "") << ", offsets";
+        out << (view.needsAutoZoom() ? ", zoom due" : "")
+            << (view.fourCornerBoxInitialized() ? ", box" : "") << ", offsets";
         for (double o : range().offsets) out << " " << o;
         out << ", pans";
         for (double p : range().panned) out << " " << p + 0.0;
-        out << ", selection changes " << range().selectionChanges;
+        out << ", selection changes " << range().selectionChanges << ", volume changes "
+            << range().volumeChanges;
         return out.str();
     }
 
@@ -202,9 +206,11 @@ protected:
     }
     // A gesture as a script: "d t v", "m t v" (a drag step past the gate), "q t v" (one
     // inside it), "u t v", "c t v" (a click), "2 t v" (a double click), each point followed by
-    // its modifiers if any: s Shift, o Option, c Command, x Control; "k" and "K" press and
-    // release the space bar, "z" turns auto-zoom off, "b" takes the box tool, "D" detaches the
-    // controller. Steps are separated by "|".
+    // its modifiers if any: s Shift, o Option, c Command, x Control; "r t v" a right click
+    // on a fresh frame (notes the menu it answers); "k" and "K" press and release the space
+    // bar, "z" turns auto-zoom off, "b" takes the box tool, "S" the sketch tool with every
+    // item selected, "a name:" sends a key map's action (notes one the view does not know),
+    // "D" detaches the controller. Steps are separated by "|".
     void gesture(const std::string& script) {
         std::istringstream in(script);
         for (std::string step; std::getline(in, step, '|');) {
@@ -212,7 +218,15 @@ protected:
             char op = 0;
             double t = 0, v = 0;
             std::string mods;
-            words >> op >> t >> v >> mods;
+            if (words >> op && op == 'a') {
+                struct KeySender final : RWActionSender {
+                    int64_t tag() const override { return 0; }
+                } sender;
+                words >> mods;
+                if (!view.performAction(mods, sender)) notes += "unknown " + mods + " ";
+                continue;
+            }
+            words >> t >> v >> mods;
             uint64_t m = 0;
             for (char c : mods)
                 m |= c == 's' ? kShift : c == 'o' ? kOption : c == 'c' ? kCommand : kControl;
@@ -230,10 +244,27 @@ protected:
             if (op == 'z') view.setAutoZoom(0);
             if (op == 'D') view.setController(nullptr);
             if (op == 'b') ctrl().setCurrentTool(TQTool::kBox);
+            if (op == 'S') {
+                ctrl().setCurrentTool(TQTool::kSketch);
+                for (const auto& i : items) i->select(1);
+            }
+            if (op == 'r') {
+                frame();
+                const RWMenuPtr menu =
+                    view.menuForEvent(mouseAt(RWEventType::RightMouseDown, p, m));
+                notes += std::string("menu ") +
+                         (menu == ctrl().getKeyframeMenu()  ? "keypoint"
+                          : menu == ctrl().getTangentMenu() ? "tangent"
+                          : menu == ctrl().getCurveMenu()   ? "curve"
+                          : menu == ctrl().getDefaultMenu() ? "default"
+                                                            : "none") +
+                         " ";
+            }
         }
     }
 
     HXDRecordingEncoder encoder{800, 400};
+    std::string notes;  // what gesture() saw on the way
 };
 
 }  // namespace view_test
