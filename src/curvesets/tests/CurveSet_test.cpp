@@ -5,6 +5,8 @@
 
 #include <gtest/gtest.h>
 
+#include <sstream>
+
 #include "host/TQHostAppDelegate.h"
 
 namespace {
@@ -16,16 +18,19 @@ std::vector<TQChannelRef> refs(std::initializer_list<const char*> paths) {
 }
 
 std::string text(const TQCurveSet& set) {
-    std::string out;
+    std::ostringstream out;
     for (const auto& root : set.roots()) {
-        out += (out.empty() ? "" : " ") + root->rootName().value_or("?") + "[";
-        for (const auto& item : root->children())
-            out += (out.back() == '[' ? "" : " ") +
-                   item->simpleName().substr(item->simpleName().rfind('.') + 1) +
-                   (item->isEnabledItem() == 0 ? "-" : "") + (item->isSelected() ? "*" : "");
-        out += "]";
+        out << (out.tellp() > 0 ? " " : "") << root->rootName().value_or("?") << "[";
+        const char* gap = "";
+        for (const auto& item : root->children()) {
+            const BNString& name = item->simpleName();
+            out << gap << name.substr(name.rfind('.') + 1)
+                << (item->isEnabledItem() == 0 ? "-" : "") << (item->isSelected() ? "*" : "");
+            gap = " ";
+        }
+        out << "]";
     }
-    return out;
+    return out.str();
 }
 
 class CurveSetFixture : public ::testing::Test {

@@ -223,7 +223,7 @@ protected:
                     int64_t tag() const override { return 0; }
                 } sender;
                 words >> mods;
-                if (!view.performAction(mods, sender)) notes += "unknown " + mods + " ";
+                if (!view.performAction(mods, sender)) notes.append("unknown ").append(mods) += ' ';
                 continue;
             }
             words >> t >> v >> mods;
@@ -252,13 +252,11 @@ protected:
                 frame();
                 const RWMenuPtr menu =
                     view.menuForEvent(mouseAt(RWEventType::RightMouseDown, p, m));
-                notes += std::string("menu ") +
-                         (menu == ctrl().getKeyframeMenu()  ? "keypoint"
-                          : menu == ctrl().getTangentMenu() ? "tangent"
-                          : menu == ctrl().getCurveMenu()   ? "curve"
-                          : menu == ctrl().getDefaultMenu() ? "default"
-                                                            : "none") +
-                         " ";
+                notes.append("menu ").append(menu == ctrl().getKeyframeMenu()  ? "keypoint"
+                                             : menu == ctrl().getTangentMenu() ? "tangent"
+                                             : menu == ctrl().getCurveMenu()   ? "curve"
+                                             : menu == ctrl().getDefaultMenu() ? "default"
+                                                                               : "none") += ' ';
             }
         }
     }

@@ -57,7 +57,7 @@ TEST_P(ViewGestures, gesture__as_recorded_and_undone_exactly) {
         "scene: " + sceneText(*object, true) + "\ncalls: " + recorder.bracketText() +
             "\nselection: " + seen + selectionText() + "\nundo steps: " + std::to_string(steps) +
             "\nview: " + viewText() + ", panels " + std::to_string(modal.runs().size()) +
-            (notes.empty() ? "" : "\nnotes: " + notes) + "\n",
+            (notes.empty() ? "" : "\nnotes: ") + notes + "\n",
         "src/view/tests/baselines"));
     RWResetServices();
     EXPECT_EQ(recorder.captureBalance(), 0);
