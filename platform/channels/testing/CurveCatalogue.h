@@ -40,6 +40,15 @@ inline std::unique_ptr<TQChannel> makeChannel(const char* name) {
     return std::make_unique<TQChannel>(name, 1, 0.0);
 }
 
+inline std::unique_ptr<TQChannel> cloneOf(const TQChannel& c) {
+    return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
+}
+
+// A channel whose values step whatever the interpolation codes say (as booleans do).
+struct SteppedChannel : TQChannel {
+    SteppedChannel() : TQChannel("stepped", 1, 0.0) { setDiscrete(true); }
+};
+
 inline void keys(TQChannel& c, std::initializer_list<std::pair<double, double>> secondsValues) {
     for (const auto& [t, v] : secondsValues) c.setKeyframe(seconds(t), v);
 }

@@ -31,7 +31,9 @@ inline constexpr int32_t kFps = 30;
 inline CMTime frame(int64_t k) { return CMTimeMake(k, kFps); }
 inline CMTime frameDuration() { return CMTimeMake(1, kFps); }
 
+using curve_catalogue::cloneOf;
 using curve_catalogue::Lcg;
+using curve_catalogue::SteppedChannel;
 
 inline std::unique_ptr<TQChannel> noisySine(int64_t frames = 100'000, uint64_t seed = 11) {
     auto c = std::make_unique<TQChannel>("noisy sine", 1, 0.0);

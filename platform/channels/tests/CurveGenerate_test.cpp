@@ -5,23 +5,16 @@
 
 #include "platform/channels/testing/ReferenceCurves.h"
 
+using curve_catalogue::cloneOf;
+using curve_catalogue::SteppedChannel;
 using reference_curves::frame;
 
 namespace {
-
-std::unique_ptr<TQChannel> cloneOf(const TQChannel& c) {
-    return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
-}
 
 // Keyframes on frames 0 to 40 with a segment of most kinds: Catmull-Rom segments at each end
 // and after a step (their shape changes with new neighbours unless baked with care), the step
 // (which a mirrored cycle runs backwards), broken handles, an ease and an Exp segment. The ends
 // differ in value, so a repeated cycle jumps.
-// A channel whose values step whatever the interpolation codes say (as booleans do).
-struct SteppedChannel : TQChannel {
-    SteppedChannel() : TQChannel("stepped", 1, 0.0) { setDiscrete(true); }
-};
-
 std::unique_ptr<TQChannel> mixedCurve(bool discrete = false) {
     std::unique_ptr<TQChannel> c = discrete ? std::make_unique<SteppedChannel>()
                                             : std::make_unique<TQChannel>("mixed", 1, 0.0);

@@ -11,10 +11,6 @@ namespace {
 
 constexpr double kTolerance = 1e-12;
 
-std::unique_ptr<TQChannel> copyOf(const TQChannel& c) {
-    return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
-}
-
 // Keyframes at 1, 2 and 3 s valued 10, 20 and 30, made in that order.
 class CurveKeyframes : public ::testing::Test {
 protected:
@@ -86,7 +82,7 @@ TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywher
     auto other = flat();
     EXPECT_FALSE(other->getKeyframe(a, nullptr, nullptr)) << "a handle of another channel";
     EXPECT_FALSE(c->getKeyframe(nullptr, nullptr, nullptr));
-    const auto before = copyOf(*c);
+    const auto before = cloneOf(*c);
     for (TQKeyframeHandle h : {b, TQKeyframeHandle(nullptr)}) {
         c->setKeyframeValue(h, 99.0);
         c->setKeyframeOutputTangents(h, 1.0, 1.0);
@@ -139,7 +135,7 @@ TEST_F(CurveKeyframes, meetingKeyframes__bothLiveUntilPurgeKeepsTheArrival) {
     editScript(*c, "move 1 2; => 2=20 2=10 3=30");  // the arrival comes last
     EXPECT_EQ(c->getKeyframe(two), a) << "lookup by time answers the keyframe that arrived";
     EXPECT_NEAR(c->getCurveValue(two), 10.0, kTolerance) << "the arrival stands for the time";
-    const auto copy = copyOf(*c);
+    const auto copy = cloneOf(*c);
     editScript(*c, "purge; => 2=10 3=30; purge; => 2=10 3=30");
     EXPECT_TRUE(live(a) && !live(b)) << "the moved keyframe survives, the one it landed on goes";
     // Replacing, every keyframe at the target goes at once; a move to its own time, or from a
@@ -216,7 +212,7 @@ TEST_F(CurveKeyframes, smoothAndReverse__catmullRomHandlesAndMirroredRuns) {
     editScript(*r,
                "key 0 0; key 1 4; key 3 5; key 4 1; interp 0 13; interp 1 17; interp 3 1; interp 4 "
                "0; out 3 0.3 0.7");
-    const auto before = copyOf(*r);
+    const auto before = cloneOf(*r);
     // Mirrored in its span, each segment's shape run backwards, the one leaving as it was; the
     // order of the ends does not matter, and one keyframe has nothing to reverse.
     editScript(*r,
@@ -241,7 +237,7 @@ TEST_F(CurveKeyframes, segmentAndCurveOffsets__moveTheRightKeyframes) {
         "shift 10; offset 11.5 40; => 1=30/1 2=50/1 3=55/1; offset 11.5 40; => 1=30/1 2=50/1 "
         "3=55/1; "
         "offset 14 0; => 1=-30/1 2=-10/1 3=-5/1; offset 11.5 nan; => 1=-30/1 2=-10/1 3=-5/1");
-    const auto moved = copyOf(*c);
+    const auto moved = cloneOf(*c);
     const CMTime invalid = kCMTimeInvalid;
     c->offsetCurve(nullptr, 5.0);
     c->offsetCurve(&invalid, 5.0);
@@ -285,7 +281,7 @@ TEST_F(CurveKeyframes, cloneAssignCompareAndReset__roundTripEveryPartOfTheState)
     c->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
     c->setKeyframeLocked(a, true);
     c->addBehavior(std::make_unique<TQNoiseBehavior>(1.0, 2.0, 3));
-    const auto clone = copyOf(*c);
+    const auto clone = cloneOf(*c);
     EXPECT_TRUE(*clone == *c);
     EXPECT_TRUE(clone->getKeyframeLocked(a)) << "a clone keeps the keyframes' serials";
     // Every part of the state is compared and carried by an assignment.
@@ -307,10 +303,10 @@ TEST_F(CurveKeyframes, cloneAssignCompareAndReset__roundTripEveryPartOfTheState)
         [&](TQChannel& x) { x.getInfo()->tickStep = 2.0, x.getImpl()->range().setRange(0.0, 1.0); },
     };
     for (size_t i = 0; i < std::size(edits); ++i) {
-        const auto changed = copyOf(*c);
+        const auto changed = cloneOf(*c);
         edits[i](*changed);
         EXPECT_FALSE(*changed == *c) << "edit " << i << " must be seen";
-        const auto restored = copyOf(*changed);
+        const auto restored = cloneOf(*changed);
         *restored = *c;
         EXPECT_TRUE(*restored == *c) << "edit " << i << " must be undone by an assignment";
         *restored = *changed;

@@ -10,10 +10,6 @@ using namespace reference_curves;
 
 namespace {
 
-std::unique_ptr<TQChannel> cloneOf(const TQChannel& c) {
-    return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
-}
-
 int64_t frameOf(const CMTime& t) { return t.value * kFps / t.timescale; }
 
 bool onFrame(const CMTime& t) {
@@ -171,11 +167,6 @@ TEST(CurveSimplify, fits_lines_steps_and_existing_keyframes_within_the_same_prom
         }
     }
 }
-
-// A channel whose values step whatever the interpolation codes say (as booleans do).
-struct SteppedChannel : TQChannel {
-    SteppedChannel() : TQChannel("stepped", 1, 0.0) { setDiscrete(true); }
-};
 
 TEST(CurveSimplify, fits_a_stepped_channel_with_steps_on_its_own_levels) {
     SteppedChannel c;

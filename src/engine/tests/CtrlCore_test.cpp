@@ -66,6 +66,13 @@ TEST_F(CtrlCore, sets__append_remove_refresh_and_first_channel) {
     set->channeItemAtIndex(0)->enableItem(0);
     set->channeItemAtIndex(1)->select(1);
     EXPECT_EQ(ctrl().getFirstChannel(), set->channeItemAtIndex(1));
+    // A removal posts one word; by selection it is also a controller undo step.
+    recorder.clearCalls();
+    EXPECT_TRUE(ctrl().removeChannelWithIdentifier(set->channeItemAtIndex(0)->channelId(), set));
+    EXPECT_FALSE(ctrl().removeChannelWithIdentifier(1, nullptr));
+    EXPECT_TRUE(ctrl().removeSelectedChannelFromSelectedCurveSet());
+    EXPECT_EQ(ctrl().numberOfChannelItems(), 0u);
+    EXPECT_EQ(recorder.bracketText(), "!20000 +2.0:Remove Channel from Curve Set !20000");
     // A set without removal removes nothing, appends nothing and posts nothing.
     auto plain = std::make_shared<TQCurveSet>();
     plain->initWithName("Plain", &recorder);
