@@ -87,18 +87,21 @@ TEST_F(CurveSetFixture, relative__pathsRebuildTheItemsAndCarryTheirStates) {
     host.scene().setSelection({cube});
     set->setReferences(&position);
     set->refresh(10, false);
+    set->appendItem(itemFor(ball, "./1/200/202"));  // its path joins the set's, for the cube too
+    EXPECT_EQ(set->references()->size(), 4u);
+    set->refresh(10, false);
     set->channeItemAtIndex(1)->enableItem(0);
     set->refresh(10, false);
-    EXPECT_EQ(text(*set), "Cube[X Y- Z]");
-    EXPECT_EQ(set->numberOfEnabledItems(), 2u);
+    EXPECT_EQ(text(*set), "Cube[X Y- Z Opacity]");
+    EXPECT_EQ(set->numberOfEnabledItems(), 3u);
     set->disableAll();
     set->channeItemAtIndex(0)->select(true);
     EXPECT_EQ(set->selectedItem(), set->channeItemAtIndex(0));
     set->deselectAll();
     set->enableAll(true, set->channeItemAtIndex(2).get());
-    EXPECT_EQ(text(*set), "Cube[X* Y Z-]");
+    EXPECT_EQ(text(*set), "Cube[X* Y Z- Opacity]");
     set->deselectAll();
-    EXPECT_EQ(text(*set), "Cube[X Y Z-]");
+    EXPECT_EQ(text(*set), "Cube[X Y Z- Opacity]");
 }
 
 TEST_F(CurveSetFixture, filter__aRootEmptiedByTheFilterStaysOneEmptyFromTheStartGoes) {
@@ -127,7 +130,8 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
     set->appendItem(x);  // present: not added twice, but enabled again
     set->insertItem(y, 987654);
     EXPECT_EQ(text(*set), "Cube[X Z]") << "no such child: nothing inserted";
-    set->insertItem(y, z->channelId());
+    y->enableItem(0);
+    set->insertItem(y, z->channelId());  // enabled as it comes in
     set->appendItem(itemFor(ball, "./1/200/202"));
     EXPECT_EQ(text(*set), "Cube[X Y Z] Ball[Opacity]");
     EXPECT_EQ(set->channeItemAtIndex(2), z);
@@ -135,6 +139,10 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
     EXPECT_EQ(set->itemWithIdentifier(y->channelId()), y);
     EXPECT_FALSE(set->removeItemNotInList({x, y, z}));
     EXPECT_EQ(text(*set), "Cube[X Y Z]");
+    set->setItem(nullptr);
+    EXPECT_EQ(text(*set), "Cube[X Y Z]");
+    set->setItem(y);
+    EXPECT_EQ(text(*set), "Cube[Y]");
 
     host.scene().removeObject(cube);
     set->appendItem(itemFor(ball, "./1/200/202"));

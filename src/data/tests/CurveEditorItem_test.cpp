@@ -240,6 +240,7 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     item->takeCurveSnapshot(1);
     EXPECT_EQ(item->numberOfSamplesSnapshot(), 0u) << "no samples yet: nothing taken";
     item->refreshOriginalCurve(kCMTimeZero, sec(1));
+    item->refreshProcessedCurve(kCMTimeZero, sec(1));
     item->takeCurveSnapshot(1);
     ASSERT_EQ(item->numberOfSamplesSnapshot(), 4u);
     ASSERT_NE(item->snapshotChannel(), nullptr);
@@ -256,7 +257,9 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     EXPECT_EQ(item->minY(), 0.0);
     EXPECT_TRUE(item->compoundChannelComponents().empty());
     item->refreshOriginalCurve(kCMTimeZero, sec(1));
+    item->refreshProcessedCurve(kCMTimeZero, sec(1));
     EXPECT_EQ(item->numberOfSamples(), 0u);
+    EXPECT_TRUE(!item->processedSamplesU() && !item->processedSamplesV());
     item->takeCurveSnapshot(1);
     EXPECT_EQ(item->numberOfSamplesSnapshot(), 0u);
     EXPECT_EQ(item->snapshotChannel(), nullptr);
