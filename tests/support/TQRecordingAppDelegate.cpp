@@ -80,10 +80,11 @@ std::string TQRecordingAppDelegate::bracketText() const {
                 ++r;
             if (r > 1 && r * k > bestRepeats * bestLength) bestLength = k, bestRepeats = r;
         }
-        std::string group;
-        for (size_t k = 0; k < bestLength; ++k) group += (k ? " " : "") + tokens[i + k];
-        out += (out.empty() ? "" : " ") +
-               (bestRepeats > 1 ? std::to_string(bestRepeats) + "*[" + group + "]" : group);
+        // Appended piece by piece: GCC 12 at -O3 takes a prefixed string for an overlapping copy.
+        if (!out.empty()) out += ' ';
+        if (bestRepeats > 1) out.append(std::to_string(bestRepeats)).append("*[");
+        for (size_t k = 0; k < bestLength; ++k) (k ? out += ' ' : out) += tokens[i + k];
+        if (bestRepeats > 1) out += ']';
         i += bestLength * bestRepeats;
     }
     return out;
