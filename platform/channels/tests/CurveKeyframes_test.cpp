@@ -140,8 +140,13 @@ TEST_F(CurveKeyframes, meetingKeyframes__bothLiveUntilPurgeKeepsTheArrival) {
     EXPECT_TRUE(live(a) && !live(b)) << "the moved keyframe survives, the one it landed on goes";
     // Replacing, every keyframe at the target goes at once; a move to its own time, or from a
     // time without a keyframe, changes nothing.
+    // Read, and so held, before the move: the curve and where the handles are.
+    EXPECT_TRUE(copy->getKeyframe(b, nullptr, nullptr) && copy->getCurveValue(seconds(2.5)) < 30);
     editScript(*copy, "move 3 2 replace; => 2=30; move 2 2 replace; move 5 3; => 2=30");
     EXPECT_EQ(copy->getKeyframe(two), d);
+    EXPECT_FALSE(copy->getKeyframe(a, nullptr, nullptr) || copy->getKeyframe(b, nullptr, nullptr))
+        << "the replaced keyframes' handles are stale";
+    EXPECT_EQ(copy->getCurveValue(seconds(2.5)), 30.0);
 
     auto e = makeChannel("e");
     const TQKeyframeHandle x = e->setKeyframe(seconds(1.0), 1.0), y = e->setKeyframe(two, 2.0);
