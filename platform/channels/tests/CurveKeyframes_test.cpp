@@ -318,7 +318,9 @@ TEST_F(CurveKeyframes, cloneAssignCompareAndReset__roundTripEveryPartOfTheState)
         EXPECT_TRUE(*restored == *changed) << "edit " << i << " must be carried by an assignment";
     }
     c->setInterpolation(kTQInterpolationLinear);
+    c->setAnimationEnabled(false);
     c->reset();
+    EXPECT_TRUE(c->canKeyframe()) << "animation on again";
     EXPECT_EQ(c->numberOfKeyframes(), 0u);
     EXPECT_EQ(c->getInitialValue(), c->getDefaultValue());
     EXPECT_EQ(c->getExtrapolation(kTQExtrapolationAfter), kTQExtrapolationConstant);

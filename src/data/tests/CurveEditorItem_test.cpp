@@ -125,6 +125,8 @@ TEST_F(ItemFixture, folderItem__hiddenInCurveEditorsReadsBackwards) {
     for (const auto& r : rows)
         EXPECT_EQ(shown(r.flagged, r.ignore), r.want)
             << r.flagged->getName() << " ignoring " << int(r.ignore);
+    opacity->setFlag(kTQChannelFlagHidden);
+    EXPECT_TRUE(channelItem(opacity)->isHidden() && !channelItem(x)->isHidden());
 }
 
 TEST_F(ItemFixture, colours__wrapAfterEight) {

@@ -80,6 +80,8 @@ TEST_F(ViewBox, drag__each_part_moves_the_corners_and_the_keypoints_with_them) {
         {"inside", "d 4 .1|m 4.5 .35|u 4.5 .35", "2.5=-0.25 6.5=-0.25 6.5=0.75 2.5=0.75"},
         {"inside, Shift: along the larger distance", "d 4 .1 s|m 4.5 .2 s|u 4.5 .2 s",
          "2.5=-0.5 6.5=-0.5 6.5=0.5 2.5=0.5"},
+        {"corner after Shift drags: free again", "d 2 -.5|m 2.5 -.25|u 2.5 -.25",
+         "2.5=-0.25 6=-0.25 6=0.5 2.5=0.5"},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
