@@ -103,7 +103,11 @@ TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywher
                      c->getKeyframeInputTangents(h, nullptr, nullptr));
     }
     EXPECT_TRUE(*c == *before) << keyText(*c, true);
-    // Non-numeric times and values that are not finite add nothing.
+    // Non-numeric times and values that are not finite add nothing; states out of order are
+    // refused whole.
+    std::vector<TQKeyframeState> states = c->getKeyframeStates();
+    std::swap(states[0], states[1]);
+    EXPECT_FALSE(c->setKeyframeStates(states));
     EXPECT_EQ(c->setKeyframe(kCMTimeInvalid, 1.0), nullptr);
     EXPECT_EQ(c->setKeyframe(seconds(4.0), NAN), nullptr);
     c->setKeyframeValue(a, INFINITY);

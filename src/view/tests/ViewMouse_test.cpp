@@ -138,6 +138,7 @@ INSTANTIATE_TEST_SUITE_P(
         // movement, the other way; with Command a drag rightward magnifies time about where it
         // began, leftward it shrinks; without it a drag on nothing is a band.
         Gesture{"spaceDragPans", kEnds, "", "z|d 4 .5|m 3 .5|u 3 .5|k|d 4 .5|m 3 .5|u 3 .5|K"},
+        Gesture{"spaceRepeatArms", kEnds, "", "z|R|d 4 .5|m 3 .5|u 3 .5|K"},
         Gesture{"spaceDragZooms", kEnds, "", "z|k|d 4 .5|m 5 .5 c|m 3 .5 c|u 3 .5 c|K"},
         // Nudges step by the host's frame and a pixel, one undo step each, named a deletion
         // as the history always read.
