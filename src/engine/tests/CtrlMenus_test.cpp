@@ -158,6 +158,10 @@ TEST_F(CtrlMenus, curveAndTangentMenus__followTheSegmentUnderTheClickAndTheHandl
               "[Bézier] [Catmull-Rom] [Exponential] [Logarithmic]");
 
     selectInView({});
+    EXPECT_EQ(curveMenuAt(2.5),
+              "Add Keypoint [Delete All Keypoints] [Constant] [Linear] "
+              "[Bézier] [Catmull-Rom] [Exponential] [Logarithmic]")
+        << "nothing selected";
     EXPECT_EQ(reading(ctrl().getTangentMenu()), "[Break Tangents] [Align Tangents]");
     selectInView({tangentEntry(item, 3, true)});
     EXPECT_EQ(reading(ctrl().getTangentMenu()), "Break Tangents Align Tangents");
