@@ -236,7 +236,9 @@ TEST(TreeTypes, factoriesCreateAndCloneEveryClassAsItself) {
         ASSERT_NE(factory, nullptr) << "no factory for word " << word;
         std::unique_ptr<TQChannelBase> made = factory->create("Made", 42);
         EXPECT_EQ(TQChannelFactoryIdOf(made.get()), id) << factory->getClassName();
+        made->setTimeOffset(CMTimeMake(1, 2));
         std::unique_ptr<TQChannelBase> copy(made->cloneChannel());
+        EXPECT_EQ(copy->timeOffset(), CMTimeMake(1, 2)) << factory->getClassName();
         const TQChannelBase &copied = *copy, &original = *made;
         EXPECT_EQ(typeid(copied), typeid(original))
             << factory->getClassName() << " clones as itself";
