@@ -13,6 +13,11 @@
 
 namespace {
 
+// The generate panel bakes only while every channel has fewer keyframes than this.
+constexpr size_t kMostKeyframesToBake = 400;
+// The simplify panel runs only on channels whose keyframes span at most this many seconds.
+constexpr double kLongestSpanToSimplify = 60.0;
+
 // Past the view's 1/30 s gate on drag steps and frames.
 constexpr double kStep = 0.05;
 // Steps named in a failure's report.
@@ -354,6 +359,22 @@ void TQSoakSession::channelCommand() {
 }
 
 void TQSoakSession::simplify() {
+    // Keypoints dragged far out stretch a channel over thousands of seconds, where one fit
+    // takes seconds: the soak simplifies channels of a usual length.
+    for (const TQCurveEditorItemPtr& item : _ctrl.selectedChannels()) {
+        auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
+        TQChannel* channel = channelItem ? channelItem->channel() : nullptr;
+        const std::vector<TQKeyframeHandle> keys =
+            channel ? channel->getKeyframes(false) : std::vector<TQKeyframeHandle>{};
+        CMTime first = kCMTimeZero, last = kCMTimeZero;
+        if (keys.empty() || !channel->getKeyframe(keys.front(), &first, nullptr) ||
+            !channel->getKeyframe(keys.back(), &last, nullptr))
+            continue;
+        if (CMTimeGetSeconds(last) - CMTimeGetSeconds(first) > kLongestSpanToSimplify) {
+            _lastDetail = "skipped";
+            return;
+        }
+    }
     // The panel's controls moved a few times, then OK or Cancel.
     const bool ok = below(2) == 0;
     _lastDetail = ok ? "ok" : "cancel";
@@ -372,6 +393,17 @@ void TQSoakSession::simplify() {
 }
 
 void TQSoakSession::generate() {
+    // Each bake multiplies a channel's keyframes by up to the cycles plus one: past a few
+    // hundred, the session would spend itself on one channel.
+    std::vector<TQChannelBase*> channels;
+    if (auto* root = dynamic_cast<TQChannelFolder*>(_host.sceneChannelRoot()))
+        root->getAllDescendantsFlattened(channels, 0, true);
+    for (TQChannelBase* c : channels)
+        if (auto* channel = dynamic_cast<TQChannel*>(c);
+            channel && channel->numberOfKeyframes() > kMostKeyframesToBake) {
+            _lastDetail = "skipped";
+            return;
+        }
     const bool after = below(2) == 0;
     _lastDetail = after ? "after" : "before";
     if (after)
