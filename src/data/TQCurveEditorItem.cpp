@@ -354,17 +354,16 @@ void TQCurveEditorChannelItem::refreshOriginalCurve(const CMTime& start, const C
 
     // Pin the polyline onto the keyframes: each keyframe takes the first sample at or after
     // it that an earlier keyframe has not taken, however coarse the step.
+    const auto earlier = [](const CMTime& a, const CMTime& b) { return CMTimeCompare(a, b) < 0; };
     uint32_t i = 0;
     for (TQKeyframeHandle k : c->getKeyframes(true)) {
-        if (i >= n) break;
         CMTime t{};
         double v = 0.0;
         if (!c->getKeyframe(k, &t, &v)) continue;
-        while (i < n && CMTimeCompare(t, times[i]) > 0) ++i;
-        if (i < n) {
-            times[i] = t;
-            values[i] = v;
-        }
+        i = static_cast<uint32_t>(std::lower_bound(times + i, times + n, t, earlier) - times);
+        if (i == n) break;
+        times[i] = t;
+        values[i] = v;
     }
     setProcessedCurveDirty(1);  // both curves go stale together
     _originalCurveDirty = 0;

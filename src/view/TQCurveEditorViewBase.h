@@ -744,8 +744,7 @@ private:
     // Scratch of drawOriginalCurve, kept between frames so that the merge of selected
     // keypoints allocates only when it grows.
     std::vector<std::pair<CMTime, double>> _selectedKeyScratch;
-    // Scratch of drawPoints: the handles of a large selection, sorted, so that each keypoint
-    // is looked up in it by bisection instead of by a walk of the whole selection.
+    // The selected handles, sorted at the start of each frame for drawPoints' lookups.
     std::vector<TQKeyframeHandle> _selectedHandleScratch;
     // Scratch of select: the records of every channel's keypoints, kept between the steps of
     // a rubber band.

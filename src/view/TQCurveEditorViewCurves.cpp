@@ -35,7 +35,6 @@ constexpr float kDimStippleScale = 2.0f;
 constexpr double kLabelOffset = 5.0;
 constexpr double kLabelMargin = 2.0;
 // Beyond this many entries a selection is looked up by bisection over its sorted handles.
-constexpr size_t kLinearSelectionLimit = 16;
 
 // The six keypoint images an item can show, as drawPoints lays them out for drawKeypoint.
 enum KeypointSlot : size_t {
@@ -342,19 +341,8 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
                                               row[kInactive][1], row[kInactive][0],
                                               row[kPressed][1],  row[kNormal][0]};
 
-    // A large selection is bisected instead of walked for every keypoint.
-    const auto& entries = _selection->getSelectionArray();
-    const bool bisect = entries.size() > kLinearSelectionLimit;
-    if (bisect) {
-        _selectedHandleScratch.clear();
-        for (const TQCurveSelectionPtr& e : entries)
-            if (e) _selectedHandleScratch.push_back(e->getHandle());
-        std::sort(_selectedHandleScratch.begin(), _selectedHandleScratch.end());
-    }
     auto isSelected = [&](TQKeyframeHandle h) {
-        return bisect ? std::binary_search(_selectedHandleScratch.begin(),
-                                           _selectedHandleScratch.end(), h)
-                      : _selection->isKeypointSelected(h);
+        return std::binary_search(_selectedHandleScratch.begin(), _selectedHandleScratch.end(), h);
     };
 
     const bool chanLocked = channel->isLocked(true);

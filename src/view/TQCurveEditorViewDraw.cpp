@@ -2,6 +2,7 @@
 // the image assets, the order in which a frame is built, the overlays, the colours and the
 // screen text. Curves, keypoints and handles themselves are in TQCurveEditorViewCurves.cpp.
 
+#include <algorithm>
 #include <cinttypes>
 #include <cmath>
 #include <cstdio>
@@ -205,6 +206,12 @@ void TQCurveEditorViewBase::drawCurveEditor() {
     drawGrid();
 
     if (_controller) {
+        // The selected handles, sorted once per frame: each keypoint of every item is looked
+        // up in them by bisection.
+        _selectedHandleScratch.clear();
+        for (const TQCurveSelectionPtr& e : _selection->getSelectionArray())
+            if (e) _selectedHandleScratch.push_back(e->getHandle());
+        std::sort(_selectedHandleScratch.begin(), _selectedHandleScratch.end());
         auto drawItem = [this](TQCurveEditorItem* item) {
             drawOriginalCurve(item);
             drawPoints(item, 1);

@@ -105,6 +105,61 @@ TEST(CurveSimplify, leaves_the_curve_outside_the_span_and_locked_keyframes_as_th
     EXPECT_TRUE(c->getKeyframeLocked(locked));
 }
 
+TEST(CurveSimplify, lines_up_with_the_handles_outside_the_span_where_the_tolerance_allows) {
+    // A parabola keyed every 6 frames, Catmull-Rom, with flat stored handles that the
+    // interpolation ignores. The keyframes just outside the span sit a little off it, so the
+    // slopes the curve arrives and leaves with differ from the parabola's.
+    const double step = 6.0 / kFps;
+    auto parabola = [&](int keys, int offAt, int offAt2) {
+        auto c = std::make_unique<TQChannel>("parabola", 1, 0.0);
+        c->setInterpolation(kTQInterpolationCatmullRom);
+        for (int i = 0; i < keys; ++i) {
+            const double t = i * step;
+            const TQKeyframeHandle h =
+                c->setKeyframe(frame(6 * i), t * t + (i == offAt || i == offAt2 ? 0.04 : 0.0));
+            c->setKeyframeInputTangents(h, -step / 3.0, 0.0);
+            c->setKeyframeOutputTangents(h, step / 3.0, 0.0);
+        }
+        return c;
+    };
+    auto stateAt = [](const TQChannel& c, const CMTime& t) {
+        for (const TQKeyframeState& k : c.getKeyframeStates())
+            if (CMTimeCompare(k.time, t) == 0) return k;
+        ADD_FAILURE() << "no keyframe at " << CMTimeGetSeconds(t) << " s";
+        return TQKeyframeState{};
+    };
+    {
+        auto c = parabola(40, 9, 31);
+        const auto before = cloneOf(*c);
+        c->simplifyCurve(frame(60), frame(180), frameDuration(), kTQSimplifyBezier, 0, 1.0,
+                         kTQSimplifyOnFrames);
+        EXPECT_EQ(c->numberOfKeyframes(), 40u - 19u) << "the span is one segment";
+        EXPECT_LE(worstFrameError(*before, *c, 0, 60), 1e-12);
+        EXPECT_LE(worstFrameError(*before, *c, 180, 240), 1e-12);
+        const TQKeyframeState in = stateAt(*c, frame(60)), out = stateAt(*c, frame(180));
+        EXPECT_FALSE(in.broken || out.broken);
+        EXPECT_NEAR(in.outV / in.outU, in.inV / in.inU, 1e-9) << "start of the span";
+        EXPECT_NEAR(out.inV / out.inU, out.outV / out.outU, 1e-9) << "end of the span";
+    }
+    {
+        // Up to the last keyframe, whose own outgoing handle shapes nothing and steers nothing.
+        auto c = parabola(20, 9, -1);
+        // A Bezier last keyframe whose slope a fit could take, were it to steer.
+        const TQKeyframeHandle last = c->getKeyframe(frame(114));
+        c->setKeyframeInterpolation(last, kTQInterpolationBezier);
+        c->setKeyframeOutputTangents(last, 1.0, 7.7);
+        c->setKeyframeTangentsBroken(last, false);
+        const auto before = cloneOf(*c);
+        c->simplifyCurve(frame(60), frame(114), frameDuration(), kTQSimplifyBezier, 0, 1.0,
+                         kTQSimplifyOnFrames);
+        EXPECT_LE(worstFrameError(*before, *c, 0, 60), 1e-12);
+        EXPECT_LE(worstFrameError(*before, *c, 60, 114), 0.01 * height(*before, 60, 114));
+        const TQKeyframeState tail = stateAt(*c, frame(114));
+        // The curve arrives there with the slope of the last chord, 7.4.
+        EXPECT_NEAR(tail.inV / tail.inU, 7.4, 0.2);
+    }
+}
+
 TEST(CurveSimplify, at_zero_tolerance_keeps_every_frame_and_drops_keyframes_that_change_nothing) {
     // Two straight runs of keyframes, one per frame, meeting at a corner on frame 30; values
     // from 0 up to 3 and down to -3: the scale (height plus largest magnitude) is 9.

@@ -40,6 +40,10 @@ TEST_F(ViewTickMarks, computeVerticalTickMarks__table) {
         // 11 / 250, and the range's bottom padded, two label steps down: -0.5 + 0.044 * 50.
         {"the channel's range when no larger", "A: 0=0/1 1=100/1", 0, 1, 10, false, "0.044 1.7"},
         {"a fixed scale fits a flat curve by its range", "A: ", 3, 1, 10, true, "0.044 1.7"},
+        // The range, padded to 106.7, fits within the flat curve's padded four steps (110).
+        {"a flat curve's range when no larger", "A: ", 7, 1, 97, false, "0.4268 16.49"},
+        // Extent -4..67, span 71: 71 / 250 doubles to just over one, so the step halves once.
+        {"a span just over half a step", "A: 0=0/1 1=63.6/1", 0, 1, 0, false, "0.52 61"},
         // Both components' extent, 0..100, one mapping for the compound.
         {"a compound's components", "Pos.A: 0=0/1 1=10/1; Pos.B: 0=0/1 1=100/1", 0, 1, 0, false,
          "0.52 60"},
