@@ -12,6 +12,8 @@
 //                              (aim: at most 500 keyframes, which it was made from)
 //   BM_SimplifySketchedStroke  300 keyframes, one per frame, 0.01 of the range
 //                              (aim: at most 35 keyframes)
+//   BM_SimplifyLongSparse      5 keyframes spread over 22 minutes (a keypoint dragged far
+//                              out), about 40,000 frames, 0.01 of the range
 // The argument is the smoothness in frames: 0, the panel's default, and 3.
 
 #include <benchmark/benchmark.h>
@@ -71,3 +73,17 @@ void BM_SimplifySketchedStroke(benchmark::State& state) {
 BENCHMARK(BM_SimplifySketchedStroke)->Arg(0)->Arg(3)->Unit(benchmark::kMillisecond);
 
 }  // namespace
+
+void BM_SimplifyLongSparse(benchmark::State& state) {
+    static const std::unique_ptr<TQChannel> curve = [] {
+        auto c = std::make_unique<TQChannel>("long sparse", 1, 0.0);
+        const int64_t frames[] = {0, 30, 60, 90, 40'500};
+        const double values[] = {0.0, 1.0, -0.5, 0.25, 3.0};
+        for (size_t i = 0; i < std::size(frames); ++i) c->setKeyframe(frame(frames[i]), values[i]);
+        const TQKeyframeHandle h = c->getKeyframe(frame(90));
+        c->setKeyframeOutputTangents(h, 400.0, 30.0);
+        return c;
+    }();
+    simplifyReference(state, *curve, 0.0001, true);
+}
+BENCHMARK(BM_SimplifyLongSparse)->Arg(0)->Arg(3)->Unit(benchmark::kMillisecond);

@@ -18,6 +18,9 @@ constexpr double kChordPull = 1e-9;
 // bound a long chain could take a round per keyframe.
 constexpr size_t kMaxAlignRounds = 8;
 
+// Nodes of a layer of the placement tried as the start of the next segment, at most.
+constexpr size_t kLayerCandidates = 64;
+
 // Hermite basis on s in [0, 1]: value = ya h00 + yb h01 + d (mOut h10 + mIn h11).
 struct Hermite {
     double h00, h01, h10, h11;
@@ -198,10 +201,23 @@ size_t Fitter::reachOf(size_t i, size_t& hint) const {
 void Fitter::fillGreedily(size_t from, size_t to, std::vector<size_t>& path) const {
     size_t at = from;
     while (at != to) {
-        size_t next = to;
-        while (next > at + 1 && !feasibleNodes(at, next)) --next;
-        path.push_back(next);
-        at = next;
+        // Gallop down from `to` to a node that fits, then halve the gap to the one that failed:
+        // a walk down one node at a time costs a check of the whole gap per node.
+        size_t good = at + 1, bad = to + 1;
+        for (size_t step = 1; bad - good > 1; step *= 2) {
+            const size_t probe = bad - std::min(step, bad - good - 1);
+            if (feasibleNodes(at, probe)) {
+                good = probe;
+                break;
+            }
+            bad = probe;
+        }
+        while (bad - good > 1) {
+            const size_t mid = good + (bad - good) / 2;
+            (feasibleNodes(at, mid) ? good : bad) = mid;
+        }
+        path.push_back(good);
+        at = good;
     }
 }
 
@@ -220,7 +236,13 @@ void Fitter::place(size_t lo, size_t hi, std::vector<size_t>& out) {
         while (far < last) {
             size_t best = layerEnd + 1;
             size_t bestReach = 0;
-            for (size_t i = layerEnd + 1; i <= far; ++i) {
+            // Each candidate costs checks as long as its reach. A layer of more than
+            // kLayerCandidates nodes (a long smooth stretch, thousands of frames) is sampled
+            // evenly, its last node always among them: a keyframe more at worst, where trying
+            // them all would take seconds.
+            const size_t stride = std::max<size_t>(1, (far - layerEnd) / kLayerCandidates);
+            for (size_t i = layerEnd + 1; i <= far;
+                 i = (i < far && i + stride > far) ? far : i + stride) {
                 const size_t r = reachOf(i, hint);
                 if (r > bestReach) {
                     bestReach = r;
