@@ -106,6 +106,14 @@ TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywher
     // Non-numeric times and values that are not finite add nothing; states out of order are
     // refused whole.
     std::vector<TQKeyframeState> states = c->getKeyframeStates();
+    ASSERT_TRUE(c->setKeyframeStates(states));
+    EXPECT_FALSE(live(a)) << "states make new keyframes";
+    const std::vector<TQKeyframeHandle> handles = c->getKeyframes(false);
+    for (size_t i = 0; i < handles.size(); ++i) {
+        CMTime t;
+        ASSERT_TRUE(c->getKeyframe(handles[i], &t, nullptr));
+        EXPECT_EQ(CMTimeCompare(t, states[i].time), 0) << "each with a handle of its own";
+    }
     std::swap(states[0], states[1]);
     EXPECT_FALSE(c->setKeyframeStates(states));
     EXPECT_EQ(c->setKeyframe(kCMTimeInvalid, 1.0), nullptr);

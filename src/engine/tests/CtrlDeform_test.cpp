@@ -162,9 +162,11 @@ TEST_F(CtrlDeform, deformSelected__linked_components_follow_in_time) {
         static_cast<TQCompoundChannel*>(item("X")->channel()->getParent())->setLinked(*linked);
         Box box = setupAll({item("X")});
         box.tl.y = box.tr.y = 2.0;
+        item("Y")->refreshOriginalCurve(kCMTimeZero, seconds(0.5));
         deform(box.moved(0.5));
         EXPECT_EQ(sceneText(*object), *linked ? "X: 1.5=0 2.5=1 3.5=2; Y: 1.5=0 2.5=0.5 3.5=1"
                                               : "X: 1.5=0 2.5=1 3.5=2; Y: 1=0 2=0.5 3=1");
+        EXPECT_EQ(item("Y")->originalCurveDirty(), *linked ? 1 : 0) << "Y's curve is drawn anew";
     }
 }
 
