@@ -4,6 +4,7 @@
 #include <limits>
 #include <memory>
 
+#include "platform/channels/internal/TQCurveFit.h"
 #include "platform/channels/testing/ReferenceCurves.h"
 
 using namespace reference_curves;
@@ -291,3 +292,22 @@ TEST(CurveSimplify, refuses_bad_input_without_a_change_or_an_announcement) {
 }
 
 }  // namespace
+
+TEST(CurveSimplify, smoothing_keeps_a_parabola_and_irons_out_a_zigzag_within_its_limit) {
+    std::vector<double> t, parabola, zigzag, target;
+    for (int k = 0; k < 60; ++k) {
+        const double s = k / 30.0;
+        t.push_back(s);
+        parabola.push_back(3.0 * s * s - s + 1.0);
+        zigzag.push_back(k % 2 ? 0.1 : -0.1);
+    }
+    tq_internal::smoothedTargets(t, parabola, 5, 1.0, target);
+    for (size_t k = 0; k < t.size(); ++k) EXPECT_NEAR(target[k], parabola[k], 1e-9) << k;
+    tq_internal::smoothedTargets(t, zigzag, 5, 0.05, target);
+    for (size_t k = 0; k < t.size(); ++k) {
+        EXPECT_LE(std::fabs(target[k] - zigzag[k]), 0.05 + 1e-12) << k;
+        if (k >= 5 && k + 5 < t.size()) {
+            EXPECT_LE(std::fabs(target[k]), 0.05 + 1e-12) << k;
+        }
+    }
+}

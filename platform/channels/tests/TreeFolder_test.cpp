@@ -213,6 +213,7 @@ TEST_F(TreeFolderTest, children__ownershipMovesAndBadIndices) {
 }
 
 TEST_F(TreeFolderTest, animatedAndReset__aFolderAnswersForItsDescendants) {
+    TQChannelFolder("Empty", 1).reset(false);  // nothing to reset
     EXPECT_FALSE(transform->isAnimated(false)) << "a folder has no animation of its own";
     EXPECT_TRUE(transform->isAnimated(true));
     EXPECT_TRUE(position->isAnimated(false)) << "a compound answers for its components";
