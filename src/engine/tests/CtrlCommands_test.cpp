@@ -50,6 +50,12 @@ protected:
                  RWMenuItem sender(a.rest, a.rest);
                  EXPECT_TRUE(ctrl().performAction(a.rest, sender));
              }},
+            {"interp",
+             [&] {
+                 RWMenuItem sender("", "menuSetKeypointInterpolation:");
+                 sender.setTag(int64_t(N(0)));
+                 EXPECT_TRUE(ctrl().performAction(sender.action(), sender));
+             }},
             {"select", [&] { select(a.rest); }},
             {"move", [&] { ctrl().moveSelected(s, T(0), N(1), 1, char(N(2))); }},
             {"nudge", [&] { ctrl().offsetSelected(s, T(0), N(1)); }},
@@ -165,6 +171,7 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"menuAlignTangent", "A: 2=3(-0.3,0.2|0.5,0.1); B: 4=20(-1,0.5|1,0.1)", "A>2 B@4",
              "menu menuAlignTangent:"},
         Edit{"menuAddKeyframe", "A: 1=2", "A~", "mouse 0.5 0 | menu menuAddKeyframe:"},
+        Edit{"menuInterpolationLinked", kMenuScene, "X@1", "interp 1"},
         // Each channel announced once per phase; each step measures from where the last left.
         Edit{"drag", "A: 1=0 2=1; B: 1=0", "A@1 A@2 B@1", "drag 10 1 0.05 0.1"},
         Edit{"vanishedChannel", "A: 1=0 2=1; Gone: 1=0; B: 1=0", "A@1 Gone@1 B@1 A@2",
