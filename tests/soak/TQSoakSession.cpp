@@ -334,28 +334,25 @@ void TQSoakSession::channelCommand() {
     // The selected channels' interpolation or extrapolation by the menu's tags (tag 100, the
     // one that leaves its bracket open, is the host's to close between events: not here).
     static const int64_t kInterpolations[] = {0, 1, 4, 6, 13, 14, 15, 16, 17};
+    using C = TQCurveEditorCtrl;
+    static const struct {
+        const char* name;
+        void (C::*run)(RWActionSender*);
+    } kCommands[] = {{"interpolation", &C::animMenuSetCurveInterpolation},
+                     {"pre-extrapolation", &C::animMenuSetCurvePreExtrapolation},
+                     {"post-extrapolation", &C::animMenuSetCurvePostExtrapolation}};
     RWMenuItem sender("", "", "");
-    switch (below(4)) {
-        case 0:
-            sender.setTag(kInterpolations[below(std::size(kInterpolations))]);
-            _lastDetail = "interpolation " + std::to_string(sender.tag());
-            _ctrl.animMenuSetCurveInterpolation(&sender);
-            break;
-        case 1:
-            sender.setTag(static_cast<int64_t>(below(5)));
-            _lastDetail = "pre-extrapolation " + std::to_string(sender.tag());
-            _ctrl.animMenuSetCurvePreExtrapolation(&sender);
-            break;
-        case 2:
-            sender.setTag(static_cast<int64_t>(below(5)));
-            _lastDetail = "post-extrapolation " + std::to_string(sender.tag());
-            _ctrl.animMenuSetCurvePostExtrapolation(&sender);
-            break;
-        default:
-            _lastDetail = "add keyframe";
-            _ctrl.animMenuAddKeyframe();
-            break;
+    const size_t which = below(4);
+    if (which == 3) {
+        _lastDetail = "add keyframe";
+        _ctrl.animMenuAddKeyframe();
+        return;
     }
+    sender.setTag(which == 0 ? kInterpolations[below(std::size(kInterpolations))]
+                             : static_cast<int64_t>(below(5)));
+    _lastDetail =
+        std::string(kCommands[which].name).append(" ").append(std::to_string(sender.tag()));
+    (_ctrl.*kCommands[which].run)(&sender);
 }
 
 void TQSoakSession::simplify() {

@@ -295,11 +295,6 @@ protected:
         }
         return out;
     }
-    static double keyValueAt(const TQChannel* channel, double t) {
-        double v = 0.0;
-        channel->getKeyframe(channel->getKeyframe(seconds(t)), nullptr, &v);
-        return v;
-    }
 
     // The object's whole tree as it stands now, to compare with operator== later.
     std::unique_ptr<TQChannelBase> snapshot() const {

@@ -111,62 +111,12 @@ void TQRecordingAppDelegate::removeReceiver(TQNotificationReceiver* receiver) {
 
 // --- Scene and time ---
 
-TQChannelBase* TQRecordingAppDelegate::sceneChannelRoot() {
-    record("sceneChannelRoot");
-    return _forward ? _forward->sceneChannelRoot() : answers.sceneChannelRoot;
-}
-
-CMTime TQRecordingAppDelegate::currentTime() {
-    record("currentTime");
-    return _forward ? _forward->currentTime() : answers.currentTime;
-}
-
 void TQRecordingAppDelegate::setCurrentTime(const CMTime& time) {
     record("setCurrentTime").time = time;
     if (_forward)
         _forward->setCurrentTime(time);
     else
         answers.currentTime = time;
-}
-
-CMTime TQRecordingAppDelegate::getFrameDuration() {
-    record("getFrameDuration");
-    return _forward ? _forward->getFrameDuration() : answers.frameDuration;
-}
-
-CMTimeRange TQRecordingAppDelegate::displayRange() {
-    record("displayRange");
-    return _forward ? _forward->displayRange() : answers.displayRange;
-}
-
-bool TQRecordingAppDelegate::isPlaying() {
-    record("isPlaying");
-    return _forward ? _forward->isPlaying() : answers.playing;
-}
-
-uint32_t TQRecordingAppDelegate::firstFrameNumber() {
-    record("firstFrameNumber");
-    return _forward ? _forward->firstFrameNumber() : answers.firstFrameNumber;
-}
-
-uint32_t TQRecordingAppDelegate::startTimecode() {
-    record("startTimecode");
-    return _forward ? _forward->startTimecode() : answers.startTimecode;
-}
-
-CMTime TQRecordingAppDelegate::secondsPerTextStep() {
-    record("secondsPerTextStep");
-    return _forward ? _forward->secondsPerTextStep() : answers.secondsPerTextStep;
-}
-
-bool TQRecordingAppDelegate::shouldDisplayTimeAsFrames() {
-    record("shouldDisplayTimeAsFrames");
-    return _forward ? _forward->shouldDisplayTimeAsFrames() : answers.displayTimeAsFrames;
-}
-
-bool TQRecordingAppDelegate::isKestrel() {
-    record("isKestrel");
-    return _forward ? _forward->isKestrel() : answers.kestrel;
 }
 
 void TQRecordingAppDelegate::abort() {
@@ -177,27 +127,7 @@ void TQRecordingAppDelegate::abort() {
         answers.playing = false;
 }
 
-void TQRecordingAppDelegate::suppressEventCoalescing() {
-    record("suppressEventCoalescing");
-    if (_forward) _forward->suppressEventCoalescing();
-}
-
-void TQRecordingAppDelegate::unsuppressEventCoalescing() {
-    record("unsuppressEventCoalescing");
-    if (_forward) _forward->unsuppressEventCoalescing();
-}
-
 // --- Object selection ---
-
-bool TQRecordingAppDelegate::objectsSelectedInScene() {
-    record("objectsSelectedInScene");
-    return _forward ? _forward->objectsSelectedInScene() : !answers.selectedObjects.empty();
-}
-
-std::vector<TQChannelBase*> TQRecordingAppDelegate::selectedObjectsRootChannels() {
-    record("selectedObjectsRootChannels");
-    return _forward ? _forward->selectedObjectsRootChannels() : answers.selectedObjects;
-}
 
 bool TQRecordingAppDelegate::isObjectSelected(const TQChannelBase* objectRoot) {
     recordChannel("isObjectSelected", objectRoot);
@@ -247,42 +177,6 @@ void TQRecordingAppDelegate::postNotification(TQNotificationWord word) {
 
 // --- Edit brackets and undo ---
 
-void TQRecordingAppDelegate::startCaptureModifiedChannels(const BNString& undoDescription) {
-    record("startCaptureModifiedChannels").text = undoDescription;
-    if (_forward) _forward->startCaptureModifiedChannels(undoDescription);
-}
-
-void TQRecordingAppDelegate::endCaptureModifiedChannels() {
-    record("endCaptureModifiedChannels");
-    if (_forward) _forward->endCaptureModifiedChannels();
-}
-
-void TQRecordingAppDelegate::willChangeChannel(const TQChannelBase* channel) {
-    recordChannel("willChangeChannel", channel);
-    if (_forward) _forward->willChangeChannel(channel);
-}
-
-void TQRecordingAppDelegate::didChangeChannel(const TQChannelBase* channel) {
-    recordChannel("didChangeChannel", channel);
-    if (_forward) _forward->didChangeChannel(channel);
-}
-
-void TQRecordingAppDelegate::willSetChannelValue(const TQChannelBase* channel) {
-    recordChannel("willSetChannelValue", channel);
-    if (_forward) _forward->willSetChannelValue(channel);
-}
-
-void TQRecordingAppDelegate::didSetChannelValue(const TQChannelBase* channel) {
-    recordChannel("didSetChannelValue", channel);
-    if (_forward) _forward->didSetChannelValue(channel);
-}
-
-void TQRecordingAppDelegate::addChannelToUndo(const TQChannelBase* channel,
-                                              const BNString& undoDescription) {
-    recordChannel("addChannelToUndo", channel).text = undoDescription;
-    if (_forward) _forward->addChannelToUndo(channel, undoDescription);
-}
-
 void TQRecordingAppDelegate::addToUndo(void* object, uint32_t type, uint32_t action,
                                        const BNString& undoDescription) {
     TQDelegateCall& call = record("addToUndo");
@@ -291,16 +185,4 @@ void TQRecordingAppDelegate::addToUndo(void* object, uint32_t type, uint32_t act
     call.action = action;
     call.text = undoDescription;
     if (_forward) _forward->addToUndo(object, type, action, undoDescription);
-}
-
-// --- Persistence ---
-
-TQCurveSetListSerializer* TQRecordingAppDelegate::getCurveSetListSerializer() {
-    record("getCurveSetListSerializer");
-    return _forward ? _forward->getCurveSetListSerializer() : answers.curveSetListSerializer;
-}
-
-double TQRecordingAppDelegate::version() {
-    record("version");
-    return _forward ? _forward->version() : answers.version;
 }

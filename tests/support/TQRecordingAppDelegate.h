@@ -84,24 +84,52 @@ public:
     void addReceiver(TQNotificationReceiver* receiver);
     void removeReceiver(TQNotificationReceiver* receiver);
 
-    // --- The contract ---
-    TQChannelBase* sceneChannelRoot() override;
-    CMTime currentTime() override;
+    // --- The contract: recorded, then forwarded or answered from `answers` ---
+    using Base = TQCurveEditorAppDelegate;
+    TQChannelBase* sceneChannelRoot() override {
+        return ask("sceneChannelRoot", &Base::sceneChannelRoot, answers.sceneChannelRoot);
+    }
+    CMTime currentTime() override {
+        return ask("currentTime", &Base::currentTime, answers.currentTime);
+    }
     void setCurrentTime(const CMTime& time) override;
-    CMTime getFrameDuration() override;
-    CMTimeRange displayRange() override;
-    bool isPlaying() override;
-    uint32_t firstFrameNumber() override;
-    uint32_t startTimecode() override;
-    CMTime secondsPerTextStep() override;
-    bool shouldDisplayTimeAsFrames() override;
-    bool isKestrel() override;
+    CMTime getFrameDuration() override {
+        return ask("getFrameDuration", &Base::getFrameDuration, answers.frameDuration);
+    }
+    CMTimeRange displayRange() override {
+        return ask("displayRange", &Base::displayRange, answers.displayRange);
+    }
+    bool isPlaying() override { return ask("isPlaying", &Base::isPlaying, answers.playing); }
+    uint32_t firstFrameNumber() override {
+        return ask("firstFrameNumber", &Base::firstFrameNumber, answers.firstFrameNumber);
+    }
+    uint32_t startTimecode() override {
+        return ask("startTimecode", &Base::startTimecode, answers.startTimecode);
+    }
+    CMTime secondsPerTextStep() override {
+        return ask("secondsPerTextStep", &Base::secondsPerTextStep, answers.secondsPerTextStep);
+    }
+    bool shouldDisplayTimeAsFrames() override {
+        return ask("shouldDisplayTimeAsFrames", &Base::shouldDisplayTimeAsFrames,
+                   answers.displayTimeAsFrames);
+    }
+    bool isKestrel() override { return ask("isKestrel", &Base::isKestrel, answers.kestrel); }
     void abort() override;
-    void suppressEventCoalescing() override;
-    void unsuppressEventCoalescing() override;
+    void suppressEventCoalescing() override {
+        pass(record("suppressEventCoalescing"), &Base::suppressEventCoalescing);
+    }
+    void unsuppressEventCoalescing() override {
+        pass(record("unsuppressEventCoalescing"), &Base::unsuppressEventCoalescing);
+    }
 
-    bool objectsSelectedInScene() override;
-    std::vector<TQChannelBase*> selectedObjectsRootChannels() override;
+    bool objectsSelectedInScene() override {
+        return ask("objectsSelectedInScene", &Base::objectsSelectedInScene,
+                   !answers.selectedObjects.empty());
+    }
+    std::vector<TQChannelBase*> selectedObjectsRootChannels() override {
+        return ask("selectedObjectsRootChannels", &Base::selectedObjectsRootChannels,
+                   answers.selectedObjects);
+    }
     bool isObjectSelected(const TQChannelBase* objectRoot) override;
 
     bool wasChannelModified(const TQChannelBase* channel) override;
@@ -109,22 +137,52 @@ public:
     void resetModifiedChannels() override;
     void postNotification(TQNotificationWord word) override;
 
-    void startCaptureModifiedChannels(const BNString& undoDescription) override;
-    void endCaptureModifiedChannels() override;
-    void willChangeChannel(const TQChannelBase* channel) override;
-    void didChangeChannel(const TQChannelBase* channel) override;
-    void willSetChannelValue(const TQChannelBase* channel) override;
-    void didSetChannelValue(const TQChannelBase* channel) override;
-    void addChannelToUndo(const TQChannelBase* channel, const BNString& undoDescription) override;
+    void startCaptureModifiedChannels(const BNString& undoDescription) override {
+        record("startCaptureModifiedChannels").text = undoDescription;
+        if (_forward) _forward->startCaptureModifiedChannels(undoDescription);
+    }
+    void endCaptureModifiedChannels() override {
+        pass(record("endCaptureModifiedChannels"), &Base::endCaptureModifiedChannels);
+    }
+    void willChangeChannel(const TQChannelBase* channel) override {
+        pass(recordChannel("willChangeChannel", channel), &Base::willChangeChannel, channel);
+    }
+    void didChangeChannel(const TQChannelBase* channel) override {
+        pass(recordChannel("didChangeChannel", channel), &Base::didChangeChannel, channel);
+    }
+    void willSetChannelValue(const TQChannelBase* channel) override {
+        pass(recordChannel("willSetChannelValue", channel), &Base::willSetChannelValue, channel);
+    }
+    void didSetChannelValue(const TQChannelBase* channel) override {
+        pass(recordChannel("didSetChannelValue", channel), &Base::didSetChannelValue, channel);
+    }
+    void addChannelToUndo(const TQChannelBase* channel, const BNString& undoDescription) override {
+        recordChannel("addChannelToUndo", channel).text = undoDescription;
+        if (_forward) _forward->addChannelToUndo(channel, undoDescription);
+    }
     void addToUndo(void* object, uint32_t type, uint32_t action,
                    const BNString& undoDescription) override;
 
-    TQCurveSetListSerializer* getCurveSetListSerializer() override;
-    double version() override;
+    TQCurveSetListSerializer* getCurveSetListSerializer() override {
+        return ask("getCurveSetListSerializer", &Base::getCurveSetListSerializer,
+                   answers.curveSetListSerializer);
+    }
+    double version() override { return ask("version", &Base::version, answers.version); }
 
 private:
     TQDelegateCall& record(std::string_view operation);
     TQDelegateCall& recordChannel(std::string_view operation, const TQChannelBase* channel);
+    // Recorded as `operation`; the forward's answer, or `standalone` without one.
+    template <class R>
+    R ask(std::string_view operation, R (Base::*call)(), R standalone) {
+        record(operation);
+        return _forward ? (_forward->*call)() : standalone;
+    }
+    // A recorded call without an answer, passed on to the forward.
+    template <class... P, class... A>
+    void pass(TQDelegateCall&, void (Base::*call)(P...), A... args) {
+        if (_forward) (_forward->*call)(args...);
+    }
 
     TQCurveEditorAppDelegate* _forward;
     std::vector<TQDelegateCall> _calls;

@@ -62,7 +62,9 @@ protected:
         std::vector<std::string> out;
         for (const TQCurveSetPtr& set : window.controller().curveSets())
             for (const TQCurveEditorItemPtr& item : set->allItems())
-                out.push_back(set->curveSetName() + ":" + item->channelRef()->getText());
+                out.push_back(std::string(set->curveSetName())
+                                  .append(":")
+                                  .append(item->channelRef()->getText()));
         return out;
     }
     TQChannel* channel(const char* objectName, const char* path) {

@@ -8,7 +8,7 @@
 
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/draw/internal/HXDPrimitiveIndex.h"
-#include "platform/geometry/BNViewProjection.h"
+#include "platform/draw/tests/HitFixture.h"
 
 namespace {
 
@@ -43,29 +43,8 @@ std::vector<Found> walk(const HXDPrimitiveArray& list, const HXDHitTestContext& 
     return {best};
 }
 
-// x 0..10 by y -5..5 on 200 x 100 pixels, as in the hit-test tests.
-class HitIndexFixture : public ::testing::Test {
+class HitIndexFixture : public HitFixture {
 protected:
-    void SetUp() override { installFrame(1.0f); }
-
-    void installFrame(float backingScale, double shear = 0.0) {
-        BNMatrix44f projection = BNViewVolumeProjection(CGRectMake(0, -5, 10, 10));
-        projection.set(0, 1, static_cast<float>(shear));
-        controller.updateTexture(nullptr, backingScale, projection, HXDFloat2{0.05f, 0.1f},
-                                 CGSizeMake(200, 100));
-    }
-    CGPoint pixel(double x, double y) const {
-        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100))
-            .worldToPixel(x, y);
-    }
-    HXDHitTestContext at(CGPoint p) const {
-        return controller.renderingContextForHitTestAtCoords(HXDFloat2{float(p.x), float(p.y)});
-    }
-    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p,
-                                   bool closest = true) const {
-        return controller.newHitTestResultForPrimitives(list, at(p), closest);
-    }
-
     static std::shared_ptr<HXDMultiline> curve(double y, double amplitude, float width, int samples,
                                                double power = 1.0) {
         std::vector<HXDLineVertex> v;
@@ -157,8 +136,6 @@ protected:
             }
         }
     }
-
-    HXDRenderController controller{nullptr, 1.0f};
 };
 
 TEST_F(HitIndexFixture, longList__answersAsAWalkDoesForPointsAndBands) {

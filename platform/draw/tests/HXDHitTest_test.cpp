@@ -8,7 +8,7 @@
 
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/draw/internal/HXDGeometry2D.h"
-#include "platform/geometry/BNViewProjection.h"
+#include "platform/draw/tests/HitFixture.h"
 
 namespace {
 
@@ -17,32 +17,8 @@ constexpr uint32_t kKeypointID = 0x20000000u;
 constexpr uint32_t kOutTangentID = 0x40000000u;
 constexpr double kPixelTolerance = 1e-3;
 
-// A view of 10 seconds by 10 units (x 0..10, y -5..5) on a 200 x 100 drawable: 20 pixels per
-// second across, 10 pixels per unit up.
-class HitTestFixture : public ::testing::Test {
+class HitTestFixture : public HitFixture {
 protected:
-    void SetUp() override { installFrame(1.0f); }
-
-    void installFrame(float backingScale) {
-        controller.updateTexture(nullptr, backingScale,
-                                 BNViewVolumeProjection(CGRectMake(0, -5, 10, 10)),
-                                 HXDFloat2{0.05f, 0.1f}, CGSizeMake(200, 100));
-    }
-    CGPoint pixel(double x, double y) const {
-        return HXDScreenMapping(controller.renderingContext()->projection(), CGSizeMake(200, 100))
-            .worldToPixel(x, y);
-    }
-    HXDHitTestContext at(CGPoint p) const {
-        return controller.renderingContextForHitTestAtCoords(HXDFloat2{float(p.x), float(p.y)});
-    }
-    std::vector<HXDHitRecord> pick(const HXDPrimitiveArray& list, CGPoint p,
-                                   bool closest = true) const {
-        return controller.newHitTestResultForPrimitives(list, at(p), closest);
-    }
-    std::vector<HXDHitRecord> inBand(const HXDPrimitiveArray& list, CGRect band) const {
-        return controller.newHitTestResultForPrimitives(
-            list, controller.renderingContextForHitTestInRect(band), false);
-    }
     // The records in order, each as its hit id in hex and, for a keypoint, "/" and its handle.
     static std::string found(const std::vector<HXDHitRecord>& hits) {
         std::ostringstream out;
@@ -81,8 +57,6 @@ protected:
         line->hitInfo().setHitID(kCurveID);
         return line;
     }
-
-    HXDRenderController controller{nullptr, 1.0f};
 };
 
 TEST_F(HitTestFixture, mapping__agreesWithTheViewConversion) {

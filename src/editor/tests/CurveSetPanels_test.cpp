@@ -1,6 +1,6 @@
 // The curve set manager of the full editor on the sample project, worked as a user works it:
 // its table and buttons inside its modal run (a scripted modal service plays the user), the
-// duplicate-name alert, and the pop-up that opens it. The new-set panel is the demo's test.
+// duplicate-name alert. The new-set panel is the demo's test.
 #include <gtest/gtest.h>
 
 #include "platform/ui/RWButton.h"
@@ -197,23 +197,6 @@ TEST_F(CurveSetPanels, manager__done_keeps_reorders_and_refuses_bad_names_and_ke
     });
     EXPECT_EQ(names(), (std::vector<std::string>{"Fades", "Bounce"}));
     EXPECT_EQ(ctrl.selectedCurveSet()->curveSetName(), "Twirl");
-}
-
-TEST_F(CurveSetPanels, pop_up__automatic_then_custom_sets_with_their_keys_and_both_panels) {
-    makeSets();
-    ctrl.curveSetsPopUp()->userWillPopUp();
-    RWMenu& menu = *ctrl.curveSetsPopUp()->menu();
-    menu.update();
-    std::vector<std::string> shown;
-    for (const RWMenuItemPtr& item : menu.itemArray())
-        if (!item->isSeparatorItem())
-            shown.push_back(item->title() + (item->keyEquivalent().empty() ? "" : ":") +
-                            item->keyEquivalent() + (item->isEnabled() ? "" : " (off)"));
-    EXPECT_EQ(shown, (std::vector<std::string>{
-                         "All", "Animated:u", "Modified:y", "Active", "Position:p", "Rotation:r",
-                         "Scale:s", "Shear:h", "Pivot:a", "Opacity:o", "Retiming:t", "Bounce",
-                         "Fades:f", "Spin", "New Curve Set…", "Manage Curve Sets…"}));
-    EXPECT_EQ(menu.itemWithTitle("Fades")->keyEquivalentModifierMask(), 0u) << "a plain key";
 }
 
 }  // namespace

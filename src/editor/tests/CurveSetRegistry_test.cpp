@@ -15,7 +15,10 @@ protected:
     std::vector<std::string> popUpTitles() const {
         std::vector<std::string> out;
         for (const RWMenuItemPtr& item : ctrl.curveSetsPopUp()->menu()->itemArray())
-            out.push_back(item->isSeparatorItem() ? "--" : item->title());
+            out.push_back(item->isSeparatorItem() ? "--"
+                          : item->keyEquivalent().empty()
+                              ? item->title()
+                              : item->title() + ":" + item->keyEquivalent());
         return out;
     }
     std::vector<TQChannelBase*> allObjects() {
@@ -31,32 +34,29 @@ protected:
 
 TEST_F(CurveSetRegistry, pop_up__each_automatic_set_shows_what_it_finds_for_the_selection) {
     host.setSelectedObjects(allObjects());
-    const char* automatic[] = {"All",   "Animated", "Modified", "Active",  "Position", "Rotation",
-                               "Scale", "Shear",    "Pivot",    "Opacity", "Retiming"};
     std::set<const TQCurveSet*> chosen;
-    for (const char* title : automatic) {
+    for (const char* title : {"All", "Animated", "Modified", "Position", "Rotation", "Scale",
+                              "Shear", "Pivot", "Opacity", "Retiming"}) {
         SCOPED_TRACE(title);
         choose(title);
-        if (std::string(title) == "Active") {
-            // Active follows what changes: a step of a drag on the title's opacity.
-            TQChannelBase* opacity = TQChannelRef("./1/200/202").getChannel(object("Title"));
-            ASSERT_NE(opacity, nullptr);
-            opacity->noteWillChange(true);
-            host.postNotification(kTQNotifyChannelsChanging);
-            EXPECT_EQ(shownChannels(), std::vector<const TQChannelBase*>{opacity});
-        }
         const TQCurveSetPtr set = ctrl.selectedCurveSet();
         ASSERT_TRUE(ctrl.isAutomaticCurveSet(set.get()));
         EXPECT_EQ(set->curveSetName() + ctrl.curveSetsPopUp()->title(), title + std::string(title));
+        const TQCurveSetPtr fresh = set->copy();
+        fresh->refresh(100, false);
         EXPECT_FALSE(set->allItems().empty()) << "the piece has something for every set";
-        if (std::string(title) != "Active") {
-            const TQCurveSetPtr fresh = set->copy();
-            fresh->refresh(100, false);
-            EXPECT_EQ(shownChannels(), channelsOf(*fresh)) << "refreshed for the selection";
-        }
+        EXPECT_EQ(shownChannels(), channelsOf(*fresh)) << "refreshed for the selection";
         chosen.insert(set.get());
     }
-    EXPECT_EQ(chosen.size(), std::size(automatic)) << "one set of its own for each item";
+    // Active follows what changes: a step of a drag on the title's opacity.
+    choose("Active");
+    chosen.insert(ctrl.selectedCurveSet().get());
+    EXPECT_EQ(chosen.size(), 11u) << "one set of its own for each item";
+    EXPECT_EQ(ctrl.curveSetsPopUp()->title(), "Active");
+    TQChannelBase* opacity = TQChannelRef("./1/200/202").getChannel(object("Title"));
+    opacity->noteWillChange(true);
+    host.postNotification(kTQNotifyChannelsChanging);
+    EXPECT_EQ(shownChannels(), std::vector<const TQChannelBase*>{opacity});
 
     // The host's selection word re-filters the shown set.
     choose("Position");
@@ -68,18 +68,19 @@ TEST_F(CurveSetRegistry, pop_up__each_automatic_set_shows_what_it_finds_for_the_
 
 TEST_F(CurveSetRegistry, pop_up__sections_in_order_with_custom_sets_and_the_panel_entries) {
     ctrl.createCurveSetWithName("Bounce");
-    ctrl.createCurveSetWithName("Fades");
+    ctrl.createCurveSetWithName("Fades")->setCurveSetShortcut("F");
     ctrl.curveSetsPopUp()->userWillPopUp();
-    EXPECT_EQ(popUpTitles(), (std::vector<std::string>{
-                                 "All", "Animated", "Modified", "Active", "--", "Position",
-                                 "Rotation", "Scale", "Shear", "Pivot", "Opacity", "Retiming", "--",
-                                 "Bounce", "Fades", "--", "New Curve Set…", "Manage Curve Sets…"}));
+    EXPECT_EQ(popUpTitles(),
+              (std::vector<std::string>{"All", "Animated:u", "Modified:y", "Active", "--",
+                                        "Position:p", "Rotation:r", "Scale:s", "Shear:h", "Pivot:a",
+                                        "Opacity:o", "Retiming:t", "--", "Bounce", "Fades:f", "--",
+                                        "New Curve Set…", "Manage Curve Sets…"}));
     const RWMenu& menu = *ctrl.curveSetsPopUp()->menu();
     EXPECT_EQ(ctrl.curveSetsPopUp()->indexOfSelectedItem(), 1) << "Animated is selected";
     EXPECT_EQ(menu.itemAtIndex(3)->keyEquivalentModifierMask(),
               uint64_t{RWEventModifierFlagCommand})
         << "Active keeps the default mask";
-    EXPECT_EQ(menu.itemAtIndex(13)->keyEquivalentModifierMask(), 0u);
+    EXPECT_EQ(menu.itemAtIndex(14)->keyEquivalentModifierMask(), 0u) << "a custom key is plain";
     ctrl.curveSetsPopUp()->menu()->update();
     EXPECT_FALSE(menu.itemAtIndex(17)->isEnabled()) << "its panel is not this controller's";
     choose("Fades");
@@ -88,8 +89,8 @@ TEST_F(CurveSetRegistry, pop_up__sections_in_order_with_custom_sets_and_the_pane
     ctrl.setUsesRelativeCurveSets(false);
     ctrl.refreshPopUp();
     EXPECT_EQ(popUpTitles(),
-              (std::vector<std::string>{"All", "Animated", "Modified", "Active", "Bounce", "Fades",
-                                        "--", "New Curve Set…", "Manage Curve Sets…"}));
+              (std::vector<std::string>{"All", "Animated:u", "Modified:y", "Active", "Bounce",
+                                        "Fades:f", "--", "New Curve Set…", "Manage Curve Sets…"}));
 }
 
 TEST_F(CurveSetRegistry, custom_sets__adding_cloning_and_merging) {
