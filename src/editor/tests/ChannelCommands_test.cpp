@@ -13,8 +13,6 @@ using namespace editor_test;
 
 namespace {
 
-CMTime sec(double s) { return CMTimeMakeWithSeconds(s, 600); }
-
 class ChannelCommands : public EditorFixture {
 protected:
     void SetUp() override {
@@ -47,8 +45,6 @@ protected:
     }
     TQChannel* a() const { return items[0]->channel(); }
     TQChannel* b() const { return items[1]->channel(); }
-    using Copy = std::unique_ptr<TQChannelBase>;
-    static Copy copyOf(const TQChannel* c) { return Copy(c->cloneChannel()); }
     bool channelsAre(const Copy& wantA, const Copy& wantB) const {
         return *a() == *wantA && *b() == *wantB;
     }

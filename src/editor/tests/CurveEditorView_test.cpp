@@ -16,6 +16,7 @@
 
 namespace {
 
+using namespace editor_test;
 constexpr double kPixelTolerance = 1.5;
 
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTQCurveEditorTimescale); }
@@ -28,7 +29,7 @@ public:
     CMTime secondsPerTextStep() override { return kCMTimeZero; }
 };
 
-class TimelineTest : public editor_test::EditorFixture {
+class TimelineTest : public EditorFixture {
 protected:
     void SetUp() override {
         EditorFixture::SetUp();
@@ -37,18 +38,8 @@ protected:
         host.setSelectedObjects(
             {object(kTQHostSampleTitleObject), object(kTQHostSampleBehaviorObject)});
         view.setAutoZoom(0);
-        previousModal = RWApplicationServices().modal;
-        RWServiceSet mine;
-        mine.modal = &modal;
-        RWInstallServices(mine);
         ASSERT_TRUE(frame());
         ctrl.ranges.clear();
-    }
-    void TearDown() override {
-        RWServiceSet back;
-        back.modal = previousModal;
-        RWInstallServices(back);
-        EditorFixture::TearDown();
     }
 
     bool frame() {
@@ -75,29 +66,6 @@ protected:
             if (const auto* t = dynamic_cast<const HXDText*>(p.get())) out.push_back(t);
         return out;
     }
-    // Every keypoint of the channel (or the one given), selected in the view.
-    void selectKeypointsOf(TQChannel* c, int only = -1) {
-        const TQCurveEditorItemPtr item = ctrl.selectedCurveSet()->itemWithChannel(c);
-        ASSERT_TRUE(item) << c->getName() << " is not shown";
-        const auto keys = c->getKeyframes(false);
-        for (size_t i = 0; i < keys.size(); ++i) {
-            if (only >= 0 && i != static_cast<size_t>(only)) continue;
-            auto entry = std::make_shared<TQCurveSelection>();
-            entry->setHandle(keys[i]);
-            entry->setFlags(TQSelectionKeypoint);
-            entry->setCurveId(item->channelId());
-            view.getSelection()->addSelection(entry);
-        }
-    }
-    static std::vector<double> keyTimes(const TQChannel* c) {
-        std::vector<double> out;
-        for (TQKeyframeHandle h : c->getKeyframes(false)) {
-            CMTime t = kCMTimeInvalid;
-            c->getKeyframe(h, &t, nullptr);
-            out.push_back(CMTimeGetSeconds(t));
-        }
-        return out;
-    }
     // Opens the typing panel with a key; the script types more and ends with a button.
     bool type(const char* key, const char* more, const char* button) {
         modal.pushScript([=, this](RWWindow& panel, RWModalService&) {
@@ -111,8 +79,6 @@ protected:
         return view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, key));
     }
 
-    RWScriptedModal modal;
-    RWModalService* previousModal = nullptr;
     HXDRecordingEncoder encoder{800, 400};
     std::string shown;
     CGRect panelFrame = CGRectZero;
@@ -177,7 +143,7 @@ TEST_F(TimelineTest, display_range__drives_the_volume_and_the_grid_of_whole_seco
               view.TQCurveEditorViewBase::getCoordinates(nullptr, seconds(0.4), 0.5));
     TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
     const std::unique_ptr<TQChannelBase> before(x->cloneChannel());
-    selectKeypointsOf(x);
+    selectKeypoints(x);
     view.moveSelectedKeypointsInTime(12.0, false);
     EXPECT_TRUE(*x == *before) << "no frame is zero seconds long";
     ctrl.setAppDelegate(&recorder);
@@ -223,7 +189,7 @@ TEST_F(TimelineTest, text__time_as_frames_or_timecode_value_labels_and_the_keypo
     ctrl.deselectAllChannels();
     TQChannel* y = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
     const TQCurveEditorItemPtr bounce = ctrl.selectedCurveSet()->itemWithChannel(y);
-    selectKeypointsOf(y, 6);
+    selectHandles(y, {y->getKeyframes(false)[6]});
     view.setPrintText(1);
     auto keypointOnScreen = [&] {
         CMTime t = kCMTimeInvalid;
@@ -274,7 +240,7 @@ TEST_F(TimelineTest, typed_numbers__move_the_selected_keypoints_as_one_undo_step
     TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
     const std::unique_ptr<TQChannelBase> before(x->cloneChannel());
     const std::vector<double> times = keyTimes(x);
-    selectKeypointsOf(x);
+    selectKeypoints(x);
     viewHost.setScreenOrigin(CGPointMake(100.0, 200.0));
     EXPECT_TRUE(type("1", "2", "OK"));  // the user goes on typing: "12"
     EXPECT_EQ(shown, "1") << "the key that opened the panel is in its field";
@@ -291,10 +257,9 @@ TEST_F(TimelineTest, typed_numbers__move_the_selected_keypoints_as_one_undo_step
     EXPECT_TRUE(*x == *before) << "one undo step takes the move back exactly";
 
     // A sign moves each keypoint onto the frame so many frames later.
-    view.getSelection()->reset();
     TQChannel* y = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
     const std::vector<double> yTimes = keyTimes(y);
-    selectKeypointsOf(y);
+    selectKeypoints(y);
     EXPECT_TRUE(type("+", "6", "OK"));
     for (size_t i = 0; i < yTimes.size(); ++i)
         EXPECT_NEAR(keyTimes(y)[i], std::round(yTimes[i] * 30.0 + 6.0) / 30.0, 1e-9) << i;

@@ -25,13 +25,6 @@ protected:
         TQInstantiateCurveSetPanels(&ctrl, outlets);
         list = outlets.curveSetManagerList;
         manager = outlets.curveSetManagerPanel;
-        RWServiceSet services;
-        services.modal = &modal;
-        RWInstallServices(services);
-    }
-    void TearDown() override {
-        EditorFixture::TearDown();
-        RWResetServices();
     }
 
     // Bounce (title's opacity and x position), Fades (opacity, key "f"), Spin (relative).
@@ -67,12 +60,6 @@ protected:
     }
 
     // ---- The user in the manager ----
-    void press(RWPanel& panel, const std::string& action) {
-        auto button = panel.contentView()->subview<RWButton>(
-            [&](const RWButton& b) { return b.action() == action; });
-        ASSERT_NE(button, nullptr) << action;
-        button->userClick();
-    }
     void plusMinus(int64_t segment) {
         manager->contentView()->subview<RWSegmentedControl>()->userClickSegment(segment);
     }
@@ -90,7 +77,6 @@ protected:
         choose("Manage Curve Sets…");
     }
 
-    RWScriptedModal modal;
     TQCurveSetManagerList* list = nullptr;
     std::shared_ptr<RWPanel> manager;
 };

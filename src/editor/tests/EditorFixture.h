@@ -3,7 +3,8 @@
 // motion-graphics piece, a recording delegate in front of it, the controller with a timeline
 // view on a stub view host (800 x 400 points), a vertical scroller in a superview, a tool
 // switch and a curve set pop-up; setupController and viewDidLoad have run, and the controller
-// hears the host's words.
+// hears the host's words. A scripted modal service plays the user in panels, and a pasteboard
+// of the test's own takes what is copied.
 //
 // One log takes, in order, what the tests of the update cycle watch: the controller's
 // refreshes, the view's tool and zoom calls, a few calls of the delegate, and what the
@@ -17,6 +18,7 @@
 
 #include "host/TQHostAppDelegate.h"
 #include "host/TQHostSampleScene.h"
+#include "platform/ui/RWButton.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "src/editor/TQCurveEditorCtrl.h"
 #include "src/editor/TQCurveEditorView.h"
@@ -25,6 +27,26 @@
 namespace editor_test {
 
 using Log = std::vector<std::string>;
+using Copy = std::unique_ptr<TQChannelBase>;
+inline Copy copyOf(const TQChannelBase* c) { return Copy(c->cloneChannel()); }
+inline CMTime sec(double s) { return CMTimeMakeWithSeconds(s, 600); }
+// Keyframe times of the channel in seconds, in order.
+inline std::vector<double> keyTimes(const TQChannel* c) {
+    std::vector<double> out;
+    for (TQKeyframeHandle h : c->getKeyframes(false)) {
+        CMTime t = kCMTimeInvalid;
+        c->getKeyframe(h, &t, nullptr);
+        out.push_back(CMTimeGetSeconds(t));
+    }
+    return out;
+}
+// The user presses the panel's button of that action.
+inline void press(const RWPanel& panel, const std::string& action) {
+    const auto button = panel.contentView()->subview<RWButton>(
+        [&](const RWButton& b) { return b.action() == action; });
+    ASSERT_NE(button, nullptr) << action;
+    button->userClick();
+}
 
 class LoggingRecorder : public TQRecordingAppDelegate {
 public:
@@ -137,6 +159,7 @@ protected:
     virtual void connect(TQCurveEditorOutlets& outlets) { (void)outlets; }
 
     void SetUp() override {
+        RWInstallServices({.modal = &modal, .pasteboard = &board});
         TQHostLoadSampleScene(host, family());
         recorder.forwardTo(&host);
         recorder.log = &log;
@@ -172,6 +195,7 @@ protected:
     void TearDown() override {
         host.removeNotificationReceiver(&ctrl);
         view.setViewHost(nullptr);
+        RWResetServices();
     }
     virtual TQHostObjectFamily family() const { return TQHostObjectFamily::Kestrel; }
 
@@ -191,6 +215,25 @@ protected:
                 out.push_back(item->channelBase());
         return out;
     }
+    // The keypoints of the channel at those times (every one when none are given), selected in
+    // the view alone.
+    void selectKeypoints(TQChannel* c, std::initializer_list<double> times = {}) {
+        std::vector<TQKeyframeHandle> keys;
+        for (double t : times) keys.push_back(c->getKeyframe(sec(t)));
+        selectHandles(c, times.size() ? keys : c->getKeyframes(false));
+    }
+    void selectHandles(TQChannel* c, const std::vector<TQKeyframeHandle>& keys) {
+        const TQCurveEditorItemPtr item = ctrl.selectedCurveSet()->itemWithChannel(c);
+        ASSERT_TRUE(item) << c->getName() << " is not shown";
+        view.getSelection()->reset();
+        for (TQKeyframeHandle h : keys) {
+            auto entry = std::make_shared<TQCurveSelection>();
+            entry->setHandle(h);
+            entry->setFlags(TQSelectionKeypoint);
+            entry->setCurveId(item->channelId());
+            view.getSelection()->addSelection(entry);
+        }
+    }
     // The pop-up's item of that title, chosen as the user chooses it.
     void choose(const std::string& title) {
         ctrl.curveSetsPopUp()->userWillPopUp();
@@ -199,6 +242,8 @@ protected:
         ctrl.curveSetsPopUp()->userSelectItemAtIndex(index);
     }
 
+    RWScriptedModal modal;
+    RWMemoryPasteboard board;
     TQHostAppDelegate host;
     Log log;
     LoggingRecorder recorder;

@@ -16,17 +16,10 @@ using namespace editor_test;
 
 namespace {
 
-CMTime sec(double s) { return CMTimeMakeWithSeconds(s, 600); }
-using Copy = std::unique_ptr<TQChannelBase>;
-Copy copyOf(const TQChannel* c) { return Copy(c->cloneChannel()); }
-
 class KeypointClipboard : public EditorFixture {
 protected:
     void SetUp() override {
         EditorFixture::SetUp();
-        RWServiceSet services;
-        services.pasteboard = &board;
-        RWInstallServices(services);
         host.selectObject(object(kTQHostSampleTitleObject));
         ctrl.showAll();
         // Two unlocked channels of one kind.
@@ -52,21 +45,10 @@ protected:
         b()->deleteAllKeyframes(kCMTimeZero);
         b()->setKeyframe(sec(0.5), 1.0);
     }
-    void TearDown() override {
-        RWResetServices();
-        EditorFixture::TearDown();
-    }
     TQChannel* a() const { return itemA->channel(); }
     TQChannel* b() const { return itemB->channel(); }
     void selectKeypoints(std::initializer_list<double> times) {
-        view.getSelection()->reset();
-        for (double t : times) {
-            auto entry = std::make_shared<TQCurveSelection>();
-            entry->setCurveId(itemA->channelId());
-            entry->setHandle(a()->getKeyframe(sec(t)));
-            entry->setFlags(TQSelectionKeypoint);
-            view.getSelection()->addSelection(entry);
-        }
+        EditorFixture::selectKeypoints(a(), times);
     }
     bool enabled(const char* action) {
         RWMenuItem item(action, action);
@@ -76,7 +58,6 @@ protected:
         return ctrl.validateMenuItem(*menu->itemAtIndex(index));
     }
 
-    RWMemoryPasteboard board;
     TQCurveEditorChannelItemPtr itemA, itemB;
 };
 

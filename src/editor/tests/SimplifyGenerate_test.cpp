@@ -29,7 +29,6 @@ protected:
     }
     void SetUp() override {
         EditorFixture::SetUp();
-        RWInstallServices({.modal = &modal});
         host.selectObject(object(kTQHostSampleTitleObject));
         ctrl.showAll();
         item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(
@@ -44,20 +43,10 @@ protected:
         item->select(1);
         host.undoStack().clear();
     }
-    void TearDown() override {
-        RWResetServices();
-        EditorFixture::TearDown();
-    }
     TQChannel& c() const { return *item->channel(); }
-    static void press(const RWPanel& panel, const char* action) {
-        panel.contentView()
-            ->subview<RWButton>([&](const RWButton& b) { return b.action() == action; })
-            ->userClick();
-    }
 
     TQCurveEditorOutlets panels;
     TQCurveEditorChannelItemPtr item;
-    RWScriptedModal modal;
 };
 
 TEST_F(SimplifyGenerate, simplify__moves_start_from_the_opening_curve_ok_is_one_step_cancel_none) {
