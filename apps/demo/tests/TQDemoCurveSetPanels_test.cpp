@@ -1,10 +1,9 @@
 // The demo's curve set panels as a user meets them: a new set made from the pop-up's entry,
-// renamed and joined by another in the manager's dialog, then saved with the project and
-// opened again.
+// undone and redone, then renamed and joined by another in the manager's dialog. The document
+// test saves and opens sets.
 #include <gtest/gtest.h>
 
 #include <QPushButton>
-#include <QTemporaryDir>
 #include <QTimer>
 #include <QToolButton>
 
@@ -25,11 +24,6 @@ protected:
     void SetUp() override {
         DemoWindowTest::SetUp();
         modal.install();
-        window.prompts().chooseFileToSave = [this](const QString&) {
-            return directory.filePath("sets.vceproj");
-        };
-        window.prompts().chooseFileToOpen = [this] { return directory.filePath("sets.vceproj"); };
-        window.prompts().askToSaveChanges = [](const QString&) { return QMessageBox::Discard; };
     }
     void choose(const QString& title) {
         QMenu* menu = window.curveSetPopUp()->popUpMenu();
@@ -62,15 +56,13 @@ protected:
         for (const TQCurveSetPtr& set : window.controller().curveSets()) {
             out.push_back(set->curveSetName());
             for (const TQCurveEditorItemPtr& item : set->allItems())
-                out.back() +=
-                    " " +
-                    TQChannelRef(item->channelBase(), window.host().sceneChannelRoot()).getText();
+                out.back().append(" ").append(
+                    TQChannelRef(item->channelBase(), window.host().sceneChannelRoot()).getText());
         }
         return out;
     }
 
     TQQtModalService modal;
-    QTemporaryDir directory;
 };
 
 TEST_F(DemoCurveSetPanelsTest, new_and_managed_sets__are_saved_and_opened_with_the_project) {
@@ -118,15 +110,7 @@ TEST_F(DemoCurveSetPanelsTest, new_and_managed_sets__are_saved_and_opened_with_t
     ASSERT_EQ(sets.size(), 2u);
     EXPECT_EQ(sets[0].rfind("Glides ./", 0), 0u) << sets[0];
     EXPECT_EQ(sets[1], "Untitled Set");
-    EXPECT_TRUE(window.isWindowModified());
-
-    ASSERT_TRUE(window.save());
-    ASSERT_TRUE(window.newDocument());
-    EXPECT_TRUE(window.controller().curveSets().empty());
-    ASSERT_TRUE(window.open());
-    EXPECT_EQ(customSets(), sets);
-    EXPECT_EQ(window.curveSetPopUp()->text(), "Glides");
-    EXPECT_FALSE(window.isWindowModified());
+    EXPECT_TRUE(window.isWindowModified()) << "the sets are the document's";
 }
 
 }  // namespace

@@ -211,7 +211,7 @@ TEST_F(DemoDocumentTest, box_tool__a_drag_undoes_with_its_box_and_delete_forgets
         std::vector<double> out;
         for (const CGPoint& p : {v.fourCornersBottomLeft(), v.fourCornersBottomRight(),
                                  v.fourCornersTopRight(), v.fourCornersTopLeft()})
-            out.insert(out.end(), {p.x, p.y});
+            for (const double coordinate : {p.x, p.y}) out.push_back(coordinate);
         return out;
     };
     // A free corner drag distorts the box; a second drag moves it on.

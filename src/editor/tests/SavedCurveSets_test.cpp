@@ -97,31 +97,29 @@ TEST_F(SavedCurveSets, save_and_construct__sets_come_back_without_what_vanished)
 TEST_F(SavedCurveSets, save__the_selected_sets_number_with_no_number_for_pivot) {
     ctrl.createCurveSetWithName("One");
     ctrl.createCurveSetWithName("Two");
-    const struct {
-        TQCurveSetPtr set;
-        uint32_t previous;
-        uint32_t expected;
-    } rows[] = {
-        {ctrl.curveSetAll(), 1, 0},      {ctrl.curveSetAnimated(), 0, 1},
-        {ctrl.curveSetCurrent(), 1, 2},  {ctrl.curveSetModified(), 1, 3},
-        {ctrl.curveSetPosition(), 1, 4}, {ctrl.curveSetRotation(), 1, 5},
-        {ctrl.curveSetScale(), 1, 6},    {ctrl.curveSetShear(), 1, 7},
-        {ctrl.curveSetOpacity(), 1, 9},  {ctrl.curveSetRetiming(), 1, 10},
-        {ctrl.curveSets()[0], 1, 11},    {ctrl.curveSets()[1], 1, 12},
-        {ctrl.curveSetPivot(), 1, 1},    {ctrl.curveSetPivot(), 7, 7},  // the list's stays
-    };
-    for (const auto& row : rows) {
-        SCOPED_TRACE(row.set->curveSetName());
-        TQCurveSetListSerializer saved;
-        saved.setSelectedCurveSet(row.previous);
-        ctrl.setSelectedCurveSet(row.set);
+    // Numbered in this order; Pivot has none (8 is nobody's).
+    const TQCurveSetPtr numbered[] = {
+        ctrl.curveSetAll(),      ctrl.curveSetAnimated(), ctrl.curveSetCurrent(),
+        ctrl.curveSetModified(), ctrl.curveSetPosition(), ctrl.curveSetRotation(),
+        ctrl.curveSetScale(),    ctrl.curveSetShear(),    nullptr,
+        ctrl.curveSetOpacity(),  ctrl.curveSetRetiming(), ctrl.curveSets()[0],
+        ctrl.curveSets()[1]};
+    TQCurveSetListSerializer saved;
+    for (uint32_t n = 0; n < std::size(numbered); ++n) {
+        if (!numbered[n]) continue;
+        saved.setSelectedCurveSet(n + 1);
+        ctrl.setSelectedCurveSet(numbered[n]);
         ctrl.saveCurveSets(&saved);
-        EXPECT_EQ(saved.getSelectedCurveSet(), row.expected);
-        if (row.set == ctrl.curveSetPivot() && row.previous == 1) {
-            construct(saved);
-            EXPECT_EQ(ctrl.selectedCurveSet(), ctrl.curveSetAnimated()) << "Pivot reopens so";
-        }
+        EXPECT_EQ(saved.getSelectedCurveSet(), n) << numbered[n]->curveSetName();
     }
+    saved.setSelectedCurveSet(7);
+    ctrl.setSelectedCurveSet(ctrl.curveSetPivot());
+    ctrl.saveCurveSets(&saved);
+    EXPECT_EQ(saved.getSelectedCurveSet(), 7u) << "the list's number stays";
+    saved.setSelectedCurveSet(1);
+    ctrl.saveCurveSets(&saved);
+    construct(saved);
+    EXPECT_EQ(ctrl.selectedCurveSet(), ctrl.curveSetAnimated()) << "Pivot reopens so";
 }
 
 TEST_F(SavedCurveSets, construct__numbers_by_document_version_and_past_the_end) {
