@@ -102,13 +102,29 @@ TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_c
     const auto before = snapshot();
     const QPoint start = keypointInWidget();
     ASSERT_TRUE(window.curveWidget()->rect().contains(start)) << "the keypoint is off screen";
+    TQChannel* channel = shownChannels()[0];
+    const TQKeyframeHandle key = channel->getKeyframes(false)[channel->numberOfKeyframes() / 2];
     TQQtCurveViewWidget* widget = window.curveWidget();
     QTest::mousePress(widget, Qt::LeftButton, Qt::NoModifier, start);
     for (int step = 1; step <= 10; ++step) {
         clock.advance(kStepSeconds);
         QTest::mouseMove(widget, start + QPoint(0, -3 * step));
     }
-    QTest::mouseRelease(widget, Qt::LeftButton, Qt::NoModifier, start + QPoint(0, -30));
+    // Inside the gate: the view drops this move, and the pointer then rests there.
+    const QPoint rest = start + QPoint(6, -40);
+    QTest::mouseMove(widget, rest);
+    clock.advance(kStepSeconds);
+    QTest::qWait(100);  // the widget hands the last move over again
+    QTest::mouseRelease(widget, Qt::LeftButton, Qt::NoModifier, rest);
+    CMTime t = kCMTimeInvalid;
+    double v = 0.0;
+    ASSERT_TRUE(channel->getKeyframe(key, &t, &v)) << "the dragged keyframe's handle went stale";
+    const QPoint landed = toWidget(
+        CGPointMake(CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset()),
+                    window.controller().convertFromChannelCoords(
+                        window.controller().selectedCurveSet()->channeItemAtIndex(0).get(), v)));
+    EXPECT_NEAR(landed.x(), rest.x(), 2) << "the keypoint stopped short of the pointer";
+    EXPECT_NEAR(landed.y(), rest.y(), 2);
 
     EXPECT_EQ(changedCount(before), 1u) << "the drag must change exactly the dragged channel";
     QAction* undo = window.editMenu()->undoAction();

@@ -98,7 +98,7 @@ TEST_F(ChannelListTest, showBoxes__folderTriStateGroupToggleAndSolo) {
     }
 }
 
-TEST_F(ChannelListTest, typedValue__oneUndoStepAtTheCurrentTime) {
+TEST_F(ChannelListTest, valueEdits__typedOrScrubbedOneUndoStepAtTheCurrentTime) {
     const int64_t value = list.columnWithIdentifier(Ctrl::kValueColumn);
     UndoingManipulator manipulator(host);
     host.setCurrentTime(TQTarnTimeForChannelSeconds(2.5, 0x40000));
@@ -142,13 +142,10 @@ TEST_F(ChannelListTest, typedValue__oneUndoStepAtTheCurrentTime) {
     EXPECT_EQ(*channel, *before);
     EXPECT_FALSE(host.canUndo()) << "one step";
     channel->setObjectManipulator(nullptr);
-}
 
-TEST_F(ChannelListTest, scrub__dragInValueCellIsOneStep) {
-    const int64_t row = rowOf("Opacity");
-    auto* item = dynamic_cast<TQCurveEditorChannelItem*>(itemAt(row));
+    SCOPED_TRACE("a drag in the value cell scrubs, as one step");
+    host.setCurrentTime(kCMTimeZero);  // where the title is still fading in
     const double start = item->currentValue();
-    const std::unique_ptr<TQChannelBase> before(item->channel()->cloneChannel());
     const CGPoint press = at(Ctrl::kValueColumn, row);
     list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, press));
     for (double dx : {2.0, 10.0, 20.0})
@@ -157,10 +154,11 @@ TEST_F(ChannelListTest, scrub__dragInValueCellIsOneStep) {
     list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, press + CGPointMake(20, 0)));
     // Five steps of the channel's nudge step (a hundredth of opacity).
     EXPECT_NEAR(item->currentValue(), start + 5 * 0.01, 1e-9);
+    EXPECT_FALSE(list.isEditing()) << "a scrub is no click: no edit starts";
     ASSERT_TRUE(host.canUndo());
     host.undo();
-    EXPECT_EQ(*item->channel(), *before);
-    EXPECT_FALSE(list.isEditing()) << "a scrub is no click: no edit starts";
+    EXPECT_EQ(*channel, *before);
+    EXPECT_FALSE(host.canUndo()) << "one step";
 }
 
 TEST_F(ChannelListTest, dragOut__leavesCustomSetNotScene) {
