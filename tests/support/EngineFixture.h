@@ -285,17 +285,6 @@ protected:
         return list;
     }
 
-    // Keyframe times of the channel in seconds, in order.
-    static std::vector<double> keyTimes(const TQChannel* channel) {
-        std::vector<double> out;
-        for (TQKeyframeHandle h : channel->getKeyframes(false)) {
-            CMTime t = kCMTimeInvalid;
-            channel->getKeyframe(h, &t, nullptr);
-            out.push_back(CMTimeGetSeconds(t));
-        }
-        return out;
-    }
-
     // The object's whole tree as it stands now, to compare with operator== later.
     std::unique_ptr<TQChannelBase> snapshot() const {
         return std::unique_ptr<TQChannelBase>(object->cloneChannel());

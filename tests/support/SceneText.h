@@ -46,3 +46,14 @@ inline std::string sceneText(const TQChannelBase& root, bool handles = false) {
             out += (out.empty() ? "" : "; ") + c->getName() + ": " + keyText(*c, handles);
     return out;
 }
+
+// Keyframe times of the channel in seconds, in order.
+inline std::vector<double> keyTimes(const TQChannel* channel) {
+    std::vector<double> out;
+    for (TQKeyframeHandle h : channel->getKeyframes(false)) {
+        CMTime t = kCMTimeInvalid;
+        channel->getKeyframe(h, &t, nullptr);
+        out.push_back(CMTimeGetSeconds(t));
+    }
+    return out;
+}

@@ -22,6 +22,7 @@
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "src/editor/TQCurveEditorCtrl.h"
 #include "src/editor/TQCurveEditorView.h"
+#include "tests/support/SceneText.h"
 #include "tests/support/TQRecordingAppDelegate.h"
 
 namespace editor_test {
@@ -30,16 +31,6 @@ using Log = std::vector<std::string>;
 using Copy = std::unique_ptr<TQChannelBase>;
 inline Copy copyOf(const TQChannelBase* c) { return Copy(c->cloneChannel()); }
 inline CMTime sec(double s) { return CMTimeMakeWithSeconds(s, 600); }
-// Keyframe times of the channel in seconds, in order.
-inline std::vector<double> keyTimes(const TQChannel* c) {
-    std::vector<double> out;
-    for (TQKeyframeHandle h : c->getKeyframes(false)) {
-        CMTime t = kCMTimeInvalid;
-        c->getKeyframe(h, &t, nullptr);
-        out.push_back(CMTimeGetSeconds(t));
-    }
-    return out;
-}
 // The user presses the panel's button of that action.
 inline void press(const RWPanel& panel, const std::string& action) {
     const auto button = panel.contentView()->subview<RWButton>(
