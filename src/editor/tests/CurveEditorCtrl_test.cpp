@@ -132,15 +132,11 @@ TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
 
 TEST_F(Notify, rows__time_refreshes_animated_rows_and_keypoints_select_their_rows) {
     state(&TQCurveEditorCtrl::showAll, {title});
-    Log expected;
     const TQCurveSetPtr set = ctrl.selectedCurveSet();
-    for (uint32_t i = 0; i < set->numberOfChannelItems(); ++i)
-        if (TQChannel* c = set->channeItemAtIndex(i)->channel();
-            c->isAnimated(false) || c->isChannelAffectedByBehaviors(true))
-            expected.push_back("refreshRowWithoutTitle " + std::to_string(i));
-    ASSERT_FALSE(expected.empty());
-    ASSERT_LT(expected.size(), set->numberOfChannelItems()) << "some rows stand still";
-    expected.push_back("resetModifiedChannels");
+    // The title's animated rows (and the ones behaviours move); the others stand still.
+    const Log expected = {"refreshRowWithoutTitle 0",  "refreshRowWithoutTitle 1",
+                          "refreshRowWithoutTitle 6",  "refreshRowWithoutTitle 7",
+                          "refreshRowWithoutTitle 15", "resetModifiedChannels"};
     host.play();
     // The limit of five updates a second never holds: its time is kept in a bool.
     for (int call = 0; call < 2; ++call) {
