@@ -121,6 +121,9 @@ TEST_F(ViewVolume, operations__table) {
         // 0..100 needs a factor of 1/50, short of the limit; the draw pass calls it: no word.
         {"auto-zoom only when due", "A: 1=0 2=100; auto; ?; due; auto",
          "0 -1 10 2 / 0 -5 10 110 *1 *0.02 #32  "},
+        // The curve would need 1/50,000: the height stops at 128 times the fixture's, padded.
+        {"auto-zoom clamps at 1/128", "A: 1=0 2=100000; due; auto",
+         "0 -12.8 10 281.6 *1 *0.0078125 #128  "},
         {"reset zoom", "zoom 2 4; draw; pan -80 -40; clear; reset",
          "0 -1 10 2 *1 *1 #1 !1800 >0.5 "},
         {"reset pan keeps the zoom", "zoom 1 2; draw; pan 0 -40; clear; resetpan",
@@ -156,6 +159,8 @@ TEST_F(ViewVolume, no_frame_a_tool_change_and_destruction) {
     EXPECT_TRUE(std::isnan(fresh.getPointWorld(CGPointMake(10, 10)).x));
     EXPECT_TRUE(std::isnan(fresh.getPointScreen(CGPointMake(0.5, 0.5)).y));
     EXPECT_TRUE(std::isnan(fresh.adjustWorldPointToScreen(CGPointMake(0.5, 0.5)).x));
+    fresh.setAllOriginalCurveDirty(1);  // no controller: no items to mark
+    fresh.setAllOriginalCurveScaleDirty(1);
     viewHost.resetRedrawRequests();
     ctrl().setCurrentTool(TQTool::kBox);
     EXPECT_EQ(recorder.bracketText(), "!4000008");
