@@ -87,6 +87,12 @@ TEST(CurveSimplify, leaves_the_curve_outside_the_span_and_locked_keyframes_as_th
                      kTQSimplifyBezier, 0, 5.0, kTQSimplifyOnFrames);
 
     EXPECT_LT(c->numberOfKeyframes(), before->numberOfKeyframes());
+    EXPECT_EQ(backwardSegments(*c), 0u) << "the locked keyframe parts the span in two";
+    for (const TQKeyframeState& k : c->getKeyframeStates()) {
+        if (k.inU < 0.0 && k.outU > 0.0 && std::fabs(k.inV / k.inU - k.outV / k.outU) > 1e-6) {
+            EXPECT_TRUE(k.broken) << "handles out of line at " << CMTimeGetSeconds(k.time) << " s";
+        }
+    }
     const int64_t end = frameOf(c->getKeyframeMaxTime());
     // Outside, the curve is the same but for rounding (the bordering Catmull-Rom segments are
     // Bezier segments now).
