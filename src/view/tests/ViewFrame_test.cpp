@@ -41,8 +41,9 @@ TEST_F(ViewFrame, frame__order_pieces_and_dimmed_ends) {
 TEST_F(ViewFrame, frame__keypoint_states_handles_and_label) {
     build(
         "States: 1=0/1! 2=0/1! 3=0/1L 4=0/1L 5=0/1 6=0/1; Bezier: 1=-0.5(-1,-0.25|2,0.5)b "
-        "5=-0.5(-1,-0.25|2,0.5)b 8=-0.5(-0.01,-0.001|2,0.5)b; Corner: 1=0/1 9.95=0.98/1");
-    select("Corner@9.95 States@1 States@3 States@5 Bezier@5 Bezier@8");
+        "5=-0.5(-1,-0.25|2,0.5)b 8=-0.5(-0.01,-0.001|2,0.5)b 9=-0.5(0,0.2|0,-0.2)b; "
+        "Corner: 1=0/1 9.95=0.98/1");
+    select("Corner@9.95 States@1 States@3 States@5 Bezier@5 Bezier@8 Bezier@9");
     view.setPrintText(1);
     item("States")->setScaleY(0.5);
     item("States")->setOffsetY(-0.2);
