@@ -85,9 +85,10 @@ struct Baker {
 
     // Cycle k (k = 0 being the keyframes themselves), in time order.
     Block copy(int32_t k) const;
-    // Joins two neighbouring blocks where they meet; leftOriginal or rightOriginal tells that
-    // the block on that side is the existing keyframe at the seam.
-    void join(Block& left, Block& right, bool leftOriginal, bool rightOriginal) const;
+    // Joins two neighbouring blocks where they meet; leftOriginal tells that the left block is
+    // the existing keyframe at the seam. An existing keyframe on the right needs no word: the
+    // right side's keyframe is the one kept there anyway.
+    void join(Block& left, Block& right, bool leftOriginal) const;
     // Repeated cycles whose ends differ in value: the curve jumps at every seam.
     bool jumps() const;
 };
@@ -130,14 +131,13 @@ bool Baker::jumps() const {
     return std::fabs(a - b) > 1e-12 * (std::fabs(a) + std::fabs(b));
 }
 
-void Baker::join(Block& left, Block& right, bool leftOriginal, bool rightOriginal) const {
+void Baker::join(Block& left, Block& right, bool leftOriginal) const {
     TQKeyframeRecord& l = left.back();
     TQKeyframeRecord& r = right.front();
     if (!jumps()) {
         // One keyframe: the arriving side of the left, the leaving side of the right, kept on
         // the existing keyframe if one of them is.
         TQKeyframeRecord merged = leftOriginal ? l : r;
-        if (!leftOriginal && !rightOriginal) merged.value = r.value;
         merged.inU = l.inU;
         merged.inV = l.inV;
         merged.outU = r.outU;
@@ -280,12 +280,12 @@ void TQChannel::generateKeypoints(unsigned direction, unsigned cycles) {
         if (before) blocks.push_back({table[seamPos]});
         const size_t original = before ? blocks.size() - 1 : 0;
         for (size_t b = 0; b + 1 < blocks.size(); ++b) {
-            baker.join(blocks[b], blocks[b + 1], b == original, b + 1 == original);
+            baker.join(blocks[b], blocks[b + 1], b == original);
         }
         if (!before && baker.jumps()) {
             // The time where the baked cycles end belongs to the cycle after them.
             Block start{copyAt(baker.cycle.front(), far)};
-            baker.join(blocks.back(), start, false, false);
+            baker.join(blocks.back(), start, false);
             blocks.push_back(start);
         }
         table[seamPos] = blocks[original].front();
