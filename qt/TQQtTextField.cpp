@@ -17,6 +17,9 @@ QValidator::State TQQtFormatterValidator::validate(QString& input, int& pos) con
 
 TQQtTextField::TQQtTextField(QWidget* parent) : QLineEdit(parent) {
     connect(this, &QLineEdit::editingFinished, this, [this] { endEditing(); });
+    connect(this, &QLineEdit::textEdited, this, [this] {
+        if (const std::shared_ptr<RWTextField> m = model()) m->userBeginEditing();
+    });
     syncFromModel();
 }
 
@@ -57,5 +60,7 @@ bool TQQtTextField::commitEditing() {
 void TQQtTextField::focusOutEvent(QFocusEvent* event) {
     QLineEdit::focusOutEvent(event);
     // An edit that the validator holds back never ends: the model's value shows again.
-    if (!hasAcceptableInput()) syncFromModel();
+    if (hasAcceptableInput()) return;
+    if (const std::shared_ptr<RWTextField> m = model()) m->userAbandonEditing();
+    syncFromModel();
 }

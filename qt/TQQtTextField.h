@@ -4,7 +4,8 @@
 // formatter would refuse while it is typed cannot be typed, and only text it accepts ends an
 // edit. An ended edit (Return, or leaving the field) is the model's userEndEditing; text the
 // model refuses, or a field left with text that is not acceptable, shows the model's value
-// again. While the model has its whole text selected, so has the line.
+// again. While the model has its whole text selected, so has the line. Typing marks the model
+// as being edited until the edit ends or the field is left.
 
 #include <QLineEdit>
 #include <QValidator>

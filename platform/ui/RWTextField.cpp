@@ -51,11 +51,18 @@ void RWTextField::selectText() {
 void RWTextField::insertText(const std::string& text) {
     const std::string typed = _allTextSelected ? text : stringValue() + text;
     _allTextSelected = false;
+    _editing = true;
     _cell->setStringValue(typed);
     changed();
 }
 
+void RWTextField::userAbandonEditing() {
+    _editing = false;
+    changed();
+}
+
 std::optional<std::string> RWTextField::userEndEditing(const std::string& text, bool sendsAction) {
+    _editing = false;
     if (!isEnabled() || !isEditable()) {
         changed();
         return std::string();

@@ -69,6 +69,12 @@ public:
     void insertText(const std::string& text);
 
     // ---- The user ----
+    // The user began changing the text (typed into it): until the edit ends or is abandoned,
+    // whoever keeps the field up to date leaves it alone, so that the typing is not lost.
+    void userBeginEditing() { _editing = true; }
+    // The user left the field without an edit that ends (text it would refuse).
+    void userAbandonEditing();
+    bool isEditing() const { return _editing; }
     // The user ended an edit with this text. Accepted: the value changes and the action is
     // sent (unless the edit ended without it: a click on a button of the field's window
     // settles the field first); answers nothing. Refused (or the field is disabled or not
@@ -80,4 +86,5 @@ private:
     RWTextFieldCellPtr _cell;
     std::string _placeholder;
     bool _allTextSelected = false;
+    bool _editing = false;
 };

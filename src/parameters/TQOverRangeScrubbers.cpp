@@ -55,6 +55,7 @@ void TQChanDoubleOverRangeScrubberController::update() {
     const double scale = displayScaleOf(*c);
     updateScrubberRange(*c, scale);
     _pSlider->setDoubleValue(y * scale);
+    if (_pTF->isEditing()) return;  // the user's typing stands
     const double shown = y * scale + valueBias();
     if (_pTF->doubleValue() == shown && !_pTF->objectValue().isNil()) return;
     _pTF->setDoubleValue(shown);
@@ -193,7 +194,8 @@ void TQChanAngleOverRangeScrubberController::update() {
     if (!c || _isOffsetting || !_pMiniCurveEditor) return;
     updateEnableState();
     const double v = _pMiniCurveEditor->getSelectedValueY() * displayScaleOf(*c);
-    if (_pTF->doubleValue() != v || _pTF->objectValue().isNil()) _pTF->setDoubleValue(v);
+    if (!_pTF->isEditing() && (_pTF->doubleValue() != v || _pTF->objectValue().isNil()))
+        _pTF->setDoubleValue(v);
     _pDial->setDoubleValue(360.0 - renormalize(v));
 }
 
