@@ -26,22 +26,17 @@ class RWManualTimer final : public RWTimerService {
 public:
     explicit RWManualTimer(RWManualClock& clock) : _clock(clock), _queue(clock) {}
     void dispatchAfter(uint64_t nanoseconds, std::function<void()> block) override {
-        _requests.push_back(nanoseconds);
         _queue.dispatchAfter(nanoseconds, std::move(block));
     }
     size_t advance(double seconds) {
         _clock.advance(seconds);
         return _queue.runDueBlocks();
     }
-    size_t runDue() { return _queue.runDueBlocks(); }
     size_t pendingCount() const { return _queue.pendingCount(); }
-    // The delays asked for, in order.
-    const std::vector<uint64_t>& requests() const { return _requests; }
 
 private:
     RWManualClock& _clock;
     RWQueuedTimer _queue;
-    std::vector<uint64_t> _requests;
 };
 
 class RWStubViewHost final : public RWViewHost {
@@ -51,16 +46,16 @@ public:
 
     CGRect bounds() const override { return _bounds; }
     double backingScaleFactor() const override { return _scale; }
-    bool hasWindow() const override { return _hasWindow; }
     void setNeedsDisplay() override { ++_redrawRequests; }
-    void setNeedsDisplayInRect(const CGRect& rect) override { _redrawRects.push_back(rect); }
+    // Only whole-frame requests are counted: a partial or immediate redraw is none.
+    void setNeedsDisplayInRect(const CGRect&) override {}
+    void displayNow() override {}
     void setCursor(RWCursor cursor) override { _cursors.push_back(cursor); }
-    void setCursorHidden(bool hidden) override { _cursorHidden = hidden; }
+    void setCursorHidden(bool) override {}
     // The view fills the window, whose origin is the view's.
     CGPoint convertPointFromWindow(const CGPoint& p) const override { return p - _bounds.origin; }
-    // The window sits at screenOrigin (bottom left), when the view has one.
+    // The window sits at screenOrigin (bottom left).
     std::optional<CGRect> convertRectToScreen(const CGRect& rect) const override {
-        if (!_hasWindow) return std::nullopt;
         return CGRectMake(rect.origin.x + _screenOrigin.x, rect.origin.y + _screenOrigin.y,
                           rect.size.width, rect.size.height);
     }
@@ -74,38 +69,21 @@ public:
         return std::nullopt;
     }
 
-    void displayNow() override { ++_immediateRedraws; }
-    void addTrackingArea(const RWTrackingAreaPtr& area) override { _trackingAreas.push_back(area); }
-    void removeTrackingArea(const RWTrackingArea& area) override {
-        std::erase_if(_trackingAreas, [&](const RWTrackingAreaPtr& a) { return a.get() == &area; });
-    }
-
-    void setBounds(const CGRect& bounds) { _bounds = bounds; }
     void setBackingScaleFactor(double scale) { _scale = scale; }
-    void setHasWindow(bool has) { _hasWindow = has; }
     void setScreenOrigin(const CGPoint& origin) { _screenOrigin = origin; }
-    const std::vector<CGRect>& redrawRects() const { return _redrawRects; }
     void queueEvent(const RWEvent& event) { _queued.push_back(event); }
     size_t queuedCount() const { return _queued.size(); }
     int redrawRequests() const { return _redrawRequests; }
     void resetRedrawRequests() { _redrawRequests = 0; }
     const std::vector<RWCursor>& cursors() const { return _cursors; }
-    bool cursorHidden() const { return _cursorHidden; }
-    int immediateRedraws() const { return _immediateRedraws; }
-    const std::vector<RWTrackingAreaPtr>& trackingAreas() const { return _trackingAreas; }
 
 private:
     CGRect _bounds;
     double _scale;
-    bool _hasWindow = true;
     CGPoint _screenOrigin = CGPointZero;
     int _redrawRequests = 0;
-    std::vector<CGRect> _redrawRects;
-    bool _cursorHidden = false;
     std::vector<RWCursor> _cursors;
     std::deque<RWEvent> _queued;
-    int _immediateRedraws = 0;
-    std::vector<RWTrackingAreaPtr> _trackingAreas;
 };
 
 // Each runModalForWindow plays the next script: the script stands for the user working the

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "platform/ui/RWControl.h"
+#include "platform/ui/RWDecimalFormatter.h"
 #include "platform/ui/RWPopUpButton.h"
 #include "platform/ui/RWSegmentedControl.h"
 #include "platform/ui/RWTextField.h"
@@ -20,8 +21,7 @@ namespace {
 
 // Records each action with what the sender showed at that moment (a tag, a hit part, a
 // selected segment), read through `probe`.
-class Target : public RWActionTarget {
-public:
+struct Target : RWActionTarget {
     bool performAction(const std::string& action, RWActionSender& sender) override {
         actions.push_back(action + "/" + std::to_string(probe ? probe(sender) : sender.tag()));
         return true;
@@ -30,8 +30,7 @@ public:
     std::vector<std::string> actions;
 };
 
-class Observer : public RWControlObserver {
-public:
+struct Observer : RWControlObserver {
     void controlDidChange(RWControl&) override { ++changes; }
     int changes = 0;
 };
@@ -75,15 +74,13 @@ TEST(RWZoomScroller, gestures_set_the_part_and_values_then_send_the_action) {
     EXPECT_EQ(scroller->displayedKnobProportion(), 0.01);
     EXPECT_EQ(target.actions.size(), 4u);
     scroller->removeObserver(&observer);
-}
 
-TEST(RWZoomScroller, frame_leaves_the_window_corner_free_only_when_it_ends_there) {
-    RWZoomScroller scroller;
-    scroller.setFrame(CGRectMake(0, 0, 15, 200));
-    EXPECT_EQ(scroller.frame().size.height, 200.0);
-    scroller.setEndsAtWindowCorner(true);
-    scroller.setFrame(CGRectMake(0, 0, 15, 200));
-    EXPECT_EQ(scroller.frame().size.height, 200.0 - RWZoomScroller::kGrowBoxSize);
+    // The frame leaves the window's corner free only when the scroller ends there.
+    for (const bool corner : {false, true}) {
+        scroller->setEndsAtWindowCorner(corner);
+        scroller->setFrame(CGRectMake(0, 0, 15, 200));
+        EXPECT_EQ(scroller->frame().size.height, 200.0 - corner * RWZoomScroller::kGrowBoxSize);
+    }
 }
 
 TEST(RWSegmentedControl, select_one_keeps_the_segment_momentary_only_during_the_action) {
@@ -150,28 +147,9 @@ TEST(RWPopUpButton, opening_lets_an_observer_rebuild_and_a_choice_runs_the_items
     EXPECT_EQ(popUp->indexOfSelectedItem(), -1);
 }
 
-// Numbers only, with a reason for anything else.
-class NumberFormatter : public RWFormatter {
-public:
-    std::optional<std::string> stringForObjectValue(const RWObjectValue& v) const override {
-        return v.isNumber() ? std::optional(RWObjectValue::numberText(v.doubleValue()))
-                            : std::nullopt;
-    }
-    bool getObjectValue(RWObjectValue* value, const std::string& text,
-                        std::string* why) const override {
-        const std::optional<double> n = RWObjectValue::leadingNumber(text);
-        if (!n) {
-            if (why) *why = "not a number";
-            return false;
-        }
-        if (value) *value = *n;
-        return true;
-    }
-};
-
 TEST(RWTextField, an_edit_goes_through_the_formatter) {
     Target target;
-    NumberFormatter numbers;
+    RWDecimalFormatter numbers;
     auto field = wired<RWTextField>(target, "nameChanged:");
     field->setEditable(true);
     field->setFormatter(&numbers);
@@ -179,7 +157,7 @@ TEST(RWTextField, an_edit_goes_through_the_formatter) {
     Observer observer;
     field->addObserver(&observer);
 
-    EXPECT_EQ(field->userEndEditing("abc"), std::optional<std::string>("not a number"));
+    EXPECT_EQ(field->userEndEditing("abc"), std::optional<std::string>("Not a number"));
     EXPECT_EQ(field->stringValue(), "2.5") << "refused text leaves the value";
     EXPECT_EQ(observer.changes, 1) << "the widget is told to show the value again";
     EXPECT_EQ(field->userEndEditing("7"), std::nullopt);
@@ -218,8 +196,7 @@ TEST(RWValueControls, values_stay_in_range_and_steps_follow_the_increments) {
     EXPECT_EQ(target.actions.size(), 3u);
 }
 
-class WindowDelegate : public RWWindowDelegate {
-public:
+struct WindowDelegate : RWWindowDelegate {
     bool windowShouldClose(RWWindow&) override {
         calls.push_back("should");
         return allow;
@@ -241,34 +218,6 @@ TEST(RWWindow, the_users_close_asks_the_delegate_first) {
     EXPECT_FALSE(panel.isVisible());
     panel.close();
     EXPECT_EQ(delegate.calls, (std::vector<std::string>{"should", "should", "will", "will"}));
-}
-
-TEST(RWMenu, key_equivalents_match_characters_and_modifiers) {
-    Target target;
-    RWMenu menu;
-    auto add = [&](const char* key, uint64_t mask, int64_t tag) {
-        RWMenuItemPtr item = menu.addItemWithTitle("Item", "act:", key);
-        item->setTarget(&target);
-        item->setTag(tag);
-        item->setKeyEquivalentModifierMask(mask);
-        return item;
-    };
-    add("d", RWEventModifierFlagCommand, 1);
-    add("D", RWEventModifierFlagCommand, 2);  // an upper-case letter stands for Shift
-    add("p", 0, 3);
-    add("x", RWEventModifierFlagCommand, 4)->setEnabled(false);
-    auto press = [&](const char* c, uint64_t flags) {
-        return menu.performKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, c, flags));
-    };
-    EXPECT_TRUE(press("d", RWEventModifierFlagCommand));
-    EXPECT_TRUE(press("D", RWEventModifierFlagCommand | RWEventModifierFlagShift));
-    EXPECT_TRUE(press("p", 0));
-    EXPECT_FALSE(press("p", RWEventModifierFlagCommand)) << "the modifiers must match";
-    EXPECT_FALSE(press("x", RWEventModifierFlagCommand)) << "a disabled item takes no key";
-    EXPECT_FALSE(press("q", RWEventModifierFlagCommand));
-    EXPECT_EQ(target.actions, (std::vector<std::string>{"act:/1", "act:/2", "act:/3"}));
-    EXPECT_EQ(RWMenuItem().keyEquivalentModifierMask(), uint64_t{RWEventModifierFlagCommand})
-        << "items want Command unless told otherwise";
 }
 
 }  // namespace

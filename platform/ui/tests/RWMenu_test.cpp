@@ -8,8 +8,7 @@
 namespace {
 
 // Records the actions it receives; enables only the actions it is told to.
-class RecordingTarget : public RWActionTarget {
-public:
+struct RecordingTarget : RWActionTarget {
     bool performAction(const std::string& action, RWActionSender& sender) override {
         performed.push_back(action);
         auto* item = dynamic_cast<RWMenuItem*>(&sender);
@@ -25,9 +24,7 @@ public:
     bool removeSenderOnAction = false;
 };
 
-class RWMenuTest : public ::testing::Test {};
-
-TEST_F(RWMenuTest, structure__oneMenuPerItemBackReferencesAndLookupsOutOfRange) {
+TEST(RWMenuTest, structure__oneMenuPerItemBackReferencesAndLookupsOutOfRange) {
     RWMenu first("first"), top("top");
     RWMenuItemPtr item = first.addItemWithTitle("Delete", "menuDelete:");
     ASSERT_EQ(item->menu(), &first);
@@ -53,7 +50,7 @@ TEST_F(RWMenuTest, structure__oneMenuPerItemBackReferencesAndLookupsOutOfRange) 
     EXPECT_EQ(menu.numberOfItems(), 2);
 }
 
-TEST_F(RWMenuTest, update__enablesThroughTheTargetAndRecursesIntoSubmenus) {
+TEST(RWMenuTest, update__enablesThroughTheTargetAndRecursesIntoSubmenus) {
     RecordingTarget target;
     target.enabledAction = "menuReverse:";
     RWMenu menu;
@@ -76,7 +73,7 @@ TEST_F(RWMenuTest, update__enablesThroughTheTargetAndRecursesIntoSubmenus) {
     EXPECT_TRUE(inner->isEnabled()) << "submenus are validated too";
 }
 
-TEST_F(RWMenuTest, performActionForItemAtIndex__skipsDisabledAndSurvivesSelfRemoval) {
+TEST(RWMenuTest, performActionForItemAtIndex__skipsDisabledAndSurvivesSelfRemoval) {
     RecordingTarget target;
     target.removeSenderOnAction = true;
     RWMenu menu;
@@ -90,6 +87,33 @@ TEST_F(RWMenuTest, performActionForItemAtIndex__skipsDisabledAndSurvivesSelfRemo
     EXPECT_EQ(target.performed, std::vector<std::string>{"on:"});
     EXPECT_EQ(menu.numberOfItems(), 1) << "the action removed its own item";
     EXPECT_FALSE(menu.performActionForItemAtIndex(3));
+}
+
+TEST(RWMenuTest, keyEquivalents__matchCharacterAndModifiersOfEnabledItems) {
+    RecordingTarget target;
+    RWMenu menu;
+    const uint64_t command = RWEventModifierFlagCommand, shift = RWEventModifierFlagShift;
+    for (const auto& [key, mask] :
+         {std::pair{"d", command}, {"D", command}, {"p", 0}, {"x", command}}) {
+        RWMenuItemPtr item = menu.addItemWithTitle("Item", key + std::string(":"), key);
+        item->setTarget(&target);
+        item->setKeyEquivalentModifierMask(mask);
+    }
+    menu.itemAtIndex(3)->setEnabled(false);
+    // An upper-case letter stands for Shift; the modifiers must match exactly; a disabled item
+    // takes no key.
+    for (const auto& [key, flags, taken] : {std::tuple{"d", command, true},
+                                            {"D", command | shift, true},
+                                            {"p", 0, true},
+                                            {"p", command, false},
+                                            {"x", command, false},
+                                            {"q", command, false}})
+        EXPECT_EQ(menu.performKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, key, flags)),
+                  taken)
+            << key << " " << flags;
+    EXPECT_EQ(target.performed, (std::vector<std::string>{"d:", "D:", "p:"}));
+    EXPECT_EQ(RWMenuItem().keyEquivalentModifierMask(), command)
+        << "items want Command unless told otherwise";
 }
 
 }  // namespace
