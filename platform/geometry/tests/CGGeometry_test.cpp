@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cmath>
 #include <random>
 
@@ -29,34 +30,32 @@ TEST(Rect, operations__agreeWithPointMembershipOnAGrid) {
         SCOPED_TRACE(testing::Message()
                      << "a " << ax << "," << ay << "," << aw << "," << ah << " b " << bx << ","
                      << by << "," << bw << "," << bh << " edge " << trial % 4);
+        // Each operation's answer for the point, against what membership in a and b says; the
+        // union and the integral form hold at least their operands' points, and the slice and
+        // the rest share none.
         for (double x = -9.5; x <= 9.5; x += 0.5) {
             for (double y = -9.5; y <= 9.5; y += 0.5) {
                 const bool inA = in(a, x, y), inB = in(b, x, y);
-                ASSERT_EQ(in(s, x, y), inA) << x << ", " << y;
-                ASSERT_EQ(ba.contains(x, y), inA) << x << ", " << y;
-                ASSERT_EQ(in(i, x, y), inA && inB) << x << ", " << y;
-                ASSERT_EQ(ba.intersected(bb).contains(x, y), inA && inB) << x << ", " << y;
-                ASSERT_TRUE(!(inA || inB) || (in(u, x, y) && ba.united(bb).contains(x, y)))
-                    << x << ", " << y;
-                ASSERT_EQ(in(moved, x + 1, y - 2), inA) << x << ", " << y;
-                ASSERT_EQ(in(inset, x, y), in(a, x - 0.5, y - 0.5) && in(a, x + 0.5, y + 0.5))
-                    << x << ", " << y;
-                ASSERT_EQ(in(slice, x, y) + in(rest, x, y), int(inA))
-                    << "slice and rest share nothing";
-                ASSERT_TRUE(!in(R(ax + 0.2, ay - 0.3, aw, ah), x, y) || in(whole, x, y))
+                const bool inU = in(u, x, y) && ba.united(bb).contains(x, y);
+                ASSERT_EQ(
+                    (std::array{in(s, x, y), ba.contains(x, y), in(i, x, y),
+                                ba.intersected(bb).contains(x, y), inU || !(inA || inB),
+                                in(moved, x + 1, y - 2), in(inset, x, y),
+                                in(whole, x, y) || !in(R(ax + 0.2, ay - 0.3, aw, ah), x, y),
+                                in(slice, x, y) + in(rest, x, y) == int(inA)}),
+                    (std::array{inA, inA, inA && inB, inA && inB, true, inA,
+                                in(a, x - 0.5, y - 0.5) && in(a, x + 0.5, y + 0.5), true, true}))
                     << x << ", " << y;
             }
         }
         const bool shared = CGRectGetWidth(i) > 0 && CGRectGetHeight(i) > 0 && !CGRectIsNull(i);
-        EXPECT_EQ(CGRectIntersectsRect(a, b), shared);
-        EXPECT_EQ(ba.intersects(bb), shared);
-        EXPECT_EQ(CGRectContainsRect(a, b), !CGRectIsNull(i) && CGRectEqualToRect(i, b));
-        EXPECT_TRUE(CGRectEqualToRect(a, s));
+        EXPECT_EQ((std::array{CGRectIntersectsRect(a, b), ba.intersects(bb),
+                              CGRectContainsRect(a, b), CGRectEqualToRect(a, s)}),
+                  (std::array{shared, shared, !CGRectIsNull(i) && CGRectEqualToRect(i, b), true}));
         // The union is the least rectangle: each of its edges is an edge of an operand.
-        for (const auto& [edge, of] :
-             {std::pair{CGRectGetMinX(u), std::min(CGRectGetMinX(a), CGRectGetMinX(b))},
-              {CGRectGetMaxY(u), std::max(CGRectGetMaxY(a), CGRectGetMaxY(b))}})
-            EXPECT_EQ(edge, of);
+        EXPECT_EQ((std::array{CGRectGetMinX(u), CGRectGetMaxY(u)}),
+                  (std::array{std::min(CGRectGetMinX(a), CGRectGetMinX(b)),
+                              std::max(CGRectGetMaxY(a), CGRectGetMaxY(b))}));
         // The slice lies on its own side, as wide as the amount allows.
         const double sliceSides[] = {CGRectGetMinX(slice), CGRectGetMinY(slice),
                                      CGRectGetMaxX(slice), CGRectGetMaxY(slice)};

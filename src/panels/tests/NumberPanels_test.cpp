@@ -12,36 +12,29 @@
 
 namespace {
 
-// A button of a panel, by its title, as the user finds it.
+// A button of a panel, by its title, as the user finds it, and the panel's field.
 std::shared_ptr<RWButton> button(RWWindow& panel, const std::string& title) {
     return panel.contentView()->subview<RWButton>(
         [&](const RWButton& b) { return b.title() == title; });
 }
+std::shared_ptr<RWTextField> field(RWWindow& panel) {
+    return panel.contentView()->subview<RWTextField>();
+}
 
 class NumberPanels : public ::testing::Test {
 protected:
-    void SetUp() override {
-        previous = RWApplicationServices().modal;
-        RWServiceSet mine;
-        mine.modal = &modal;
-        RWInstallServices(mine);
-    }
-    void TearDown() override {
-        RWServiceSet back;
-        back.modal = previous;
-        RWInstallServices(back);
-    }
-    // The user presses Return on this text in the field, the panel's formatter taken off first
-    // when `raw` (as a host's own field without one would be).
-    void pushReturnWith(const std::string& text, bool raw = false) {
-        modal.pushScript([text, raw](RWWindow& panel, RWModalService&) {
-            if (raw) panel.contentView()->subview<RWTextField>()->setFormatter(nullptr);
-            panel.contentView()->subview<RWTextField>()->userEndEditing(text);
+    void SetUp() override { RWInstallServices({.modal = &modal}); }
+    void TearDown() override { RWResetServices(); }
+    // The user presses Return on text that is no number in a field without the panel's
+    // formatter (as a host's own field would be).
+    void pushReturnWithoutFormatter() {
+        modal.pushScript([](RWWindow& panel, RWModalService&) {
+            field(panel)->setFormatter(nullptr);
+            field(panel)->userEndEditing("abc");
         });
     }
 
     RWScriptedModal modal;
-    RWModalService* previous = nullptr;
 };
 
 TEST_F(NumberPanels, getPanelLocation__keepsThePanelInsideTheParentFrame) {
@@ -78,9 +71,9 @@ TEST_F(NumberPanels, answers__return_cancel_close_and_text_that_is_no_number) {
     double value = -5.0;
     std::string shown;
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        shown = panel.contentView()->subview<RWTextField>()->stringValue();
-        EXPECT_TRUE(panel.contentView()->subview<RWTextField>()->isAllTextSelected());
-        panel.contentView()->subview<RWTextField>()->userEndEditing("2.5");
+        shown = field(panel)->stringValue();
+        EXPECT_TRUE(field(panel)->isAllTextSelected());
+        field(panel)->userEndEditing("2.5");
     });
     EXPECT_TRUE(TQCurveEditorValueController::openWithLocation(CGPointZero, &value));
     EXPECT_EQ(shown, "-5");
@@ -97,21 +90,21 @@ TEST_F(NumberPanels, answers__return_cancel_close_and_text_that_is_no_number) {
 
     // OK after a refused edit answers the number shown.
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        panel.contentView()->subview<RWTextField>()->userEndEditing("1e");
+        field(panel)->userEndEditing("1e");
         button(panel, "OK")->userClick();
     });
     EXPECT_TRUE(TQTimingMoveController::openWithLocation(CGPointZero, &value));
     EXPECT_EQ(value, 2.5);
     // Reaching Return anyway: the value panel answers no, the timing panel the field's number.
-    pushReturnWith("abc", true);
+    pushReturnWithoutFormatter();
     EXPECT_FALSE(TQCurveEditorValueController::openWithLocation(CGPointZero, &value));
     EXPECT_EQ(value, 2.5);
-    pushReturnWith("abc", true);
+    pushReturnWithoutFormatter();
     EXPECT_TRUE(TQTimingMoveController::openWithLocation(CGPointZero, &value));
     EXPECT_EQ(value, 0.0);
     // After a run the field has no formatter left; the next run gives it one again.
     modal.pushScript([&](RWWindow& panel, RWModalService&) {
-        EXPECT_NE(panel.contentView()->subview<RWTextField>()->formatter(), nullptr);
+        EXPECT_NE(field(panel)->formatter(), nullptr);
         button(panel, "Cancel")->userClick();
     });
     TQTimingMoveController::openWithLocation(CGPointZero, &value);
