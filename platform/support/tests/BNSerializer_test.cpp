@@ -30,22 +30,17 @@ enum : uint32_t {
     kInPrint = 5,
 };
 
-const BNScopeEntry kShelfTable[] = {
-    {"shelf", kShelf, 0},
-    {"book", kBook, 0},
-    {"title", kBook, kTitle},
-    {"price", kBook, kPrice},
-    {"published", kBook, kPublished},
-    {"copies", kBook, kCopies},
-    {"inprint", kBook, kInPrint},
-    {nullptr, 0, 0},
-};
+const BNScopeEntry kShelfTable[] = {{"shelf", kShelf, 0},
+                                    {"book", kBook, 0},
+                                    {"title", kBook, kTitle},
+                                    {"price", kBook, kPrice},
+                                    {"published", kBook, kPublished},
+                                    {"copies", kBook, kCopies},
+                                    {"inprint", kBook, kInPrint},
+                                    {nullptr, 0, 0}};
 const BNScope kShelfScope(kShelfTable);
 
-const BNScopeEntry kBookTable[] = {
-    {"note", kNote, 0},
-    {nullptr, 0, 0},
-};
+const BNScopeEntry kBookTable[] = {{"note", kNote, 0}, {nullptr, 0, 0}};
 const BNScope kBookScope(kBookTable);
 
 struct Book final : BNSerializer {
@@ -290,8 +285,7 @@ TEST(BNSerializerTest, reader__damagedDocumentsFailWithTheirPlace) {
         {"bad time", "<shelf><book published='10/3/1'/></shelf>", 1, 8, "not a value"},
         {"bad bool", "<shelf><book inprint='maybe'/></shelf>", 1, 8, "not a value"},
         {"duplicate attribute", "<shelf><book title='a' title='b'/></shelf>", 1, 24,
-         "duplicate attribute"},
-    };
+         "duplicate attribute"}};
     for (const Case& c : cases) {
         SCOPED_TRACE(c.what);
         Shelf shelf;

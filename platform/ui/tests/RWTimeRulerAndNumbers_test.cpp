@@ -25,25 +25,17 @@ double seconds(const CMTime& t) { return CMTimeGetSeconds(t); }
 
 TEST(RWDecimalFormatter, readsWholeFiniteNumbersAndLetPartsOfThemBeTyped) {
     const RWDecimalFormatter numbers;
+    // "1e999" is beyond the doubles.
     const struct {
         const char* text;
         std::optional<double> number;
         bool mayStand;  // as a partial text
     } cases[] = {
-        {"12", 12.0, true},
-        {" -0.5 ", -0.5, true},
-        {"+3", 3.0, true},
-        {".25", 0.25, true},
-        {"1e-3", 0.001, true},
-        {"-", std::nullopt, true},
-        {"1e", std::nullopt, true},
-        {"", std::nullopt, true},
-        {"1..2", std::nullopt, false},
-        {"1a", std::nullopt, false},
-        {"1 2", std::nullopt, false},
-        {"1e999", std::nullopt, true},  // beyond the doubles
-        {"nan", std::nullopt, false},
-    };
+        {"12", 12.0, true},          {" -0.5 ", -0.5, true},       {"+3", 3.0, true},
+        {".25", 0.25, true},         {"1e-3", 0.001, true},        {"-", std::nullopt, true},
+        {"1e", std::nullopt, true},  {"", std::nullopt, true},     {"1..2", std::nullopt, false},
+        {"1a", std::nullopt, false}, {"1 2", std::nullopt, false}, {"1e999", std::nullopt, true},
+        {"nan", std::nullopt, false}};
     for (const auto& c : cases) {
         EXPECT_EQ(RWDecimalFormatter::numberFromString(c.text), c.number) << c.text;
         RWObjectValue value("kept");

@@ -61,8 +61,7 @@ TEST(Timecode, text__aroundTheMinuteMarksAtEveryRate) {
         {CMTimeMake(-1, 60), k30, false, "-00:00:00:01"},
         {frameStart(-1800, k2997), k2997, true, "-00:01:00;02"},
         {kCMTimeInvalid, k30, false, "nil"},
-        {CMTimeMake(1, 1), CMTimeMake(0, 30), false, "nil"},
-    };
+        {CMTimeMake(1, 1), CMTimeMake(0, 30), false, "nil"}};
     for (const Case& c : cases)
         EXPECT_EQ(text(c.time, c.duration, c.drop), c.expected) << c.time.value;
 }
@@ -121,16 +120,14 @@ TEST(ObjectValue, conversions__ofNothingNumbersAndStrings) {
         int32_t asInt;
         bool asBool;
         const char* asString;
-    } cases[] = {
-        {{}, 0.0, 0, false, ""},
-        {-2.7, -2.7, -2, true, "-2.7"},
-        {1e20, 1e20, INT32_MAX, true, "1e+20"},
-        {"  12.5px", 12.5, 12, true, "  12.5px"},
-        {"-3e2x", -300.0, -300, true, "-3e2x"},
-        {"+.5", 0.5, 0, true, "+.5"},
-        {"Yes", 0.0, 0, true, "Yes"},
-        {"-99999999999", -99999999999.0, INT32_MIN, true, "-99999999999"},
-    };
+    } cases[] = {{{}, 0.0, 0, false, ""},
+                 {-2.7, -2.7, -2, true, "-2.7"},
+                 {1e20, 1e20, INT32_MAX, true, "1e+20"},
+                 {"  12.5px", 12.5, 12, true, "  12.5px"},
+                 {"-3e2x", -300.0, -300, true, "-3e2x"},
+                 {"+.5", 0.5, 0, true, "+.5"},
+                 {"Yes", 0.0, 0, true, "Yes"},
+                 {"-99999999999", -99999999999.0, INT32_MIN, true, "-99999999999"}};
     for (const auto& c : cases) {
         EXPECT_EQ(c.value.doubleValue(), c.asDouble) << c.asString;
         EXPECT_EQ(c.value.intValue(), c.asInt) << c.asString;
