@@ -135,16 +135,15 @@ TEST_F(OutlineTest, editing__endsByMovement) {
 TEST(NumberFormatterTest, patterns__showAndReadBack) {
     RWNumberFormatter f;
     ASSERT_TRUE(f.setFormat("#,##0.000"));
-    struct Case {
-        double value;
-        const char* text;
-    };
-    for (const Case& c : {Case{1234.5, "1,234.500"}, Case{-0.25, "-0.250"}, Case{0.0, "0.000"},
-                          Case{1e6, "1,000,000.000"}, Case{-0.0001, "0.000"}}) {
-        EXPECT_EQ(f.stringForObjectValue(c.value), c.text);
+    for (const auto& [value, text] : {std::pair{1234.5, "1,234.500"},
+                                      {-0.25, "-0.250"},
+                                      {0.0, "0.000"},
+                                      {1e6, "1,000,000.000"},
+                                      {-0.0001, "0.000"}}) {
+        EXPECT_EQ(f.stringForObjectValue(value), text);
         RWObjectValue back;
-        ASSERT_TRUE(f.getObjectValue(&back, c.text, nullptr)) << c.text;
-        EXPECT_NEAR(back.doubleValue(), c.value, 5e-4) << c.text;
+        ASSERT_TRUE(f.getObjectValue(&back, text, nullptr)) << text;
+        EXPECT_NEAR(back.doubleValue(), value, 5e-4) << text;
     }
     for (const char* bad : {"abc", "1.2.3", "", "12 apples", "nan"})
         EXPECT_FALSE(f.getObjectValue(nullptr, bad, nullptr)) << bad;

@@ -28,9 +28,6 @@ TEST(ImageResources, everyImage__decodesAtBothScalesToOneSizeInPoints) {
         EXPECT_TRUE(retina->size() == plain->size() &&
                     plain->pixels().size() == plain->bytesPerRow() * plain->pixelsHigh());
     }
-    // The names the views load, by colour, state and selection.
-    for (size_t c = 0; c < kColorCount * kStateCount * 2; ++c)
-        EXPECT_NE(BNImageForResource(imageName(c / 8, c % 4, c / 4 % 2), 2.0), nullptr) << c;
     EXPECT_EQ(imageName(8, kNormal, false) + imageName(0, 4, false), "")
         << "no colour 8, no state 4";
     EXPECT_EQ(BNImageForResource(tangentHandleImageName(), 1.5)->scale(), 2.0)
