@@ -103,8 +103,7 @@ TEST(InspectorRows, groups__collapse_hides_rows_and_a_folder_row_opens_its_group
                                    std::move(enclosed), context);
     EXPECT_TRUE(first->isHidden()) << "a closed group hides its rows";
     folder.twiddle(true);
-    EXPECT_FALSE(first->isHidden());
-    EXPECT_FALSE(folder.enclosedGroup()->isCollapsed());
+    EXPECT_FALSE(first->isHidden() || folder.enclosedGroup()->isCollapsed());
     folder.setHidden(true);
     EXPECT_TRUE(first->isHidden()) << "hidden with its parent";
     folder.enclosedGroup()->indent();

@@ -19,16 +19,8 @@ std::string textOf(const std::optional<BNSerializerError>& error) {
 }
 
 // A small two-level document: a shelf of books, each with notes.
-enum : uint32_t {
-    kShelf = 10,
-    kBook = 11,
-    kNote = 12,
-    kTitle = 1,
-    kPrice = 2,
-    kPublished = 3,
-    kCopies = 4,
-    kInPrint = 5,
-};
+enum : uint32_t { kShelf = 10, kBook, kNote };
+enum : uint32_t { kTitle = 1, kPrice, kPublished, kCopies, kInPrint };
 
 const BNScopeEntry kShelfTable[] = {{"shelf", kShelf, 0},
                                     {"book", kBook, 0},
@@ -138,6 +130,7 @@ std::optional<BNSerializerError> read(std::string_view text, Shelf& shelf) {
 }
 
 TEST(BNSerializerTest, roundTrip__textNumbersAndTimesComeBackExactly) {
+    // Times with the rounded flag and with an epoch; titles with 2, 3 and 4-byte sequences.
     const std::vector<CMTime> times = {
         CMTimeMake(1001, 30000),
         CMTimeMake(-7, 262144),
@@ -145,17 +138,11 @@ TEST(BNSerializerTest, roundTrip__textNumbersAndTimesComeBackExactly) {
         kCMTimePositiveInfinity,
         kCMTimeNegativeInfinity,
         kCMTimeIndefinite,
-        CMTime{5, 3, kCMTimeFlags_Valid | kCMTimeFlags_HasBeenRounded, 0},  // rounded flag
-        CMTime{INT64_MIN, 1, kCMTimeFlags_Valid, 2},                        // an epoch
-    };
+        CMTime{5, 3, kCMTimeFlags_Valid | kCMTimeFlags_HasBeenRounded, 0},
+        CMTime{INT64_MIN, 1, kCMTimeFlags_Valid, 2}};
     const std::vector<BNString> titles = {
-        "Plain",
-        "Tom & Jerry <\"quoted\"> 'single'",
-        "tab\there\nline\r\nend",
-        "  padded  ",
-        "caf\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x8E\xAC",  // 2, 3 and 4-byte sequences
-        "",
-    };
+        "Plain",      "Tom & Jerry <\"quoted\"> 'single'",         "tab\there\nline\r\nend",
+        "  padded  ", "caf\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x8E\xAC", ""};
 
     Shelf shelf;
     for (const double price : {0.1, 1.0 / 3.0, -0.0, 5e-324, DBL_MAX, -DBL_MIN, 1e21,
