@@ -31,39 +31,32 @@ std::string text(const CMTime& time, const CMTime& duration, bool drop) {
 }
 
 TEST(Timecode, text__aroundTheMinuteMarksAtEveryRate) {
-    struct Case {
-        CMTime time;
+    // Around the minute marks: 29.97 drop frame skips ;00 and ;01 but in every tenth minute;
+    // 59.94 skips four numbers; other rates never drop; hours do not wrap (frame 2160000 at 24
+    // is hour 25); negatives count down.
+    const CMTime k120 = CMTimeMake(1, 120);
+    const struct {
+        int64_t frame;
         CMTime duration;
         bool drop;
         const char* expected;
-    };
-    // Around the minute marks: 29.97 drop frame skips ;00 and ;01 but in every tenth minute;
-    // 59.94 skips four numbers; other rates never drop; hours do not wrap; negatives count down.
-    const Case cases[] = {
-        {frameStart(1799, k2997), k2997, true, "00:00:59;29"},
-        {frameStart(1800, k2997), k2997, true, "00:01:00;02"},
-        {frameStart(3598, k2997), k2997, true, "00:02:00;02"},
-        {frameStart(17981, k2997), k2997, true, "00:09:59;29"},
-        {frameStart(17982, k2997), k2997, true, "00:10:00;00"},
-        {frameStart(19782, k2997), k2997, true, "00:11:00;02"},
-        {frameStart(107892, k2997), k2997, true, "01:00:00;00"},
-        {CMTimeMake(6006, 100), k2997, true, "00:01:00;02"},
-        {CMTimeMake(1801800 + 500, 30000), k2997, true, "00:01:00;02"},
-        {CMTimeMake(18, 1), CMTimeMake(100, 2997), true, "00:00:17;29"},
-        {frameStart(1800, k2997), k2997, false, "00:01:00:00"},
-        {frameStart(3599, k5994), k5994, true, "00:00:59;59"},
-        {frameStart(3600, k5994), k5994, true, "00:01:00;04"},
-        {frameStart(49, k25), k25, true, "00:00:01:24"},
-        {frameStart(90000, k25), k25, false, "01:00:00:00"},
-        {frameStart(24 * 3600 * 25, k24), k24, false, "25:00:00:00"},
-        {frameStart(1440, k23976), k23976, true, "00:01:00:00"},
-        {frameStart(119, CMTimeMake(1, 120)), CMTimeMake(1, 120), false, "00:00:00:119"},
-        {CMTimeMake(-1, 60), k30, false, "-00:00:00:01"},
-        {frameStart(-1800, k2997), k2997, true, "-00:01:00;02"},
-        {kCMTimeInvalid, k30, false, "nil"},
-        {CMTimeMake(1, 1), CMTimeMake(0, 30), false, "nil"}};
-    for (const Case& c : cases)
-        EXPECT_EQ(text(c.time, c.duration, c.drop), c.expected) << c.time.value;
+    } frames[] = {{1799, k2997, true, "00:00:59;29"},   {1800, k2997, true, "00:01:00;02"},
+                  {3598, k2997, true, "00:02:00;02"},   {17981, k2997, true, "00:09:59;29"},
+                  {17982, k2997, true, "00:10:00;00"},  {19782, k2997, true, "00:11:00;02"},
+                  {107892, k2997, true, "01:00:00;00"}, {1800, k2997, false, "00:01:00:00"},
+                  {3599, k5994, true, "00:00:59;59"},   {3600, k5994, true, "00:01:00;04"},
+                  {49, k25, true, "00:00:01:24"},       {90000, k25, false, "01:00:00:00"},
+                  {2160000, k24, false, "25:00:00:00"}, {1440, k23976, true, "00:01:00:00"},
+                  {119, k120, false, "00:00:00:119"},   {-1800, k2997, true, "-00:01:00;02"}};
+    for (const auto& c : frames)
+        EXPECT_EQ(text(frameStart(c.frame, c.duration), c.duration, c.drop), c.expected) << c.frame;
+    // Times between frame starts, in other timescales; no valid time or frame duration.
+    EXPECT_EQ(text(CMTimeMake(6006, 100), k2997, true), "00:01:00;02");
+    EXPECT_EQ(text(CMTimeMake(1801800 + 500, 30000), k2997, true), "00:01:00;02");
+    EXPECT_EQ(text(CMTimeMake(18, 1), CMTimeMake(100, 2997), true), "00:00:17;29");
+    EXPECT_EQ(text(CMTimeMake(-1, 60), k30, false), "-00:00:00:01");
+    EXPECT_EQ(text(kCMTimeInvalid, k30, false), "nil");
+    EXPECT_EQ(text(CMTimeMake(1, 1), CMTimeMake(0, 30), false), "nil");
 }
 
 TEST(Timecode, readBack__everyFrameOfElevenMinutesRoundTrips) {
