@@ -96,6 +96,20 @@ TEST_F(OverRangeRows, valueRow__a_typed_value_or_a_slider_drag_moves_the_keypoin
     expectOneUndoStep(*before);
 }
 
+TEST_F(OverRangeRows, valueRow__a_field_being_typed_in_keeps_its_text_through_updates) {
+    selectInGroup(gain, 0.5);
+    RWTextField& field = valueRow().textField();
+    const double was = field.doubleValue();
+    field.selectText();
+    field.insertText("4");
+    gain->setKeyframeValue(gain->getKeyframe(position(0.5)), was + 5.0);
+    group->update();
+    EXPECT_DOUBLE_EQ(field.doubleValue(), 4.0) << "the typing stands";
+    field.userAbandonEditing();
+    group->update();
+    EXPECT_DOUBLE_EQ(field.doubleValue(), was + 5.0) << "once left, the field follows again";
+}
+
 TEST_F(OverRangeRows, positionRow__percent_moves_the_keypoint_and_clamps) {
     selectInGroup(gain, 0.5);
     const auto before = snapshot();
