@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <array>
+#include <atomic>
 #include <cmath>
 #include <exception>
 
@@ -21,6 +22,11 @@ constexpr size_t kMaxCachedTextures = 256;
 constexpr double kFlatness = 0.1;
 // Below this a frame is painted on the caller's thread: the hand-off would cost more.
 constexpr size_t kPoolPaintPrimitives = 32;
+// Rows of one band of direct painting: its pixels stay in a core's cache while every
+// primitive crossing it is painted.
+constexpr int kBandRows = 128;
+// Points waiting in the batch past which it is painted before the frame ends.
+constexpr size_t kMaxBatchPoints = size_t(1) << 20;
 
 Qt::PenJoinStyle penJoin(HXDLineJoin join) {
     switch (join) {
@@ -135,6 +141,9 @@ void TQQtPainterEncoder::beginEncoding(HXDTexture& target, const HXDColor& clear
     _painter.begin(&_target.image());
     _painter.setCompositionMode(QPainter::CompositionMode_Source);
     _painter.fillRect(QRect(QPoint(0, 0), _target.image().size()), qColor(clearColor));
+    // Taken after begin, which has detached the image: these are the pixels it paints.
+    _surface = _directRaster ? tq_raster::Surface::of(_target.image()) : tq_raster::Surface();
+    _batch.clear();
     _encoding = true;
     _mapping = HXDScreenMapping();
     _mappedSize = CGSizeZero;
@@ -142,8 +151,10 @@ void TQQtPainterEncoder::beginEncoding(HXDTexture& target, const HXDColor& clear
 
 void TQQtPainterEncoder::endEncoding() {
     if (!_encoding) return;
+    flushDirect();
     _painter.end();
     _encoding = false;
+    _surface = tq_raster::Surface();
     ++_framesPresented;
     if (_present) _present(_target.image());
 }
@@ -151,6 +162,13 @@ void TQQtPainterEncoder::endEncoding() {
 void TQQtPainterEncoder::encodePrimitives(
     std::span<const std::shared_ptr<HXDDrawPrimitive>> primitives,
     const HXDRenderingContext& context) {
+    if (_surface.isValid()) {
+        // Curves and keypoints are painted straight into the pixels, in bands on two
+        // threads; what still goes through the painter is too little to hand off.
+        HXDEncoder::encodePrimitives(primitives, context);
+        flushDirect();
+        return;
+    }
     // The raster engine hands every batch of more than about a hundred spans to Qt's global
     // thread pool and waits for it, unless it runs on one of the pool's own threads. A frame
     // of many thin antialiased curves flushes thousands of such batches, and the hand-offs cost
@@ -250,11 +268,38 @@ QRectF TQQtPainterEncoder::toDevice(const CGRect& r) const {
 
 bool TQQtPainterEncoder::prepare(const HXDDrawPrimitive& primitive) {
     if (!_encoding) return false;
-    _painter.setCompositionMode(compositionModeFor(primitive.blendingInfo()));
+    const QPainter::CompositionMode mode = compositionModeFor(primitive.blendingInfo());
+    _painter.setCompositionMode(mode);
     _painter.setOpacity(1.0);
+    _directSourceOver = _surface.isValid() && mode == QPainter::CompositionMode_SourceOver;
     _straightSource = primitive.blendingInfo().enabled &&
                       primitive.blendingInfo().sourceRGB == HXDBlendFactor::SourceAlpha;
     return true;
+}
+
+void TQQtPainterEncoder::flushDirect() {
+    if (_batch.empty()) return;
+    const QRect clip = _surface.clip;
+    const int bands = std::max(1, (clip.height() + kBandRows - 1) / kBandRows);
+    std::atomic<int> next{0};
+    const auto paintBands = [&]() noexcept {
+        for (int b = next++; b < bands; b = next++) {
+            tq_raster::Surface band = _surface;
+            band.clip = QRect(clip.left(), clip.top() + b * kBandRows, clip.width(), kBandRows)
+                            .intersected(clip);
+            _batch.paintBand(band);
+        }
+    };
+    // The helper takes bands as long as any are left; it may start after the last is taken.
+    QSemaphore done;
+    QThreadPool* pool = bands > 1 ? QThreadPool::globalInstance() : nullptr;
+    const bool helped = pool && pool->tryStart([&] {
+        paintBands();
+        done.release();
+    });
+    paintBands();
+    if (helped) done.acquire();
+    _batch.clear();
 }
 
 // ---- Multilines -----------------------------------------------------------------------------
@@ -276,7 +321,9 @@ void TQQtPainterEncoder::encodeMultiline(const HXDMultiline& multiline,
         return;
     }
     _painter.setRenderHint(QPainter::Antialiasing, multiline.antialiased());
+    _directLines = _directSourceOver && multiline.antialiased() && widthPixels <= 1.0;
     strokeMultiline(_painter, multiline, widthPixels, step);
+    _directLines = false;
 }
 
 void TQQtPainterEncoder::strokeMultiline(QPainter& painter, const HXDMultiline& multiline,
@@ -409,15 +456,18 @@ void TQQtPainterEncoder::appendFlattened(const std::vector<QPointF>& points, QPo
     while (kept + 1 < n) {
         const QPointF a = points[kept];
         const QPointF d = points[kept + 1] - a;
-        const double length = std::hypot(d.x(), d.y());
+        // Device points are finite and near the drawable: no need for hypot's care. Distances
+        // are compared times the length, which saves a division per point.
+        const double length = std::sqrt(d.x() * d.x() + d.y() * d.y());
         size_t last = kept + 1;
         if (length > 1e-9) {
-            double along = length;
+            const double offLimit = kFlatness * length;
+            double along = length * length;
             while (last + 1 < n) {
                 const QPointF p = points[last + 1] - a;
-                const double off = std::abs(d.x() * p.y() - d.y() * p.x()) / length;
-                const double next = (d.x() * p.x() + d.y() * p.y()) / length;
-                if (off > kFlatness || next < along) break;
+                const double off = std::abs(d.x() * p.y() - d.y() * p.x());
+                const double next = d.x() * p.x() + d.y() * p.y();
+                if (off > offLimit || next < along) break;
                 along = next;
                 ++last;
             }
@@ -456,7 +506,15 @@ void TQQtPainterEncoder::appendToPolyline(QPainter& painter, const QPointF& a, c
 
 void TQQtPainterEncoder::flushPolyline(QPainter& painter, double widthPixels,
                                        Qt::PenJoinStyle join) {
-    if (_polyline.size() >= 2) {
+    if (_polyline.size() >= 2 && _directLines && &painter == &_painter) {
+        // What linePen hands the cosmetic stroker: the colour weakened by a width under one.
+        QColor color = paintColor(_polylineColor);
+        if (widthPixels < 1.0) color.setAlphaF(color.alphaF() * std::max(widthPixels, 0.0));
+        _batch.addPolyline(_polyline.constData(), size_t(_polyline.size()),
+                           qPremultiply(color.rgba()));
+        if (_batch.pointCount() > kMaxBatchPoints) flushDirect();
+    } else if (_polyline.size() >= 2) {
+        if (&painter == &_painter) flushDirect();
         painter.setPen(linePen(QBrush(paintColor(_polylineColor)), widthPixels, join));
         painter.drawPolyline(_polyline);
     }
@@ -467,6 +525,7 @@ void TQQtPainterEncoder::drawSegment(QPainter& painter, const QPointF& a, const 
                                      const HXDColor& ca, const HXDColor& cb, double widthPixels,
                                      Qt::PenJoinStyle join) {
     if (nearlySame(a, b)) return;
+    if (&painter == &_painter) flushDirect();
     QLinearGradient gradient(a, b);
     gradient.setColorAt(0.0, paintColor(ca));
     gradient.setColorAt(1.0, paintColor(cb));
@@ -515,25 +574,29 @@ void TQQtPainterEncoder::strokeWithGamma(const HXDMultiline& multiline, double w
             row[x] = qRgba(scale(qRed(row[x])), scale(qGreen(row[x])), scale(qBlue(row[x])), na);
         }
     }
+    flushDirect();
     _painter.drawImage(area.topLeft(), layer);
 }
 
 // ---- Quads, meshes, text ----------------------------------------------------------------------
 
-const QImage* TQQtPainterEncoder::textureImage(const HXDPixelTexture& texture) {
+const tq_raster::Sprite* TQQtPainterEncoder::textureImage(const HXDPixelTexture& texture) {
     if (texture.width() == 0 || texture.height() == 0) return nullptr;
     // Texels are premultiplied and go to the painter as they are. Under a SourceAlpha blending
     // they are read as straight, so that the conversion multiplies them by alpha once more.
     const uint64_t key = texture.textureID() * 2 + (_straightSource ? 1 : 0);
     const auto found = _textures.find(key);
     if (found != _textures.end()) return &found->second;
-    if (_textures.size() >= kMaxCachedTextures) _textures.clear();
+    if (_textures.size() >= kMaxCachedTextures) {
+        flushDirect();  // the batch holds sprites of the cache
+        _textures.clear();
+    }
     const QImage texels(
         texture.rgba().data(), static_cast<int>(texture.width()),
         static_cast<int>(texture.height()), static_cast<qsizetype>(texture.width()) * 4,
         _straightSource ? QImage::Format_RGBA8888 : QImage::Format_RGBA8888_Premultiplied);
     // The conversion copies: the cached image owns its texels.
-    QImage converted = texels.convertToFormat(QImage::Format_ARGB32_Premultiplied);
+    tq_raster::Sprite converted(texels.convertToFormat(QImage::Format_ARGB32_Premultiplied));
     if (converted.isNull()) return nullptr;
     return &_textures.emplace(key, std::move(converted)).first->second;
 }
@@ -541,21 +604,31 @@ const QImage* TQQtPainterEncoder::textureImage(const HXDPixelTexture& texture) {
 void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad,
                                            const HXDRenderingContext& context) {
     if (!prepare(quad) || !mappingFor(context).isValid() || !quad.texture()) return;
-    const QImage* image = textureImage(*quad.texture());
-    if (!image) return;
+    const tq_raster::Sprite* sprite = textureImage(*quad.texture());
+    if (!sprite) return;
+    const QImage* image = &sprite->image();
     const float attenuation = quad.attenuation();
     if (!(attenuation > 0.0f)) return;
     const QRectF target = toDevice(_mapping.worldRectToPixels(quad.destinationRect()));
     if (!target.isValid()) return;
     const bool faded = attenuation < 1.0f;
-    if (faded) _painter.setOpacity(attenuation);
     // An image shown texel for pixel (keypoints, handles) lands on whole pixels: it stays
-    // crisp, and the painter blits it instead of resampling (the shift is under half a
-    // pixel). A frame draws thousands of them, so no painter state changes for them either.
-    if (std::abs(target.width() - image->width()) < 0.01 &&
-        std::abs(target.height() - image->height()) < 0.01) {
-        _painter.drawImage(QPoint(int(std::lround(target.left())), int(std::lround(target.top()))),
-                           *image);
+    // crisp, and is blitted instead of resampled (the shift is under half a pixel). A frame
+    // draws thousands of them, so no painter state changes for them either.
+    const bool texelForPixel = std::abs(target.width() - image->width()) < 0.01 &&
+                               std::abs(target.height() - image->height()) < 0.01;
+    const QPoint topLeft(int(std::lround(target.left())), int(std::lround(target.top())));
+    if (texelForPixel && _directSourceOver) {
+        // The painter's opacity in its own steps (1/256), then to 0..255 as its blend does.
+        const auto opacity =
+            static_cast<uint32_t>((std::lround(std::min(attenuation, 1.0f) * 256.0f) * 255) >> 8);
+        _batch.addSprite(*sprite, topLeft, opacity);
+        return;
+    }
+    flushDirect();
+    if (faded) _painter.setOpacity(attenuation);
+    if (texelForPixel) {
+        _painter.drawImage(topLeft, *image);
     } else {
         _painter.setRenderHint(QPainter::SmoothPixmapTransform, true);
         _painter.drawImage(target, *image, QRectF(image->rect()));
@@ -568,6 +641,7 @@ void TQQtPainterEncoder::encodeScreenspaceQuad(const HXDScreenspaceQuad& quad,
     if (!prepare(quad) || !mappingFor(context).isValid()) return;
     const QRectF target = toDevice(_mapping.worldRectToPixels(quad.frame()));
     if (!target.isValid()) return;
+    flushDirect();
     // Flat fills keep crisp edges: a band or handle is an exact pixel rectangle.
     _painter.setRenderHint(QPainter::Antialiasing, false);
     _painter.fillRect(target, paintColor(quad.color()));
@@ -576,6 +650,7 @@ void TQQtPainterEncoder::encodeScreenspaceQuad(const HXDScreenspaceQuad& quad,
 void TQQtPainterEncoder::encodeMesh(const HXDMesh& mesh, const HXDRenderingContext& context) {
     if (!prepare(mesh) || !mappingFor(context).isValid()) return;
     const QColor color = paintColor(mesh.brush().color);
+    flushDirect();
     _painter.setRenderHint(QPainter::Antialiasing, true);
     if (mesh.wireframe()) {
         _painter.setPen(
@@ -601,6 +676,7 @@ void TQQtPainterEncoder::encodeText(const HXDText& text, const HXDRenderingConte
     const float scale = context.backingScale() > 0.0f ? context.backingScale() : 1.0f;
     const QRectF box = toDevice(text.pixelRect(_mapping, scale));
     if (!box.isValid()) return;
+    flushDirect();
     _painter.save();
     _painter.setRenderHint(QPainter::TextAntialiasing, true);
     _painter.translate(box.topLeft());

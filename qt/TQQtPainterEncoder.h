@@ -31,6 +31,7 @@
 #include <vector>
 
 #include "platform/draw/HXDPrimitives.h"
+#include "qt/internal/TQQtDirectRaster.h"
 
 // A QImage as the target of a frame.
 class TQQtImageTarget final : public HXDTexture {
@@ -96,6 +97,13 @@ public:
     // Textures converted for painting, kept by textureID (and blending source) across frames.
     size_t cachedTextureCount() const { return _textures.size(); }
 
+    // Thin antialiased lines of one colour and images shown texel for pixel, blended
+    // source-over, are written straight into the image's pixels rather than through the
+    // painter (many times faster on a frame of curves; the same picture within rounding).
+    // Off: everything goes through the painter, as a reference to compare with.
+    void setDirectRaster(bool direct) { _directRaster = direct; }
+    bool directRaster() const { return _directRaster; }
+
 private:
     // Maps world to QPainter device pixels for one context; rebuilt when the projection or
     // the drawable changes, not per primitive.
@@ -109,7 +117,10 @@ private:
     bool prepare(const HXDDrawPrimitive& primitive);
     // The colour to hand the painter under the present primitive's blending.
     QColor paintColor(const HXDColor& color) const;
-    const QImage* textureImage(const HXDPixelTexture& texture);
+    const tq_raster::Sprite* textureImage(const HXDPixelTexture& texture);
+    // Paints what went to the batch, band by band on this thread and a pool thread. Called
+    // before anything goes through the painter, so that the order of painting stays.
+    void flushDirect();
 
     // Multilines: one run of vertices [first, end) stroked with `painter`; stipple phase
     // carries over from run to run.
@@ -144,6 +155,14 @@ private:
     bool _encoding = false;
     // The present primitive's blending multiplies the source by its alpha (SourceAlpha).
     bool _straightSource = false;
+    // The present primitive blends source-over, and may go straight to the pixels.
+    bool _directSourceOver = false;
+    // The present multiline's polylines go straight to the pixels.
+    bool _directLines = false;
+    bool _directRaster = true;
+    // The frame's pixels, valid while encoding, and what waits to be painted into them.
+    tq_raster::Surface _surface;
+    tq_raster::Batch _batch;
     int _framesPresented = 0;
     std::function<void(const QImage&)> _present;
 
@@ -159,5 +178,5 @@ private:
     QPolygonF _polyline;
     HXDColor _polylineColor;
 
-    std::unordered_map<uint64_t, QImage> _textures;
+    std::unordered_map<uint64_t, tq_raster::Sprite> _textures;
 };
