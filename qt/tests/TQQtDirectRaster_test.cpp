@@ -18,13 +18,11 @@ namespace {
 // line the two drift apart by a few hundredths of a pixel, a few steps of a channel. An
 // off-by-one pixel, a wrong blend or a primitive painted out of order is ten times that.
 constexpr int kCoverageTolerance = 8;
-// Taller than one band of rows, so that bands meet inside every frame.
-constexpr int kWidth = 240;
-constexpr int kHeight = 300;
+// Taller than one band of rows, so that bands meet inside the frame.
+constexpr int kWidth = 240, kHeight = 300;
 
 using Primitives = std::vector<std::shared_ptr<HXDDrawPrimitive>>;
 
-const HXDColor kBackground{0.1f, 0.1f, 0.12f, 1.0f};
 const HXDColor kOrange{0.9f, 0.5f, 0.1f, 1.0f};
 const HXDColor kGreen{0.2f, 0.8f, 0.3f, 1.0f};
 const HXDColor kHalfBlue{0.0f, 0.1f, 0.4f, 0.4f};  // premultiplied: 40 % of a blue
@@ -34,46 +32,32 @@ QImage render(const Primitives& primitives, bool direct) {
     TQQtPainterEncoder encoder(QSize(kWidth, kHeight));
     encoder.setDirectRaster(direct);
     HXDTexture* target = encoder.nextDrawable();
-    if (!target) return {};
     const HXDRenderingContext context(target, 1.0f,
                                       BNViewVolumeProjection(CGRectMake(0, 0, kWidth, kHeight)),
                                       HXDFloat2{1.0f, 1.0f});
-    encoder.beginEncoding(*target, kBackground);
+    encoder.beginEncoding(*target, HXDColor{0.1f, 0.1f, 0.12f, 1.0f});
     encoder.encodePrimitives(primitives, context);
     encoder.endEncoding();
     return encoder.image();
-}
-
-// The largest channel difference, where it is, and how many pixels the reference changed.
-struct Difference {
-    int largest = 0, x = 0, y = 0, changed = 0;
-};
-
-Difference compare(const QImage& direct, const QImage& reference) {
-    Difference d;
-    for (int y = 0; y < reference.height(); ++y)
-        for (int x = 0; x < reference.width(); ++x) {
-            const QRgb a = direct.pixel(x, y), b = reference.pixel(x, y);
-            d.changed += b != qRgb(26, 26, 31) ? 1 : 0;  // the background
-            for (const int diff : {qRed(a) - qRed(b), qGreen(a) - qGreen(b), qBlue(a) - qBlue(b),
-                                   qAlpha(a) - qAlpha(b)})
-                if (std::abs(diff) > d.largest) d = {std::abs(diff), x, y, d.changed};
-        }
-    return d;
 }
 
 std::shared_ptr<HXDMultiline> polyline(const std::vector<CGPoint>& points, HXDColor color,
                                        float width = 1.0f) {
     std::vector<HXDLineVertex> vertices;
     for (const CGPoint& p : points)
-        vertices.emplace_back(HXDFloat3{float(p.x), float(p.y), 0.0f}, color);
+        vertices.emplace_back(HXDFloat3{float(p.x), float(p.y), 0}, color);
     auto line = std::make_shared<HXDMultiline>(std::move(vertices));
     line->setAntialiased(true);
     line->setWidth(width);
     return line;
 }
 
-// A 9 x 9 round keypoint image with a soft rim (premultiplied), at a point.
+std::shared_ptr<HXDMultiline> seg(double x0, double y0, double x1, double y1, HXDColor color,
+                                  float width = 1.0f) {
+    return polyline({CGPointMake(x0, y0), CGPointMake(x1, y1)}, color, width);
+}
+
+// A 9 x 9 round keypoint image with a soft rim (premultiplied), centred on a point.
 std::shared_ptr<HXDQuadTexture> keypoint(double x, double y, float attenuation = 1.0f) {
     static const auto image = [] {
         std::vector<uint8_t> rgba;
@@ -87,81 +71,63 @@ std::shared_ptr<HXDQuadTexture> keypoint(double x, double y, float attenuation =
                                             attenuation);
 }
 
-// One straight antialiased line.
-std::shared_ptr<HXDMultiline> seg(double x0, double y0, double x1, double y1, HXDColor color,
-                                  float width = 1.0f) {
-    return polyline({CGPointMake(x0, y0), CGPointMake(x1, y1)}, color, width);
-}
+TEST(DirectRaster, aFrameOfLinesAndKeypointsMatchesThePainters) {
+    Primitives p;
+    // Every direction from a centre off the grid; lines on pixel centres and edges.
+    for (int k = 0; k < 24; ++k) {
+        const double a = k * M_PI / 12.0 + 0.05;
+        p.push_back(
+            seg(120.3, 150.6, 120.3 + 110 * std::cos(a), 150.6 + 140 * std::sin(a), kOrange));
+    }
+    p.push_back(seg(10, 20.5, 200, 20.5, kGreen));
+    p.push_back(seg(10, 30, 200, 30, kGreen));
+    p.push_back(seg(30.5, 40, 30.5, 290, kGreen));
+    // Nearly flat lines every 16 rows from the top: wherever bands of rows meet, one runs along.
+    for (int row = 16; row < kHeight; row += 16)
+        p.push_back(seg(140, kHeight - row + 0.3, 230, kHeight - row - 0.4, kGreen));
+    // A wiggly curve: steep swings a few pixels apart, as a dense animation draws.
+    std::vector<CGPoint> wiggle;
+    for (int i = 0; i <= 120; ++i)
+        wiggle.push_back(CGPointMake(2 + i * 1.95, 150 + 130 * std::sin(i * 1.3)));
+    p.push_back(polyline(wiggle, kGreen));
+    // Off every edge, far outside, translucent, thin, sub-pixel and zero-length pieces.
+    for (auto line : {seg(-50, 100, 300, 180, kOrange), seg(60, -40, 90, 400, kOrange),
+                      seg(-10, -10, 250, 310, kGreen), seg(239.6, 0.2, 239.6, 299.8, kGreen),
+                      seg(0.3, 299.7, 239.7, 299.7, kGreen), seg(-5000, 50, 5000, 250, kOrange),
+                      seg(20, 260, 220, 60, kHalfBlue), seg(20, 60, 220, 260, kOrange, 0.5f),
+                      polyline({CGPointMake(100.2, 200.2), CGPointMake(100.7, 200.5),
+                                CGPointMake(100.7, 200.5), CGPointMake(101.1, 201.4)},
+                               kGreen)})
+        p.push_back(line);
+    // Keypoints on edges and corners, overlapping, faded; a gradient line and a filled square
+    // go through the painter in between, and what lies under and over them must stay so.
+    auto gradient = std::make_shared<HXDMultiline>(std::vector<HXDLineVertex>{
+        {HXDFloat3{10, 200, 0}, kOrange}, {HXDFloat3{230, 210, 0}, kGreen}});
+    gradient->setAntialiased(true);
+    p.push_back(gradient);
+    for (const CGPoint c : {CGPointMake(1, 150), CGPointMake(239, 150), CGPointMake(120, 1),
+                            CGPointMake(120, 299), CGPointMake(0, 0), CGPointMake(240, 300),
+                            CGPointMake(128.2, 128.7), CGPointMake(131, 130)})
+        p.push_back(keypoint(c.x, c.y));
+    p.push_back(seg(30, 170, 110, 90, kOrange));
+    p.push_back(keypoint(55, 115));
+    p.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(40, 100, 60, 60), 0));
+    p.push_back(keypoint(70, 130, 0.5f));
+    p.push_back(seg(30, 90, 110, 170, kOrange));
 
-void expectSamePicture(const Primitives& primitives) {
-    const QImage reference = render(primitives, false);
-    const QImage direct = render(primitives, true);
-    ASSERT_FALSE(reference.isNull());
+    const QImage reference = render(p, false);
+    const QImage direct = render(p, true);
     ASSERT_EQ(direct.size(), reference.size());
-    const Difference d = compare(direct, reference);
-    EXPECT_GT(d.changed, 100) << "the frame draws almost nothing";
-    EXPECT_LE(d.largest, kCoverageTolerance)
-        << "pixel (" << d.x << ", " << d.y << ") differs by " << d.largest;
-}
-
-TEST(DirectRaster, framesMatchThePainters) {
-    {
-        SCOPED_TRACE("every direction from a centre off the grid, lines on centres and edges");
-        Primitives p;
-        for (int k = 0; k < 24; ++k) {
-            const double a = k * M_PI / 12.0 + 0.05;
-            p.push_back(seg(120.3, 150.6, 120.3 + 110 * std::cos(a), 150.6 + 140 * std::sin(a),
-                            kOrange));
+    int largest = 0;
+    for (int y = 0; y < reference.height(); ++y)
+        for (int x = 0; x < reference.width(); ++x) {
+            const QRgb a = direct.pixel(x, y), b = reference.pixel(x, y);
+            for (const int d : {qRed(a) - qRed(b), qGreen(a) - qGreen(b), qBlue(a) - qBlue(b)}) {
+                EXPECT_LE(std::abs(d), kCoverageTolerance) << "at (" << x << ", " << y << ")";
+                largest = std::max(largest, std::abs(d));
+            }
+            if (largest > kCoverageTolerance) return;  // one pixel says enough
         }
-        p.push_back(seg(10, 20.5, 200, 20.5, kGreen));
-        p.push_back(seg(10, 30, 200, 30, kGreen));
-        p.push_back(seg(30.5, 40, 30.5, 290, kGreen));
-        // Nearly flat lines every 16 rows from the top: wherever bands of rows meet, one
-        // runs along it.
-        for (int row = 16; row < kHeight; row += 16)
-            p.push_back(seg(140, kHeight - row + 0.3, 230, kHeight - row - 0.4, kGreen));
-        expectSamePicture(p);
-    }
-    {
-        SCOPED_TRACE("wiggly curves: steep swings a few pixels apart, over each other");
-        Primitives p;
-        for (int pass = 0; pass < 2; ++pass) {
-            std::vector<CGPoint> points;
-            for (int i = 0; i <= 120; ++i)
-                points.push_back(CGPointMake(2.0 + i * 1.95, 150 + 130 * std::sin(i * 1.3 + pass)));
-            p.push_back(polyline(points, pass == 0 ? kOrange : kGreen));
-        }
-        expectSamePicture(p);
-    }
-    {
-        SCOPED_TRACE("off every edge, far outside, translucent, thin, sub-pixel, zero length");
-        expectSamePicture(
-            {seg(-50, 100, 300, 180, kOrange), seg(60, -40, 90, 400, kOrange),
-             seg(-10, -10, 250, 310, kGreen), seg(239.6, 0.2, 239.6, 299.8, kGreen),
-             seg(0.3, 299.7, 239.7, 299.7, kGreen), seg(-5000, 50, 5000, 250, kOrange),
-             seg(20, 260, 220, 60, kHalfBlue), seg(20, 60, 220, 260, kOrange, 0.5f),
-             polyline({CGPointMake(100.2, 200.2), CGPointMake(100.7, 200.5),
-                       CGPointMake(100.7, 200.5), CGPointMake(101.1, 201.4)},
-                      kGreen)});
-    }
-    {
-        SCOPED_TRACE("keypoints on edges, overlapping, faded, in order with painter primitives");
-        auto gradient = std::make_shared<HXDMultiline>(std::vector<HXDLineVertex>{
-            {HXDFloat3{10, 200, 0}, kOrange}, {HXDFloat3{230, 210, 0}, kGreen}});
-        gradient->setAntialiased(true);
-        Primitives p{seg(0, 10, 240, 290, kGreen), gradient};
-        for (const CGPoint c : {CGPointMake(1, 150), CGPointMake(239, 150), CGPointMake(120, 1),
-                                CGPointMake(120, 299), CGPointMake(0, 0), CGPointMake(240, 300),
-                                CGPointMake(128.2, 128.7), CGPointMake(131, 130)})
-            p.push_back(keypoint(c.x, c.y));
-        // Under the filled square, and over it.
-        p.push_back(seg(30, 170, 110, 90, kOrange));
-        p.push_back(keypoint(55, 115));
-        p.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(40, 100, 60, 60), 0));
-        p.push_back(keypoint(70, 130, 0.5f));
-        p.push_back(seg(30, 90, 110, 170, kOrange));
-        expectSamePicture(p);
-    }
 }
 
 }  // namespace
