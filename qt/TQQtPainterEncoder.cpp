@@ -27,6 +27,10 @@ constexpr size_t kPoolPaintPrimitives = 32;
 constexpr int kBandRows = 128;
 // Points waiting in the batch past which it is painted before the frame ends.
 constexpr size_t kMaxBatchPoints = size_t(1) << 20;
+// Points (a sprite counts as kSpritePoints) in the batch past which it is handed to a pool
+// thread while the frame goes on.
+constexpr size_t kHandOffPoints = 16384;
+constexpr size_t kSpritePoints = 8;
 
 Qt::PenJoinStyle penJoin(HXDLineJoin join) {
     switch (join) {
@@ -122,6 +126,7 @@ CGSize TQQtTextMetrics::sizeOfText(const std::string& text,
 // ---- Frame ----------------------------------------------------------------------------------
 
 TQQtPainterEncoder::~TQQtPainterEncoder() {
+    joinHandOff();
     if (_painter.isActive()) _painter.end();
 }
 
@@ -143,6 +148,7 @@ void TQQtPainterEncoder::beginEncoding(HXDTexture& target, const HXDColor& clear
     _painter.fillRect(QRect(QPoint(0, 0), _target.image().size()), qColor(clearColor));
     // Taken after begin, which has detached the image: these are the pixels it paints.
     _surface = _directRaster ? tq_raster::Surface::of(_target.image()) : tq_raster::Surface();
+    joinHandOff();
     _batch.clear();
     _encoding = true;
     _mapping = HXDScreenMapping();
@@ -277,7 +283,32 @@ bool TQQtPainterEncoder::prepare(const HXDDrawPrimitive& primitive) {
     return true;
 }
 
+void TQQtPainterEncoder::joinHandOff() {
+    if (!_handOffBusy) return;
+    _handOffDone.acquire();
+    _handOffBusy = false;
+}
+
+void TQQtPainterEncoder::maybeHandOff() {
+    if (_batch.pointCount() + kSpritePoints * _batch.spriteCount() < kHandOffPoints) return;
+    if (_handOffBusy) {
+        if (!_handOffDone.tryAcquire()) return;  // still painting: this batch grows meanwhile
+        _handOffBusy = false;
+    }
+    std::swap(_batch, _handedOff);
+    const tq_raster::Surface surface = _surface;
+    _handOffBusy = QThreadPool::globalInstance()->tryStart([this, surface] {
+        _handedOff.paintBand(surface);
+        _handOffDone.release();
+    });
+    if (_handOffBusy)
+        _batch.clear();
+    else
+        std::swap(_batch, _handedOff);  // no pool thread free: it waits for the flush
+}
+
 void TQQtPainterEncoder::flushDirect() {
+    joinHandOff();
     if (_batch.empty()) return;
     const QRect clip = _surface.clip;
     const int bands = std::max(1, (clip.height() + kBandRows - 1) / kBandRows);
@@ -513,6 +544,7 @@ void TQQtPainterEncoder::flushPolyline(QPainter& painter, double widthPixels,
         _batch.addPolyline(_polyline.constData(), size_t(_polyline.size()),
                            qPremultiply(color.rgba()));
         if (_batch.pointCount() > kMaxBatchPoints) flushDirect();
+        maybeHandOff();
     } else if (_polyline.size() >= 2) {
         if (&painter == &_painter) flushDirect();
         painter.setPen(linePen(QBrush(paintColor(_polylineColor)), widthPixels, join));
@@ -623,6 +655,7 @@ void TQQtPainterEncoder::encodeQuadTexture(const HXDQuadTexture& quad,
         const auto opacity =
             static_cast<uint32_t>((std::lround(std::min(attenuation, 1.0f) * 256.0f) * 255) >> 8);
         _batch.addSprite(*sprite, topLeft, opacity);
+        maybeHandOff();
         return;
     }
     flushDirect();

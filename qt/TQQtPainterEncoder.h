@@ -24,6 +24,7 @@
 #include <QImage>
 #include <QPainter>
 #include <QPolygonF>
+#include <QSemaphore>
 
 #include <cstdint>
 #include <functional>
@@ -118,9 +119,14 @@ private:
     // The colour to hand the painter under the present primitive's blending.
     QColor paintColor(const HXDColor& color) const;
     const tq_raster::Sprite* textureImage(const HXDPixelTexture& texture);
-    // Paints what went to the batch, band by band on this thread and a pool thread. Called
-    // before anything goes through the painter, so that the order of painting stays.
+    // Paints what went to the batch (after what was handed off), band by band on this thread
+    // and a pool thread. Called before anything goes through the painter, so that the order
+    // of painting stays.
     void flushDirect();
+    // Once the batch holds enough, a pool thread paints it while the frame goes on, if it is
+    // done with the last one.
+    void maybeHandOff();
+    void joinHandOff();
 
     // Multilines: one run of vertices [first, end) stroked with `painter`; stipple phase
     // carries over from run to run.
@@ -163,6 +169,9 @@ private:
     // The frame's pixels, valid while encoding, and what waits to be painted into them.
     tq_raster::Surface _surface;
     tq_raster::Batch _batch;
+    tq_raster::Batch _handedOff;  // being painted by a pool thread while _handOffBusy
+    QSemaphore _handOffDone;
+    bool _handOffBusy = false;
     int _framesPresented = 0;
     std::function<void(const QImage&)> _present;
 

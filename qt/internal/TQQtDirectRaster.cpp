@@ -175,6 +175,8 @@ Sprite::Sprite(QImage image) {
 void blendSprite(const Surface& surface, const Sprite& sprite, QPoint topLeft, uint32_t opacity) {
     if (!surface.isValid() || sprite.isNull() || opacity == 0) return;
     const QRect& clip = surface.clip;
+    // Most sprites of a frame miss a given band.
+    if (topLeft.y() > clip.bottom() || topLeft.y() + sprite.image().height() <= clip.top()) return;
     const QRect area = clip.intersected(QRect(topLeft, sprite.image().size()));
     if (area.isEmpty()) return;
     for (const Sprite::Run& run : sprite.runs()) {

@@ -75,6 +75,7 @@ public:
     void addSprite(const Sprite& sprite, QPoint topLeft, uint32_t opacity);
     bool empty() const { return _ops.empty(); }
     size_t pointCount() const { return _points.size(); }
+    size_t spriteCount() const { return _ops.size() - _shades.size() / 256; }
     void clear();
 
     // Paints everything recorded into the surface's clip (a band of a larger surface):

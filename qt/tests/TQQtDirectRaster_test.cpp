@@ -85,11 +85,15 @@ TEST(DirectRaster, aFrameOfLinesAndKeypointsMatchesThePainters) {
     // Nearly flat lines every 16 rows from the top: wherever bands of rows meet, one runs along.
     for (int row = 16; row < kHeight; row += 16)
         p.push_back(seg(140, kHeight - row + 0.3, 230, kHeight - row - 0.4, kGreen));
-    // A wiggly curve: steep swings a few pixels apart, as a dense animation draws.
-    std::vector<CGPoint> wiggle;
-    for (int i = 0; i <= 120; ++i)
-        wiggle.push_back(CGPointMake(2 + i * 1.95, 150 + 130 * std::sin(i * 1.3)));
-    p.push_back(polyline(wiggle, kGreen));
+    // A field of small zigzags, steep swings a pixel or two apart as a dense animation draws:
+    // enough points that the frame is painted in parts while it is encoded.
+    for (int cell = 0; cell < 2000; ++cell) {
+        std::vector<CGPoint> zigzag;
+        for (int i = 0; i < 9; ++i)
+            zigzag.push_back(CGPointMake(cell % 40 * 6 + i * 0.6 + 0.1 * (cell % 7),
+                                         cell / 40 * 6 + (i % 2 ? 5.2 : 0.4)));
+        p.push_back(polyline(zigzag, cell % 2 ? kGreen : kOrange));
+    }
     // Off every edge, far outside, translucent, thin, sub-pixel and zero-length pieces.
     for (auto line : {seg(-50, 100, 300, 180, kOrange), seg(60, -40, 90, 400, kOrange),
                       seg(-10, -10, 250, 310, kGreen), seg(239.6, 0.2, 239.6, 299.8, kGreen),
