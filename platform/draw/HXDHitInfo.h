@@ -42,6 +42,8 @@ private:
 class HXDExtraInfo {
 public:
     void setObject(std::string_view key, HXDNumber value);
+    // Room for `count` entries: a dictionary filled per primitive grows once.
+    void reserve(size_t count) { _entries.reserve(count); }
     // Null when the key is absent.
     const HXDNumber* objectForKey(std::string_view key) const;
     void removeObjectForKey(std::string_view key);

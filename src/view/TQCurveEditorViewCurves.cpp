@@ -83,14 +83,15 @@ struct WorldY {
     double operator()(double value) const { return (value * conversion - offset) / scale; }
 };
 
-HXDExtraInfo curveInfo(uint32_t channelId) {
+HXDExtraInfo curveInfo(uint32_t channelId, size_t room = 1) {
     HXDExtraInfo info;
+    info.reserve(room);
     info.setObject("ID", HXDNumber::numberWithInteger(channelId));
     return info;
 }
 
 HXDExtraInfo keyframeInfo(uint32_t channelId, TQKeyframeHandle handle) {
-    HXDExtraInfo info = curveInfo(channelId);
+    HXDExtraInfo info = curveInfo(channelId, 2);  // one allocation per keypoint, not two
     info.setObject("Handle",
                    HXDNumber::numberWithUnsignedLongLong(reinterpret_cast<uintptr_t>(handle)));
     return info;
@@ -397,8 +398,9 @@ void TQCurveEditorViewBase::drawKeypoint(TQKeyframeHandle handle, const CMTime* 
     const double x = CMTimeGetSeconds(*u);
 
     // The value label of the primary keypoint while it is being edited.
-    const TQCurveSelectionPtr primary = _selection->selectionAtIndex(0);
-    if (slot == kSlotSelected && _printText && primary && primary->getHandle() == handle) {
+    const TQCurveSelectionPtr primary =
+        slot == kSlotSelected && _printText ? _selection->selectionAtIndex(0) : nullptr;
+    if (primary && primary->getHandle() == handle) {
         const CGPoint p = getPointScreen(CGPointMake(x, v));
         const double value = channelItem->scaleY() * v + channelItem->offsetY();
         const BNString text = getCoordinates(item, *u, value);
