@@ -49,6 +49,7 @@ TEST_F(CurveKeyframes, reading__neighboursExtremesAndLookupsByTime) {
     CMTime t = seconds(2.01), invalid = kCMTimeInvalid;
     EXPECT_FALSE(c->hasKeyframeAtTime(&t) || c->keyframeExistsAtTime(&t) ||
                  c->nextKeyframeTime(&invalid) || c->previousKeyframeTime(nullptr) ||
+                 c->nextKeyframeTime(nullptr) || c->addKeyframe(nullptr) ||
                  c->keyframeExistsAtTime(nullptr) || c->hasKeyframeAtTime(nullptr, 1.0));
     EXPECT_EQ(c->getPreviousEnabledKeyframe(d), a);
     EXPECT_EQ(c->getPreviousEnabledKeyframe(a), nullptr);

@@ -364,6 +364,11 @@ TEST_F(TreeCompoundTest, linkedEdits__reachEveryComponentInChildOrderUnlinkedOnl
     EXPECT_TRUE(collided) << "moved onto the keyframe at channel 2 s";
     EXPECT_EQ(keys(), "1.5=99 2=0 3=0 | 1.5=20 2=0 3=0 4.5=0 | 2=0 2=30 3=0")
         << "both stay until a purge";
+    observer.told.clear();
+    compound.moveKeyframe(components[1], seconds(5.5), seconds(6), nullptr, nullptr, true);
+    EXPECT_EQ(observer.told, std::vector<TQChannelBase*>{components[1]})
+        << "a component without a keyframe there is neither moved nor announced";
+    compound.moveKeyframe(components[1], seconds(6), seconds(5.5), nullptr, nullptr, true);
     compound.deleteKeyframe(components[0], seconds(2), false);
     compound.deleteKeyframe(components[1], seconds(3), true);
     EXPECT_EQ(keys(), "1.5=99 | 1.5=20 2=0 4.5=0 | 2=0 2=30") << "deletes take channel times";

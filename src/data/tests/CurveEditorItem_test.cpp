@@ -141,6 +141,7 @@ TEST_F(ItemFixture, copy__newIdentitySameColourNoSamples) {
     opacity->setKeyframe(sec(0), 1.0);
     opacity->setKeyframe(sec(1), 2.0);
     opacity->setKeyframeEnabled(opacity->setKeyframe(sec(9), 50.0), false);
+    opacity->setKeyframeEnabled(opacity->setKeyframe(sec(10), -50.0), false);
     auto item = channelItem(opacity, 8);
     EXPECT_EQ(item->minY() + 10 * item->maxY(), 21.0) << "of the enabled keyframes";
     item->setColorIndex(5);
@@ -248,6 +249,7 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     ASSERT_NE(item->snapshotChannel(), nullptr);
     EXPECT_TRUE(*item->snapshotChannel() == *opacity);
     item->setOriginalCurveDirty(1);
+    EXPECT_TRUE(item->samplesU() == nullptr && item->samplesV() == nullptr) << "stale samples go";
     item->takeCurveSnapshot(1);
     EXPECT_EQ(item->numberOfSamplesSnapshot(), 4u) << "an earlier ghost survives";
 

@@ -165,6 +165,13 @@ INSTANTIATE_TEST_SUITE_P(
 class ViewMouse : public ViewFixture {};
 class ViewMouseUndo : public WithReferenceHost<ViewFixture> {};
 
+// The space bar's release stops at the view only after its press was taken.
+TEST_F(ViewMouse, spaceBar__the_release_is_taken_only_after_the_press) {
+    EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
+    EXPECT_TRUE(view.customKeyEquivalent(RWEvent::keyEvent(RWEventType::KeyDown, " ")));
+    EXPECT_TRUE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
+}
+
 TEST_F(ViewMouse, constraints__a_tie_is_vertical_and_time_stays_in_the_ranges) {
     EXPECT_EQ(view.constrainMove(CGPointMake(13, 17), CGPointMake(10, 20)), CGPointMake(10, 20))
         << "the deciding call answers the origin";
