@@ -117,6 +117,13 @@ TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywher
     }
     std::swap(states[0], states[1]);
     EXPECT_FALSE(c->setKeyframeStates(states));
+    std::swap(states[0], states[1]);
+    for (auto spoil : {+[](TQKeyframeState& k) { k.time = kCMTimeInvalid; },
+                       +[](TQKeyframeState& k) { k.interpolation = 99; }}) {
+        std::vector<TQKeyframeState> spoilt = states;
+        spoil(spoilt[1]);
+        EXPECT_FALSE(c->setKeyframeStates(spoilt));
+    }
     EXPECT_EQ(c->setKeyframe(kCMTimeInvalid, 1.0), nullptr);
     EXPECT_EQ(c->setKeyframe(seconds(4.0), NAN), nullptr);
     c->setKeyframeValue(a, INFINITY);

@@ -198,8 +198,10 @@ TEST_F(CtrlMenus, actions__changeWhatTheKindNeedsInOneUndoStepThatGivesItBack) {
         view.setMouseOrigin(view.getPointScreen(CGPointMake(2.5, 0.5)));
         host.setCurrentTime(seconds(1.5));
         const auto before = snapshot();
+        recorder.clearCalls();
         ASSERT_TRUE(
             choose(onCurve ? ctrl().getCurveMenu() : ctrl().getKeyframeMenu(), c.action, c.tag));
+        EXPECT_NE(recorder.bracketText().find("!8"), std::string::npos) << "channels changed";
         std::vector<unsigned> got;
         for (TQKeyframeHandle h : item->channel()->getKeyframes(false))
             got.push_back(item->channel()->getKeyframeInterpolation(h));
