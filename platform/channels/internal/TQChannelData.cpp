@@ -37,9 +37,9 @@ void autoTangents(std::vector<TQKeyframeRecord>& keys, size_t pos) {
         const double span = next->seconds - prev->seconds;
         if (!extreme && span > 0.0) slope = (next->value - prev->value) / span;
     }
-    double lenIn = prev ? (k.seconds - prev->seconds) / 3.0 : 0.0;
+    // At an end both handles take the one segment's third.
     double lenOut = next ? (next->seconds - k.seconds) / 3.0 : 0.0;
-    if (!prev) lenIn = lenOut;
+    const double lenIn = prev ? (k.seconds - prev->seconds) / 3.0 : lenOut;
     if (!next) lenOut = lenIn;
     k.inU = -lenIn;
     k.inV = -lenIn * slope;

@@ -114,7 +114,7 @@ TEST(CMTimeArithmetic, everyOperation__exactRoundedSaturatedAndNonNumeric) {
         "5/1 +- 1/0 = inval inval 1; 3/4~ +- 1/4 = 4/4~ 2/4~ 1; "
         // Of equal times the first is the minimum and the maximum; |INT64_MIN| does not fit.
         "1/2 min 2/4 = 1/2; 2/4 max 1/2 = 2/4; abs of MIN/1 = +inf; abs of -3/4~ = 3/4~; "
-        "abs of -inf = +inf; "
+        "abs of -inf = +inf; abs of -5/0 = -5/0; "
         // Scaling keeps the time's timescale, rounds to nearest and saturates.
         "3/10 * 2.5 = 8/10~; 8/10~ * 2 = 16/10~; 3/10 *u 4 = 12/10; "
         "1/10 *u 3000000000 = 3000000000/10; 1/2 * 3/1 = 3/2; 1/2 * indef = inval; "

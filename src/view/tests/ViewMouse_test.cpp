@@ -144,7 +144,7 @@ INSTANTIATE_TEST_SUITE_P(
         // as the history always read.
         Gesture{"nudges", "A: 10/30=0.25 20/30=0.5", "",
                 "a selectAll:|a nudgeRight:|a nudgeRight:|a nudgeLeft:|a nudgeUp:|"
-                "a nudgeUpFinished:|a nudgeSideways:"},
+                "a nudgeUpFinished:|a nudgeDown:|a nudgeSideways:"},
         // Delete takes the selected keypoints; with the box tool only the box.
         Gesture{"deleteKeys", kBezier, "A@5 A@8", "a delete:"},
         Gesture{"deleteTheBox", kBezier, "", "b|d 1 .9|m 6 -.2|u 6 -.2|?|a delete:"},
