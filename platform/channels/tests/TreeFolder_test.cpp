@@ -167,6 +167,7 @@ TEST_F(TreeFolderTest, ancestors__locksObserversTimeOffsetsAndRoots) {
 TEST_F(TreeFolderTest, children__ownershipMovesAndBadIndices) {
     EXPECT_EQ(object.getChild(99), nullptr);
     EXPECT_EQ(object.getChild(object.numberOfChildren()), nullptr);
+    EXPECT_EQ(object.takeChildAt(object.numberOfChildren()), nullptr);
     EXPECT_FALSE(object.removeChildAt(99));
     EXPECT_EQ(object.takeChildAt(2), nullptr) << "a null slot has nothing to hand over";
     EXPECT_EQ(object.takeChildAt(99), nullptr);
