@@ -317,3 +317,48 @@ TEST(CurveSimplify, smoothing_keeps_a_parabola_and_irons_out_a_zigzag_within_its
         }
     }
 }
+
+TEST(CurveSimplify, keeps_whole_segments_as_stored_and_ignores_a_handle_pointing_backwards) {
+    // A long straight segment, then noise on every frame: the straight one is kept whole, with
+    // the handles it stores for a later change to Bezier.
+    {
+        auto c = std::make_unique<TQChannel>("run", 1, 0.0);
+        c->setInterpolation(kTQInterpolationLinear);
+        c->setKeyframe(frame(0), 0.0);
+        Lcg rng{5};
+        for (int64_t k = 30; k <= 60; ++k) c->setKeyframe(frame(k), 1.0 + 0.2 * rng.next());
+        for (TQKeyframeHandle h : c->getKeyframes(false)) {
+            c->setKeyframeInputTangents(h, -0.01, 0.3);
+            c->setKeyframeOutputTangents(h, 0.01, 0.3);
+        }
+        const auto before = cloneOf(*c);
+        c->simplifyCurve(frame(0), frame(60), frameDuration(), kTQSimplifyBezier, 0, 5.0,
+                         kTQSimplifyOnFrames);
+        const TQKeyframeHandle start = c->getKeyframe(frame(0));
+        ASSERT_TRUE(c->getKeyframe(frame(30))) << "the straight segment is kept whole";
+        double u = 0.0, v = 0.0;
+        c->getKeyframeOutputTangents(start, &u, &v);
+        EXPECT_EQ(u, 0.01);
+        EXPECT_EQ(v, 0.3);
+        EXPECT_EQ(c->getKeyframeInterpolation(start), kTQInterpolationLinear);
+    }
+    // Two Bezier curves alike but for where the span's first keyframe points its backward
+    // handle, the wrong way in both: the fit lines up with neither, so both come out alike.
+    std::unique_ptr<TQChannel> fitted[2];
+    for (int i = 0; i < 2; ++i) {
+        auto& c = fitted[i];
+        c = std::make_unique<TQChannel>("bezier", 1, 0.0);
+        c->setInterpolation(kTQInterpolationBezier);
+        for (int64_t k = 0; k <= 60; k += k < 24 ? 6 : 1)
+            c->setKeyframe(frame(k), std::sin(0.05 * double(k)));
+        const TQKeyframeHandle h = c->getKeyframe(frame(24));
+        c->setKeyframeTangentsBroken(h, true);
+        c->setKeyframeInputTangents(h, 0.05, i == 0 ? 0.025 : 0.03);
+        c->setKeyframeTangentsBroken(h, false);
+        c->simplifyCurve(frame(24), frame(60), frameDuration(), kTQSimplifyBezier, 0, 1.0,
+                         kTQSimplifyOnFrames);
+        c->setKeyframeTangentsBroken(h, true);
+        c->setKeyframeInputTangents(h, -0.05, 0.0);
+    }
+    EXPECT_TRUE(*fitted[0] == *fitted[1]);
+}

@@ -99,6 +99,7 @@ protected:
              }},
             {"noview", [&] { ctrl().setView(nullptr); }},
             {"undrawn", [&] { ctrl().setView(&undrawn); }},
+            {"fps", [&] { EXPECT_TRUE(host.setFrameDuration(CMTimeMake(1, int32_t(N(0))))); }},
         };
         tests_support::runSteps(script, a, steps);
         ctrl().setView(&view);
@@ -184,6 +185,8 @@ INSTANTIATE_TEST_SUITE_P(
              "A@1 A@0 X@0 X@1", "now 1.3; cycle A; cycle Y | menu menuDelete:"},
         Edit{"duplicateOnTakenAndBetweenFrames", "A: 1=3 31/30=4; B: 1.01=7", "A@1 B@1.01",
              "menu menuDuplicate:"},
+        // A thousandth of so short a frame is below the finest time: the steps are one tick.
+        Edit{"duplicateOnATinyFrame", "A: 1=3", "A@1", "fps 100000000 | menu menuDuplicate:"},
         Edit{"addToLinked", "Pos.X: 0=0 4=8; Pos.Y: 0=0 4=8; Pos.Z: 0=0 4=8", "",
              "add X~ 2.01; addvalue X~ 3 6.5", true},
         Edit{"deleteFromLinked", "Pos.X: 0=0 3=2 4=8; Pos.Y: 0=0 3=2 4=8; Pos.Z: 0=0 3=2 4=8", "",
@@ -214,8 +217,9 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"weightedPairKeepsLength", "A: 5=0.3(-0.3,0.2|0.5,0.1)s", "", "tangent A>5 5.6 0.5"},
         Edit{"zeroHandlePulledOut", "A: 5=0(-0.5,-0.1|0,0)", "", "tangent A>5 5.4 0.3"},
         Edit{"noViewWorldIsScreen", "A: 5=0(-0.5,-0.1|0.5,0.1)", "", "noview; tangent A>5 6 0.2"},
-        Edit{"undrawnViewNoNaN", "A: 5=0(-0.5,-0.1|0.5,0.1)", "",
-             "undrawn; tangent A>5 5.2 0.3; tangent45 A>5 5.2 0.3 0"},
+        Edit{"undrawnViewNoNaN", "A: 5=0(-0.5,-0.1|0.5,0.1)", "", "undrawn; tangent A>5 5.2 0.3"},
+        Edit{"undrawnViewNoSnap", "A: 5=0(-0.5,-0.1|0.5,0.1)", "",
+             "| undrawn; tangent45 A>5 5.2 0.3 0"},
         Edit{"snap45", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 5.9 0.3 0"},
         Edit{"snap45FromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
              "save A>5; tangent45 A>5 5.5 0.5 1"},

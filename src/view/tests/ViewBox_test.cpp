@@ -97,6 +97,25 @@ TEST_F(ViewBox, drag__each_part_moves_the_corners_and_the_keypoints_with_them) {
     }
 }
 
+// Unlike the edit drag, the box drag keeps every sample of the curves it deforms; without
+// auto-zoom it pans only once the box's top edge enters the band.
+TEST_F(ViewBox, drag__keeps_the_curves_whole_and_pans_once_the_box_enters_the_band) {
+    build("A: 2=-0.5 6=0.5");
+    band();
+    gesture("z");
+    ASSERT_TRUE(frame());
+    const uint32_t full = item("A")->numberOfSamples();
+    gesture("d 4 0|m 4 .3");
+    EXPECT_EQ(item("A")->numberOfSamples(), full);
+    gesture("u 4 .3");
+    ASSERT_TRUE(frame());
+    gesture("d 4 .3|m 4 -.3|u 4 -.3");
+    EXPECT_TRUE(range().panned.empty()) << "a top at 0.8, a bottom at -0.8: short of the band";
+    ASSERT_TRUE(frame());
+    gesture("d 4 -.3|m 4 .45|u 4 .45");
+    EXPECT_EQ(range().panned.size(), 1u) << "a top at 0.95 is in it";
+}
+
 // The box as a host keeps it for its undo: what getEditBox answers, given back by setEditBox.
 class BoxUndoClient : public TQHostUndoClient {
 public:

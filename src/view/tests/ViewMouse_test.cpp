@@ -166,6 +166,43 @@ INSTANTIATE_TEST_SUITE_P(
 class ViewMouse : public ViewFixture {};
 class ViewMouseUndo : public WithReferenceHost<ViewFixture> {};
 
+// Kept as a snapshot, the ghost is the curve before the first drag.
+TEST_F(ViewMouse, snapshot__the_ghost_stays_the_curve_before_the_first_drag) {
+    ctrl().setSnapshotChannels(true);
+    build(kSketch);
+    const std::string before = keyText(*item("A")->channel(), true);
+    for (const char* drag : {"d 2 0|m 2.5 .3|u 2.5 .3", "d 6 0|m 6.5 .6|u 6.5 .6"}) {
+        ASSERT_TRUE(frame());
+        gesture(drag);
+    }
+    const TQChannel* ghost = item("A")->snapshotChannel();
+    ASSERT_TRUE(ghost);
+    EXPECT_EQ(keyText(*ghost, true), before);
+    EXPECT_NE(keyText(*item("A")->channel(), true), before);
+}
+
+// A controller that puts a moved keypoint on the 1/30 s grid, as the full editor does.
+class GridRangeController : public RangeController {
+public:
+    CMTime convertToCurveEditorAxis(CMTime time) const override {
+        return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, CMTimeMake(1, 60)),
+                                              CMTimeMake(1, 30));
+    }
+};
+class ViewMouseOnGrid : public ViewFixture {
+    std::unique_ptr<TQCurveEditorCtrlBase> makeController() override {
+        return std::make_unique<GridRangeController>();
+    }
+};
+
+// A free drag lands on the grid; one held upright keeps the time it had, even off the grid.
+TEST_F(ViewMouseOnGrid, drag__lands_on_the_grid_unless_held_upright) {
+    build("A: 5.01=0/1 8=0/1");
+    ASSERT_TRUE(frame());
+    gesture("d 5.01 0|m 5.02 .5 s|u 5.02 .5 s|d 8 0|m 8.51 .2|u 8.51 .2");
+    EXPECT_EQ(sceneText(*object, false), "A: 5.01=0.5/1 8.5=0.2/1");
+}
+
 // The space bar's release stops at the view only after its press was taken.
 TEST_F(ViewMouse, spaceBar__the_release_is_taken_only_after_the_press) {
     EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
