@@ -343,7 +343,8 @@ TEST(CurveSimplify, keeps_whole_segments_as_stored_and_ignores_a_handle_pointing
         EXPECT_EQ(c->getKeyframeInterpolation(start), kTQInterpolationLinear);
     }
     // Two Bezier curves alike but for where the span's first keyframe points its backward
-    // handle, the wrong way in both: the fit lines up with neither, so both come out alike.
+    // handle, the wrong way in both: the fit lines up with neither, so both come out alike, and
+    // the curve before the span stays as it was.
     std::unique_ptr<TQChannel> fitted[2];
     for (int i = 0; i < 2; ++i) {
         auto& c = fitted[i];
@@ -355,10 +356,25 @@ TEST(CurveSimplify, keeps_whole_segments_as_stored_and_ignores_a_handle_pointing
         c->setKeyframeTangentsBroken(h, true);
         c->setKeyframeInputTangents(h, 0.05, i == 0 ? 0.025 : 0.03);
         c->setKeyframeTangentsBroken(h, false);
+        const auto before = cloneOf(*c);
         c->simplifyCurve(frame(24), frame(60), frameDuration(), kTQSimplifyBezier, 0, 1.0,
                          kTQSimplifyOnFrames);
+        EXPECT_LE(worstFrameError(*before, *c, 0, 24), 1e-12) << "the Bezier segment before";
         c->setKeyframeTangentsBroken(h, true);
         c->setKeyframeInputTangents(h, -0.05, 0.0);
     }
     EXPECT_TRUE(*fitted[0] == *fitted[1]);
+
+    // Two cubics joined smoothly at 1 s: three keyframes, the join an unbroken pair.
+    auto join = std::make_unique<TQChannel>("join", 1, 0.0);
+    join->setInterpolation(kTQInterpolationLinear);
+    for (int64_t k = 0; k <= 60; ++k) {
+        const double t = double(k) / kFps, s = t - 1.0;
+        join->setKeyframe(frame(k),
+                          t <= 1.0 ? t * t * t - t : 2.0 * s + 0.5 * s * s - 2 * s * s * s);
+    }
+    join->simplifyCurve(frame(0), frame(60), frameDuration(), kTQSimplifyBezier, 0, 0.01,
+                        kTQSimplifyOnFrames);
+    ASSERT_EQ(join->numberOfKeyframes(), 3u);
+    EXPECT_FALSE(join->getKeyframeTangentsBroken(join->getKeyframe(frame(30))));
 }

@@ -77,6 +77,8 @@ TEST_F(ViewBox, drag__each_part_moves_the_corners_and_the_keypoints_with_them) {
          "1.5=-0.5 6.5=-0.5 6.5=0.75 1.5=0.75"},
         {"right side, Option: mirrored", "d 6 0 o|m 6.5 .25 o|u 6.5 .25 o",
          "1.5=-0.5 6.5=-0.5 6.5=0.5 1.5=0.5"},
+        {"left side, Shift: heightened evenly", "d 2 0 s|m 1.5 .25 s|u 1.5 .25 s",
+         "1.5=-0.563 6=-0.563 6=0.563 1.5=0.563"},
         {"inside", "d 4 .1|m 4.5 .35|u 4.5 .35", "2.5=-0.25 6.5=-0.25 6.5=0.75 2.5=0.75"},
         {"inside, Shift: along the larger distance", "d 4 .1 s|m 4.5 .2 s|u 4.5 .2 s",
          "2.5=-0.5 6.5=-0.5 6.5=0.5 2.5=0.5"},
@@ -107,6 +109,9 @@ TEST_F(ViewBox, drag__keeps_the_curves_whole_and_pans_once_the_box_enters_the_ba
     const uint32_t full = item("A")->numberOfSamples();
     gesture("d 4 0|m 4 .3");
     EXPECT_EQ(item("A")->numberOfSamples(), full);
+    const CGPoint fromPress = view.getOffsetFromOriginWorld(0.0, 0.0);
+    EXPECT_NEAR(fromPress.x, 0.0, kWorldTolerance);
+    EXPECT_NEAR(fromPress.y, 0.3, kWorldTolerance);
     gesture("u 4 .3");
     ASSERT_TRUE(frame());
     gesture("d 4 .3|m 4 -.3|u 4 -.3");
