@@ -68,9 +68,8 @@ protected:
         return list.convertPointToWindow(CGPointMake(f.origin.x + x, f.origin.y + 5));
     }
     void pressKey(double x) {
-        list.mouseMoved(RWEvent::mouseEvent(RWEventType::MouseMoved, keyPoint(x)));
-        list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, keyPoint(x)));
-        list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, keyPoint(x)));
+        moveTo(keyPoint(x));
+        press(keyPoint(x), keyPoint(x));
     }
     std::vector<std::string> drawn(const char* column, int64_t r) {
         RecordingDrawing drawing;
@@ -108,7 +107,7 @@ TEST_F(AnimStatusCells, drawing__key_mark_at_the_playhead_and_arrows_and_menu_on
     EXPECT_EQ(drawn(Ctrl::kKeyColumn, row), (std::vector<std::string>{"AnimStatusKeyframe"}));
     EXPECT_TRUE(drawn(Ctrl::kMenuColumn, row).empty()) << "not under the pointer";
 
-    list.mouseMoved(RWEvent::mouseEvent(RWEventType::MouseMoved, keyPoint(5)));
+    moveTo(keyPoint(5));
     host.setCurrentTime(sec(2.5));
     EXPECT_EQ(
         drawn(Ctrl::kKeyColumn, row),
@@ -117,7 +116,7 @@ TEST_F(AnimStatusCells, drawing__key_mark_at_the_playhead_and_arrows_and_menu_on
               (std::vector<std::string>{TQCurveEditorAnimMenuCell::kMenuImage}));
 
     // The object's row is a folder: neither cell draws, hovered or not.
-    list.mouseMoved(RWEvent::mouseEvent(RWEventType::MouseMoved, at(Ctrl::kMenuColumn, 0)));
+    moveTo(at(Ctrl::kMenuColumn, 0));
     EXPECT_TRUE(drawn(Ctrl::kKeyColumn, 0).empty());
     EXPECT_TRUE(drawn(Ctrl::kMenuColumn, 0).empty());
 }
@@ -143,8 +142,7 @@ TEST_F(AnimStatusCells, key_parts__step_between_keyframes_and_add_or_delete_one_
     EXPECT_TRUE(*channel == *keyed);
 
     // A press released in another part does nothing.
-    list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, keyPoint(5)));
-    list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, keyPoint(27)));
+    press(keyPoint(5), keyPoint(27));
     EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), 2.5);
 }
 

@@ -69,9 +69,16 @@ protected:
         return list.convertPointToWindow(
             CGPointMake(f.origin.x + f.size.width / 2, f.origin.y + f.size.height / 2));
     }
+    // A press at `from`, dragged through `via`, released at `to`.
+    void press(CGPoint from, CGPoint to, std::initializer_list<CGPoint> via = {},
+               uint64_t flags = 0) {
+        list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, from, flags));
+        for (const CGPoint& p : via)
+            list.mouseDragged(RWEvent::mouseEvent(RWEventType::LeftMouseDragged, p));
+        list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, to, flags));
+    }
     void click(const char* column, int64_t row, uint64_t flags = 0) {
-        list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, at(column, row), flags));
-        list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, at(column, row), flags));
+        press(at(column, row), at(column, row), {}, flags);
     }
     void moveTo(const CGPoint& point) {
         list.mouseMoved(RWEvent::mouseEvent(RWEventType::MouseMoved, point));

@@ -131,42 +131,35 @@ TEST_F(ChannelListTest, valueEdits__typedOrScrubbedOneUndoStepAtTheCurrentTime) 
     channel->setObjectManipulator(&manipulator);
     const std::unique_ptr<TQChannelBase> before(channel->cloneChannel());
     const unsigned keys = channel->numberOfKeyframes();
+    // Undo takes back one step of the rows' name, to the channel as it was.
+    auto undoOneStep = [&] {
+        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Value"));
+        ASSERT_TRUE(host.undo());
+        EXPECT_EQ(*channel, *before);
+        EXPECT_FALSE(host.canUndo()) << "one step";
+    };
     type(row, "25");
     EXPECT_EQ(channel->numberOfKeyframes(), keys + 1) << "a keyframe at the playhead";
     EXPECT_DOUBLE_EQ(item->currentValue() * item->conversionFactor(), 25.0)
         << "typed in display units";
     EXPECT_FALSE(list.isEditing()) << "Return does not move the edit to the next row";
-    ASSERT_TRUE(host.canUndo());
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Value"));
-    host.undo();
-    EXPECT_EQ(*channel, *before);
-    EXPECT_FALSE(host.canUndo()) << "one step";
+    undoOneStep();
     channel->setObjectManipulator(nullptr);
 
     SCOPED_TRACE("a drag in the value cell scrubs, as one step");
     host.setCurrentTime(kCMTimeZero);  // where the title is still fading in
     const double start = item->currentValue();
-    const CGPoint press = at(Ctrl::kValueColumn, row);
-    list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, press));
-    for (double dx : {2.0, 10.0, 20.0})
-        list.mouseDragged(
-            RWEvent::mouseEvent(RWEventType::LeftMouseDragged, press + CGPointMake(dx, 0)));
-    list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, press + CGPointMake(20, 0)));
+    const CGPoint from = at(Ctrl::kValueColumn, row), to = from + CGPointMake(20, 0);
+    press(from, to, {from + CGPointMake(2, 0), from + CGPointMake(10, 0), to});
     // Five steps of the channel's nudge step (a hundredth of opacity).
     EXPECT_NEAR(item->currentValue(), start + 5 * 0.01, 1e-9);
     EXPECT_FALSE(list.isEditing()) << "a scrub is no click: no edit starts";
-    ASSERT_TRUE(host.canUndo());
-    host.undo();
-    EXPECT_EQ(*channel, *before);
-    EXPECT_FALSE(host.canUndo()) << "one step";
+    undoOneStep();
 }
 
 TEST_F(ChannelListTest, dragOut__leavesCustomSetNotScene) {
     auto dragName = [&](int64_t row, const CGPoint& to) {
-        const CGPoint from = at(Ctrl::kNameColumn, row);
-        list.mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, from));
-        list.mouseDragged(RWEvent::mouseEvent(RWEventType::LeftMouseDragged, to));
-        list.mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, to));
+        press(at(Ctrl::kNameColumn, row), to, {to});
     };
     const CGPoint outside = list.convertPointToWindow(CGPointMake(-50, 30));
     {  // An automatic set takes no changes by hand.

@@ -29,10 +29,7 @@ protected:
 
     // Bounce (title's opacity and x position), Fades (opacity, key "f"), Spin (relative).
     void makeSets() {
-        TQChannelObjectRootBase* title = object(kTQHostSampleTitleObject);
-        auto channel = [&](const char* path) {
-            return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(title));
-        };
+        auto channel = [&](const char* path) { return this->channel("Title", path); };
         ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("Bounce"));
         ctrl.appendChannelToCurveSet(channel("./1/200/202"));
         ctrl.appendChannelToCurveSet(channel("./1/100/101/1"));
@@ -46,10 +43,8 @@ protected:
     std::vector<SetForm> forms() const {
         std::vector<SetForm> out;
         for (const TQCurveSetPtr& set : ctrl.curveSets()) {
-            SetForm form{set->curveSetName(), set->curveSetShortcut(), set->isRelative(), {}};
-            for (const TQCurveEditorItemPtr& item : set->allItems())
-                form.channels.push_back(item->channelBase());
-            out.push_back(form);
+            out.push_back({set->curveSetName(), set->curveSetShortcut(), set->isRelative(),
+                           channelsOf(*set)});
         }
         return out;
     }

@@ -25,11 +25,6 @@ protected:
         const auto objects = host.scene().objects();
         return {objects.begin(), objects.end()};
     }
-    static std::vector<const TQChannelBase*> channelsOf(const TQCurveSet& set) {
-        std::vector<const TQChannelBase*> out;
-        for (const TQCurveEditorItemPtr& item : set.allItems()) out.push_back(item->channelBase());
-        return out;
-    }
 };
 
 TEST_F(CurveSetRegistry, pop_up__each_automatic_set_shows_what_it_finds_for_the_selection) {

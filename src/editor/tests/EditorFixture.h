@@ -198,13 +198,15 @@ protected:
     TQChannel* channel(const char* objectName, TQHostProperty property, size_t axis = 0) {
         return channel(objectName, TQHostPropertyPaths(family(), property)[axis]);
     }
-    // The channels the selected set shows, in order.
-    std::vector<const TQChannelBase*> shownChannels() const {
+    // The channels a set shows, in order; those of the selected set.
+    static std::vector<const TQChannelBase*> channelsOf(const TQCurveSet& set) {
         std::vector<const TQChannelBase*> out;
-        if (const TQCurveSetPtr& set = ctrl.selectedCurveSet())
-            for (const TQCurveEditorItemPtr& item : set->allItems())
-                out.push_back(item->channelBase());
+        for (const TQCurveEditorItemPtr& item : set.allItems()) out.push_back(item->channelBase());
         return out;
+    }
+    std::vector<const TQChannelBase*> shownChannels() const {
+        const TQCurveSetPtr& set = ctrl.selectedCurveSet();
+        return set ? channelsOf(*set) : std::vector<const TQChannelBase*>{};
     }
     // The keypoints of the channel at those times (every one when none are given), selected in
     // the view alone.

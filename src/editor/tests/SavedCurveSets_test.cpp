@@ -21,11 +21,9 @@ protected:
         for (const TQCurveSetPtr& set : ctrl.curveSets()) {
             std::string form = set->curveSetName() + (set->isRelative() ? "/relative:" : ":");
             for (const TQCurveEditorItemPtr& item : set->allItems())
-                form.append(" ")
-                    .append(pathOf(item->channelBase()))
-                    .append("#")
-                    .append(std::to_string(
-                        static_cast<const TQCurveEditorChannelItem&>(*item).colorIndex()));
+                form += " " + pathOf(item->channelBase()) + "#" +
+                        std::to_string(
+                            static_cast<const TQCurveEditorChannelItem&>(*item).colorIndex());
             out.push_back(form);
         }
         return out;
