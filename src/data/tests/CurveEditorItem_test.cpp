@@ -60,16 +60,17 @@ protected:
 }  // namespace
 
 TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
-    EXPECT_EQ(channelItem(x)->simpleName(), "Position.X")
-        << "a component reads compound dot component";
+    // A component reads compound dot component, naming stops at the object root, the parent
+    // folder is named; a flagged root names itself, and takes part above the parent.
+    const auto names = [&] {
+        return std::vector{channelItem(x)->simpleName(), channelItem(opacity)->simpleName(),
+                           channelItem(deep)->simpleName()};
+    };
+    EXPECT_EQ(names(), (std::vector<BNString>{"Position.X", "Opacity", "Extra.Deep"}));
     EXPECT_EQ(channelItem(x)->rootName(), std::optional<BNString>("Cube"));
-    EXPECT_EQ(channelItem(opacity)->simpleName(), "Opacity") << "naming stops at the object root";
-    EXPECT_EQ(channelItem(deep)->simpleName(), "Extra.Deep") << "the parent folder is named";
     cube->setFlag(kTQChannelFlagNameInDisplayName);
-    EXPECT_EQ(channelItem(opacity)->simpleName(), "Cube.Opacity") << "a flagged root names itself";
-    EXPECT_EQ(channelItem(deep)->simpleName(), "Extra.Deep");
-    EXPECT_EQ(channelItem(x)->simpleName(), "Cube.Transform.Position.X")
-        << "a flagged root above the parent takes part";
+    EXPECT_EQ(names(),
+              (std::vector<BNString>{"Cube.Transform.Position.X", "Cube.Opacity", "Extra.Deep"}));
     auto* sized = add<TQChannel>(transform, "Cube Size", 5);
     EXPECT_EQ(channelItem(sized)->simpleName(), "Cube Size") << "a name holding its root's stays";
     auto* loose = add<TQChannel>(scene.get(), "Loose", 900);
@@ -149,9 +150,9 @@ TEST_F(ItemFixture, copy__newIdentitySameColourNoSamples) {
     ASSERT_NE(item->samplesV(), nullptr);
     auto copy = std::static_pointer_cast<TQCurveEditorChannelItem>(item->copy());
     EXPECT_NE(copy->channelId(), item->channelId());
-    EXPECT_EQ(copy->colorIndex(), 5u);
-    EXPECT_EQ(copy->samplesV(), nullptr) << "samples are not copied";
-    EXPECT_TRUE(copy->isEqual(*item));
+    // Samples are not copied.
+    EXPECT_EQ(std::tuple(copy->colorIndex(), copy->samplesV(), copy->isEqual(*item)),
+              std::tuple(5u, nullptr, true));
 }
 
 TEST_F(ItemFixture, refreshOriginalCurve__pinsSamplesOntoKeyframes) {
@@ -165,12 +166,9 @@ TEST_F(ItemFixture, refreshOriginalCurve__pinsSamplesOntoKeyframes) {
     ASSERT_EQ(item->numberOfSamples(), 5u);
     const CMTime* u = item->samplesU();
     const double* v = item->samplesV();
-    EXPECT_EQ(CMTimeCompare(u[2], sec(1.4)), 0);
-    EXPECT_NEAR(v[2], 3.0, kTol);
-    EXPECT_EQ(CMTimeCompare(u[3], sec(1.6)), 0);
-    EXPECT_NEAR(v[3], 4.0, kTol);
-    EXPECT_EQ(CMTimeCompare(u[4], sec(4)), 0) << "a keyframe past the last sample pins nothing";
-    EXPECT_NEAR(v[4], opacity->getCurveValue(sec(4)), kTol);
+    // A keyframe past the last sample pins nothing.
+    EXPECT_EQ(std::vector(u + 2, u + 5), (std::vector{sec(1.4), sec(1.6), sec(4)}));
+    EXPECT_EQ(std::vector(v + 2, v + 5), (std::vector{3.0, 4.0, opacity->getCurveValue(sec(4))}));
     EXPECT_EQ(item->originalCurveDirty(), 0);
     EXPECT_EQ(item->processedSamplesV(), nullptr) << "both curves go stale together";
 
@@ -184,8 +182,8 @@ TEST_F(ItemFixture, maxY__processedCurveWidensAtMostFiveTimes) {
     opacity->setKeyframe(sec(1), 1.0);
     opacity->addBehavior(std::make_unique<TQOscillateBehavior>(100.0, 1.0));
     auto item = channelItem(opacity);
-    EXPECT_NEAR(item->maxY(), 5.0, kTol) << "range 0..1 and a peak near 100 widen to 5";
-    EXPECT_NEAR(item->minY(), -4.0, kTol) << "the minimum mirrors it: 1 + (0 - 1) * 5";
+    // Range 0..1 and a peak near 100 widen to 5; the minimum mirrors it: 1 + (0 - 1) * 5.
+    EXPECT_EQ(std::pair(item->minY(), item->maxY()), std::pair(-4.0, 5.0));
     EXPECT_EQ(item->processedCurveDirty(), 1) << "samples taken to measure are not for drawing";
 }
 
@@ -196,12 +194,10 @@ TEST_F(ItemFixture, newSampleCount__readersTakeOnlyWhatTheHeldArraysHoldUntilThe
     auto item = channelItem(opacity, 5);
     item->refreshOriginalCurve(kCMTimeZero, sec(1));
     item->refreshProcessedCurve(kCMTimeZero, sec(1));
-    const double maxBefore = item->maxY();
-    const double minBefore = item->minY();
-
+    const auto extremes = [&] { return std::pair(item->minY(), item->maxY()); };
+    const auto before = extremes();
     item->setNumberOfSamples(5000);  // the arrays still hold 5
-    EXPECT_EQ(item->maxY(), maxBefore) << "extremes of the samples held";
-    EXPECT_EQ(item->minY(), minBefore);
+    EXPECT_EQ(extremes(), before) << "extremes of the samples held";
     item->takeCurveSnapshot(1);
     ASSERT_EQ(item->numberOfSamplesSnapshot(), 5u) << "the ghost is the curve as last drawn";
     EXPECT_EQ(item->samplesVSnapshot()[4], 4.0);
@@ -215,8 +211,7 @@ TEST_F(ItemFixture, newSampleCount__readersTakeOnlyWhatTheHeldArraysHoldUntilThe
 TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
     auto empty = std::make_shared<TQCurveEditorFolderItem>();
     empty->initWithRoot(cube, 0, &host, 1);
-    EXPECT_EQ(empty->isEnabledItem(), 1);
-    EXPECT_TRUE(empty->isAnimatedChannel());
+    EXPECT_TRUE(empty->isEnabledItem() == 1 && empty->isAnimatedChannel());
 
     auto root = std::make_shared<TQCurveEditorFolderItem>();
     root->initWithChannel(cube, 0, &host, 1);
@@ -254,19 +249,16 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     EXPECT_EQ(item->numberOfSamplesSnapshot(), 4u) << "an earlier ghost survives";
 
     cube->removeChild(opacity);  // the channel vanishes under the live item
-    EXPECT_EQ(item->channel(), nullptr);
-    EXPECT_FALSE(item->isValid());
-    EXPECT_TRUE(item->isHidden());
-    EXPECT_EQ(item->numberOfKeypoints(), 0u);
-    EXPECT_EQ(item->minY(), 0.0);
-    EXPECT_TRUE(item->compoundChannelComponents().empty());
+    EXPECT_EQ(
+        std::tuple(item->channel(), item->isValid(), item->isHidden(), item->numberOfKeypoints(),
+                   item->minY(), item->compoundChannelComponents().size()),
+        std::tuple(nullptr, false, true, 0u, 0.0, 0u));
     item->refreshOriginalCurve(kCMTimeZero, sec(1));
     item->refreshProcessedCurve(kCMTimeZero, sec(1));
-    EXPECT_EQ(item->numberOfSamples(), 0u);
-    EXPECT_TRUE(!item->processedSamplesU() && !item->processedSamplesV());
     item->takeCurveSnapshot(1);
-    EXPECT_EQ(item->numberOfSamplesSnapshot(), 0u);
-    EXPECT_EQ(item->snapshotChannel(), nullptr);
+    EXPECT_TRUE(!item->numberOfSamples() && !item->processedSamplesU() &&
+                !item->processedSamplesV() && !item->numberOfSamplesSnapshot() &&
+                !item->snapshotChannel());
 }
 
 TEST_F(ItemFixture, compound__componentsOwnFirst) {

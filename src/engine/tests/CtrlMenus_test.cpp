@@ -66,47 +66,37 @@ protected:
 
 TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelection) {
     // Arrangement: "L2" locks the keypoint at 2, "D3" disables the one at 3, "B2" makes the
-    // one at 2 Bezier, "C" locks the channel; then the keypoints selected.
+    // one at 2 Bezier, "C" locks the channel, "@3" selects the keypoint at 3.
     struct Case {
         const char* arrange;
-        std::vector<double> selected;
         const char* want;
     };
     const std::vector<Case> cases = {
         {"",
-         {},
          "[Delete] [Reverse] [Ease In] [Ease Out] [Ease In and Out] [Constant] [Linear] [Bézier] "
          "[Catmull-Rom] [Exponential] [Logarithmic] Unlock [Disable]"},
-        {"",
-         {3},
+        {"@3",
          "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear* Bézier Catmull-Rom "
          "Exponential Logarithmic Lock Disable"},
-        {"B2",
-         {3},
+        {"B2 @3",
          "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear~ Bézier~ Catmull-Rom "
          "Exponential Logarithmic Lock Disable"},
-        {"B4",
-         {2, 4},
+        {"B4 @2 @4",
          "Delete Reverse Ease In Ease Out Ease In and Out Constant~ Linear~ Bézier~ Catmull-Rom~ "
          "Exponential~ Logarithmic~ Lock Disable"},
-        {"L2 L3",
-         {2, 3},
+        {"L2 L3 @2 @3",
          "Delete Reverse Ease In Ease Out Ease In and Out [Constant] [Linear] [Bézier] "
          "[Catmull-Rom] [Exponential] [Logarithmic] Unlock [Disable]"},
-        {"L2",
-         {2, 3},
+        {"L2 @2 @3",
          "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear* Bézier Catmull-Rom "
          "Exponential Logarithmic Lock~ Disable"},
-        {"D2 D3",
-         {2, 3},
+        {"D2 D3 @2 @3",
          "[Delete] [Reverse] [Ease In] [Ease Out] [Ease In and Out] [Constant] [Linear] [Bézier] "
          "[Catmull-Rom] [Exponential] [Logarithmic] Lock Enable"},
-        {"D3",
-         {2, 3},
+        {"D3 @2 @3",
          "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear* Bézier Catmull-Rom "
          "Exponential Logarithmic Lock Disable~"},
-        {"C",
-         {3},
+        {"C @3",
          "[Delete] [Reverse] Ease In Ease Out Ease In and Out [Constant] [Linear]* [Bézier] "
          "[Catmull-Rom] [Exponential] [Logarithmic] [Lock] [Disable]"},
     };
@@ -116,6 +106,7 @@ TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelec
         set->clear();
         auto item = fourKeys();
         TQChannel* channel = item->channel();
+        TQCurveSelectionList* list = selectInView({});
         std::istringstream words(c.arrange);
         for (std::string w; words >> w;) {
             const TQKeyframeHandle h =
@@ -124,9 +115,8 @@ TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelec
             if (w[0] == 'D') channel->setKeyframeEnabled(h, false);
             if (w[0] == 'B') channel->setKeyframeInterpolation(h, kTQInterpolationBezier);
             if (w[0] == 'C') channel->setLocked(true, false);
+            if (w[0] == '@') list->addSelection(keypointEntry(item, w[1] - '0'));
         }
-        TQCurveSelectionList* list = selectInView({});
-        for (double t : c.selected) list->addSelection(keypointEntry(item, t));
         EXPECT_EQ(reading(ctrl().getKeyframeMenu()), c.want);
     }
 }
