@@ -3,7 +3,6 @@
 // and the animation menu opened from a row, read back item by item for the selections that
 // change it.
 
-#include <algorithm>
 #include <memory>
 #include <string>
 #include <vector>

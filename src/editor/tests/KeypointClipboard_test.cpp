@@ -4,8 +4,6 @@
 // holds that is not ours, is damaged or has nowhere to go changes nothing; and the items that
 // offer these commands are enabled when they can act (a cut, one named step, enables Paste).
 
-#include <algorithm>
-#include <memory>
 #include <string>
 
 #include "platform/channels/TQChannelTypes.h"

@@ -5,9 +5,6 @@
 // (baselines/edits.txt, see TextBaseline.h); every row is undone to the very scene it started
 // from and redone to the one it made.
 
-#include <functional>
-#include <map>
-#include <sstream>
 #include <string>
 
 #include "src/engine/TQEditBrackets.h"

@@ -9,6 +9,7 @@
 #include "src/engine/TQEditBrackets.h"
 #include "src/mini/tests/MiniFixture.h"
 #include "src/resources/TQStrings.h"
+#include "tests/support/SceneText.h"
 
 using namespace mini_test;
 
@@ -18,21 +19,20 @@ class MiniCtrl : public MiniFixture {};
 
 TEST_F(MiniCtrl, setChannel__a_channel_or_a_folder_fills_the_private_set) {
     editor.setChannel(gain);
-    EXPECT_EQ(ctrl().numberOfChannelItems(), 1u);
-    EXPECT_TRUE(ctrl()._linked);
-    EXPECT_EQ(ctrl().getCurrentTool(), TQTool::kEdit);
-    EXPECT_EQ(ctrl().selectedCurveSet()->curveSetName(),
-              TQLocalizedString("Curve Editor Curve Set Untitled"));
-    EXPECT_EQ(editor.axisY().stringValue(), "Gain");
-    EXPECT_EQ(view().getController(), editor.controller());
+    EXPECT_EQ(
+        std::tuple(ctrl().numberOfChannelItems(), ctrl()._linked, ctrl().getCurrentTool(),
+                   ctrl().selectedCurveSet()->curveSetName(), editor.axisY().stringValue(),
+                   view().getController()),
+        std::tuple(1u, true, TQTool::kEdit, TQLocalizedString("Curve Editor Curve Set Untitled"),
+                   "Gain", editor.controller()));
     editor.setChannel(gradient);
     EXPECT_EQ(ctrl().numberOfChannelItems(), 2u) << "both components of the pair";
     const auto item = ctrl().selectedCurveSet()->itemWithChannel(gradient->getXChannel());
     ASSERT_NE(item, nullptr);
     EXPECT_FALSE(static_cast<TQCurveEditorChannelItem&>(*item).drawProcessedCurve());
     editor.setChannel(nullptr);
-    EXPECT_EQ(ctrl().numberOfChannelItems(), 0u) << "a null channel is an empty folder";
-    EXPECT_FALSE(editor.hasSelection());
+    EXPECT_FALSE(ctrl().numberOfChannelItems() || editor.hasSelection())
+        << "a null channel is an empty folder";
 }
 
 TEST_F(MiniCtrl, defaultMenu__extrapolation_submenus_reflect_the_first_channel) {
@@ -50,15 +50,14 @@ TEST_F(MiniCtrl, defaultMenu__extrapolation_submenus_reflect_the_first_channel) 
         states += std::to_string(item->state());
     }
     EXPECT_EQ(states, "00100");
-    EXPECT_TRUE(ctrl().validateDefaultMenuItem(*post->submenu()->itemArray()[0]));
-    EXPECT_EQ(post->submenu()->itemArray()[0]->state(), 1);
+    const RWMenuItemPtr& firstPost = post->submenu()->itemArray()[0];
+    EXPECT_TRUE(ctrl().validateDefaultMenuItem(*firstPost) && firstPost->state() == 1);
 
     // Without a channel nothing is valid, and the states stay as they were.
     editor.setChannel(nullptr);
     RWMenuItem& pingPong = *ctrl().getDefaultMenu()->itemArray()[0]->submenu()->itemArray()[2];
     pingPong.setState(1);
-    EXPECT_FALSE(ctrl().validateDefaultMenuItem(pingPong));
-    EXPECT_EQ(pingPong.state(), 1);
+    EXPECT_TRUE(!ctrl().validateDefaultMenuItem(pingPong) && pingPong.state() == 1);
     RWMenuItem del("Delete", "delete:");
     EXPECT_TRUE(ctrl().validateMenuItem(del));
 }
@@ -94,7 +93,6 @@ TEST_F(MiniCtrl, menu_commands__every_channel_in_one_undo_step) {
         ASSERT_TRUE(ctrl().performAction(row.action, sender));
         EXPECT_TRUE(*object == *want);
         EXPECT_EQ(recorder.captureBalance(), 0);
-        ASSERT_FALSE(recorder.bracketSequence().empty());
         EXPECT_EQ(recorder.bracketSequence().back(), "postNotification(0x8)");
         EXPECT_EQ(host.undoDescription(), TQLocalizedString(row.undoKey));
         ASSERT_TRUE(host.undo());
@@ -105,8 +103,9 @@ TEST_F(MiniCtrl, menu_commands__every_channel_in_one_undo_step) {
     RWMenuItem lock("", "menuLockChannel:channel:");
     for (const bool locked : {true, false}) {
         ctrl().performAction(lock.action(), lock);
-        EXPECT_EQ(gradient->getXChannel()->isLocked(false), locked);
-        EXPECT_EQ(gradient->getYChannel()->isLocked(false), locked);
+        EXPECT_EQ(std::pair(gradient->getXChannel()->isLocked(false),
+                            gradient->getYChannel()->isLocked(false)),
+                  std::pair(locked, locked));
     }
 
     SCOPED_TRACE("the chosen interpolation is ticked; the mixed tag does nothing");
@@ -123,26 +122,25 @@ TEST_F(MiniCtrl, menu_commands__every_channel_in_one_undo_step) {
     ctrl().performAction(mixed->action(), *mixed);
     EXPECT_TRUE(recorder.calls().empty()) << "not even a bracket";
     ctrl().performAction(linear->action(), *linear);
-    EXPECT_EQ(gain->getInterpolation(), static_cast<unsigned>(kTQInterpolationLinear));
-    EXPECT_EQ(linear->state(), 1);
-    EXPECT_EQ(mixed->state(), 0);
+    EXPECT_EQ(std::tuple(gain->getInterpolation(), linear->state(), mixed->state()),
+              std::tuple(unsigned{kTQInterpolationLinear}, 1, 0));
 }
 
 TEST_F(MiniCtrl, selection__mirrored_onto_items_and_read_by_the_rows) {
     editor.setChannel(gain);
     recorder.clearCalls();
     selectKeys(gain, {0.5});
+    // What the rows read: the selection, its position and value.
+    const auto read = [&] {
+        return std::tuple(ctrl().numberOfSelectedChannels(), editor.hasSelection(),
+                          CMTimeGetSeconds(editor.getSelectedValueX()), editor.getSelectedValueY());
+    };
     EXPECT_EQ(recorder.count("postNotification"), 1u);
-    EXPECT_EQ(ctrl().numberOfSelectedChannels(), 1u);
-    EXPECT_TRUE(editor.hasSelection());
-    EXPECT_DOUBLE_EQ(CMTimeGetSeconds(editor.getSelectedValueX()), 0.5);
-    EXPECT_DOUBLE_EQ(editor.getSelectedValueY(), 30.0);
+    EXPECT_EQ(read(), std::tuple(1u, true, 0.5, 30.0));
 
     // Tangent entries count as a selection, but give no position.
     view().getSelection()->getSelectionArray().front()->setFlags(TQSelectionOutTangent);
-    EXPECT_TRUE(editor.hasSelection());
-    EXPECT_EQ(CMTimeCompare(editor.getSelectedValueX(), kCMTimeZero), 0);
-    EXPECT_EQ(editor.getSelectedValueY(), 0.0);
+    EXPECT_EQ(read(), std::tuple(1u, true, 0.0, 0.0));
 
     view().getSelection()->reset();
     ctrl().selectionChangedTo(view().getSelection());
@@ -153,9 +151,7 @@ TEST_F(MiniCtrl, move__primary_takes_the_value_others_keep_their_distance_pairs_
     editor.setChannel(gain);
     selectKeys(gain, {0.5, 1.0});
     editor.setSelectedValueY(40.0);
-    EXPECT_DOUBLE_EQ(keyValue(*gain, 0.5), 40.0);
-    EXPECT_DOUBLE_EQ(keyValue(*gain, 1.0), 30.0);
-    EXPECT_DOUBLE_EQ(keyValue(*gain, 0.0), 10.0) << "unselected keypoints stay";
+    EXPECT_EQ(keyText(*gain), "0=10 0.5=40 1=30") << "unselected keypoints stay";
 
     // In x a linked pair moves as a whole.
     editor.setChannel(gradient);

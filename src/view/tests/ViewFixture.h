@@ -5,7 +5,6 @@
 // gestures as RWEvent sequences at world points of the last frame. The stub host is 800 x 400
 // points at scale 1 with the view at the window's origin, so a window point is a pixel.
 
-#include <cmath>
 #include <cstdint>
 #include <cstdio>
 #include <sstream>

@@ -2,8 +2,6 @@
 // framing and the resets, with the words they post.
 
 #include <cmath>
-#include <functional>
-#include <map>
 #include <sstream>
 
 #include "src/view/tests/ViewFixture.h"
