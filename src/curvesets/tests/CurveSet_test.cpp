@@ -134,9 +134,9 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
     set->insertItem(y, z->channelId());  // enabled as it comes in
     set->appendItem(itemFor(ball, "./1/200/202"));
     EXPECT_EQ(text(*set), "Cube[X Y Z] Ball[Opacity]");
-    EXPECT_EQ(set->channeItemAtIndex(2), z);
-    EXPECT_EQ(set->channeItemAtIndex(4), nullptr);
-    EXPECT_EQ(set->itemWithIdentifier(y->channelId()), y);
+    EXPECT_EQ(std::tuple(set->channeItemAtIndex(2), set->channeItemAtIndex(4),
+                         set->itemWithIdentifier(y->channelId())),
+              std::tuple(z, nullptr, y));
     EXPECT_FALSE(set->removeItemNotInList({x, y, z}));
     EXPECT_EQ(text(*set), "Cube[X Y Z]");
     set->setItem(nullptr);
@@ -156,9 +156,8 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
 
 TEST_F(CurveSetFixture, identity__namesShortcutsIdsAndCopies) {
     auto a = relativeSet(position), b = relativeSet(refs({"./1/304"}));
-    EXPECT_TRUE(a->isEqual(*b)) << "sets are equal by name alone";
-    EXPECT_NE(a->curveSetId(), b->curveSetId());
-    EXPECT_EQ(a->shortcut(), 0);
+    EXPECT_TRUE(a->isEqual(*b) && a->curveSetId() != b->curveSetId() && a->shortcut() == 0)
+        << "sets are equal by name alone";
     a->setCurveSetShortcut("U");
     EXPECT_EQ(a->curveSetShortcut() + char(a->shortcut()), "uu");
     b->setCurveSetShortcut("ÄRGER");
@@ -171,17 +170,17 @@ TEST_F(CurveSetFixture, identity__namesShortcutsIdsAndCopies) {
     auto copy = a->copy();
     EXPECT_NE(dynamic_cast<TQCurveSetMutable*>(copy.get()), nullptr) << "copies keep the class";
     EXPECT_EQ(*copy->references(), position) << "the source's paths survive, unmatched ones too";
-    EXPECT_EQ(copy->curveSetShortcut(), "u");
-    EXPECT_EQ(text(*copy), "Cube[Y Z]");
-    EXPECT_TRUE(copy->isRelative());
+    EXPECT_EQ(std::tuple(copy->curveSetShortcut(), text(*copy), copy->isRelative()),
+              std::tuple("u", "Cube[Y Z]", true));
     copy->setRelative(false);
     EXPECT_FALSE(copy->hasReferences()) << "an absolute set keeps no paths";
     EXPECT_NE(copy->channeItemAtIndex(0)->channelId(), a->channeItemAtIndex(0)->channelId());
 
     TQCurveSetMutable fromSet;
     fromSet.initWithCurveSet(*a);
-    EXPECT_EQ(fromSet.curveSetShortcut(), "") << "initWithCurveSet leaves the shortcut";
-    EXPECT_EQ(*fromSet.references(), position);
+    EXPECT_EQ(std::pair(fromSet.curveSetShortcut(), *fromSet.references()),
+              std::pair(BNString(), position))
+        << "initWithCurveSet leaves the shortcut";
 }
 
 }  // namespace

@@ -55,11 +55,11 @@ protected:
     RWMemoryUserDefaults _defaults;
 };
 
-void expectRect(const BNRect<double>& r, double x, double y, double w, double h) {
-    EXPECT_EQ(r.x, x);
-    EXPECT_EQ(r.y, y);
-    EXPECT_EQ(r.width, w);
-    EXPECT_EQ(r.height, h);
+using Rect = BNRect<double>;
+// The flags a state keeps: auto-zoom, snapping, ghosts, waveform, keyframes locked in time.
+auto flags(const TQCurveEditorState& s) {
+    return std::tuple(s.autoZoom(), s.snapping(), s.snapshotChannels(), s.displayAudioWaveform(),
+                      s.lockKeyframesInTime());
 }
 
 TEST_F(SavedTreesTest, state__writesTopEdgeAndEndAndReadsThemBack) {
@@ -87,9 +87,9 @@ TEST_F(SavedTreesTest, state__writesTopEdgeAndEndAndReadsThemBack) {
 
     TQCurveEditorState back;  // zeroed volume, unset range
     read(text, back);
-    expectRect(back.currentViewVolume(), 1, 2, 3, 4);
-    EXPECT_TRUE(CMTimeIdentical(back.displayRange().start, CMTimeMake(10, 30)));
-    EXPECT_TRUE(CMTimeIdentical(back.displayRange().duration, CMTimeMake(5, 30)));
+    EXPECT_EQ(back.currentViewVolume(), Rect(1, 2, 3, 4));
+    EXPECT_TRUE(CMTimeIdentical(back.displayRange().start, CMTimeMake(10, 30)) &&
+                CMTimeIdentical(back.displayRange().duration, CMTimeMake(5, 30)));
     EXPECT_TRUE(back.snapping());
 }
 
@@ -102,7 +102,7 @@ TEST_F(SavedTreesTest, state__partialViewVolumeKeepsTheOppositeEdges) {
         state.setCurrentViewVolume(BNRect<double>(0, 1, 10, 5));
         read(std::string("<curveeditor><currentviewvolume ") + attribute + "/></curveeditor>",
              state);
-        expectRect(state.currentViewVolume(), x, y, w, h);
+        EXPECT_EQ(state.currentViewVolume(), Rect(x, y, w, h)) << attribute;
     }
 }
 
@@ -112,8 +112,8 @@ TEST_F(SavedTreesTest, state__olderVersionsReadTheRangeAsFrameNumbers) {
         TQCurveEditorState state;
         read(doc, state, 4, CMTimeMake(1, 30));
         // The duration is counted from frame 0, not from the start; old files read so.
-        EXPECT_EQ(state.displayRange().start, CMTimeMake(10, 30));
-        EXPECT_EQ(state.displayRange().duration, CMTimeMake(18, 30));
+        EXPECT_EQ(std::pair(state.displayRange().start, state.displayRange().duration),
+                  std::pair(CMTimeMake(10, 30), CMTimeMake(18, 30)));
     }
     {
         TQCurveEditorState state;
@@ -135,34 +135,27 @@ TEST_F(SavedTreesTest, state__flagsFollowTheDefaultsAndCopiesLeaveTheRangeUnset)
     _defaults.setBool(true, kTQPreferenceCurveEditorAutoZoom);
     _defaults.setBool(true, kTQPreferenceCurveEditorLockKeyframesInTime);
     TQCurveEditorState state;
-    EXPECT_TRUE(state.autoZoom());
-    EXPECT_TRUE(state.lockKeyframesInTime());
-    EXPECT_FALSE(state.snapping());
+    EXPECT_EQ(flags(state), std::tuple(true, false, false, false, true));
     EXPECT_FALSE(state.hasDisplayRange()) << "a new state's range is unset";
 
     state.setSnapshotChannels(true);
     state.setDisplayAudioWaveform(true);
-    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorSnapshotChannels));
-    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorDisplayAudioWaveform));
+    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorSnapshotChannels) &&
+                _defaults.boolForKey(kTQPreferenceCurveEditorDisplayAudioWaveform));
 
     read("<curveeditor><autozoom>false</autozoom><snapping>true</snapping></curveeditor>", state);
-    EXPECT_FALSE(state.autoZoom());
-    EXPECT_TRUE(state.snapping());
-    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorAutoZoom))
+    EXPECT_EQ(flags(state), std::tuple(false, true, true, true, true));
+    EXPECT_TRUE(_defaults.boolForKey(kTQPreferenceCurveEditorAutoZoom) &&
+                !_defaults.boolForKey(kTQPreferenceCurveEditorSnapping))
         << "a read changes the object, never the defaults";
-    EXPECT_FALSE(_defaults.boolForKey(kTQPreferenceCurveEditorSnapping));
 
     state.setDisplayRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(4, 1)));
     state.setCurrentViewVolume(BNRect<double>(1, 2, 3, 4));
     const TQCurveEditorState copy(state);
     EXPECT_FALSE(copy.hasDisplayRange()) << "a copy leaves the range unset";
     EXPECT_TRUE(CMTimeIdentical(copy.displayRange().start, kCMTimeInvalid));
-    expectRect(copy.currentViewVolume(), 1, 2, 3, 4);
-    EXPECT_EQ(copy.autoZoom(), state.autoZoom());
-    EXPECT_EQ(copy.snapping(), state.snapping());
-    EXPECT_EQ(copy.snapshotChannels(), state.snapshotChannels());
-    EXPECT_EQ(copy.displayAudioWaveform(), state.displayAudioWaveform());
-    EXPECT_EQ(copy.lockKeyframesInTime(), state.lockKeyframesInTime());
+    EXPECT_EQ(copy.currentViewVolume(), Rect(1, 2, 3, 4));
+    EXPECT_EQ(flags(copy), flags(state));
 }
 
 TEST_F(SavedTreesTest, list__writesColourIndexAsItemsAndReadsItAsSets) {
@@ -175,12 +168,11 @@ TEST_F(SavedTreesTest, list__writesColourIndexAsItemsAndReadsItAsSets) {
     list.addCurveSet(set);
     list.setSelectedCurveSet(13);
     const std::string text = write(list);
-    EXPECT_NE(text.find("<curvesets selected=\"13\">"), std::string::npos) << text;
-    EXPECT_NE(text.find("<curveset name=\"Arms\" shortcut=\"\" relative=\"false\">"),
-              std::string::npos)
-        << text;
-    EXPECT_NE(text.find("<channel colorindex=\"5\">"), std::string::npos) << text;
-    EXPECT_NE(text.find("<channelref>./1/100/101/2</channelref>"), std::string::npos) << text;
+    for (const char* part :
+         {"<curvesets selected=\"13\">",
+          "<curveset name=\"Arms\" shortcut=\"\" relative=\"false\">", "<channel colorindex=\"5\">",
+          "<channelref>./1/100/101/2</channelref>"})
+        EXPECT_NE(text.find(part), std::string::npos) << part << " in\n" << text;
 
     // Older files name the colour "enabled"; "colorindex" wins when both are there. Unknown
     // elements are skipped at every level.
@@ -199,20 +191,18 @@ TEST_F(SavedTreesTest, list__writesColourIndexAsItemsAndReadsItAsSets) {
     EXPECT_EQ(back.getSelectedCurveSet(), 4u) << "the host reads \"selected\" and hands it on";
     ASSERT_EQ(back.curveSets().size(), 1u);
     const TQCurveSetSerializer& old = *back.curveSets()[0];
-    EXPECT_EQ(old._name, "Old");
-    EXPECT_EQ(old._shortcut, "q") << "reading takes the shortcut that writing never sets";
-    EXPECT_TRUE(old._relative);
+    EXPECT_EQ(std::tuple(old._name, old._shortcut, old._relative), std::tuple("Old", "q", true))
+        << "reading takes the shortcut that writing never sets";
     ASSERT_EQ(old._channels.size(), 4u) << "a channel inside an unknown element still counts";
-    EXPECT_EQ(old._channels[0]->getColorIndex(), 1u);
-    EXPECT_EQ(old._channels[0]->getChannelRef(), "./2/7");
-    EXPECT_EQ(old._channels[1]->getColorIndex(), 6u);
-    EXPECT_EQ(old._channels[1]->getChannelRef(), "./2/8");
+    EXPECT_EQ(std::tuple(old._channels[0]->getColorIndex(), old._channels[0]->getChannelRef(),
+                         old._channels[1]->getColorIndex(), old._channels[1]->getChannelRef()),
+              std::tuple(1u, "./2/7", 6u, "./2/8"));
     EXPECT_EQ(old._channels[2]->getChannelRef(), "not a path") << "kept as text";
     EXPECT_EQ(old._channels[3]->getColorIndex(), 9u);
 
     back.clear();
-    EXPECT_TRUE(back.curveSets().empty());
-    EXPECT_EQ(back.getSelectedCurveSet(), 4u) << "clear keeps the selected number";
+    EXPECT_TRUE(back.curveSets().empty() && back.getSelectedCurveSet() == 4u)
+        << "clear keeps the selected number";
 }
 
 }  // namespace
