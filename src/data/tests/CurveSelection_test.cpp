@@ -20,11 +20,13 @@ TQCurveSelectionPtr entry(uintptr_t h, uint64_t flag, uint32_t curve, int64_t fr
 }  // namespace
 
 TEST(TQCurveSelection, isKeypoint__excludesOtherKindsRatherThanMatchingKeypoint) {
-    EXPECT_TRUE(entry(7, 0, 1)->isKeypoint()) << "a handle with no flag counts as a keypoint";
-    EXPECT_FALSE(entry(0, TQSelectionKeypoint, 1)->isKeypoint()) << "no handle, no keypoint";
-    EXPECT_FALSE(entry(7, TQSelectionInTangent, 1)->isKeypoint());
-    EXPECT_TRUE(entry(7, TQSelectionInTangent, 1)->isTangent());
-    EXPECT_TRUE(entry(0, TQSelectionCurve, 1)->isCurve());
+    // A handle with no flag counts as a keypoint; no handle, no keypoint.
+    EXPECT_EQ(
+        (std::vector{entry(7, 0, 1)->isKeypoint(), entry(0, TQSelectionKeypoint, 1)->isKeypoint(),
+                     entry(7, TQSelectionInTangent, 1)->isKeypoint(),
+                     entry(7, TQSelectionInTangent, 1)->isTangent(),
+                     entry(0, TQSelectionCurve, 1)->isCurve()}),
+        (std::vector{true, false, false, true, true}));
 }
 
 TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
@@ -32,8 +34,7 @@ TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
     CMTime u{};
     double v = 0;
     EXPECT_FALSE(tangent->getKeypointUV(&u, &v));
-    EXPECT_EQ(CMTimeCompare(u, CMTimeMake(12, 30)), 0);
-    EXPECT_DOUBLE_EQ(v, 0.5);
+    EXPECT_EQ(std::pair(u, v), std::pair(CMTimeMake(12, 30), 0.5));
     EXPECT_FALSE(tangent->setKeypointTangents(1, 2, 3, 4));
     double t[4] = {};
     tangent->getKeypointTangents(&t[0], &t[1], &t[2], &t[3]);
@@ -42,9 +43,10 @@ TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
 
 TEST(TQCurveSelection, compare__usesStoredTimes) {
     auto early = entry(1, TQSelectionKeypoint, 1, 3), late = entry(2, TQSelectionKeypoint, 1, 9);
-    EXPECT_EQ(early->compareKeypointAscending(*late), -1);
-    EXPECT_EQ(early->compareKeypointDescending(*late), 1);
-    EXPECT_EQ(late->compareKeypointAscending(*late), 0);
+    EXPECT_EQ(
+        std::tuple(early->compareKeypointAscending(*late), early->compareKeypointDescending(*late),
+                   late->compareKeypointAscending(*late)),
+        std::tuple(-1, 1, 0));
 }
 
 TEST(TQCurveSelectionList, equality__curveEntriesOfDifferentCurvesAreOne) {
@@ -60,9 +62,8 @@ TEST(TQCurveSelectionList, equality__curveEntriesOfDifferentCurvesAreOne) {
 TEST(TQCurveSelectionList, queries__tangentCountsAsSelectedKeypoint) {
     TQCurveSelectionList list;
     list.addSelection(entry(5, TQSelectionInTangent, 3));
-    EXPECT_TRUE(list.isKeypointSelected(handle(5)));
-    EXPECT_TRUE(list.isCurveSelected(3));
-    EXPECT_FALSE(list.isCurveSelected(4));
+    EXPECT_TRUE(list.isKeypointSelected(handle(5)) && list.isCurveSelected(3) &&
+                !list.isCurveSelected(4));
     EXPECT_EQ(list.selectionAtIndex(1), nullptr) << "out of range answers null";
 }
 

@@ -41,18 +41,14 @@ protected:
         const auto T = [&](size_t i) { return seconds(N(i)); };
         const auto E = [&](size_t i) { return entry(a.words.at(i)); };
         TQCurveSelectionList* s = view.getSelection();
+        const auto perform = [&](const std::string& action, double tag) {
+            RWMenuItem sender(action, action);
+            sender.setTag(int64_t(tag));
+            EXPECT_TRUE(ctrl().performAction(action, sender));
+        };
         const tests_support::Steps steps = {
-            {"menu",
-             [&] {
-                 RWMenuItem sender(a.rest, a.rest);
-                 EXPECT_TRUE(ctrl().performAction(a.rest, sender));
-             }},
-            {"interp",
-             [&] {
-                 RWMenuItem sender("", "menuSetKeypointInterpolation:");
-                 sender.setTag(int64_t(N(0)));
-                 EXPECT_TRUE(ctrl().performAction(sender.action(), sender));
-             }},
+            {"menu", [&] { perform(a.rest, 0); }},
+            {"interp", [&] { perform("menuSetKeypointInterpolation:", N(0)); }},
             {"select", [&] { select(a.rest); }},
             {"move", [&] { ctrl().moveSelected(s, T(0), N(1), 1, char(N(2))); }},
             {"nudge", [&] { ctrl().offsetSelected(s, T(0), N(1)); }},

@@ -76,8 +76,7 @@ TEST_F(NumberPanels, answers__return_cancel_close_and_text_that_is_no_number) {
         field(panel)->userEndEditing("2.5");
     });
     EXPECT_TRUE(TQCurveEditorValueController::openWithLocation(CGPointZero, &value));
-    EXPECT_EQ(shown, "-5");
-    EXPECT_EQ(value, 2.5);
+    EXPECT_EQ(std::pair(shown, value), std::pair(std::string("-5"), 2.5));
 
     // Cancel, the user's close and a run nothing could show leave the number alone.
     modal.pushScript(

@@ -154,15 +154,15 @@ TEST_F(ViewVolume, no_frame_a_tool_change_and_destruction) {
     TQCurveEditorViewBase fresh;
     fresh.setViewHost(&viewHost);
     fresh.setCurrentViewVolume(CGRectMake(0, 0, 1, 1));
-    EXPECT_TRUE(std::isnan(fresh.getPointWorld(CGPointMake(10, 10)).x));
-    EXPECT_TRUE(std::isnan(fresh.getPointScreen(CGPointMake(0.5, 0.5)).y));
-    EXPECT_TRUE(std::isnan(fresh.adjustWorldPointToScreen(CGPointMake(0.5, 0.5)).x));
+    EXPECT_TRUE(std::isnan(fresh.getPointWorld(CGPointMake(10, 10)).x) &&
+                std::isnan(fresh.getPointScreen(CGPointMake(0.5, 0.5)).y) &&
+                std::isnan(fresh.adjustWorldPointToScreen(CGPointMake(0.5, 0.5)).x));
     fresh.setAllOriginalCurveDirty(1);  // no controller: no items to mark
     fresh.setAllOriginalCurveScaleDirty(1);
     viewHost.resetRedrawRequests();
     ctrl().setCurrentTool(TQTool::kBox);
-    EXPECT_EQ(recorder.bracketText(), "!4000008");
-    EXPECT_EQ(viewHost.redrawRequests(), 1);
+    EXPECT_EQ(std::pair(recorder.bracketText(), viewHost.redrawRequests()),
+              std::pair(std::string("!4000008"), 1));
     auto doomed = std::make_unique<TQCurveEditorViewBase>();
     doomed->setController(&ctrl());
     ctrl().setView(doomed.get());
