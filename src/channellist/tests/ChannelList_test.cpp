@@ -106,14 +106,11 @@ TEST_F(ChannelListTest, valueEdits__typedOrScrubbedOneUndoStepAtTheCurrentTime) 
         list.editColumn(value, row, true);
         list.userEndEditing(text, RWReturnTextMovement);
     };
-    auto channelAt = [&](int64_t row) {
-        return dynamic_cast<TQCurveEditorChannelItem*>(itemAt(row))->channel();
-    };
     {  // No number, or the number shown (in display units, here the channel's): no change.
         int64_t row = 1;
         while (dynamic_cast<TQCurveEditorChannelItem*>(itemAt(row))->conversionFactor() != 1.0)
             ++row;
-        TQChannel* channel = channelAt(row);
+        TQChannel* channel = itemAt(row)->channel();
         channel->setObjectManipulator(&manipulator);
         const std::unique_ptr<TQChannelBase> before(channel->cloneChannel());
         type(row, "abc");

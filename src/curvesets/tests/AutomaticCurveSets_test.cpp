@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <set>
+#include <sstream>
 
 #include "host/TQHostAppDelegate.h"
 #include "host/TQHostSampleScene.h"
@@ -28,19 +29,24 @@ protected:
         set->refresh(100, false);
         return set;
     }
-    // Paths of the property table, by row and axis; an axis the family lacks is left out.
-    Paths paths(std::initializer_list<std::pair<P, size_t>> slots) const {
+    // Paths of the property table, by the row's shortcut and the axis ("$" the last one):
+    // "p0 r$"; an axis the family lacks is left out.
+    Paths paths(const std::string& slots) const {
+        const std::string rows = "psrhaot";  // in the order of TQHostProperty
         Paths out;
-        for (const auto& [property, axis] : slots)
-            if (axis < TQHostPropertyPaths(GetParam(), property).size())
-                out.insert(TQHostPropertyPaths(GetParam(), property)[axis]);
+        std::istringstream in(slots);
+        for (std::string w; in >> w;) {
+            const auto& row = TQHostPropertyPaths(GetParam(), P(rows.find(w[0])));
+            const size_t axis = w[1] == '$' ? row.size() - 1 : size_t(w[1] - '0');
+            if (axis < row.size()) out.insert(row[axis]);
+        }
         return out;
     }
     TQChannel* at(TQChannelBase* object, P property, size_t axis = 0) const {
-        const Paths found = paths({{property, axis}});
-        return found.empty()
-                   ? nullptr
-                   : dynamic_cast<TQChannel*>(TQChannelRef(*found.begin()).getChannel(object));
+        const auto& row = TQHostPropertyPaths(GetParam(), property);
+        return axis < row.size()
+                   ? dynamic_cast<TQChannel*>(TQChannelRef(row[axis]).getChannel(object))
+                   : nullptr;
     }
     // What a set shows of one object, as paths below it.
     static Paths shown(const TQCurveSet& set, const TQChannelBase* object) {
@@ -57,42 +63,18 @@ protected:
 };
 
 TEST_P(AutomaticSets, byState__eachObjectShowsWhatMovesAndWhatWasSet) {
-    const size_t spin = TQHostPropertyPaths(GetParam(), P::Rotation).size() - 1;
-    const Paths retiming = paths({{P::Retiming, 0}, {P::Retiming, 1}});
-    Paths backgroundMoves = paths(
-        {{P::Position, 0}, {P::Position, 1}, {P::Rotation, spin}, {P::Scale, 0}, {P::Scale, 1}});
-    backgroundMoves.insert(retiming.begin(), retiming.end());
+    Paths backgroundMoves = paths("p0 p1 r$ s0 s1 t0 t1");
     backgroundMoves.insert(TQHostTypedPaths(GetParam()).volume);
     const struct {
         const char* object;
         Paths animated;
         Paths modifiedToo;  // one keypoint, a value set without keys, resting compound parts
     } rows[] = {
-        {kTQHostSampleTitleObject,
-         paths({{P::Position, 0}, {P::Position, 1}, {P::Scale, 0}, {P::Scale, 1}, {P::Opacity, 0}}),
-         paths({{P::Position, 2}, {P::Scale, 2}})},
-        {kTQHostSampleBehaviorObject,  // the sway is a behaviour on a channel without keys
-         paths({{P::Position, 0},
-                {P::Position, 1},
-                {P::Rotation, spin},
-                {P::Scale, 0},
-                {P::Scale, 1},
-                {P::Opacity, 0}}),
-         paths({{P::Position, 2},
-                {P::Rotation, 0},
-                {P::Rotation, 1},
-                {P::Scale, 2},
-                {P::Pivot, 0},
-                {P::Pivot, 1},
-                {P::Pivot, 2}})},
-        {kTQHostSampleOffsetObject, paths({{P::Position, 0}, {P::Shear, 0}, {P::Opacity, 0}}),
-         paths({{P::Position, 1}, {P::Position, 2}, {P::Shear, 1}})},
-        {kTQHostSampleQuaternionObject, backgroundMoves,
-         paths({{P::Position, 2},
-                {P::Rotation, 0},
-                {P::Rotation, 1},
-                {P::Scale, 2},
-                {P::Opacity, 0}})},
+        {kTQHostSampleTitleObject, paths("p0 p1 s0 s1 o0"), paths("p2 s2")},
+        // The sway is a behaviour on a channel without keys.
+        {kTQHostSampleBehaviorObject, paths("p0 p1 r$ s0 s1 o0"), paths("p2 r0 r1 s2 a0 a1 a2")},
+        {kTQHostSampleOffsetObject, paths("p0 h0 o0"), paths("p1 p2 h1")},
+        {kTQHostSampleQuaternionObject, backgroundMoves, paths("p2 r0 r1 s2 o0")},
     };
     const uint32_t channelsPerObject = GetParam() == TQHostObjectFamily::Kestrel ? 29 : 23;
     std::vector<TQChannelBase*> everything;

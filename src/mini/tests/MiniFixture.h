@@ -31,6 +31,24 @@ inline double keyValue(const TQChannel& channel, double p) {
     return v;
 }
 
+// Selects the keypoints of `channel` at the positions in `editor`, the first one primary, as a
+// click and Shift-clicks would, and tells its controller.
+inline void selectKeys(TQMiniCurveEditorInspector& editor, TQChannel* channel,
+                       std::initializer_list<double> positions) {
+    TQCurveSelectionList* list = editor.curveEditorView().getSelection();
+    list->reset();
+    const auto item = editor.controller()->selectedCurveSet()->itemWithChannel(channel);
+    for (double p : positions) {
+        auto entry = std::make_shared<TQCurveSelection>();
+        entry->setCurveId(item ? item->channelId() : 0);
+        entry->setHandle(channel->getKeyframe(position(p)));
+        entry->setFlags(TQSelectionKeypoint);
+        entry->setKeypointUV(position(p), keyValue(*channel, p));
+        list->addSelection(entry);
+    }
+    editor.controller()->selectionChangedTo(list);
+}
+
 class MiniFixture : public ::testing::Test {
 protected:
     void SetUp() override {
@@ -53,21 +71,8 @@ protected:
     TQMiniCurveEditorCtrl& ctrl() { return *editor.controller(); }
     TQMiniCurveEditorView& view() { return editor.curveEditorView(); }
 
-    // Selects the keypoints of `channel` at the positions, the first one primary, as a click
-    // and Shift-clicks would, and tells the controller.
     void selectKeys(TQChannel* channel, std::initializer_list<double> positions) {
-        TQCurveSelectionList* list = view().getSelection();
-        list->reset();
-        const TQCurveEditorItemPtr item = ctrl().selectedCurveSet()->itemWithChannel(channel);
-        for (double p : positions) {
-            auto entry = std::make_shared<TQCurveSelection>();
-            entry->setCurveId(item ? item->channelId() : 0);
-            entry->setHandle(channel->getKeyframe(position(p)));
-            entry->setFlags(TQSelectionKeypoint);
-            entry->setKeypointUV(position(p), keyValue(*channel, p));
-            list->addSelection(entry);
-        }
-        ctrl().selectionChangedTo(list);
+        mini_test::selectKeys(editor, channel, positions);
     }
 
     std::unique_ptr<TQChannelBase> snapshot() const {

@@ -36,17 +36,7 @@ protected:
     // Selects the keypoint at p in a group's own editor, as a click would, and updates the
     // group as the host's post of the new selection does.
     static void select(TQMiniCurveEditorGroupController& in, TQChannel* channel, double p) {
-        TQMiniCurveEditorInspector& editor = *in.editorController()->getMiniCurveEditor();
-        TQCurveSelectionList* list = editor.curveEditorView().getSelection();
-        list->reset();
-        const auto item = editor.controller()->selectedCurveSet()->itemWithChannel(channel);
-        auto entry = std::make_shared<TQCurveSelection>();
-        entry->setCurveId(item ? item->channelId() : 0);
-        entry->setHandle(channel->getKeyframe(position(p)));
-        entry->setFlags(TQSelectionKeypoint);
-        entry->setKeypointUV(position(p), keyValue(*channel, p));
-        list->addSelection(entry);
-        editor.controller()->selectionChangedTo(list);
+        mini_test::selectKeys(*in.editorController()->getMiniCurveEditor(), channel, {p});
         in.update();
     }
     void selectInGroup(TQChannel* channel, double p) { select(*group, channel, p); }
