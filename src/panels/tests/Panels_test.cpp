@@ -1,6 +1,7 @@
 // The framework's formatters, its timecode strings, its bundle and its version.
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <string>
 
 #include "src/panels/TQCurveBundle.h"
