@@ -1,55 +1,34 @@
 #pragma once
-// The channel list beside the full editor on the sample project, wired as a host wires it:
-// the reference host, the editor with its view, the list with its controller, every column.
+// The channel list beside the full editor of the editor fixture, wired as a host wires it:
+// the list with its controller and every column, as the editor's channel outlets.
 // Helpers find rows by name and press at the middle of a cell, as a user does.
 
-#include <gtest/gtest.h>
-
-#include <memory>
 #include <string>
 #include <vector>
 
-#include "host/TQHostAppDelegate.h"
-#include "host/TQHostSampleScene.h"
-#include "platform/ui/testing/RWTestDoubles.h"
 #include "src/channellist/TQCurveEditorChannelList.h"
 #include "src/channellist/TQCurveEditorListController.h"
-#include "src/editor/TQCurveEditorCtrl.h"
-#include "src/editor/TQCurveEditorView.h"
+#include "src/editor/tests/EditorFixture.h"
 
 namespace channellist_test {
 
 using Ctrl = TQCurveEditorListController;
 
-class ChannelListTest : public ::testing::Test {
+class ChannelListTest : public editor_test::EditorFixture {
 protected:
-    void SetUp() override {
-        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
-        view.setViewHost(&viewHost);
-        const CMTimeRange range = host.displayRange();
-        view.setTotalRange(&range.start, &range.duration);
+    void connect(TQCurveEditorOutlets& outlets) override {
         list.addStandardColumns();
         controller.setMainCurveEditorController(&ctrl);
         controller.setOutlineView(&list);
         list.setCurveListController(&controller);
         controller.awakeFromNib();
-        ctrl.init();
-        ctrl.setAppDelegate(&host);
-        ctrl.setView(&view);
-        TQCurveEditorOutlets outlets;
-        outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
         outlets.channels = &list;
         outlets.channelsList = &controller;
-        ctrl.connectOutlets(outlets);
-        ctrl.setupController();
-        ctrl.viewDidLoad();
-        host.addNotificationReceiver(&ctrl);
+    }
+    void SetUp() override {
+        EditorFixture::SetUp();
         list.setVisibleRect(CGRectMake(0, 0, list.bounds().size.width, 400));
         ctrl.updateUI();
-    }
-    void TearDown() override {
-        host.removeNotificationReceiver(&ctrl);
-        view.setViewHost(nullptr);
     }
 
     // The row of the first channel item whose name holds `name`, -1 when the list shows none.
@@ -90,10 +69,6 @@ protected:
         return names;
     }
 
-    TQHostAppDelegate host;
-    RWStubViewHost viewHost{800.0, 400.0, 1.0};
-    TQCurveEditorView view;
-    TQCurveEditorCtrl ctrl;
     TQCurveEditorChannelList list;
     Ctrl controller;
 };

@@ -199,9 +199,9 @@ TEST_F(CtrlMenus, actions__changeWhatTheKindNeedsInOneUndoStepThatGivesItBack) {
         if (c.want.empty()) {  // the cleared channel shows what it showed at the playhead
             EXPECT_NEAR(item->channel()->getInitialValue(), 0.5, kValueTolerance);
         }
-        EXPECT_EQ(recorder.captureBalance(), 0);
-        EXPECT_EQ(host.undoStack().undoCount(), 1u);
-        EXPECT_EQ(host.undoDescription(), TQLocalizedString(c.undoKey));
+        EXPECT_EQ(std::tuple(recorder.captureBalance(), host.undoStack().undoCount(),
+                             host.undoDescription()),
+                  std::tuple(0, 1u, TQLocalizedString(c.undoKey)));
         ASSERT_TRUE(host.undo());
         EXPECT_TRUE(sceneIs(*before));
         host.undoStack().clear();

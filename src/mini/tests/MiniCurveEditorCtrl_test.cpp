@@ -92,9 +92,9 @@ TEST_F(MiniCtrl, menu_commands__every_channel_in_one_undo_step) {
         sender.setTag(row.tag);
         ASSERT_TRUE(ctrl().performAction(row.action, sender));
         EXPECT_TRUE(*object == *want);
-        EXPECT_EQ(recorder.captureBalance(), 0);
-        EXPECT_EQ(recorder.bracketSequence().back(), "postNotification(0x8)");
-        EXPECT_EQ(host.undoDescription(), TQLocalizedString(row.undoKey));
+        EXPECT_EQ(std::tuple(recorder.captureBalance(), recorder.bracketSequence().back(),
+                             host.undoDescription()),
+                  std::tuple(0, "postNotification(0x8)", TQLocalizedString(row.undoKey)));
         ASSERT_TRUE(host.undo());
         EXPECT_TRUE(*object == *before) << "undo gives the scene back exactly";
     }
