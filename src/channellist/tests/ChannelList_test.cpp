@@ -90,8 +90,7 @@ TEST_F(ChannelListTest, showBoxes__folderTriStateGroupToggleAndSolo) {
     {  // Option solos the row and selects it alone; again shows everything.
         ctrl.selectedCurveSet()->enableAll(true, nullptr);
         click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
-        EXPECT_EQ(ctrl.numberOfEnabledChannels(), 1u);
-        EXPECT_EQ(state(2), RWOnState);
+        EXPECT_TRUE(ctrl.numberOfEnabledChannels() == 1u && state(2) == RWOnState);
         EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
         click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
         EXPECT_EQ(ctrl.numberOfEnabledChannels(), ctrl.numberOfChannelItems());
@@ -190,8 +189,7 @@ TEST_F(ChannelListTest, routing__byColumnAndModifier) {
     }
     click(Ctrl::kKeyColumn, 1);  // no status cell here: the press only selects
     EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1}));
-    EXPECT_FALSE(controller.mouseDown());
-    EXPECT_EQ(controller.cellClickedChannel(), nullptr);
+    EXPECT_FALSE(controller.mouseDown() || controller.cellClickedChannel());
     {  // The arrows run a bound command instead of moving the selection.
         int ran = 0;
         auto command = std::make_shared<RWCommand>("next frame", 0xF703, 0, [&] {

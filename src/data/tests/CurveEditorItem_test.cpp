@@ -169,8 +169,8 @@ TEST_F(ItemFixture, refreshOriginalCurve__pinsSamplesOntoKeyframes) {
     // A keyframe past the last sample pins nothing.
     EXPECT_EQ(std::vector(u + 2, u + 5), (std::vector{sec(1.4), sec(1.6), sec(4)}));
     EXPECT_EQ(std::vector(v + 2, v + 5), (std::vector{3.0, 4.0, opacity->getCurveValue(sec(4))}));
-    EXPECT_EQ(item->originalCurveDirty(), 0);
-    EXPECT_EQ(item->processedSamplesV(), nullptr) << "both curves go stale together";
+    EXPECT_TRUE(!item->originalCurveDirty() && !item->processedSamplesV())
+        << "both curves go stale together";
 
     const double* before = item->samplesV();
     item->refreshOriginalCurve(kCMTimeZero, sec(1));
@@ -240,8 +240,7 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     item->refreshOriginalCurve(kCMTimeZero, sec(1));
     item->refreshProcessedCurve(kCMTimeZero, sec(1));
     item->takeCurveSnapshot(1);
-    ASSERT_EQ(item->numberOfSamplesSnapshot(), 4u);
-    ASSERT_NE(item->snapshotChannel(), nullptr);
+    ASSERT_TRUE(item->numberOfSamplesSnapshot() == 4u && item->snapshotChannel());
     EXPECT_TRUE(*item->snapshotChannel() == *opacity);
     item->setOriginalCurveDirty(1);
     EXPECT_TRUE(item->samplesU() == nullptr && item->samplesV() == nullptr) << "stale samples go";
@@ -263,7 +262,6 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
 
 TEST_F(ItemFixture, compound__componentsOwnFirst) {
     auto item = channelItem(y);
-    EXPECT_TRUE(item->isCompound());
+    EXPECT_TRUE(item->isCompound() && !channelItem(opacity)->isCompound());
     EXPECT_EQ(item->compoundChannelComponents(), (std::vector<TQChannelBase*>{y, x}));
-    EXPECT_FALSE(channelItem(opacity)->isCompound());
 }

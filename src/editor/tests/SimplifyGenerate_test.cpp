@@ -15,10 +15,6 @@ using namespace editor_test;
 namespace {
 
 CMTime frames(int64_t n) { return CMTimeMake(n * 20, 600); }  // 30 frames a second
-using Channel = std::unique_ptr<TQChannel>;
-Channel copy(const TQChannel& from) {
-    return Channel(static_cast<TQChannel*>(from.cloneChannel()));
-}
 
 class SimplifyGenerate : public EditorFixture {
 protected:
@@ -50,10 +46,9 @@ protected:
 };
 
 TEST_F(SimplifyGenerate, simplify__moves_start_from_the_opening_curve_ok_is_one_step_cancel_none) {
-    const Channel opening = copy(c());
-    const Channel want = copy(c());
-    want->simplifyCurve(frames(0), frames(89), host.getFrameDuration(), kTQSimplifyBezier, 2, 4.0,
-                        kTQSimplifyOnFrames);
+    const Copy opening = copyOf(&c()), want = copyOf(&c());
+    static_cast<TQChannel&>(*want).simplifyCurve(frames(0), frames(89), host.getFrameDuration(),
+                                                 kTQSimplifyBezier, 2, 4.0, kTQSimplifyOnFrames);
     modal.pushScript([&](RWWindow&, RWModalService&) {
         EXPECT_TRUE(c() == *opening) << "opening changes nothing";
         panels.toleranceSlider->userSetSliderValue(2.8);  // to the mark at 3
@@ -66,7 +61,7 @@ TEST_F(SimplifyGenerate, simplify__moves_start_from_the_opening_curve_ok_is_one_
     ctrl.animMenuSimplifyCurve();
     EXPECT_TRUE(c() == *want);
     EXPECT_EQ(panels.tolerance->intValue(), 1) << "the panel is ready for the next time";
-    ASSERT_NE(c().numberOfKeyframes(), opening->numberOfKeyframes());
+    ASSERT_NE(c().numberOfKeyframes(), static_cast<TQChannel&>(*opening).numberOfKeyframes());
     EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Simplify"));
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(c() == *opening);
@@ -84,9 +79,8 @@ TEST_F(SimplifyGenerate, simplify__moves_start_from_the_opening_curve_ok_is_one_
 TEST_F(SimplifyGenerate, generate__bakes_the_panels_cycles_after_the_keyframes_in_one_step) {
     c().setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter);
     host.undoStack().clear();
-    const Channel opening = copy(c());
-    const Channel want = copy(c());
-    want->generateKeypoints(kTQExtrapolationAfter, 3);
+    const Copy opening = copyOf(&c()), want = copyOf(&c());
+    static_cast<TQChannel&>(*want).generateKeypoints(kTQExtrapolationAfter, 3);
 
     ctrl.animMenuGeneratePostKeypoints();
     EXPECT_TRUE(modal.runs().empty() && panels.generatePanel->isVisible()) << "not modal";

@@ -55,8 +55,7 @@ TEST_F(CtrlCore, sets__append_remove_refresh_and_first_channel) {
     group->addChild(object->takeChild(pos));
     const TQCurveEditorItemPtr last = ctrl().appendFolder(group, set);
     ASSERT_NE(last, nullptr);
-    EXPECT_EQ(last->channelBase(), pos->getChild(1));
-    EXPECT_EQ(ctrl().numberOfChannelItems(), 3u);
+    EXPECT_TRUE(last->channelBase() == pos->getChild(1) && ctrl().numberOfChannelItems() == 3u);
     EXPECT_EQ(recorder.bracketText(), "2*[!20000]") << "once per level, nothing per item";
     EXPECT_EQ(ctrl().appendFolder(nullptr, set), nullptr);
     // A refresh drops the items of channels that went, and the view's selection.
@@ -74,8 +73,8 @@ TEST_F(CtrlCore, sets__append_remove_refresh_and_first_channel) {
     recorder.clearCalls();
     EXPECT_TRUE(ctrl().removeChannelWithIdentifier(set->channeItemAtIndex(0)->channelId(), set));
     EXPECT_FALSE(ctrl().removeChannelWithIdentifier(1, nullptr));
-    EXPECT_TRUE(ctrl().removeSelectedChannelFromSelectedCurveSet());
-    EXPECT_EQ(ctrl().numberOfChannelItems(), 0u);
+    EXPECT_TRUE(ctrl().removeSelectedChannelFromSelectedCurveSet() &&
+                ctrl().numberOfChannelItems() == 0u);
     EXPECT_EQ(recorder.bracketText(), "!20000 +2.0:Remove Channel from Curve Set !20000");
     // A set without removal removes nothing, appends nothing and posts nothing.
     auto plain = std::make_shared<TQCurveSet>();
