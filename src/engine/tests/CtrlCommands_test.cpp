@@ -40,6 +40,7 @@ protected:
         const auto N = [&](size_t i) { return a.number(i); };
         const auto T = [&](size_t i) { return seconds(N(i)); };
         const auto E = [&](size_t i) { return entry(a.words.at(i)); };
+        const auto C = [&] { return item(a.rest)->channel(); };  // the named channel
         TQCurveSelectionList* s = view.getSelection();
         const auto perform = [&](const std::string& action, double tag) {
             RWMenuItem sender(action, action);
@@ -76,14 +77,10 @@ protected:
             {"save", [&] { ctrl().saveTangents(E(0).get()); }},
             {"negative", [&] { ctrl().allowNegativeRange(true); }},
             {"cycle",
-             [&] {
-                 item(a.rest)->channel()->setExtrapolation(kTQExtrapolationRepeat,
-                                                           kTQExtrapolationAfter);
-             }},
+             [&] { C()->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter); }},
             {"linked", [&] { ctrl()._linked = true; }},
             {"offset", [&] { object->setTimeOffset(T(0)); }},
-            {"remove",
-             [&] { item(a.rest)->channel()->getParent()->removeChild(item(a.rest)->channel()); }},
+            {"remove", [&] { C()->getParent()->removeChild(C()); }},
             {"unlist", [&] { set->removeItemWithIdentifier(item(a.rest)->channelId()); }},
             {"movekey",
              [&] {

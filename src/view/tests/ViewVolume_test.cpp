@@ -28,9 +28,10 @@ protected:
         std::ostringstream out;
         out.precision(5);
         const auto point = [&](const CGPoint& p) { out << p.x << " " << p.y << " / "; };
-        const auto volume = [&] {
+        const auto volume = [&](const char* after) {
             const CGRect& v = view.getCurrentViewVolume();
-            out << v.origin.x << " " << v.origin.y << " " << v.size.width << " " << v.size.height;
+            out << v.origin.x << " " << v.origin.y << " " << v.size.width << " " << v.size.height
+                << after;
         };
         const tests_support::Steps steps = {
             {"zoom", [&] { view.zoomWithFactor(N(0), N(1)); }},
@@ -53,11 +54,7 @@ protected:
             {"resetpan", [&] { view.resetPan(); }},
             {"clear", [&] { recorder.clearCalls(); }},
             {"off", [&] { item(a.rest)->enableItem(0); }},
-            {"?",
-             [&] {
-                 volume();
-                 out << " / ";
-             }},
+            {"?", [&] { volume(" / "); }},
             {"screen", [&] { point(view.getPointScreen(CGPointMake(N(0), N(1)))); }},
             {"world", [&] { point(view.getPointWorld(CGPointMake(N(0), N(1)))); }},
             {"size", [&] { point(view.getSizeWorld(CGPointMake(N(0), N(1)))); }},
@@ -75,7 +72,7 @@ protected:
             item(name.substr(0, name.size() - 1))->enableItem(1);
             view.computeVerticalTickMarks();
         });
-        volume();
+        volume("");
         out << " *" << view.zoomX() << " *" << view.zoomY() << " #" << view.gridZoomY() << " "
             << recorder.bracketText() << " ";
         for (double o : range().offsets) out << ">" << o << " ";
