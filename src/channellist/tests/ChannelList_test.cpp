@@ -71,30 +71,25 @@ TEST_F(ChannelListTest, showBoxes__folderTriStateGroupToggleAndSolo) {
     auto state = [&](int64_t row) {
         return static_cast<RWButtonCell*>(list.preparedCellAtColumn(show, row))->state();
     };
-    {  // One channel off: the folder's box is mixed; a click on the folder shows them all.
-        click(Ctrl::kShowColumn, 1);
-        EXPECT_EQ(state(1), RWOffState);
-        EXPECT_EQ(state(0), RWMixedState);
-        click(Ctrl::kShowColumn, 0);
-        EXPECT_EQ(state(0), RWOnState);
-        EXPECT_EQ(state(1), RWOnState);
-    }
-    {  // Among selected rows every box takes the opposite of the clicked one.
-        click(Ctrl::kNameColumn, 1);
-        click(Ctrl::kNameColumn, 3, RWEventModifierFlagShift);
-        click(Ctrl::kShowColumn, 2);
-        for (int64_t row : {1, 2, 3}) EXPECT_EQ(state(row), RWOffState) << "row " << row;
-        EXPECT_EQ(state(4), RWOnState);
-        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1, 2, 3}));
-    }
-    {  // Option solos the row and selects it alone; again shows everything.
-        ctrl.selectedCurveSet()->enableAll(true, nullptr);
-        click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
-        EXPECT_TRUE(ctrl.numberOfEnabledChannels() == 1u && state(2) == RWOnState);
-        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
-        click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
-        EXPECT_EQ(ctrl.numberOfEnabledChannels(), ctrl.numberOfChannelItems());
-    }
+    // One channel off: the folder's box is mixed; a click on the folder shows them all.
+    click(Ctrl::kShowColumn, 1);
+    EXPECT_EQ(std::pair(state(0), state(1)), (std::pair<int, int>(RWMixedState, RWOffState)));
+    click(Ctrl::kShowColumn, 0);
+    EXPECT_EQ(std::pair(state(0), state(1)), (std::pair<int, int>(RWOnState, RWOnState)));
+    // Among selected rows every box takes the opposite of the clicked one.
+    click(Ctrl::kNameColumn, 1);
+    click(Ctrl::kNameColumn, 3, RWEventModifierFlagShift);
+    click(Ctrl::kShowColumn, 2);
+    for (int64_t row : {1, 2, 3}) EXPECT_EQ(state(row), RWOffState) << "row " << row;
+    EXPECT_EQ(state(4), RWOnState);
+    EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1, 2, 3}));
+    // Option solos the row and selects it alone; again shows everything.
+    ctrl.selectedCurveSet()->enableAll(true, nullptr);
+    click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
+    EXPECT_TRUE(ctrl.numberOfEnabledChannels() == 1u && state(2) == RWOnState);
+    EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
+    click(Ctrl::kShowColumn, 2, RWEventModifierFlagOption);
+    EXPECT_EQ(ctrl.numberOfEnabledChannels(), ctrl.numberOfChannelItems());
 }
 
 TEST_F(ChannelListTest, valueEdits__typedOrScrubbedOneUndoStepAtTheCurrentTime) {
@@ -158,11 +153,10 @@ TEST_F(ChannelListTest, dragOut__leavesCustomSetNotScene) {
         press(at(Ctrl::kNameColumn, row), to, {to});
     };
     const CGPoint outside = list.convertPointToWindow(CGPointMake(-50, 30));
-    {  // An automatic set takes no changes by hand.
-        const uint32_t count = ctrl.numberOfChannelItems();
-        dragName(1, outside);
-        EXPECT_EQ(ctrl.numberOfChannelItems(), count);
-    }
+    // An automatic set takes no changes by hand.
+    const uint32_t automatic = ctrl.numberOfChannelItems();
+    dragName(1, outside);
+    EXPECT_EQ(ctrl.numberOfChannelItems(), automatic);
     ctrl.cloneCurveSetWithName("Mine");
     ctrl.updateUI();
     const uint32_t count = ctrl.numberOfChannelItems();
@@ -178,31 +172,28 @@ TEST_F(ChannelListTest, dragOut__leavesCustomSetNotScene) {
 }
 
 TEST_F(ChannelListTest, routing__byColumnAndModifier) {
-    {  // Control in Name is a right press: it selects nothing.
-        click(Ctrl::kNameColumn, 2);
-        click(Ctrl::kNameColumn, 3, RWEventModifierFlagControl);
-        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
-    }
-    {  // Shift in Value is a plain click: the row alone.
-        click(Ctrl::kValueColumn, 4, RWEventModifierFlagShift);
-        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{4}));
-    }
+    // Control in Name is a right press: it selects nothing.
+    click(Ctrl::kNameColumn, 2);
+    click(Ctrl::kNameColumn, 3, RWEventModifierFlagControl);
+    EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
+    // Shift in Value is a plain click: the row alone.
+    click(Ctrl::kValueColumn, 4, RWEventModifierFlagShift);
+    EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{4}));
     click(Ctrl::kKeyColumn, 1);  // no status cell here: the press only selects
     EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1}));
     EXPECT_FALSE(controller.mouseDown() || controller.cellClickedChannel());
-    {  // The arrows run a bound command instead of moving the selection.
-        int ran = 0;
-        auto command = std::make_shared<RWCommand>("next frame", 0xF703, 0, [&] {
-            ++ran;
-            return true;
-        });
-        RWCommandsController::sharedController().addCommand(command);
-        list.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "\xEF\x9C\x83"));
-        RWCommandsController::sharedController().removeCommand("next frame");
-        EXPECT_EQ(ran, 1);
-        list.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "\xEF\x9C\x81"));  // down arrow
-        EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
-    }
+    // The arrows run a bound command instead of moving the selection.
+    int ran = 0;
+    auto command = std::make_shared<RWCommand>("next frame", 0xF703, 0, [&] {
+        ++ran;
+        return true;
+    });
+    RWCommandsController::sharedController().addCommand(command);
+    list.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "\xEF\x9C\x83"));
+    RWCommandsController::sharedController().removeCommand("next frame");
+    EXPECT_EQ(ran, 1);
+    list.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "\xEF\x9C\x81"));  // down arrow
+    EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
 }
 
 TEST_F(ChannelListTest, hover__partsOfTheKeyCellAndTheirTips) {

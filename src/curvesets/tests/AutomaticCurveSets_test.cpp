@@ -132,14 +132,13 @@ TEST_P(AutomaticSets, rules__behavioursToleranceEnableStatesAndTheOddRoot) {
     sway->setFlag(kTQChannelFlagHiddenInCurveEditor);
     EXPECT_EQ(refreshed<TQCurveSetAnimated>({logo})->itemWithChannel(sway), nullptr) << "hidden";
     sway->resetFlag(kTQChannelFlagHiddenInCurveEditor);
-    {  // The object leaves the selection: only a channel of a selected behaviour stays.
-        auto animated = refreshed<TQCurveSetAnimated>({logo});
-        sway->getBehavior(0)->setSelected(true);
-        host.selectObject(title);
-        animated->filterList();
-        ASSERT_EQ(animated->allItems().size(), 1u);
-        EXPECT_EQ(animated->allItems()[0]->channel(), sway);
-    }
+    // The object leaves the selection: only a channel of a selected behaviour stays.
+    auto animated = refreshed<TQCurveSetAnimated>({logo});
+    sway->getBehavior(0)->setSelected(true);
+    host.selectObject(title);
+    animated->filterList();
+    ASSERT_EQ(animated->allItems().size(), 1u);
+    EXPECT_EQ(animated->allItems()[0]->channel(), sway);
     // A value without keys counts from 1e-7 off its default (the title's retime is 0).
     TQChannel* retime = at(title, P::Retiming);
     for (const auto& [value, shown] : {std::pair{0.9e-7, false}, {1e-7, true}, {-1e-7, true}}) {
@@ -147,12 +146,11 @@ TEST_P(AutomaticSets, rules__behavioursToleranceEnableStatesAndTheOddRoot) {
         EXPECT_EQ(refreshed<TQCurveSetModified>({title})->itemWithChannel(retime) != nullptr, shown)
             << value;
     }
-    {  // All opens every root it filters.
-        auto all = refreshed<TQCurveSetAll>({title});
-        all->rootItemAtIndex(0)->collapse(true);
-        all->filterList();
-        EXPECT_FALSE(all->rootItemAtIndex(0)->isCollapsed());
-    }
+    // All opens every root it filters.
+    auto all = refreshed<TQCurveSetAll>({title});
+    all->rootItemAtIndex(0)->collapse(true);
+    all->filterList();
+    EXPECT_FALSE(all->rootItemAtIndex(0)->isCollapsed());
     // A disabled curve stays disabled through a refresh of Animated, not of All.
     TQChannel* x = at(title, P::Position);
     for (const TQCurveSetPtr& set : std::initializer_list<TQCurveSetPtr>{

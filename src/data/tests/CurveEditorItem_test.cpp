@@ -85,12 +85,10 @@ TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
     for (const auto& c : root->children()) names.push_back(c->simpleName());
     EXPECT_EQ(names, (std::vector<BNString>{"Opacity", "Position.X", "Position.Y", "Extra.Deep"}));
     EXPECT_FALSE(root->isCollapsed()) << "building a folder item opens its folder";
-    {
-        deep->setFlag(kTQChannelFlagHidden);
-        auto again = std::make_shared<TQCurveEditorFolderItem>();
-        again->initWithChannel(cube, 10, &host, 1);
-        EXPECT_EQ(again->numberOfChildren(), 3u) << "hidden channels are excluded";
-    }
+    deep->setFlag(kTQChannelFlagHidden);
+    auto again = std::make_shared<TQCurveEditorFolderItem>();
+    again->initWithChannel(cube, 10, &host, 1);
+    EXPECT_EQ(again->numberOfChildren(), 3u) << "hidden channels are excluded";
 }
 
 // "Hidden in curve editors" reads backwards, deliberately: the flagged root itself, or a
@@ -221,15 +219,13 @@ TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
     EXPECT_EQ(root->childrenAtIndex(99), nullptr);
     root->select(1);
     EXPECT_TRUE(root->childrenAtIndex(3)->isSelected()) << "a folder selects its children";
-    {
-        // A folder added to a folder comes in once per valid child of it not there yet: merged
-        // roots rely on it, kept so.
-        auto merged = std::make_shared<TQCurveEditorFolderItem>();
-        merged->initWithRoot(cube, 0, &host, 1);
-        merged->addChild(root->childrenAtIndex(0));
-        merged->addChild(root);
-        EXPECT_EQ(merged->numberOfChildren(), 4u);
-    }
+    // A folder added to a folder comes in once per valid child of it not there yet: merged
+    // roots rely on it, kept so.
+    auto merged = std::make_shared<TQCurveEditorFolderItem>();
+    merged->initWithRoot(cube, 0, &host, 1);
+    merged->addChild(root->childrenAtIndex(0));
+    merged->addChild(root);
+    EXPECT_EQ(merged->numberOfChildren(), 4u);
 }
 
 TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {

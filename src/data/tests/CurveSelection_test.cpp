@@ -72,12 +72,10 @@ TEST(TQCurveSelectionList, purge__takesEqualEntriesOfOtherCurvesAlong) {
     list.addSelection(entry(5, TQSelectionKeypoint, 1));
     list.addSelection(entry(5, TQSelectionKeypoint, 2));  // same handle and kind, other curve
     list.addSelection(entry(6, TQSelectionKeypoint, 2));
-    {
-        TQCurveSelectionList untouched;
-        untouched.setSelection(list);
-        untouched.purge(99);
-        EXPECT_EQ(untouched.size(), 3u) << "purge of an absent curve changes nothing";
-    }
+    TQCurveSelectionList untouched;
+    untouched.setSelection(list);
+    untouched.purge(99);
+    EXPECT_EQ(untouched.size(), 3u) << "purge of an absent curve changes nothing";
     list.purge(1);
     ASSERT_EQ(list.size(), 1u);
     EXPECT_EQ(list.selectionAtIndex(0)->getHandle(), handle(6));

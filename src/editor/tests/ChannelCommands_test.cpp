@@ -208,21 +208,16 @@ TEST_F(ChannelCommands, keyframes__the_playhead_jumps_to_the_nearest_on_any_chan
         EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), want);
         EXPECT_EQ(recorder.count("postNotification"), row.expected < 0 ? 0u : 1u);
     }
-    {
-        SCOPED_TRACE("a keyframe before zero is never the previous one");
-        key(*b(), {{-1, 0}});
-        key(*a(), {{5, 0}});
-        host.setCurrentTime(sec(2));
-        ASSERT_TRUE(run("animMenuPreviousKeyframe:"));
-        EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), 2.0);
-    }
-    {
-        SCOPED_TRACE("no channel selected");
-        for (const auto& item : items) item->select(0);
-        host.setCurrentTime(sec(0));
-        ASSERT_TRUE(run("animMenuNextKeyframe:"));
-        EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), 0.0);
-    }
+    key(*b(), {{-1, 0}});
+    key(*a(), {{5, 0}});
+    host.setCurrentTime(sec(2));
+    ASSERT_TRUE(run("animMenuPreviousKeyframe:"));
+    EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), 2.0)
+        << "a keyframe before zero is never the previous one";
+    for (const auto& item : items) item->select(0);
+    host.setCurrentTime(sec(0));
+    ASSERT_TRUE(run("animMenuNextKeyframe:"));
+    EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), 0.0) << "no channel selected";
 }
 
 }  // namespace
