@@ -20,11 +20,7 @@ std::string textOf(const std::optional<BNSerializerError>& error) {
 // Every test runs on user defaults of its own.
 class SavedTreesTest : public ::testing::Test {
 protected:
-    void SetUp() override {
-        RWServiceSet services;
-        services.userDefaults = &_defaults;
-        RWInstallServices(services);
-    }
+    void SetUp() override { RWInstallServices({.userDefaults = &_defaults}); }
     void TearDown() override { RWResetServices(); }
 
     template <class Tree>
@@ -108,27 +104,19 @@ TEST_F(SavedTreesTest, state__partialViewVolumeKeepsTheOppositeEdges) {
 
 TEST_F(SavedTreesTest, state__olderVersionsReadTheRangeAsFrameNumbers) {
     const std::string doc = "<curveeditor><displayRange in='10' out='20'/></curveeditor>";
-    {
-        TQCurveEditorState state;
-        read(doc, state, 4, CMTimeMake(1, 30));
-        // The duration is counted from frame 0, not from the start; old files read so.
-        EXPECT_EQ(std::pair(state.displayRange().start, state.displayRange().duration),
-                  std::pair(CMTimeMake(10, 30), CMTimeMake(18, 30)));
-    }
-    {
-        TQCurveEditorState state;
-        TQCurveSetListSerializer list;
-        const auto error = TQHostReadEditorTrees(doc, state, list, 5, CMTimeMake(1, 30));
-        ASSERT_TRUE(error) << "from version 5 on, the range holds times, not frame numbers";
-        EXPECT_NE(textOf(error).find("\"in\""), std::string::npos) << textOf(error);
-    }
-    {
-        TQCurveEditorState state;
-        read("<curveeditor><displayRange in='7/2'/></curveeditor>", state, 5);
-        EXPECT_EQ(state.displayRange().start, CMTimeMake(7, 2));
-        EXPECT_FALSE(CMTIME_IS_VALID(state.displayRange().duration))
-            << "without \"out\" the duration stays as it was";
-    }
+    TQCurveEditorState old, refused, noOut;
+    read(doc, old, 4, CMTimeMake(1, 30));
+    // The duration is counted from frame 0, not from the start; old files read so.
+    EXPECT_EQ(std::pair(old.displayRange().start, old.displayRange().duration),
+              std::pair(CMTimeMake(10, 30), CMTimeMake(18, 30)));
+    TQCurveSetListSerializer list;
+    const auto error = TQHostReadEditorTrees(doc, refused, list, 5, CMTimeMake(1, 30));
+    ASSERT_TRUE(error) << "from version 5 on, the range holds times, not frame numbers";
+    EXPECT_NE(textOf(error).find("\"in\""), std::string::npos) << textOf(error);
+    read("<curveeditor><displayRange in='7/2'/></curveeditor>", noOut, 5);
+    EXPECT_EQ(noOut.displayRange().start, CMTimeMake(7, 2));
+    EXPECT_FALSE(CMTIME_IS_VALID(noOut.displayRange().duration))
+        << "without \"out\" the duration stays as it was";
 }
 
 TEST_F(SavedTreesTest, state__flagsFollowTheDefaultsAndCopiesLeaveTheRangeUnset) {

@@ -143,9 +143,7 @@ TEST_F(CtrlCore, sortKeypoints__by_time_both_ways_with_ties_and_nulls) {
 // nothing, and a boolean channel opens none.
 TEST_F(CtrlCore, showValue__writes_the_accepted_value_in_channel_units) {
     RWScriptedModal modal;
-    RWServiceSet services;
-    services.modal = &modal;
-    RWInstallServices(services);
+    RWInstallServices({.modal = &modal});
     build("A: 1=0.5");
     item("A")->channel()->getInfo()->displayScale = 100.0;
     item("A")->setOriginalCurveDirty(0);
