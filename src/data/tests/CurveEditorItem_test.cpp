@@ -9,8 +9,6 @@
 
 namespace {
 
-constexpr double kTol = 1e-9;
-
 CMTime sec(double s) { return TQTarnTimeForChannelSeconds(s, 0x40000); }
 
 // scene
