@@ -93,10 +93,8 @@ TEST_P(AutomaticSets, byState__eachObjectShowsWhatMovesAndWhatWasSet) {
     ASSERT_EQ(animated->numberOfItems(), 4u);
     for (uint32_t i = 0; i < 4; ++i) {
         EXPECT_EQ(animated->rootItemAtIndex(i)->channelBase(), everything[i]);
-        EXPECT_EQ(std::static_pointer_cast<TQCurveEditorChannelItem>(
-                      animated->rootItemAtIndex(i)->childrenAtIndex(0))
-                      ->colorIndex(),
-                  0u);
+        const auto first = animated->rootItemAtIndex(i)->childrenAtIndex(0);
+        EXPECT_EQ(static_cast<TQCurveEditorChannelItem&>(*first).colorIndex(), 0u);
     }
 }
 

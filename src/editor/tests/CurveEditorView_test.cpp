@@ -237,8 +237,8 @@ TEST_F(TimelineTest, typed_numbers__move_the_selected_keypoints_as_one_undo_step
     EXPECT_TRUE(type("1", "2", "OK"));  // the user goes on typing: "12"
     EXPECT_EQ(shown, "1") << "the key that opened the panel is in its field";
     // Centred on the view's top edge, hanging below it.
-    EXPECT_EQ(panelFrame.origin.x + panelFrame.size.width / 2.0, 100.0 + 400.0);
-    EXPECT_EQ(panelFrame.origin.y + panelFrame.size.height, 200.0 + 400.0);
+    EXPECT_EQ(CGPointMake(CGRectGetMidX(panelFrame), CGRectGetMaxY(panelFrame)),
+              CGPointMake(100.0 + 400.0, 200.0 + 400.0));
     // A digit puts the earliest keypoint on that frame; the others keep their distance.
     const std::vector<double> after = keyTimes(x);
     ASSERT_EQ(after.size(), times.size());

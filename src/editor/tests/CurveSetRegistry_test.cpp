@@ -118,10 +118,9 @@ TEST_F(CurveSetRegistry, custom_sets__adding_cloning_and_merging) {
         const std::vector<const TQChannelBase*> position = shownChannels();
         const TQCurveSetPtr first = ctrl.cloneCurveSetWithName("Slide");
         const TQCurveSetPtr second = ctrl.cloneCurveSetWithName("Slide");
-        EXPECT_EQ(ctrl.selectedCurveSet(), second);
+        EXPECT_EQ(std::tuple(ctrl.selectedCurveSet(), second->isRelative(), channelsOf(*second)),
+                  std::tuple(second, false, position));
         EXPECT_EQ(first->curveSetName() + "|" + second->curveSetName(), "Slide|Slide 1");
-        EXPECT_FALSE(second->isRelative());
-        EXPECT_EQ(channelsOf(*second), position);
         // An absolute set keeps its channels whatever is selected.
         host.setSelectedObjects({object(kTQHostSampleBehaviorObject)});
         EXPECT_EQ(shownChannels(), position);
