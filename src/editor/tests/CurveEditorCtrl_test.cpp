@@ -120,14 +120,12 @@ TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
         ctrl.notify(kTQNotifyChannelsChanged);
         EXPECT_EQ(log, (Log{mod, beh, r}));
     }
-    {
-        SCOPED_TRACE("curves beyond a view out of focus zoom it");
-        state(&C::showAll, {title});
-        view.setIsInCurveEditor(0);
-        view.setCurrentViewVolume(CGRectMake(0, 0, 6, 0.001));
-        ctrl.notify(kTQNotifyChannelsChanged);
-        EXPECT_EQ(log, (Log{beh, "performAutoZoom", r}));
-    }
+    SCOPED_TRACE("curves beyond a view out of focus zoom it");
+    state(&C::showAll, {title});
+    view.setIsInCurveEditor(0);
+    view.setCurrentViewVolume(CGRectMake(0, 0, 6, 0.001));
+    ctrl.notify(kTQNotifyChannelsChanged);
+    EXPECT_EQ(log, (Log{beh, "performAutoZoom", r}));
 }
 
 TEST_F(Notify, rows__time_refreshes_animated_rows_and_keypoints_select_their_rows) {

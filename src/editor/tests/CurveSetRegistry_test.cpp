@@ -148,20 +148,18 @@ TEST_F(CurveSetRegistry, custom_sets__adding_cloning_and_merging) {
         const std::vector<const TQChannelBase*> shown = shownChannels();
         EXPECT_EQ(std::multiset(shown.begin(), shown.end()), expected);
     }
-    {
-        SCOPED_TRACE("merging the shown set with another");
-        host.setSelectedObjects({title});
-        choose("Opacity");
-        const std::vector<const TQChannelBase*> opacity = shownChannels();
-        const TQCurveSetPtr merged = ctrl.addCurveSetToCurrent(ctrl.curveSetRotation());
-        EXPECT_EQ(ctrl.selectedCurveSet(), merged);
-        EXPECT_EQ(merged->curveSetName(), "Opacity 1") << "the automatic name is reserved";
-        std::vector<const TQChannelBase*> expected = opacity;
-        for (const TQChannelBase* c : channelsOf(*ctrl.curveSetRotation())) expected.push_back(c);
-        const std::vector<const TQChannelBase*> shown = shownChannels();
-        EXPECT_EQ(std::multiset(shown.begin(), shown.end()),
-                  std::multiset(expected.begin(), expected.end()));
-    }
+    SCOPED_TRACE("merging the shown set with another");
+    host.setSelectedObjects({title});
+    choose("Opacity");
+    const std::vector<const TQChannelBase*> opacity = shownChannels();
+    const TQCurveSetPtr merged = ctrl.addCurveSetToCurrent(ctrl.curveSetRotation());
+    EXPECT_EQ(ctrl.selectedCurveSet(), merged);
+    EXPECT_EQ(merged->curveSetName(), "Opacity 1") << "the automatic name is reserved";
+    std::vector<const TQChannelBase*> expected = opacity;
+    for (const TQChannelBase* c : channelsOf(*ctrl.curveSetRotation())) expected.push_back(c);
+    const std::vector<const TQChannelBase*> shown = shownChannels();
+    EXPECT_EQ(std::multiset(shown.begin(), shown.end()),
+              std::multiset(expected.begin(), expected.end()));
 }
 
 TEST_F(CurveSetRegistry, unique_names__numbers_go_on_from_a_single_trailing_digit) {
