@@ -158,9 +158,7 @@ TEST_F(TimelineTest, text__time_as_frames_or_timecode_value_labels_and_the_keypo
     host.setStartTimecode(30);
     EXPECT_EQ(view.getCoordinates(nullptr, frame12, 0.5), "(00:00:01:12, 0.5)");
     // An amplitude channel's value in decibels, without decimals.
-    auto* volume =
-        dynamic_cast<TQChannel*>(TQChannelRef(TQHostTypedPaths(TQHostObjectFamily::Kestrel).volume)
-                                     .getChannel(object(kTQHostSampleQuaternionObject)));
+    TQChannel* volume = channel(kTQHostSampleQuaternionObject, TQHostTypedPaths(family()).volume);
     auto decibels = std::make_shared<TQCurveEditorChannelItem>();
     decibels->initWithChannel(volume, 10, &host, 0);
     EXPECT_EQ(view.getCoordinates(decibels.get(), frame12, 0.5), "(00:00:01:12,-6)");
