@@ -92,6 +92,7 @@ TEST_F(MiniCtrl, menu_commands__every_channel_in_one_undo_step) {
         sender.setTag(row.tag);
         ASSERT_TRUE(ctrl().performAction(row.action, sender));
         EXPECT_TRUE(*object == *want);
+        ASSERT_FALSE(recorder.bracketSequence().empty());
         EXPECT_EQ(std::tuple(recorder.captureBalance(), recorder.bracketSequence().back(),
                              host.undoDescription()),
                   std::tuple(0, "postNotification(0x8)", TQLocalizedString(row.undoKey)));
