@@ -158,9 +158,9 @@ TEST_F(AnimStatusCells, menu__built_for_the_selection_and_its_items_reach_the_ed
     const RWMenuItemPtr linear = item(menu, "Anim Menu Interpolation Linear");
     RWMenu* interpolation = linear->menu();
     interpolation->performActionForItemAtIndex(interpolation->indexOfItem(*linear));
-    EXPECT_EQ(channel->getInterpolation(), kTQInterpolationLinear);
-    EXPECT_EQ(linear->state(), RWOnState);
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Interpolation"));
+    EXPECT_EQ(std::tuple(channel->getInterpolation(), linear->state(), host.undoDescription()),
+              std::tuple(unsigned{kTQInterpolationLinear}, int32_t{RWOnState},
+                         TQLocalizedString("Undo Set Interpolation")));
 
     // No selected channel: no menu.
     ctrl.deselectAllChannels();

@@ -110,9 +110,7 @@ TEST_F(ChannelListTest, valueEdits__typedOrScrubbedOneUndoStepAtTheCurrentTime) 
         type(row, "abc");
         list.editColumn(value, row, true);
         type(row, list.editingText());
-        EXPECT_EQ(*channel, *before);
-        EXPECT_EQ(manipulator.edits, 0);
-        EXPECT_FALSE(host.canUndo());
+        EXPECT_TRUE(*channel == *before && manipulator.edits == 0 && !host.canUndo());
         channel->setObjectManipulator(nullptr);
     }
     const int64_t row = rowOf("Opacity");

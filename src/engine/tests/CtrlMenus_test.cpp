@@ -226,9 +226,8 @@ TEST_F(CtrlMenus, everyAction__chosenAfterItsChannelWentAwayChangesNothing) {
             object->removeChild(item->channel());
             const auto before = snapshot();
             holder->performActionForItemAtIndex(index);
-            EXPECT_TRUE(sceneIs(*before));
-            EXPECT_EQ(host.undoStack().undoCount(), 0u);
-            EXPECT_EQ(recorder.captureBalance(), 0);
+            EXPECT_TRUE(sceneIs(*before) && host.undoStack().undoCount() == 0u &&
+                        recorder.captureBalance() == 0);
         }
     }
 }
