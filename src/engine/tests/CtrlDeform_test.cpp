@@ -103,6 +103,11 @@ TEST_F(CtrlDeform, deformSelected__ends_where_it_should_however_the_corners_got_
     setupAll({item("A")});
     deform(end);
     EXPECT_TRUE(*c == *stepped) << "forty steps end exactly where one step to their end ends";
+    // The output handles take the distortion's cross term with u squared, the input ones not.
+    EXPECT_EQ(keyText(*c, true, 4),
+              "0.75=0(0,0|0.4368,0.4648) 2.312=1.812(-0.3555,-0.4414|0.5334,0.4336) "
+              "3.5=3.5(-0.2617,-0.4102|0.6536,0.4023) 4.781=1.781(-0.2852,-0.418|0.3474,0.4102) "
+              "5.688=3.375(-0.1914,-0.3867|0.08081,0.3789)");
 
     // The right side pulled through the left one (through a box of no width) and back:
     // mirrored in time each keypoint keeps its input handle before it, then all come back.
