@@ -46,6 +46,63 @@ TEST_F(CtrlCore, queries__selected_bounds_and_the_maximum_view_volume) {
     EXPECT_EQ(volume(), "0 10 0 50.025") << "reaches up to the curves";
 }
 
+// An absent selection or entry is a no-op: no channel changes and the host hears nothing.
+TEST_F(CtrlCore, absent_arguments__change_nothing_and_announce_nothing) {
+    build("A: 1=5(-0.2,0|0.2,0) 3=-2");
+    const auto before = snapshot();
+    recorder.clearCalls();
+    TQCurveEditorCtrlBase& c = ctrl();
+    const CMTime t = seconds(2.0);
+    const CGPoint p = CGPointMake(2.0, 1.0);
+    double u = 0.0, y = 0.0;
+    EXPECT_EQ(c.getKeypointPosition(nullptr), CGPointZero);
+    c.getSelectedVertex(nullptr, &u, &y);
+    EXPECT_FALSE(c.getSelected(nullptr, &u, &u, &y, &y));
+    EXPECT_EQ(c.addVertex(nullptr, t), nullptr);
+    EXPECT_EQ(c.addVertex(nullptr, t, 1.0, 1), nullptr);
+    EXPECT_EQ(c.setupDeformSelected(nullptr), CGRectZero);
+    const std::function<void(TQCurveSelectionList*)> onLists[] = {
+        [&](auto* l) { c.willModify(l); },
+        [&](auto* l) { c.didModify(l); },
+        [&](auto* l) { c.willModifyValue(l); },
+        [&](auto* l) { c.didModifyValue(l); },
+        [&](auto* l) { c.validateSelection(l); },
+        [&](auto* l) { c.purgeSelected(l); },
+        [&](auto* l) { c.cleanSelection(l); },
+        [&](auto* l) { c.deleteSelected(l); },
+        [&](auto* l) { c.duplicateSelected(l); },
+        [&](auto* l) { c.reverseSelected(l); },
+        [&](auto* l) { c.lockSelected(l); },
+        [&](auto* l) { c.disableSelected(l); },
+        [&](auto* l) { c.easeBothSelected(l); },
+        [&](auto* l) { c.moveSelected(l, t, 1, 1, 0); },
+        [&](auto* l) { c.offsetSelected(l, t, 1); },
+        [&](auto* l) { c.offsetCurve(l, t, 1); },
+        [&](auto* l) { c.deformSelected(l, p, p, p, p, 1); },
+        [&](auto* l) { c.setTangentsSelected(l, 2, 1); },
+        [&](auto* l) { c.setTangents45Selected(l, 2, 1, 0); },
+        [&](auto* l) { c.breakTangentsSelected(l); },
+        [&](auto* l) { c.alignTangentsSelected(l); },
+        [&](auto* l) { c.weightTangentsSelected(l, 1); },
+        [&](auto* l) { c.setBezierPointSelected(l); },
+        [&](auto* l) { c.flattenSelected(l); },
+    };
+    for (const auto& edit : onLists) edit(nullptr);
+    const std::function<void(const TQCurveSelection*)> onEntries[] = {
+        [&](auto* e) { c.setCurveInterpolation(e, 1); },
+        [&](auto* e) { c.deleteVertex(e, t); },
+        [&](auto* e) { c.setTangents(e, 2, 1); },
+        [&](auto* e) { c.setTangents45(e, 2, 1, 0); },
+        [&](auto* e) { c.saveTangents(e); },
+        [&](auto* e) { c.breakTangents(e); },
+        [&](auto* e) { c.weightTangents(e, 1); },
+        [&](auto* e) { c.setBezierPoint(e); },
+    };
+    for (const auto& edit : onEntries) edit(nullptr);
+    EXPECT_TRUE(sceneIs(*before));
+    EXPECT_EQ(recorder.bracketText(), "");
+}
+
 TEST_F(CtrlCore, sets__append_remove_refresh_and_first_channel) {
     // Group: W, then the compound Pos (X, Y), so the append recurses once.
     auto* group = static_cast<TQChannelFolder*>(
