@@ -153,6 +153,7 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"menuDelete", kMenuScene, kMenuSelection, "menu menuDelete:"},
         Edit{"menuDuplicate", kMenuScene, kMenuSelection, "menu menuDuplicate:"},
         Edit{"menuReverse", kMenuScene, kMenuSelection, "menu menuReverse:"},
+        Edit{"reverseSkipsHandles", "A: 1=0 2=1 3=2 4=3", "A<1 A@2 A@4", "menu menuReverse:"},
         Edit{"menuEaseIn", kMenuScene, kMenuSelection, "menu menuEaseIn:"},
         Edit{"menuEaseOut", kMenuScene, kMenuSelection, "menu menuEaseOut:"},
         Edit{"menuEaseBoth", kMenuScene, kMenuSelection, "menu menuEaseBoth:"},

@@ -36,7 +36,11 @@ protected:
 
 TEST_F(ViewBox, band__leaves_a_box_around_what_it_caught_with_any_tool) {
     build("A: 2=0/1 4=0.5/1 6=-0.25/1");
-    band();
+    ASSERT_TRUE(frame());
+    gesture("d 1 .9|m 4 0|m 7 -.9");
+    ASSERT_TRUE(frame());
+    EXPECT_TRUE(frameMatches("frame-band")) << "the band as it is dragged";
+    gesture("u 7 -.9");
     EXPECT_EQ(corners(), "2=-0.25 6=-0.25 6=0.5 2=0.5");
     ASSERT_TRUE(frame());
     EXPECT_TRUE(frameMatches("frame-box"));
