@@ -46,7 +46,7 @@ TEST_F(CtrlCore, queries__selected_bounds_and_the_maximum_view_volume) {
     EXPECT_EQ(volume(), "0 10 0 50.025") << "reaches up to the curves";
 }
 
-// An absent selection or entry is a no-op: no channel changes and the host hears nothing.
+// An absent selection, entry or frame is a no-op: no channel changes, the host hears nothing.
 TEST_F(CtrlCore, absent_arguments__change_nothing_and_announce_nothing) {
     build("A: 1=5(-0.2,0|0.2,0) 3=-2");
     const auto before = snapshot();
@@ -99,6 +99,9 @@ TEST_F(CtrlCore, absent_arguments__change_nothing_and_announce_nothing) {
         [&](auto* e) { c.setBezierPoint(e); },
     };
     for (const auto& edit : onEntries) edit(nullptr);
+    // Nor is there a free frame to duplicate onto without a frame.
+    recorder.answers.frameDuration = kCMTimeZero;
+    c.duplicateSelected(select("A@1"));
     EXPECT_TRUE(sceneIs(*before));
     EXPECT_EQ(recorder.bracketText(), "");
 }

@@ -119,9 +119,11 @@ TEST_F(ViewBox, drag__keeps_the_curves_whole_and_pans_once_the_box_enters_the_ba
     gesture("u 4 .3");
     ASSERT_TRUE(frame());
     gesture("d 4 .3|m 4 -.3|u 4 -.3");
-    EXPECT_TRUE(range().panned.empty()) << "a top at 0.8, a bottom at -0.8: short of the band";
     ASSERT_TRUE(frame());
-    gesture("d 4 -.3|m 4 .45|u 4 .45");
+    gesture("d 4 -.3|m 2.5 -.3|u 2.5 -.3");
+    EXPECT_TRUE(range().panned.empty()) << "top 0.8, bottom -0.8, left 0.5: short of the edges";
+    ASSERT_TRUE(frame());
+    gesture("d 2.5 -.3|m 2.5 .45|u 2.5 .45");
     EXPECT_EQ(range().panned.size(), 1u) << "a top at 0.95 is in it";
 }
 
