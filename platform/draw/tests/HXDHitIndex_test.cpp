@@ -34,12 +34,11 @@ std::vector<Found> walk(const HXDPrimitiveArray& list, const HXDHitTestContext& 
     }
     if (!closest || all.empty()) return all;
     Found best = all[0];
-    for (const Found& f : all) {
+    for (const Found& f : all)
         if (f.distance < best.distance ||
             (f.distance == best.distance &&
              f.primitive->hitPriority() >= best.primitive->hitPriority()))
             best = f;
-    }
     return {best};
 }
 
@@ -96,8 +95,8 @@ protected:
             8, HXDBrush{}, std::vector<HXDSubmesh>{HXDSubmesh({{6, -2}, {8, -2}, {8, 0}})});
         outline->setWireframe(true);
         list.push_back(outline);
-        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(-1, -1, 12, 0.1),
-                                                            9));  // across everything
+        // Across everything.
+        list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(-1, -1, 12, 0.1), 9));
         list.push_back(std::make_shared<HXDText>(HXDAttributedString{"1.25", HXDTextAttributes{}},
                                                  HXDTextLayoutAnchor::Center, CGPointMake(3, 3)));
         list.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(NAN, 0, 1, 1), 10));
@@ -118,7 +117,7 @@ protected:
             const HXDHitTestContext contexts[] = {
                 at(p), controller.renderingContextForHitTestInRect(
                            CGRectMake(p.x, p.y, trial % 2 ? w : -w, 8.0 * band(rng)))};
-            for (const HXDHitTestContext& c : contexts) {
+            for (const HXDHitTestContext& c : contexts)
                 for (const bool closest : {true, false}) {
                     const auto got = controller.newHitTestResultForPrimitives(list, c, closest);
                     const auto expected = walk(list, c, closest);
@@ -133,7 +132,6 @@ protected:
                             << "trial " << trial;
                     }
                 }
-            }
         }
     }
 };
@@ -143,16 +141,12 @@ TEST_F(HitIndexFixture, longList__answersAsAWalkDoesForPointsAndBands) {
     ASSERT_GE(list.size(), hxd_internal::PrimitiveIndex::kMinPrimitives)
         << "the list must be long enough to index";
     expectAgreesWithWalk(list, 11, 400);
-    {
-        // On a backing scale of 2 the lines reach twice as far: the index is rebuilt for it.
-        installFrame(2.0f);
-        expectAgreesWithWalk(list, 12, 150);
-    }
-    {
-        // A sheared mapping: world boxes no longer bound pixel boxes, and the list is walked.
-        installFrame(1.0f, 0.05);
-        expectAgreesWithWalk(list, 13, 150);
-    }
+    // On a backing scale of 2 the lines reach twice as far: the index is rebuilt for it.
+    installFrame(2.0f);
+    expectAgreesWithWalk(list, 12, 150);
+    // A sheared mapping: world boxes no longer bound pixel boxes, and the list is walked.
+    installFrame(1.0f, 0.05);
+    expectAgreesWithWalk(list, 13, 150);
 }
 
 TEST_F(HitIndexFixture, index__columnsCutTheListAndFindOnlyWhatIsNear) {
@@ -215,10 +209,7 @@ TEST_F(HitIndexFixture, quad__edgesDecideAsInPixels) {
         EXPECT_TRUE(pick({quad}, CGPointMake(edge.x + 0.01 * out, edge.y)).empty())
             << edge.x << ", " << edge.y;
         const auto band = [&](double x) {
-            return controller.newHitTestResultForPrimitives(
-                {quad},
-                controller.renderingContextForHitTestInRect(CGRectMake(x, edge.y, 5.0 * out, 1.0)),
-                false);
+            return inBand({quad}, CGRectMake(x, edge.y, 5.0 * out, 1.0));
         };
         EXPECT_TRUE(band(edge.x + 0.01 * out).empty()) << "a band just beside the edge";
         EXPECT_EQ(band(edge.x).size(), 1u) << "a band touching the edge";

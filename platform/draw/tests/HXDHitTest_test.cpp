@@ -126,7 +126,10 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
             const double px = ux(rng);
             const double py = uy(rng);
             const CGPoint p = pixel(px, py);
+            // A band of up to 30 px around the point: crossed by some segment, or not.
+            const CGRect band = CGRectMake(p.x, p.y, (trial % 7) * 5.0, (trial % 5) * 6.0);
             double best = std::numeric_limits<double>::infinity();
+            bool crossed = false;
             for (size_t s = 0; s < segments; ++s) {
                 const HXDLineVertex& a = v[s];
                 const HXDLineVertex& b = v[(s + 1) % v.size()];
@@ -136,24 +139,12 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
                 double t = ((p.x - pa.x) * dx + (p.y - pa.y) * dy) / (dx * dx + dy * dy);
                 t = std::clamp(std::isfinite(t) ? t : 0.0, 0.0, 1.0);
                 best = std::min(best, std::hypot(pa.x + t * dx - p.x, pa.y + t * dy - p.y));
+                crossed = crossed || hxd_internal::segmentMeetsRect(
+                                         pa.x, pa.y, pb.x, pb.y, band.origin.x - 0.5,
+                                         band.origin.y - 0.5, band.origin.x + band.size.width + 0.5,
+                                         band.origin.y + band.size.height + 0.5);
             }
-            // A band of up to 30 px around the point: crossed by some segment, or not.
-            const CGRect band = CGRectMake(p.x, p.y, (trial % 7) * 5.0, (trial % 5) * 6.0);
-            bool crossed = false;
-            for (size_t s = 0; s < segments && !crossed; ++s) {
-                const HXDLineVertex& a = v[s];
-                const HXDLineVertex& b = v[(s + 1) % v.size()];
-                const CGPoint pa = mapping.worldToPixel(a.start.x, a.start.y);
-                const CGPoint pb = mapping.worldToPixel(b.start.x, b.start.y);
-                crossed = hxd_internal::segmentMeetsRect(
-                    pa.x, pa.y, pb.x, pb.y, band.origin.x - 0.5, band.origin.y - 0.5,
-                    band.origin.x + band.size.width + 0.5, band.origin.y + band.size.height + 0.5);
-            }
-            EXPECT_EQ(controller
-                          .newHitTestResultForPrimitives(
-                              {line}, controller.renderingContextForHitTestInRect(band), false)
-                          .size(),
-                      crossed ? 1u : 0u)
+            EXPECT_EQ(inBand({line}, band).size(), crossed ? 1u : 0u)
                 << "band of trial " << trial << " loop " << line->loop();
 
             const auto hits = pick({line}, p);
