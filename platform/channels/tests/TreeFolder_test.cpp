@@ -165,28 +165,23 @@ TEST_F(TreeFolderTest, ancestors__locksObserversTimeOffsetsAndRoots) {
 }
 
 TEST_F(TreeFolderTest, children__ownershipMovesAndBadIndices) {
-    EXPECT_EQ(object.getChild(99), nullptr);
-    EXPECT_EQ(object.getChild(object.numberOfChildren()), nullptr);
-    EXPECT_EQ(object.takeChildAt(object.numberOfChildren()), nullptr);
-    EXPECT_FALSE(object.removeChildAt(99));
-    EXPECT_EQ(object.takeChildAt(2), nullptr) << "a null slot has nothing to hand over";
-    EXPECT_EQ(object.takeChildAt(99), nullptr);
+    const size_t n = object.numberOfChildren();
     TQChannel stranger("Stranger", 5);
-    EXPECT_FALSE(object.removeChild(&stranger) || object.removeChild(nullptr) ||
+    EXPECT_FALSE(object.getChild(99) || object.getChild(n) || object.takeChildAt(n) ||
+                 object.takeChildAt(99) || object.removeChildAt(99) ||
+                 object.removeChild(&stranger) || object.removeChild(nullptr) ||
                  object.indexOfChild(opacity));
+    EXPECT_EQ(object.takeChildAt(2), nullptr) << "a null slot has nothing to hand over";
     EXPECT_EQ(object.numberOfChildren(), 5u);
 
     std::unique_ptr<TQChannelBase> taken = object.takeChild(visible);
     ASSERT_NE(taken, nullptr);
-    EXPECT_EQ(taken->getParent(), nullptr);
-    EXPECT_EQ(object.findChild(1000), nullptr);
+    EXPECT_FALSE(taken->getParent() || object.findChild(1000));
     hidden->insertChild(500, std::move(taken));  // past the end appends
-    EXPECT_EQ(hidden->indexOfChild(visible), 1u);
-    EXPECT_EQ(visible->getParent(), hidden);
+    EXPECT_TRUE(hidden->indexOfChild(visible) == 1u && visible->getParent() == hidden);
     transform->insertChild(0, std::unique_ptr<TQChannelBase>(visible));  // moves between folders
-    EXPECT_EQ(hidden->numberOfChildren(), 1u);
-    EXPECT_EQ(transform->getChild(0), visible);
-    EXPECT_EQ(visible->getParent(), transform);
+    EXPECT_TRUE(hidden->numberOfChildren() == 1u && transform->getChild(0) == visible &&
+                visible->getParent() == transform);
     delete visible;  // deleted on its own: it leaves its folder first
     EXPECT_EQ(transform->numberOfChildren(), 2u);
     EXPECT_TRUE(object.removeChildAt(2)) << "an empty slot can be removed";
