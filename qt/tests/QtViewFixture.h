@@ -52,4 +52,21 @@ protected:
     TQQtCurveViewWidget widget;
 };
 
+// The catalogue's "bump" (0 at 2 s, 0.5 at 5 s, 0 at 8 s) as channel A, its item at scale 1,
+// drawn once.
+class QtBumpFixture : public QtViewFixture {
+protected:
+    void SetUp() override {
+        QtViewFixture::SetUp();
+        channel = addCurve("A", "bump");
+        item = addItem(channel);
+        item->setScaleY(1.0);
+        item->setOffsetY(0.0);
+        drawFrame();
+        ASSERT_GE(widget.framesDrawn(), 1) << "the widget drew no frame: picks would find nothing";
+    }
+    TQChannel* channel = nullptr;
+    TQCurveEditorChannelItemPtr item;
+};
+
 }  // namespace qt_test

@@ -10,20 +10,7 @@
 namespace qt_test {
 namespace {
 
-class QtCurveViewWidget : public QtViewFixture {
-protected:
-    void SetUp() override {
-        QtViewFixture::SetUp();
-        channel = addCurve("A", "bump");
-        item = addItem(channel);
-        item->setScaleY(1.0);
-        item->setOffsetY(0.0);
-        drawFrame();
-        ASSERT_GE(widget.framesDrawn(), 1) << "the widget drew no frame: picks would find nothing";
-    }
-    TQChannel* channel = nullptr;
-    TQCurveEditorChannelItemPtr item;
-};
+using QtCurveViewWidget = QtBumpFixture;
 
 TEST_F(QtCurveViewWidget, press_while_a_gesture_is_open__ends_it_first) {
     // The release of a drag can go astray (to a window that was modal meanwhile); the next

@@ -45,9 +45,10 @@ protected:
     void TearDown() override { panel.setRows({}); }
     // The widgets here carry no meta-object of their own: found by their C++ class.
     template <class Widget>
-    Widget* find() {
+    Widget* find(bool (*accept)(Widget&) = nullptr) {
         for (QWidget* w : panel.findChildren<QWidget*>())
-            if (auto* found = dynamic_cast<Widget*>(w)) return found;
+            if (auto* found = dynamic_cast<Widget*>(w); found && (!accept || accept(*found)))
+                return found;
         return nullptr;
     }
 
@@ -81,18 +82,14 @@ TEST_F(QtInspectorPanel, over_range_parameter_opens_onto_its_mini_editor_and_res
     auto& group = static_cast<TQMiniCurveEditorGroupController&>(*rows[1]);
     ASSERT_TRUE(group.editorController()->isHidden());
     EXPECT_FALSE(editor->isVisible()) << "the parameter starts closed";
-    QToolButton* disclosure = nullptr;
-    for (QToolButton* b : panel.findChildren<QToolButton*>())
-        if (!disclosure && b->text() == QStringLiteral("Gradient")) disclosure = b;  // the heading
+    auto* disclosure =  // the heading
+        find<QToolButton>([](QToolButton& b) { return b.text() == QStringLiteral("Gradient"); });
     ASSERT_NE(disclosure, nullptr);
     disclosure->click();
     EXPECT_TRUE(editor->isVisible());
 
-    TQQtButton* reset = nullptr;
-    for (QWidget* w : panel.findChildren<QWidget*>())
-        if (auto* b = dynamic_cast<TQQtButton*>(w);
-            b && b->model() && b->model()->action() == "resetChannel:")
-            reset = b;
+    auto* reset = find<TQQtButton>(
+        [](TQQtButton& b) { return b.model() && b.model()->action() == "resetChannel:"; });
     ASSERT_NE(reset, nullptr);
     reset->click();
     EXPECT_TRUE(gradient->getXChannel()->getKeyframes(false).empty());

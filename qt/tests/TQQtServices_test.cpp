@@ -32,7 +32,7 @@ TEST(QtViewHostTest, convertPointFromWindow__flips_y_and_removes_the_offset) {
     host.setCursor(RWCursor::Arrow);
 }
 
-TEST(QtViewHostTest, setCursor__hidden_wins_until_shown_again) {
+TEST(QtViewHostTest, setCursor__hidden_wins_and_zoom_cursors_are_drawn_images) {
     QWidget view;
     TQQtViewHost host(&view);
     host.setCursor(RWCursor::Move);
@@ -41,17 +41,13 @@ TEST(QtViewHostTest, setCursor__hidden_wins_until_shown_again) {
     EXPECT_EQ(view.cursor().shape(), Qt::BlankCursor) << "a new shape must not unhide the cursor";
     host.setCursorHidden(false);
     EXPECT_EQ(view.cursor().shape(), Qt::CrossCursor);
-}
 
-TEST(QtViewHostTest, zoomCursors__are_drawn_images_that_tell_in_from_out) {
-    QWidget view;
-    TQQtViewHost host(&view);
+    // The zoom cursors tell in from out.
     host.setCursor(RWCursor::ZoomIn);
     const QCursor in = view.cursor();
     host.setCursor(RWCursor::ZoomOut);
     const QCursor out = view.cursor();
-    ASSERT_EQ(in.shape(), Qt::BitmapCursor);
-    ASSERT_EQ(out.shape(), Qt::BitmapCursor);
+    ASSERT_TRUE(in.shape() == Qt::BitmapCursor && out.shape() == Qt::BitmapCursor);
     const QImage inImage = in.pixmap().toImage();
     const QImage outImage = out.pixmap().toImage();
     ASSERT_FALSE(inImage.isNull());
@@ -90,10 +86,6 @@ TEST(QtServiceInstallerTest, installs_and_restores) {
     EXPECT_EQ(RWApplicationServices().clock, before);
     EXPECT_EQ(&HXDTextMetrics::shared(), metricsBefore);
 }
-
-}  // namespace
-
-namespace {
 
 TEST(QtUserDefaultsTest, valuesOutliveTheSettingsObjectAndSitAboveRegisteredOnes) {
     const QString path = QString::fromStdString(testing::TempDir()) + "qt_user_defaults.ini";

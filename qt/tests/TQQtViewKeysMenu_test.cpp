@@ -16,21 +16,14 @@
 namespace qt_test {
 namespace {
 
-class QtViewKeysMenu : public QtViewFixture {
+class QtViewKeysMenu : public QtBumpFixture {
 protected:
     void SetUp() override {
-        QtViewFixture::SetUp();
-        channel = addCurve("A", "bump");  // 2 0, 5 .5, 8 0
+        QtBumpFixture::SetUp();
         channel->setInterpolation(kTQInterpolationLinear);
-        item = addItem(channel);
-        item->setScaleY(1.0);
-        item->setOffsetY(0.0);
         item->select(1);
         drawFrame();
-        ASSERT_GE(widget.framesDrawn(), 1) << "the widget drew no frame: picks would find nothing";
     }
-    TQChannel* channel = nullptr;
-    TQCurveEditorChannelItemPtr item;
 };
 
 TEST_F(QtViewKeysMenu, keys__nudgeAFrameAndDeleteEachAsAStepOfItsOwn) {
@@ -56,8 +49,6 @@ TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheC
     channel->setKeyframeInterpolation(channel->getKeyframe(seconds(2)), kTQInterpolationBezier);
     selectInView({});
     RWMenuPtr shown;
-    QAction* linear = nullptr;
-    QAction* constant = nullptr;
     widget.setContextMenuRunner([&](const RWMenuPtr& menu, const QPoint&) {
         shown = menu;
         QMenu qmenu;
@@ -67,8 +58,8 @@ TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheC
         QMenu* kinds = qmenu.actions()[8]->menu();
         if (!kinds) return false;
         // The submenu in the order of the kinds: Constant, Linear, ...
-        constant = kinds->actions().value(0);
-        linear = kinds->actions().value(1);
+        QAction* constant = kinds->actions().value(0);
+        QAction* linear = kinds->actions().value(1);
         if (!linear || !constant) return false;
         EXPECT_FALSE(linear->isCheckable());
         EXPECT_FALSE(linear->icon().isNull()) << "a mixed item shows the dash";
@@ -82,7 +73,6 @@ TEST_F(QtViewKeysMenu, rightClick__showsTheHitsMenuValidatedAsItOpensAndRunsTheC
     QCoreApplication::sendEvent(&widget, &click);
 
     EXPECT_EQ(shown, ctrl().getKeyframeMenu());
-
     EXPECT_EQ(channel->getKeyframeInterpolation(channel->getKeyframe(seconds(5))),
               kTQInterpolationConstant);
     EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Interpolation"));

@@ -4,6 +4,7 @@
 // widget's coordinates.
 #include <gtest/gtest.h>
 
+#include <QMenu>
 #include <QPoint>
 #include <QTest>
 
@@ -15,6 +16,7 @@
 #include "platform/ui/RWServices.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "qt/TQQtCurveViewWidget.h"
+#include "qt/TQQtPopUpButton.h"
 
 namespace demo_test {
 
@@ -90,16 +92,36 @@ protected:
         return QPoint(static_cast<int>(std::lround(s.x / ratio)),
                       static_cast<int>(std::lround(window.curveWidget()->height() - s.y / ratio)));
     }
-    // A keyframe of the first shown channel, in the curve widget's coordinates.
-    QPoint keypointInWidget() {
+    // Chooses the curve set pop-up's item titled `title`.
+    void choose(const QString& title) {
+        QMenu* menu = window.curveSetPopUp()->popUpMenu();
+        emit menu->aboutToShow();
+        for (QAction* action : menu->actions())
+            if (action->text() == title) return action->trigger();
+        ADD_FAILURE() << "no item " << title.toStdString();
+    }
+    // Each custom set as its name and its channels' paths.
+    std::vector<std::string> customSets() {
+        std::vector<std::string> out;
+        for (const TQCurveSetPtr& set : window.controller().curveSets()) {
+            out.push_back(set->curveSetName());
+            for (const TQCurveEditorItemPtr& item : set->allItems())
+                out.back().append(" ").append(
+                    TQChannelRef(item->channelBase(), window.host().sceneChannelRoot()).getText());
+        }
+        return out;
+    }
+    // A keyframe of the first shown channel (its middle one unless named), in the curve
+    // widget's coordinates.
+    QPoint keypointInWidget(TQKeyframeHandle key = nullptr) {
         TQDemoCurveEditorCtrl& controller = window.controller();
         const TQCurveEditorItemPtr item = controller.selectedCurveSet()->channeItemAtIndex(0);
         TQChannel* channel = item ? item->channel() : nullptr;
         if (!channel || channel->numberOfKeyframes() == 0) return QPoint(-1, -1);
-        const std::vector<TQKeyframeHandle> keys = channel->getKeyframes(false);
+        if (!key) key = channel->getKeyframes(false)[channel->numberOfKeyframes() / 2];
         CMTime t = kCMTimeInvalid;
         double v = 0.0;
-        channel->getKeyframe(keys[keys.size() / 2], &t, &v);
+        if (!channel->getKeyframe(key, &t, &v)) return QPoint(-1, -1);
         const double u = CMTimeGetSeconds(t) + CMTimeGetSeconds(channel->timeOffset());
         return toWidget(CGPointMake(u, controller.convertFromChannelCoords(item.get(), v)));
     }

@@ -12,7 +12,6 @@
 
 #include "apps/demo/tests/DemoWindowFixture.h"
 #include "qt/TQQtModal.h"
-#include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtTableView.h"
 #include "qt/TQQtTextField.h"
 
@@ -24,13 +23,6 @@ protected:
     void SetUp() override {
         DemoWindowTest::SetUp();
         modal.install();
-    }
-    void choose(const QString& title) {
-        QMenu* menu = window.curveSetPopUp()->popUpMenu();
-        emit menu->aboutToShow();
-        for (QAction* action : menu->actions())
-            if (action->text() == title) return action->trigger();
-        ADD_FAILURE() << "no item " << title.toStdString();
     }
     // Chooses the entry and works its dialog once it is up; a dialog left open is aborted.
     void inDialogOf(const QString& entry, std::function<void(QDialog&)> user) {
@@ -50,18 +42,6 @@ protected:
             if (button->text() == QLatin1String(title)) return button->click();
         ADD_FAILURE() << "no button " << title;
     }
-    // Names and channels of the custom sets.
-    std::vector<std::string> customSets() {
-        std::vector<std::string> out;
-        for (const TQCurveSetPtr& set : window.controller().curveSets()) {
-            out.push_back(set->curveSetName());
-            for (const TQCurveEditorItemPtr& item : set->allItems())
-                out.back().append(" ").append(
-                    TQChannelRef(item->channelBase(), window.host().sceneChannelRoot()).getText());
-        }
-        return out;
-    }
-
     TQQtModalService modal;
 };
 

@@ -53,14 +53,6 @@ inline void keys(TQChannel& c, std::initializer_list<std::pair<double, double>> 
     for (const auto& [t, v] : secondsValues) c.setKeyframe(seconds(t), v);
 }
 
-inline void fillFlat(TQChannel& c) { keys(c, {{0.0, 5.0}, {1.0, 5.0}, {2.0, 5.0}}); }
-
-inline std::unique_ptr<TQChannel> flat() {
-    auto c = makeChannel("flat");
-    fillFlat(*c);
-    return c;
-}
-
 inline void fillOvershoot(TQChannel& channel) {
     TQChannel* c = &channel;
     TQKeyframeHandle a = c->setKeyframe(seconds(0.0), 0.0);
@@ -72,12 +64,6 @@ inline void fillOvershoot(TQChannel& channel) {
     c->setKeyframeInputTangents(d, -0.5, 12.0);
 }
 
-inline std::unique_ptr<TQChannel> overshoot() {
-    auto c = makeChannel("overshoot");
-    fillOvershoot(*c);
-    return c;
-}
-
 inline void fillCusp(TQChannel& channel) {
     TQChannel* c = &channel;
     c->setKeyframe(seconds(0.0), 0.0);
@@ -86,12 +72,6 @@ inline void fillCusp(TQChannel& channel) {
     c->setKeyframeTangentsBroken(mid, true);
     c->setKeyframeInputTangents(mid, -0.3, 3.0);
     c->setKeyframeOutputTangents(mid, 0.3, 3.0);
-}
-
-inline std::unique_ptr<TQChannel> cusp() {
-    auto c = makeChannel("cusp");
-    fillCusp(*c);
-    return c;
 }
 
 // Deterministic generator (64-bit LCG, top bits) so that every run sees the same curve. Draw
@@ -173,7 +153,7 @@ inline int countAfter(std::string_view name, std::string_view prefix) {
 // Builds the named curve into `c`, which holds no keyframes yet. A name the catalogue does not
 // hold is a mistake in the test and throws.
 inline void fill(TQChannel& c, std::string_view name) {
-    if (name == "flat") return fillFlat(c);
+    if (name == "flat") return keys(c, {{0.0, 5.0}, {1.0, 5.0}, {2.0, 5.0}});
     if (name == "overshoot") return fillOvershoot(c);
     if (name == "cusp") return fillCusp(c);
     if (name == "level") return keys(c, {{2.0, 0.0}, {5.0, 0.0}, {8.0, 0.0}});
@@ -189,5 +169,9 @@ inline std::unique_ptr<TQChannel> make(std::string_view name) {
     fill(*c, name);
     return c;
 }
+
+inline std::unique_ptr<TQChannel> flat() { return make("flat"); }
+inline std::unique_ptr<TQChannel> overshoot() { return make("overshoot"); }
+inline std::unique_ptr<TQChannel> cusp() { return make("cusp"); }
 
 }  // namespace curve_catalogue
