@@ -60,24 +60,22 @@ TEST_F(NotificationCenter, unregisterDuringDelivery__isSafeAndTakesEffectAtOnce)
     center.addReceiver(&a);
     center.addReceiver(&b);
     center.addReceiver(&c);
-    {  // a removes b, which has not heard the word yet, and itself.
-        a.onFirst = [&](TQNotificationWord) {
-            center.removeReceiver(&b);
-            center.removeReceiver(&a);
-        };
-        center.post(0x8);
-        EXPECT_EQ(log, (Log{{'a', 0x8}, {'c', 0x8}}));
-        EXPECT_EQ(center.receiverCount(), 1u);
-    }
-    {  // c registers b again from inside notify: b hears the next word, not this one.
-        log.clear();
-        c.onFirst = [&](TQNotificationWord) {
-            center.addReceiver(&b);
-            center.post(0x2);
-        };
-        center.post(0x10);
-        EXPECT_EQ(log, (Log{{'c', 0x10}, {'c', 0x2}, {'b', 0x2}}));
-    }
+    // a removes b, which has not heard the word yet, and itself.
+    a.onFirst = [&](TQNotificationWord) {
+        center.removeReceiver(&b);
+        center.removeReceiver(&a);
+    };
+    center.post(0x8);
+    EXPECT_EQ(log, (Log{{'a', 0x8}, {'c', 0x8}}));
+    EXPECT_EQ(center.receiverCount(), 1u);
+    // c registers b again from inside notify: b hears the next word, not this one.
+    log.clear();
+    c.onFirst = [&](TQNotificationWord) {
+        center.addReceiver(&b);
+        center.post(0x2);
+    };
+    center.post(0x10);
+    EXPECT_EQ(log, (Log{{'c', 0x10}, {'c', 0x2}, {'b', 0x2}}));
     center.removeReceiver(&a);  // unknown now: ignored
     EXPECT_TRUE(center.hasReceiver(&b));
 }
