@@ -53,7 +53,7 @@ TEST_P(SceneFamilies, pathTables__resolveToKeyframableChannelsOfEveryObject) {
     TQChannelObjectRootBase* second = scene.addObject("B");
     ASSERT_NE(first->getChannelId(), second->getChannelId());
 
-    for (TQHostProperty property : kAllProperties) {
+    for (TQHostProperty property : kAllProperties)
         for (const BNString& path : TQHostPropertyPaths(family, property)) {
             auto* channel = dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(second));
             ASSERT_NE(channel, nullptr) << path << " does not name a channel";
@@ -62,7 +62,6 @@ TEST_P(SceneFamilies, pathTables__resolveToKeyframableChannelsOfEveryObject) {
             EXPECT_EQ(channel->getRef(true), TQChannelRef(path))
                 << "the relative reference of " << path << " must be the table's text";
         }
-    }
     EXPECT_EQ(TQHostPropertyPaths(family, TQHostProperty::Shear).empty(),
               family == TQHostObjectFamily::Other);
     EXPECT_EQ(scene.isKestrel(), family == TQHostObjectFamily::Kestrel);

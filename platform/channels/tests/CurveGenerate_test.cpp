@@ -64,9 +64,9 @@ TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_fram
     const unsigned modes[] = {kTQExtrapolationRepeat, kTQExtrapolationPingPong,
                               kTQExtrapolationProgressive, kTQExtrapolationLinear,
                               kTQExtrapolationConstant};
-    for (bool discrete : {false, true}) {
-        for (unsigned mode : modes) {
-            for (unsigned direction : {kTQExtrapolationBefore, kTQExtrapolationAfter}) {
+    for (bool discrete : {false, true})
+        for (unsigned mode : modes)
+            for (unsigned direction : {kTQExtrapolationBefore, kTQExtrapolationAfter})
                 for (unsigned cycles : {1u, 2u, 5u}) {
                     SCOPED_TRACE(testing::Message()
                                  << "mode " << mode << " direction " << direction << " cycles "
@@ -101,9 +101,6 @@ TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_fram
                     EXPECT_EQ(baked->getKeyframeMaxValue(false),
                               reference_curves::greatestKeyframeValue(*baked));
                 }
-            }
-        }
-    }
 }
 
 TEST(CurveGenerate, copies_keep_the_state_of_their_originals_and_existing_handles_stay) {

@@ -178,7 +178,7 @@ TEST_F(CurveExtrapolation, cycles__repeatPingPongAndProgressiveOnBothSides) {
     for (const unsigned code :
          {kTQExtrapolationRepeat, kTQExtrapolationPingPong, kTQExtrapolationProgressive}) {
         extrapolate(code);
-        for (double u = 0.05; u < 1.9; u += 0.15) {
+        for (double u = 0.05; u < 1.9; u += 0.15)
             for (const int k : {-3, -2, -1, 1, 2, 5}) {
                 const bool mirrored = code == kTQExtrapolationPingPong && k % 2 != 0;
                 const double expected = at(*c, mirrored ? 3.0 - u : 1.0 + u) +
@@ -186,7 +186,6 @@ TEST_F(CurveExtrapolation, cycles__repeatPingPongAndProgressiveOnBothSides) {
                 EXPECT_NEAR(at(*c, 1.0 + u + 2.0 * k), expected, kValueTolerance)
                     << "code " << code << " cycle " << k << " u " << u;
             }
-        }
     }
 }
 

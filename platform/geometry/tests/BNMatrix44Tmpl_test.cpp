@@ -136,7 +136,7 @@ TEST(ViewProjection, roundTrip__worldToScreenToWorldWithinFloatRounding) {
         auto tol = [](double origin, double size) {
             return 16.0 * kFloatUlp * std::fmax(std::fabs(origin), size);
         };
-        for (double fx : {0.0, 0.125, 0.5, 0.9}) {
+        for (double fx : {0.0, 0.125, 0.5, 0.9})
             for (double fy : {0.0, 0.3, 1.0}) {
                 const CGPoint world{volume.origin.x + fx * volume.size.width,
                                     volume.origin.y + fy * volume.size.height};
@@ -148,7 +148,6 @@ TEST(ViewProjection, roundTrip__worldToScreenToWorldWithinFloatRounding) {
                 EXPECT_NEAR(back.x, world.x, tol(volume.origin.x, volume.size.width));
                 EXPECT_NEAR(back.y, world.y, tol(volume.origin.y, volume.size.height));
             }
-        }
     }
     // Before the first frame there is no projection: both ways answer "no point".
     const CGPoint world = BNProjectionScreenToWorld(BNMatrix44f(), drawable, {10.0, 20.0});

@@ -33,7 +33,7 @@ TEST(Rect, operations__agreeWithPointMembershipOnAGrid) {
         // Each operation's answer for the point, against what membership in a and b says; the
         // union and the integral form hold at least their operands' points, and the slice and
         // the rest share none.
-        for (double x = -9.5; x <= 9.5; x += 0.5) {
+        for (double x = -9.5; x <= 9.5; x += 0.5)
             for (double y = -9.5; y <= 9.5; y += 0.5) {
                 const bool inA = in(a, x, y), inB = in(b, x, y);
                 const bool inU = in(u, x, y) && ba.united(bb).contains(x, y);
@@ -47,7 +47,6 @@ TEST(Rect, operations__agreeWithPointMembershipOnAGrid) {
                                 in(a, x - 0.5, y - 0.5) && in(a, x + 0.5, y + 0.5), true, true}))
                     << x << ", " << y;
             }
-        }
         const bool shared = CGRectGetWidth(i) > 0 && CGRectGetHeight(i) > 0 && !CGRectIsNull(i);
         EXPECT_EQ((std::array{CGRectIntersectsRect(a, b), ba.intersects(bb),
                               CGRectContainsRect(a, b), CGRectEqualToRect(a, s)}),

@@ -214,27 +214,24 @@ TEST(BNSerializerTest, reader__handlersScopesAndSkippedChildren) {
         "  </book>"
         "  <book title='B'><note>seen only without skipping</note></book>"
         "</shelf>";
-    {
-        Shelf shelf;
-        ASSERT_FALSE(read(doc, shelf));
-        // The unknown element reaches the handler with id 0; its child is still the shelf's.
-        ASSERT_EQ(shelf.books.size(), 3u);
-        EXPECT_EQ(shelf.books[0]->title, "inside an unknown element");
-        EXPECT_EQ(shelf.books[1]->title, "A");
-        EXPECT_EQ(shelf.books[1]->price, 2.5);
-        EXPECT_EQ(shelf.books[1]->notes, (std::vector<BNString>{"first", "second", "nested"}))
-            << "inside a book only the book's scope names elements; content is the text "
-               "before the first child";
-        EXPECT_EQ(shelf.books[2]->notes, std::vector<BNString>{"seen only without skipping"});
-        EXPECT_EQ(shelf.seen, (std::vector<BNString>{"shelf", "unknown", "book", "book", "book"}));
-    }
-    {
-        Shelf shelf;
-        shelf.skipChildren = true;
-        ASSERT_FALSE(read(doc, shelf));
-        ASSERT_EQ(shelf.books.size(), 3u);
-        EXPECT_TRUE(shelf.books[2]->notes.empty()) << "a true answer skips the children";
-    }
+    Shelf shelf;
+    ASSERT_FALSE(read(doc, shelf));
+    // The unknown element reaches the handler with id 0; its child is still the shelf's.
+    ASSERT_EQ(shelf.books.size(), 3u);
+    EXPECT_EQ(shelf.books[0]->title, "inside an unknown element");
+    EXPECT_EQ(shelf.books[1]->title, "A");
+    EXPECT_EQ(shelf.books[1]->price, 2.5);
+    EXPECT_EQ(shelf.books[1]->notes, (std::vector<BNString>{"first", "second", "nested"}))
+        << "inside a book only the book's scope names elements; content is the text "
+           "before the first child";
+    EXPECT_EQ(shelf.books[2]->notes, std::vector<BNString>{"seen only without skipping"});
+    EXPECT_EQ(shelf.seen, (std::vector<BNString>{"shelf", "unknown", "book", "book", "book"}));
+
+    Shelf skipping;
+    skipping.skipChildren = true;
+    ASSERT_FALSE(read(doc, skipping));
+    ASSERT_EQ(skipping.books.size(), 3u);
+    EXPECT_TRUE(skipping.books[2]->notes.empty()) << "a true answer skips the children";
 }
 
 TEST(BNSerializerTest, reader__damagedDocumentsFailWithTheirPlace) {
