@@ -49,13 +49,8 @@ public:
         colourFaults.clear();
         this->clearColor = clearColor;
         check(nullptr, clearColor);
-        ++framesBegun;
-        encoding = true;
     }
-    void endEncoding() override {
-        encoding = false;
-        ++framesEnded;
-    }
+    void endEncoding() override {}
     void encodeMultiline(const HXDMultiline& m, const HXDRenderingContext&) override {
         add(Kind::Multiline, m);
         for (const HXDLineVertex& v : m.vertices()) check(&m, v.color);
@@ -88,18 +83,9 @@ public:
         check(&t, t.attributes().color);
     }
 
-    size_t count(Kind kind) const {
-        size_t n = 0;
-        for (const Entry& e : entries) n += e.kind == kind ? 1 : 0;
-        return n;
-    }
-
     std::vector<Entry> entries;
     std::vector<ColourFault> colourFaults;
     HXDColor clearColor;
-    int framesBegun = 0;
-    int framesEnded = 0;
-    bool encoding = false;
 
 private:
     void add(Kind kind, const HXDDrawPrimitive& p) { entries.push_back(Entry{kind, &p}); }
