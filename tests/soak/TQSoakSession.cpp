@@ -24,11 +24,13 @@ constexpr double kStep = 0.05;
 // Steps named in a failure's report.
 constexpr size_t kTraceLength = 12;
 
-void collectChannels(TQChannelBase* node, std::vector<TQChannel*>& out) {
+// Every node from `node` down, depth first in display order.
+template <class F>
+void forEachNode(TQChannelBase* node, const F& f) {
     if (!node) return;
-    if (auto* channel = dynamic_cast<TQChannel*>(node)) out.push_back(channel);
+    f(*node);
     if (const std::vector<TQChannelBase*>* children = node->getChildren())
-        for (TQChannelBase* child : *children) collectChannels(child, out);
+        for (TQChannelBase* child : *children) forEachNode(child, f);
 }
 
 bool sameAnimation(const TQChannelBase& a, const TQChannelBase& b);
@@ -52,15 +54,8 @@ std::string firstDifference(const TQChannelBase& a, const TQChannelBase& b) {
 // not in the history: the soak compares everything else.
 std::unique_ptr<TQChannelBase> withoutEditorState(const TQChannelBase& tree) {
     std::unique_ptr<TQChannelBase> copy(tree.cloneChannel());
-    std::vector<TQChannelBase*> stack{copy.get()};
-    while (!stack.empty()) {
-        TQChannelBase* node = stack.back();
-        stack.pop_back();
-        if (!node) continue;
-        node->resetFlag(kTQChannelFlagEnabledInCurveEditor);
-        if (const std::vector<TQChannelBase*>* children = node->getChildren())
-            stack.insert(stack.end(), children->begin(), children->end());
-    }
+    forEachNode(copy.get(),
+                [](TQChannelBase& n) { n.resetFlag(kTQChannelFlagEnabledInCurveEditor); });
     return copy;
 }
 
@@ -361,14 +356,11 @@ void TQSoakSession::simplify() {
     // takes seconds: the soak simplifies channels of a usual length.
     for (const TQCurveEditorItemPtr& item : _ctrl.selectedChannels()) {
         auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
-        TQChannel* channel = channelItem ? channelItem->channel() : nullptr;
-        const std::vector<TQKeyframeHandle> keys =
-            channel ? channel->getKeyframes(false) : std::vector<TQKeyframeHandle>{};
-        CMTime first = kCMTimeZero, last = kCMTimeZero;
-        if (keys.empty() || !channel->getKeyframe(keys.front(), &first, nullptr) ||
-            !channel->getKeyframe(keys.back(), &last, nullptr))
-            continue;
-        if (CMTimeGetSeconds(last) - CMTimeGetSeconds(first) > kLongestSpanToSimplify) {
+        const TQChannel* channel = channelItem ? channelItem->channel() : nullptr;
+        // Without keyframes the span is no number, and no longer than any.
+        if (channel && CMTimeGetSeconds(channel->getKeyframeMaxTime()) -
+                               CMTimeGetSeconds(channel->getKeyframeMinTime()) >
+                           kLongestSpanToSimplify) {
             _lastDetail = "skipped";
             return;
         }
@@ -428,7 +420,9 @@ void TQSoakSession::newCurveSet() {
 
 std::string TQSoakSession::invariants() {
     std::vector<TQChannel*> channels;
-    collectChannels(_host.sceneChannelRoot(), channels);
+    forEachNode(_host.sceneChannelRoot(), [&](TQChannelBase& n) {
+        if (auto* channel = dynamic_cast<TQChannel*>(&n)) channels.push_back(channel);
+    });
     for (TQChannel* channel : channels) {
         CMTime previous = kCMTimeInvalid;
         for (TQKeyframeHandle handle : channel->getKeyframes(false)) {
