@@ -95,7 +95,8 @@ private:
     std::map<std::string, size_t> _counts;
     size_t _keypointPresses = 0;
     std::string _failure;
+    // Which command or modifier the last action used.
     std::string _lastDetail;
-    std::deque<std::string>
-        _trace;  // the last steps, for a failure's report  // which command or modifier the last action used
+    // The last steps, for a failure's report.
+    std::deque<std::string> _trace;
 };
