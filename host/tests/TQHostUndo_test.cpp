@@ -32,6 +32,9 @@ protected:
     bool sceneIs(const std::unique_ptr<TQChannelBase>& expected) {
         return *host.sceneChannelRoot() == *expected;
     }
+    // A step back (or forward) through the history, after which the scene is `expected`.
+    bool undoneTo(const std::unique_ptr<TQChannelBase>& s) { return host.undo() && sceneIs(s); }
+    bool redoneTo(const std::unique_ptr<TQChannelBase>& s) { return host.redo() && sceneIs(s); }
 
     // One framework-style edit: every channel gets a keyframe at 4.5 s with a new value.
     void bracketedEdit(const BNString& description, std::initializer_list<TQChannel*> channels,
@@ -60,15 +63,11 @@ TEST_F(HostUndo, undoRedo__theWholeSceneComesBackBitIdenticalStepByStep) {
     ASSERT_FALSE(sceneIs(start)) << "the edit should have changed the scene";
     bracketedEdit("Nudge", {y}, -4.0);
     const auto afterSecond = scene();
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(afterFirst));
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(start));
+    EXPECT_TRUE(undoneTo(afterFirst));
+    EXPECT_TRUE(undoneTo(start));
     EXPECT_FALSE(host.canUndo());
-    ASSERT_TRUE(host.redo());
-    EXPECT_TRUE(sceneIs(afterFirst));
-    ASSERT_TRUE(host.redo());
-    EXPECT_TRUE(sceneIs(afterSecond));
+    EXPECT_TRUE(redoneTo(afterFirst));
+    EXPECT_TRUE(redoneTo(afterSecond));
     EXPECT_FALSE(host.canRedo() || host.redo());
 }
 
@@ -84,8 +83,7 @@ TEST_F(HostUndo, brackets__nestedOnesMakeOneStepEmptyOnesNoneAndStrayEndsAreTole
     EXPECT_FALSE(host.canUndo()) << "no undo while a step is open";
     host.endCaptureModifiedChannels();
     EXPECT_EQ(host.undoDescription(), "Delete Keypoint");
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(before));
+    EXPECT_TRUE(undoneTo(before));
     host.endCaptureModifiedChannels();  // nothing open: changes nothing
     EXPECT_EQ(host.undoStack().redoCount(), 1u);
 
@@ -140,10 +138,8 @@ TEST_F(HostUndo, capture__anUnannouncedChangeAndAChannelAddedLaterAreTakenWhenTh
     host.didChangeChannel(y);
     const auto added = scene();
     EXPECT_EQ(host.undoDescription(), "Add keypoint");
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(nudged));
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(before));
+    EXPECT_TRUE(undoneTo(nudged));
+    EXPECT_TRUE(undoneTo(before));
     ASSERT_TRUE(host.redo() && host.redo());
     EXPECT_TRUE(sceneIs(added)) << "the after state is taken lazily";
     host.addChannelToUndo(x, "Add keypoint");
@@ -160,11 +156,9 @@ TEST_F(HostUndo, unbracketedChanges__becomeOneStepThatUndoes) {
     }
     const auto changed = scene();
     EXPECT_EQ(host.undoDescription(), TQHostUndoStack::kImplicitStepDescription);
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(before));
+    EXPECT_TRUE(undoneTo(before));
     EXPECT_FALSE(host.canUndo()) << "both channels in one step";
-    ASSERT_TRUE(host.redo());
-    EXPECT_TRUE(sceneIs(changed));
+    EXPECT_TRUE(redoneTo(changed));
 }
 
 TEST_F(HostUndo, replacedChannel__isFoundByItsReferenceAndAVanishedOneIsSkipped) {
