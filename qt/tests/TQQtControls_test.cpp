@@ -9,6 +9,7 @@
 #include <QTest>
 #include <QTimer>
 
+#include "platform/ui/testing/RWTestDoubles.h"
 #include "qt/TQQtCellDrawing.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
@@ -32,14 +33,6 @@ public:
     std::vector<std::string> actions;
     std::function<void(RWActionSender&)> onAction;
 };
-
-template <class Model>
-std::shared_ptr<Model> wired(Target& target, const char* action) {
-    auto model = std::make_shared<Model>();
-    model->setTarget(&target);
-    model->setAction(action);
-    return model;
-}
 
 TEST(QtZoomScroller, knob_follows_the_model_and_gestures_reach_it) {
     Target target;

@@ -6,8 +6,10 @@
 
 #include <deque>
 #include <functional>
+#include <memory>
 #include <vector>
 
+#include "platform/ui/RWControl.h"
 #include "platform/ui/RWServices.h"
 
 class RWManualClock final : public RWClock {
@@ -121,3 +123,12 @@ private:
     std::vector<std::string> _runs;
     std::vector<std::optional<RWModalResponse>> _stack;  // the answer of each open run
 };
+
+// A new control of the given class that sends `action` to `target`.
+template <class Control>
+std::shared_ptr<Control> wired(RWActionTarget& target, const char* action) {
+    auto control = std::make_shared<Control>();
+    control->setTarget(&target);
+    control->setAction(action);
+    return control;
+}

@@ -16,6 +16,7 @@
 #include "platform/ui/RWValueControls.h"
 #include "platform/ui/RWWindow.h"
 #include "platform/ui/RWZoomScroller.h"
+#include "platform/ui/testing/RWTestDoubles.h"
 
 namespace {
 
@@ -34,14 +35,6 @@ struct Observer : RWControlObserver {
     void controlDidChange(RWControl&) override { ++changes; }
     int changes = 0;
 };
-
-template <class Control>
-std::shared_ptr<Control> wired(Target& target, const char* action) {
-    auto control = std::make_shared<Control>();
-    control->setTarget(&target);
-    control->setAction(action);
-    return control;
-}
 
 TEST(RWZoomScroller, gestures_set_the_part_and_values_then_send_the_action) {
     Target target;
