@@ -73,6 +73,11 @@ TEST_F(CurveKeyframes, reading__neighboursExtremesAndLookupsByTime) {
     double value = 0;
     ASSERT_TRUE(c->getFirstKeyframe(&first, &value) && c->getLastKeyframe(&last, nullptr));
     EXPECT_EQ(CMTimeGetSeconds(first) + 10 * CMTimeGetSeconds(last) + 100 * value, 1031.0);
+    // A keyframe moved between its neighbours shows at once on a curve already sampled.
+    const CMTime to = seconds(1.5);
+    c->getCurveValue(to);
+    c->setKeyframeTime(a, &to);
+    EXPECT_EQ(c->getCurveValue(to), 10.0);
 }
 
 TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywhere) {
@@ -207,6 +212,9 @@ TEST_F(CurveKeyframes, handlesAndTangents__followTheKeyframeAndEachOtherOnlyWhen
         "broken 2.5 1; out 2.5 1 1 aligned; =>h 1=10(0,0|0,0) 2.5=20(0,3|1,1)bs "
         "3=30(-0.333333,0|0.333333,0); "
         "broken 2.5 0; out 2.5 0 0 aligned; =>h 1=10(0,0|0,0) 2.5=20(0,3|0,0)s "
+        "3=30(-0.333333,0|0.333333,0); "
+        // A handle that is not a number changes nothing.
+        "out 2.5 nan 5; in 2.5 1 inf; =>h 1=10(0,0|0,0) 2.5=20(0,3|0,0)s "
         "3=30(-0.333333,0|0.333333,0)");
     double u = 0, v = 0;
     ASSERT_TRUE(c->getKeyframeInputTangents(b, &u, &v, false));

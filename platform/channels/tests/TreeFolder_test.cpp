@@ -278,6 +278,7 @@ TEST(TreeTypes, typedChannels__snapFixTheirInterpolationAndComeWithTheirComponen
         << "a discrete kind starts stepped";
     EXPECT_TRUE(data.testFlag(kTQChannelFlagNoInterpolationChange) &&
                 curve.testFlag(kTQChannelFlagNoInterpolationChange));
+    EXPECT_EQ(TQChannelBlindData("Fresh", 10).getInitialValue(), 0.0);
 
     TQChannelAngle angle("Angle", 4, 1.0);
     EXPECT_NEAR(angle.getInfo()->displayScale * std::numbers::pi, 180.0, 1e-12);
@@ -311,6 +312,11 @@ TEST(TreeTypes, typedChannels__snapFixTheirInterpolationAndComeWithTheirComponen
     EXPECT_EQ(rotation.getAngleChannel(4), nullptr);
     EXPECT_TRUE(rotation.isLinked() && rotation.numberOfComponents() == 3 &&
                 !rotation.isQuaternionMode());
+    RecordingObserver told;
+    rotation.setChangeObserver(&told);
+    for (const bool mode : {false, true, true}) rotation.setQuaternionMode(mode, true);
+    EXPECT_EQ(told.told.size(), 1u) << "announced once, by the one change";
+    EXPECT_EQ(TQCompoundChannel("Empty", 12).numberOfComponents(), 0u);
 }
 
 // A compound of three components, each keyed at 1 s (value 10 * id) and 2 s, and shifted by
