@@ -21,9 +21,11 @@ protected:
         for (const TQCurveSetPtr& set : ctrl.curveSets()) {
             std::string form = set->curveSetName() + (set->isRelative() ? "/relative:" : ":");
             for (const TQCurveEditorItemPtr& item : set->allItems())
-                form += " " + pathOf(item->channelBase()) + "#" +
-                        std::to_string(
-                            static_cast<const TQCurveEditorChannelItem&>(*item).colorIndex());
+                form.append(" ")
+                    .append(pathOf(item->channelBase()))
+                    .append("#")
+                    .append(std::to_string(
+                        static_cast<const TQCurveEditorChannelItem&>(*item).colorIndex()));
             out.push_back(form);
         }
         return out;
