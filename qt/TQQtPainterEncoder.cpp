@@ -9,7 +9,6 @@
 
 #include <algorithm>
 #include <array>
-#include <atomic>
 #include <cmath>
 #include <exception>
 
@@ -170,9 +169,10 @@ void TQQtPainterEncoder::encodePrimitives(
     const HXDRenderingContext& context) {
     if (_surface.isValid()) {
         // Curves and keypoints are painted straight into the pixels, in bands on two
-        // threads; what still goes through the painter is too little to hand off.
+        // threads; what still goes through the painter is too little to hand off. The batch
+        // runs on across calls (a view hands over each curve as it is built) and is painted
+        // before anything goes through the painter, and at the end of the frame.
         HXDEncoder::encodePrimitives(primitives, context);
-        flushDirect();
         return;
     }
     // The raster engine hands every batch of more than about a hundred spans to Qt's global
@@ -283,25 +283,16 @@ bool TQQtPainterEncoder::prepare(const HXDDrawPrimitive& primitive) {
     return true;
 }
 
-void TQQtPainterEncoder::joinHandOff() {
-    if (!_handOffBusy) return;
-    _handOffDone.acquire();
-    _handOffBusy = false;
-}
+void TQQtPainterEncoder::joinHandOff() { _handOff.finish(); }
 
 void TQQtPainterEncoder::maybeHandOff() {
     if (_batch.pointCount() + kSpritePoints * _batch.spriteCount() < kHandOffPoints) return;
-    if (_handOffBusy) {
-        if (!_handOffDone.tryAcquire()) return;  // still painting: this batch grows meanwhile
-        _handOffBusy = false;
+    if (_handOff.active()) {
+        if (!_handOff.done()) return;  // still painting: this batch grows meanwhile
+        _handOff.finish();
     }
     std::swap(_batch, _handedOff);
-    const tq_raster::Surface surface = _surface;
-    _handOffBusy = QThreadPool::globalInstance()->tryStart([this, surface] {
-        _handedOff.paintBand(surface);
-        _handOffDone.release();
-    });
-    if (_handOffBusy)
+    if (_handOff.start(_handedOff, _surface, kBandRows, true))
         _batch.clear();
     else
         std::swap(_batch, _handedOff);  // no pool thread free: it waits for the flush
@@ -310,26 +301,11 @@ void TQQtPainterEncoder::maybeHandOff() {
 void TQQtPainterEncoder::flushDirect() {
     joinHandOff();
     if (_batch.empty()) return;
-    const QRect clip = _surface.clip;
-    const int bands = std::max(1, (clip.height() + kBandRows - 1) / kBandRows);
-    std::atomic<int> next{0};
-    const auto paintBands = [&]() noexcept {
-        for (int b = next++; b < bands; b = next++) {
-            tq_raster::Surface band = _surface;
-            band.clip = QRect(clip.left(), clip.top() + b * kBandRows, clip.width(), kBandRows)
-                            .intersected(clip);
-            _batch.paintBand(band);
-        }
-    };
-    // The helper takes bands as long as any are left; it may start after the last is taken.
-    QSemaphore done;
-    QThreadPool* pool = bands > 1 ? QThreadPool::globalInstance() : nullptr;
-    const bool helped = pool && pool->tryStart([&] {
-        paintBands();
-        done.release();
-    });
-    paintBands();
-    if (helped) done.acquire();
+    const bool helped = _surface.clip.height() > kBandRows;
+    tq_raster::BandedPaint paint;
+    if (!paint.start(_batch, _surface, kBandRows, helped))
+        paint.start(_batch, _surface, kBandRows, false);
+    paint.finish();
     _batch.clear();
 }
 

@@ -24,7 +24,6 @@
 #include <QImage>
 #include <QPainter>
 #include <QPolygonF>
-#include <QSemaphore>
 
 #include <cstdint>
 #include <functional>
@@ -169,9 +168,8 @@ private:
     // The frame's pixels, valid while encoding, and what waits to be painted into them.
     tq_raster::Surface _surface;
     tq_raster::Batch _batch;
-    tq_raster::Batch _handedOff;  // being painted by a pool thread while _handOffBusy
-    QSemaphore _handOffDone;
-    bool _handOffBusy = false;
+    tq_raster::Batch _handedOff;      // being painted while _handOff is active
+    tq_raster::BandedPaint _handOff;  // declared after the batches it paints: finished first
     int _framesPresented = 0;
     std::function<void(const QImage&)> _present;
 

@@ -21,6 +21,14 @@ public:
     const std::shared_ptr<const HXDPixelTexture>& texture() const { return _texture; }
     const CGRect& destinationRect() const { return _destinationRect; }
     float attenuation() const { return _attenuation; }
+    // For a quad kept from frame to frame (a view's keypoints): the image and where it goes.
+    void setTexture(const std::shared_ptr<const HXDPixelTexture>& texture) {
+        if (_texture != texture) _texture = texture;
+    }
+    void setDestinationRect(const CGRect& destinationRect) {
+        _destinationRect = destinationRect;
+        hitGeometryChanged();
+    }
 
     // With it set, a texel below kHXDTextureAlphaHitThreshold does not take hits: the image,
     // not its rectangle, is what can be clicked. Off by default.

@@ -1,6 +1,10 @@
 #include "qt/internal/TQQtDirectRaster.h"
 
+#include <QSemaphore>
+#include <QThreadPool>
+
 #include <algorithm>
+#include <atomic>
 #include <cmath>
 
 #if defined(__SSE2__)
@@ -240,6 +244,63 @@ void Batch::paintBand(const Surface& band) const noexcept {
             strokeSegment(band, a, b, shades);
         }
     }
+}
+
+struct BandedPaint::State {
+    const Batch* batch = nullptr;
+    Surface surface;
+    int bandRows = 1;
+    int bands = 0;
+    std::atomic<int> next{0};
+    std::atomic<int> painted{0};
+    QSemaphore helperDone;  // released once by a helper that painted any band
+
+    // Paints bands until none is left to take; how many it painted.
+    int paint() noexcept {
+        const QRect clip = surface.clip;
+        int mine = 0;
+        for (int b = next++; b < bands; b = next++) {
+            Surface band = surface;
+            band.clip = QRect(clip.left(), clip.top() + b * bandRows, clip.width(), bandRows)
+                            .intersected(clip);
+            batch->paintBand(band);
+            painted.fetch_add(1, std::memory_order_release);
+            ++mine;
+        }
+        return mine;
+    }
+};
+
+bool BandedPaint::start(const Batch& batch, const Surface& surface, int bandRows, bool helped) {
+    finish();
+    auto state = std::make_shared<State>();
+    state->batch = &batch;
+    state->surface = surface;
+    state->bandRows = std::max(1, bandRows);
+    state->bands = (surface.clip.height() + state->bandRows - 1) / state->bandRows;
+    if (helped) {
+        // The helper holds the state: one that starts after the caller has finished finds no
+        // band to take and touches nothing else.
+        QThreadPool* pool = QThreadPool::globalInstance();
+        const bool started = pool && pool->tryStart([state] {
+            if (state->paint() > 0) state->helperDone.release();
+        });
+        if (!started) return false;
+    }
+    _state = std::move(state);
+    return true;
+}
+
+bool BandedPaint::done() const {
+    return _state && _state->painted.load(std::memory_order_acquire) == _state->bands;
+}
+
+void BandedPaint::finish() noexcept {
+    if (!_state) return;
+    // Once the caller's loop ends every band is taken: those it did not paint, a helper did
+    // or is painting, and the helper signals when it is through.
+    if (_state->paint() < _state->bands) _state->helperDone.acquire();
+    _state.reset();
 }
 
 }  // namespace tq_raster

@@ -16,6 +16,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <vector>
 
 namespace tq_raster {
@@ -93,6 +94,31 @@ private:
     std::vector<QPointF> _points;
     std::vector<uint32_t> _shades;  // per polyline, its colour at each coverage
     std::vector<Op> _ops;
+};
+
+// A batch painted band by band by whichever thread takes each band first: the caller and,
+// when one is free, a pool thread. The caller never waits for a pool thread that has not
+// started, which on a busy machine may be a whole time slice away; it takes the bands left.
+class BandedPaint {
+public:
+    BandedPaint() = default;
+    ~BandedPaint() { finish(); }
+    BandedPaint(const BandedPaint&) = delete;
+    BandedPaint& operator=(const BandedPaint&) = delete;
+
+    // Starts painting the batch into the surface in bands of `bandRows`, asking the pool for a
+    // thread when `helped`. The batch and the pixels must stay until finish(). False (and
+    // nothing started) when a helper was asked for and none is free.
+    bool start(const Batch& batch, const Surface& surface, int bandRows, bool helped);
+    bool active() const { return _state != nullptr; }
+    // Every band painted (false while none is started).
+    bool done() const;
+    // Paints the bands nobody has taken, then waits for those a pool thread is painting.
+    void finish() noexcept;
+
+private:
+    struct State;
+    std::shared_ptr<State> _state;
 };
 
 }  // namespace tq_raster

@@ -754,6 +754,25 @@ private:
     std::vector<std::pair<uintptr_t, uint64_t>> _bandKeyScratch;
     std::vector<std::pair<uintptr_t, uint64_t>> _bandLeavingScratch;
     std::vector<TQCurveSelectionPtr> _bandJoiningScratch;
+    // The frame's primitives handed to the encoder so far: each item's go as soon as it is
+    // built, in drawing order.
+    size_t _primitivesEncoded = 0;
+    void encodeBuiltPrimitives();
+    // Keypoint quads kept from frame to frame: a frame of thousands of keypoints refills them
+    // and their hit dictionaries instead of allocating each anew. A quad still held elsewhere
+    // (by a hit record) is replaced, never changed under its holder.
+    std::vector<std::shared_ptr<HXDQuadTexture>> _keypointQuads;
+    size_t _keypointQuadsUsed = 0;
+    // The keypoint list of the channel drawKeypoint last appended to.
+    uint32_t _keypointListChannel = 0;
+    HXDPrimitiveArray* _keypointList = nullptr;
+    // Empties the keypoint lists for a new frame, keeping their storage.
+    void beginKeypointLists();
+    // Drops the lists of channels this frame did not draw, and the quads it did not use.
+    void endKeypointLists();
+    std::shared_ptr<HXDQuadTexture> keypointQuad(const KeyframeAsset& asset,
+                                                 const CGRect& destination, uint32_t channelId,
+                                                 TQKeyframeHandle handle);
     // Expires with the view, so that a delayed redraw scheduled by a frame never calls a
     // dead view.
     std::shared_ptr<char> _lifeToken = std::make_shared<char>(0);

@@ -431,13 +431,50 @@ void TQCurveEditorViewBase::drawKeypoint(TQKeyframeHandle handle, const CMTime* 
     const CGPoint size = worldSizeOfPixels(asset.size.width * s, asset.size.height * s);
     if (rasterSize) *rasterSize = size;
     const CGRect destination = CGRectMake(x - size.x * 0.5, v - size.y * 0.5, size.x, size.y);
-    auto quad = std::make_shared<HXDQuadTexture>(0, asset.texture, destination, 1.0f);
-    quad->setUseTextureAlphaForHitTest(true);
-    quad->hitInfo().setHitID(kKeypointHitID);
-    quad->hitInfo().setExtraInfo(keyframeInfo(channelItem->channelId(), handle));
+    const uint32_t id = channelItem->channelId();
+    std::shared_ptr<HXDQuadTexture> quad = keypointQuad(asset, destination, id, handle);
     _primitives.push_back(quad);
     _selectionPrimitives.push_back(quad);
-    _keypointsPrimitives[channelItem->channelId()].push_back(std::move(quad));
+    if (!_keypointList || _keypointListChannel != id) {
+        _keypointList = &_keypointsPrimitives[id];
+        _keypointListChannel = id;
+    }
+    _keypointList->push_back(std::move(quad));
+}
+
+void TQCurveEditorViewBase::beginKeypointLists() {
+    for (auto& [id, quads] : _keypointsPrimitives) quads.clear();
+    _keypointList = nullptr;
+    _keypointQuadsUsed = 0;
+}
+
+void TQCurveEditorViewBase::endKeypointLists() {
+    std::erase_if(_keypointsPrimitives, [](const auto& entry) { return entry.second.empty(); });
+    _keypointList = nullptr;
+    _keypointQuads.resize(_keypointQuadsUsed);
+}
+
+std::shared_ptr<HXDQuadTexture> TQCurveEditorViewBase::keypointQuad(const KeyframeAsset& asset,
+                                                                    const CGRect& destination,
+                                                                    uint32_t channelId,
+                                                                    TQKeyframeHandle handle) {
+    if (_keypointQuadsUsed == _keypointQuads.size()) _keypointQuads.emplace_back();
+    std::shared_ptr<HXDQuadTexture>& quad = _keypointQuads[_keypointQuadsUsed++];
+    if (quad && quad.use_count() == 1) {
+        // The dictionary has both keys already: they are replaced in place.
+        quad->setTexture(asset.texture);
+        quad->setDestinationRect(destination);
+        HXDExtraInfo& info = quad->hitInfo().extraInfo();
+        info.setObject("ID", HXDNumber::numberWithInteger(channelId));
+        info.setObject("Handle",
+                       HXDNumber::numberWithUnsignedLongLong(reinterpret_cast<uintptr_t>(handle)));
+        return quad;
+    }
+    quad = std::make_shared<HXDQuadTexture>(0, asset.texture, destination, 1.0f);
+    quad->setUseTextureAlphaForHitTest(true);
+    quad->hitInfo().setHitID(kKeypointHitID);
+    quad->hitInfo().setExtraInfo(keyframeInfo(channelId, handle));
+    return quad;
 }
 
 void TQCurveEditorViewBase::calculateDrawTangentU(double* tangentU, double* tangentV,

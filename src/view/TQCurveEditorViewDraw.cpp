@@ -6,6 +6,7 @@
 #include <cinttypes>
 #include <cmath>
 #include <cstdio>
+#include <span>
 #include <string_view>
 #include <unordered_map>
 
@@ -117,11 +118,13 @@ bool TQCurveEditorViewBase::displayLayer(HXDEncoder* encoder) {
     encoder->encodePrimitives(_backgroundPrimitives, *_renderController->renderingContext());
 
     _primitives.clear();
-    _keypointsPrimitives.clear();
+    _primitivesEncoded = 0;
+    beginKeypointLists();
     _selectionPrimitives.clear();
     drawProjection();
     drawCurveEditor();
-    encoder->encodePrimitives(_primitives, *_renderController->renderingContext());
+    endKeypointLists();
+    encodeBuiltPrimitives();
 
     encoder->endEncoding();
     // The target belongs to the frame; the projection stays for conversions and picks.
@@ -137,7 +140,8 @@ void TQCurveEditorViewBase::setupMetalRender() {
     loadAssets();
     _primitives.clear();
     _backgroundPrimitives.clear();
-    _keypointsPrimitives.clear();
+    beginKeypointLists();
+    endKeypointLists();
     _selectionPrimitives.clear();
     _metalRenderReady = 1;
 }
@@ -156,6 +160,15 @@ void TQCurveEditorViewBase::drawProjection() {
                                      BNViewVolumeProjection(v), pixelScale, _drawableSize);
     // The projection is affine: one pixel's world size serves every image of the frame.
     _worldPerPixel = getSizeWorld(CGPointMake(1.0, 1.0));
+}
+
+void TQCurveEditorViewBase::encodeBuiltPrimitives() {
+    const HXDRenderingContext* context =
+        _renderController ? _renderController->renderingContext() : nullptr;
+    if (!_encoder || !context || _primitivesEncoded >= _primitives.size()) return;
+    const std::span<const std::shared_ptr<HXDDrawPrimitive>> all(_primitives);
+    _encoder->encodePrimitives(all.subspan(_primitivesEncoded), *context);
+    _primitivesEncoded = _primitives.size();
 }
 
 // ---- Assets --------------------------------------------------------------------------------
@@ -217,6 +230,8 @@ void TQCurveEditorViewBase::drawCurveEditor() {
             drawPoints(item, 1);
             auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item);
             if (channelItem && channelItem->drawProcessedCurve()) drawProcessedCurve(item);
+            // Painting the item (on the encoder's threads) overlaps building the next.
+            encodeBuiltPrimitives();
         };
         // The primary channel is drawn last, on top of the others, even when disabled.
         const TQCurveEditorItemPtr first = _controller->getFirstChannel();
