@@ -557,6 +557,15 @@ void RWOutlineView::removeTrackingArea(uint64_t identifier) {
     if (_hoveredArea == identifier) _hoveredArea = 0;
 }
 
+void RWOutlineView::removeTrackingAreas(std::vector<uint64_t> identifiers) {
+    std::sort(identifiers.begin(), identifiers.end());
+    const auto listed = [&](uint64_t identifier) {
+        return std::binary_search(identifiers.begin(), identifiers.end(), identifier);
+    };
+    std::erase_if(_trackingAreas, [&](const RWTrackingArea& a) { return listed(a.identifier); });
+    if (listed(_hoveredArea)) _hoveredArea = 0;
+}
+
 // ---- Events ---------------------------------------------------------------------------------
 
 void RWOutlineView::makeFirstResponder() {

@@ -382,6 +382,9 @@ public:
     // ---- Tracking areas ----
     uint64_t addTrackingArea(RWTrackingArea area);
     void removeTrackingArea(uint64_t identifier);
+    // Removes every listed area in one pass over the view's areas (a layout drops all of its
+    // own at once).
+    void removeTrackingAreas(std::vector<uint64_t> identifiers);
     const std::vector<RWTrackingArea>& trackingAreas() const { return _trackingAreas; }
     // Called when rows, columns or the visible part change; subclasses lay their areas out.
     virtual void updateTrackingAreas() {}

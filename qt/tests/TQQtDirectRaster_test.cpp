@@ -4,8 +4,10 @@
 
 #include <QImage>
 
+#include <algorithm>
 #include <cmath>
 #include <memory>
+#include <span>
 #include <vector>
 
 #include "platform/draw/HXDPrimitives.h"
@@ -27,8 +29,9 @@ const HXDColor kOrange{0.9f, 0.5f, 0.1f, 1.0f};
 const HXDColor kGreen{0.2f, 0.8f, 0.3f, 1.0f};
 const HXDColor kHalfBlue{0.0f, 0.1f, 0.4f, 0.4f};  // premultiplied: 40 % of a blue
 
-// World coordinates are drawable pixels, y up.
-QImage render(const Primitives& primitives, bool direct) {
+// World coordinates are drawable pixels, y up. The primitives go to the encoder `chunk` at a
+// time (a view hands over each curve as it builds it); 0: all in one call.
+QImage render(const Primitives& primitives, bool direct, size_t chunk = 0) {
     TQQtPainterEncoder encoder(QSize(kWidth, kHeight));
     encoder.setDirectRaster(direct);
     HXDTexture* target = encoder.nextDrawable();
@@ -36,7 +39,10 @@ QImage render(const Primitives& primitives, bool direct) {
                                       BNViewVolumeProjection(CGRectMake(0, 0, kWidth, kHeight)),
                                       HXDFloat2{1.0f, 1.0f});
     encoder.beginEncoding(*target, HXDColor{0.1f, 0.1f, 0.12f, 1.0f});
-    encoder.encodePrimitives(primitives, context);
+    const std::span<const std::shared_ptr<HXDDrawPrimitive>> all(primitives);
+    const size_t step = chunk ? chunk : all.size();
+    for (size_t at = 0; at < all.size(); at += step)
+        encoder.encodePrimitives(all.subspan(at, std::min(step, all.size() - at)), context);
     encoder.endEncoding();
     return encoder.image();
 }
@@ -71,7 +77,7 @@ std::shared_ptr<HXDQuadTexture> keypoint(double x, double y, float attenuation =
                                             attenuation);
 }
 
-TEST(DirectRaster, aFrameOfLinesAndKeypointsMatchesThePainters) {
+Primitives testFrame() {
     Primitives p;
     // Every direction from a centre off the grid; lines on pixel centres and edges.
     for (int k = 0; k < 24; ++k) {
@@ -118,7 +124,11 @@ TEST(DirectRaster, aFrameOfLinesAndKeypointsMatchesThePainters) {
     p.push_back(std::make_shared<HXDScreenspaceQuad>(CGRectMake(40, 100, 60, 60), 0));
     p.push_back(keypoint(70, 130, 0.5f));
     p.push_back(seg(30, 90, 110, 170, kOrange));
+    return p;
+}
 
+TEST(DirectRaster, aFrameOfLinesAndKeypointsMatchesThePainters) {
+    const Primitives p = testFrame();
     const QImage reference = render(p, false);
     const QImage direct = render(p, true);
     ASSERT_EQ(direct.size(), reference.size());
@@ -132,6 +142,15 @@ TEST(DirectRaster, aFrameOfLinesAndKeypointsMatchesThePainters) {
             }
             if (largest > kCoverageTolerance) return;  // one pixel says enough
         }
+}
+
+// Handed over in pieces, the frame is painted in parts on the pool while later pieces are
+// encoded: every pixel as when it comes in one call, whichever thread painted which band.
+TEST(DirectRaster, aFrameHandedOverInPiecesPaintsTheSamePixels) {
+    const Primitives p = testFrame();
+    const QImage whole = render(p, true);
+    for (const size_t chunk : {size_t(1), size_t(7), size_t(500)})
+        EXPECT_TRUE(render(p, true, chunk) == whole) << "in pieces of " << chunk;
 }
 
 }  // namespace

@@ -1,5 +1,7 @@
 #include "src/channellist/TQCurveEditorChannelList.h"
 
+#include <utility>
+
 #include "platform/ui/RWCommandsController.h"
 #include "src/channellist/TQChannelListStatusCell.h"
 #include "src/channellist/TQCurveEditorListController.h"
@@ -154,8 +156,7 @@ void TQCurveEditorChannelList::mouseUp(const RWEvent& event) {
 // ---- Hover ----------------------------------------------------------------------------------
 
 void TQCurveEditorChannelList::updateTrackingAreas() {
-    for (uint64_t area : _pTrackingAreas) removeTrackingArea(area);
-    _pTrackingAreas.clear();
+    removeTrackingAreas(std::exchange(_pTrackingAreas, {}));
     const int64_t key = columnWithIdentifier(Ctrl::kKeyColumn);
     const int64_t menu = columnWithIdentifier(Ctrl::kMenuColumn);
     if (key < 0 || menu < 0) return;

@@ -72,6 +72,20 @@ private:
     double _reciprocal = 0.0;
 };
 
+// BN_CMTimeSaferAdd(time, offset) without its wide arithmetic in the usual case, run for every
+// keypoint of a frame: a zero offset on a timescale that divides the time's adds nothing, and
+// the sum is the time on its own timescale.
+CMTime plusOffset(const CMTime& time, const CMTime& offset) {
+    if (CMTIME_IS_NUMERIC(time) && CMTIME_IS_NUMERIC(offset) && offset.value == 0 &&
+        offset.epoch == 0 && offset.timescale > 0 && time.timescale % offset.timescale == 0) {
+        CMTime sum = CMTimeMake(time.value, time.timescale);
+        sum.flags |= (time.flags | offset.flags) & kCMTimeFlags_HasBeenRounded;
+        sum.epoch = time.epoch;
+        return sum;
+    }
+    return BN_CMTimeSaferAdd(time, offset);
+}
+
 // The mapping of channel values onto V (convertFromChannelCoords of the controller), with the
 // item's factors read once per curve instead of once per sample.
 struct WorldY {
@@ -356,7 +370,7 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
         CMTime time{};
         double value = 0.0;
         if (!channel->getKeyframe(h, &time, &value)) continue;
-        const CMTime u = BN_CMTimeSaferAdd(time, off);
+        const CMTime u = plusOffset(time, off);
         const double v = worldY(value);
         const bool selected = isSelected(h);
         const bool enabled = channel->getKeyframeEnabled(h);
