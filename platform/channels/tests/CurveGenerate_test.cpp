@@ -133,10 +133,17 @@ TEST(CurveGenerate, copies_keep_the_state_of_their_originals_and_existing_handle
               std::tuple(last.inU, last.inV, first.outU, first.outV));
 }
 
+struct Announcements : TQChannelChangeObserver {
+    int count = 0;
+    void channelWillChange(TQChannelBase&) override { ++count; }
+};
+
 TEST(CurveGenerate, refuses_what_it_cannot_bake_and_changes_nothing) {
     auto curve = mixedCurve();
     curve->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
     const auto untouched = cloneOf(*curve);
+    Announcements announced;
+    curve->setChangeObserver(&announced);
     struct Case {
         const char* what;
         unsigned direction;
@@ -164,6 +171,9 @@ TEST(CurveGenerate, refuses_what_it_cannot_bake_and_changes_nothing) {
         c->generateKeypoints(kTQExtrapolationAfter, 4);
         EXPECT_TRUE(*c == *before) << c->getName();
     }
+    EXPECT_EQ(announced.count, 0) << "a refusal announces nothing";
+    curve->generateKeypoints(kTQExtrapolationAfter, 1);
+    EXPECT_EQ(announced.count, 1) << "a bake announces its change";
 }
 
 }  // namespace

@@ -40,6 +40,8 @@ TEST_F(CtrlCore, queries__selected_bounds_and_the_maximum_view_volume) {
     view.setCurrentViewVolume(CGRectMake(0, -60, 10, 0.5));
     // The running maximum starts at the smallest positive double, not at -infinity.
     EXPECT_EQ(volume(), "0 10 -60 0.025");
+    view.setCurrentViewVolume(CGRectMake(0, -45, 10, 0.5));
+    EXPECT_EQ(volume(), "0 10 -50.025 0.025") << "reaches down to the curves";
     set->removeItemWithIdentifier(item("Low")->channelId());
     build("High: 0=40 1=50");
     view.setCurrentViewVolume(CGRectMake(0, 0, 10, 0.5));

@@ -88,6 +88,9 @@ TEST_F(ViewBox, drag__each_part_moves_the_corners_and_the_keypoints_with_them) {
          "2.5=-0.5 6.5=-0.5 6.5=0.5 2.5=0.5"},
         {"corner after Shift drags: free again", "d 2 -.5|m 2.5 -.25|u 2.5 -.25",
          "2.5=-0.25 6=-0.25 6=0.5 2.5=0.5"},
+        {"corner, Shift, on a distorted box: each corner keeps its place in the box",
+         "d 2 -.5 c|m 2.5 -.25 c|u 2.5 -.25 c|d 6 .5 s|m 6.5 .75 s|u 6.5 .75 s",
+         "2.56=-0.219 6.5=-0.5 6.5=0.625 2=0.625"},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
