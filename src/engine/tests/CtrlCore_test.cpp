@@ -179,8 +179,14 @@ TEST_F(CtrlCore, validateSelection__repairs_a_stale_handle_by_its_stored_time) {
     const TQKeyframeHandle after = a->setKeyframe(seconds(2), 4);
     ctrl().validateSelection(list);
     EXPECT_EQ(list->selectionAtIndex(0)->getHandle(), after);
-    // Nothing at the stored time: the stale handle stays, the entry too.
+    // The operations on a selection repair it first, and so reach the rebuilt keyframe.
     a->deleteKeyframe(after);
+    a->setKeyframe(seconds(2), 4);
+    ctrl().setBezierPointSelected(list);
+    EXPECT_EQ(a->getKeyframeInterpolation(a->getKeyframe(seconds(2))), kTQInterpolationBezier);
+    // Nothing at the stored time: the stale handle stays, the entry too.
+    const TQKeyframeHandle last = list->selectionAtIndex(0)->getHandle();
+    a->deleteKeyframe(last);
     ctrl().validateSelection(list);
     EXPECT_EQ(selectionText(), "A@stale");
 }

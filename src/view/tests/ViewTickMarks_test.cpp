@@ -42,8 +42,11 @@ TEST_F(ViewTickMarks, computeVerticalTickMarks__table) {
         {"a fixed scale fits a flat curve by its range", "A: ", 3, 1, 10, true, "0.044 1.7"},
         // The range, padded to 106.7, fits within the flat curve's padded four steps (110).
         {"a flat curve's range when no larger", "A: ", 7, 1, 97, false, "0.4268 16.49"},
+        {"not when larger, at 132", "A: ", 7, 1, 120, false, "1 0"},
         // Extent -4..67, span 71: 71 / 250 doubles to just over one, so the step halves once.
         {"a span just over half a step", "A: 0=0/1 1=63.6/1", 0, 1, 0, false, "0.52 61"},
+        // Extent -11.3..237.3 on whole numbers: -12..238, exactly one step of 250.
+        {"a span of exactly one step", "A: 0=0/1 1=226/1", 0, 1, 0, false, "1 113"},
         // Both components' extent, 0..100, one mapping for the compound.
         {"a compound's components", "Pos.A: 0=0/1 1=10/1; Pos.B: 0=0/1 1=100/1", 0, 1, 0, false,
          "0.52 60"},
