@@ -78,6 +78,9 @@ TEST_F(CurveKeyframes, reading__neighboursExtremesAndLookupsByTime) {
     c->getCurveValue(to);
     c->setKeyframeTime(a, &to);
     EXPECT_EQ(c->getCurveValue(to), 10.0);
+    // So does a change of every segment's interpolation: stepped, 2 s holds the value at 1.5.
+    c->setInterpolation(kTQInterpolationConstant);
+    EXPECT_EQ(c->getCurveValue(seconds(2.0)), 10.0);
 }
 
 TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywhere) {

@@ -66,7 +66,7 @@ protected:
 
 TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelection) {
     // Arrangement: "L2" locks the keypoint at 2, "D3" disables the one at 3, "B2" makes the
-    // one at 2 Bezier, "C" locks the channel, "@3" selects the keypoint at 3.
+    // one at 2 Bezier ("K2" stepped), "C" locks the channel, "@3" selects the keypoint at 3.
     struct Case {
         const char* arrange;
         const char* want;
@@ -80,6 +80,10 @@ TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelec
          "Exponential Logarithmic Lock Disable"},
         {"B2 @3",
          "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear~ Bézier~ Catmull-Rom "
+         "Exponential Logarithmic Lock Disable"},
+        // A stepped segment needs no second end: only its own kind is ticked.
+        {"K3 @3",
+         "Delete Reverse Ease In Ease Out Ease In and Out Constant* Linear Bézier Catmull-Rom "
          "Exponential Logarithmic Lock Disable"},
         {"B4 @2 @4",
          "Delete Reverse Ease In Ease Out Ease In and Out Constant~ Linear~ Bézier~ Catmull-Rom~ "
@@ -114,6 +118,7 @@ TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelec
             if (w[0] == 'L') channel->setKeyframeLocked(h, true);
             if (w[0] == 'D') channel->setKeyframeEnabled(h, false);
             if (w[0] == 'B') channel->setKeyframeInterpolation(h, kTQInterpolationBezier);
+            if (w[0] == 'K') channel->setKeyframeInterpolation(h, kTQInterpolationConstant);
             if (w[0] == 'C') channel->setLocked(true, false);
             if (w[0] == '@') list->addSelection(keypointEntry(item, w[1] - '0'));
         }

@@ -161,6 +161,7 @@ INSTANTIATE_TEST_SUITE_P(
         Gesture{"sketchClick", kSketch, "", "S|c 2.5 .5"},
         Gesture{"sketchPastTheRightEdge", kSketch, "", "z|S|d 8.5 .5|m 10.5 .5|u 10.5 .5"},
         Gesture{"sketchIntoTheTopBand", kSketch, "", "z|S|d 2.5 .5|m 3.5 .98|u 3.5 .98"},
+        Gesture{"sketchIntoTheBottomBand", kSketch, "", "z|S|d 2.5 .5|m 3.5 -.98|u 3.5 -.98"},
         Gesture{"sketchShift", kSketch, "", "S|d 2.5 .5 s|m 3.5 .55 s|m 4.5 .9 s|u 4.5 .9 s"}),
     [](const auto& p) { return std::string(p.param.name); });
 

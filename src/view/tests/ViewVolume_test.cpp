@@ -38,6 +38,7 @@ protected:
             {"at", [&] { view.setMouseOrigin(CGPointMake(N(0), N(1))); }},
             {"drag", [&] { view.zoom(N(0), N(1)); }},
             {"pan", [&] { view.pan(N(0), N(1)); }},
+            {"page", [&] { view.panWithPage(N(0), N(1)); }},
             {"draw", [&] { view.drawProjection(); }},
             {"wheel",
              [&] {
@@ -100,6 +101,8 @@ TEST_F(ViewVolume, operations__table) {
          "0 -0.01 10 0.02 *1 *128 #0.0078125 2*[!1800] "},
         {"pan and back", "pan -160 0; draw; pan -80 -40; ?; draw; pan 80 40",
          "3 -1.2 10 2 / 2 -1 10 2 *1 *1 #1 3*[!1800] >2 >1 >-1 "},
+        // A twentieth of a page is half a second: the range moves, as it stays after time zero.
+        {"a page in time", "page 0.05 0", "0.5 -1 10 2 *1 *1 #1 !1800 >0.5 "},
         {"a pan that would reach time zero moves only y", "pan 80 40",
          "0 -0.8 10 2 *1 *1 #1 !1800 "},
         // Four events of a line, four pixels a line: 16 px of 400; only wheel events taken.
