@@ -195,6 +195,7 @@ TEST_F(ItemFixture, newSampleCount__readersTakeOnlyWhatTheHeldArraysHoldUntilThe
     item->setNumberOfSamples(5000);  // the arrays still hold 5
     EXPECT_EQ(extremes(), before) << "extremes of the samples held";
     item->takeCurveSnapshot(1);
+    ASSERT_TRUE(item->snapshotChannel());
     ASSERT_EQ(item->numberOfSamplesSnapshot(), 5u) << "the ghost is the curve as last drawn";
     EXPECT_EQ(item->samplesVSnapshot()[4], 4.0);
 
@@ -202,6 +203,7 @@ TEST_F(ItemFixture, newSampleCount__readersTakeOnlyWhatTheHeldArraysHoldUntilThe
     EXPECT_EQ(item->numberOfSamples(), 5000u) << "the next fetch takes the new count";
     item->takeCurveSnapshot(0);
     EXPECT_EQ(item->numberOfSamplesSnapshot(), 5000u);
+    EXPECT_EQ(item->snapshotChannel(), nullptr) << "a ghost without its channel";
 }
 
 TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {

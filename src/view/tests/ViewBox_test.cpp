@@ -57,6 +57,10 @@ TEST_F(ViewBox, band__leaves_a_box_around_what_it_caught_with_any_tool) {
     EXPECT_EQ(frameText().find(" loop"), std::string::npos) << "and does not show it";
     ctrl().setCurrentTool(TQTool::kBox);
     EXPECT_FALSE(view.fourCornerBoxInitialized()) << "a change of tool forgets it";
+    band();
+    ASSERT_TRUE(view.fourCornerBoxInitialized());
+    view.frameAll(1);
+    EXPECT_FALSE(view.fourCornerBoxInitialized()) << "and so does framing all";
 }
 
 // The pointer moves 40 px across and 50 px up at each drag; the box is 4 by 1 again each
