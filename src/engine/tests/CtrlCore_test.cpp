@@ -234,6 +234,9 @@ TEST_F(CtrlCore, showValue__writes_the_accepted_value_in_channel_units) {
     flag->channel()->setKeyframe(seconds(1), 1.0);
     selectInView({keypointEntry(flag, 1)});
     ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);
+    ctrl().setView(nullptr);  // nor without a view and so a selection
+    ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);
+    ctrl().setView(&view);
     EXPECT_EQ(modal.runs().size(), 2u);
     RWResetServices();
 }
