@@ -142,7 +142,7 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
     set->setItem(nullptr);
     EXPECT_EQ(text(*set), "Cube[X Y Z]");
     set->setItem(y);
-    EXPECT_FALSE(set->removeItem(nullptr));
+    EXPECT_FALSE(set->removeItem(nullptr) || set->removeItem(z)) << "z is no longer there";
     EXPECT_EQ(text(*set), "Cube[Y]");
 
     host.scene().removeObject(cube);

@@ -236,6 +236,7 @@ TEST_F(CtrlCore, showValue__writes_the_accepted_value_in_channel_units) {
     ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);
     ctrl().setView(nullptr);  // nor without a view and so a selection
     ctrl().showValueAtPoint(CGPointMake(0, 0), nullptr, CGRectZero);
+    ctrl().menuAddKeyframe(nullptr);
     ctrl().setView(&view);
     EXPECT_EQ(modal.runs().size(), 2u);
     RWResetServices();
