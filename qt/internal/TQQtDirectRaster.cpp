@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <atomic>
 #include <cmath>
+#include <limits>
 
 #if defined(__SSE2__)
 #include <emmintrin.h>
@@ -21,6 +22,8 @@ constexpr double kMaxCoordinate = 1e6;
 // A pixel takes coverage from a line up to this far from its edges (a half pixel of width,
 // a half pixel of antialiasing, with room to spare).
 constexpr double kReach = 2.0;
+// Segments per run whose vertical extent is kept (see Batch).
+constexpr uint32_t kChunkSegments = 32;
 
 int64_t floorToInt(double v) {
     const auto i = static_cast<int64_t>(v);
@@ -207,18 +210,32 @@ void Batch::addPolyline(const QPointF* points, size_t count, uint32_t color) {
     const auto shades = static_cast<uint32_t>(_shades.size());
     _shades.resize(_shades.size() + 256);
     fillShades(color, _shades.data() + shades);
-    _ops.push_back(Op{nullptr, shades, first, static_cast<uint32_t>(count), QPoint()});
+    const auto chunks = static_cast<uint32_t>(_chunkLow.size());
+    for (size_t s = 0; s + 1 < count; s += kChunkSegments) {
+        const size_t end = std::min(s + kChunkSegments, count - 1);
+        // A coordinate that is not a number stays out: its segments are never stroked.
+        double low = std::numeric_limits<double>::infinity(), high = -low;
+        for (size_t i = s; i <= end; ++i) {
+            low = std::min(low, points[i].y());
+            high = std::max(high, points[i].y());
+        }
+        _chunkLow.push_back(low);
+        _chunkHigh.push_back(high);
+    }
+    _ops.push_back(Op{nullptr, shades, first, static_cast<uint32_t>(count), QPoint(), chunks});
 }
 
 void Batch::addSprite(const Sprite& sprite, QPoint topLeft, uint32_t opacity) {
     if (sprite.isNull() || opacity == 0) return;
-    _ops.push_back(Op{&sprite, opacity, 0, 0, topLeft});
+    _ops.push_back(Op{&sprite, opacity, 0, 0, topLeft, 0});
 }
 
 void Batch::clear() {
     _points.clear();
     _shades.clear();
     _ops.clear();
+    _chunkLow.clear();
+    _chunkHigh.clear();
 }
 
 void Batch::paintBand(const Surface& band) const noexcept {
@@ -234,14 +251,20 @@ void Batch::paintBand(const Surface& band) const noexcept {
         }
         const QPointF* p = _points.data() + op.first;
         const uint32_t* shades = _shades.data() + op.color;
-        for (uint32_t i = 0; i + 1 < op.count; ++i) {
-            const QPointF& a = p[i];
-            const QPointF& b = p[i + 1];
-            // Most segments of a frame miss a given band: two comparisons each.
-            if ((a.y() < top && b.y() < top) || (a.y() > bottom && b.y() > bottom) ||
-                (a.x() < left && b.x() < left) || (a.x() > right && b.x() > right))
-                continue;
-            strokeSegment(band, a, b, shades);
+        const double* low = _chunkLow.data() + op.firstChunk;
+        const double* high = _chunkHigh.data() + op.firstChunk;
+        for (uint32_t s = 0, c = 0; s + 1 < op.count; s += kChunkSegments, ++c) {
+            // Most runs of a frame miss a given band.
+            if (low[c] > bottom || high[c] < top) continue;
+            const uint32_t end = std::min<uint32_t>(s + kChunkSegments, op.count - 1);
+            for (uint32_t i = s; i < end; ++i) {
+                const QPointF& a = p[i];
+                const QPointF& b = p[i + 1];
+                if ((a.y() < top && b.y() < top) || (a.y() > bottom && b.y() > bottom) ||
+                    (a.x() < left && b.x() < left) || (a.x() > right && b.x() > right))
+                    continue;
+                strokeSegment(band, a, b, shades);
+            }
         }
     }
 }

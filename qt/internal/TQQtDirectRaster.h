@@ -90,8 +90,13 @@ private:
         uint32_t first;        // a polyline's points [first, first + count)
         uint32_t count;
         QPoint topLeft;
+        uint32_t firstChunk;  // a polyline's first entry in _chunkLow and _chunkHigh
     };
     std::vector<QPointF> _points;
+    // The least and greatest y of each run of kChunkSegments segments of a polyline: a band
+    // passes over whole runs it cannot touch instead of testing each of their segments.
+    std::vector<double> _chunkLow;
+    std::vector<double> _chunkHigh;
     std::vector<uint32_t> _shades;  // per polyline, its colour at each coverage
     std::vector<Op> _ops;
 };

@@ -13,6 +13,7 @@
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/geometry/BNViewProjection.h"
 #include "qt/TQQtPainterEncoder.h"
+#include "qt/internal/TQQtDirectRaster.h"
 
 namespace {
 
@@ -151,6 +152,27 @@ TEST(DirectRaster, aFrameHandedOverInPiecesPaintsTheSamePixels) {
     const QImage whole = render(p, true);
     for (const size_t chunk : {size_t(1), size_t(7), size_t(500)})
         EXPECT_TRUE(render(p, true, chunk) == whole) << "in pieces of " << chunk;
+}
+
+// A band passes over runs of a long polyline that lie wholly above or below it: what it
+// paints is what the segments paint one by one.
+TEST(DirectRaster, aLongPolylinePaintsAsItsSegmentsDo) {
+    std::vector<QPointF> wave;
+    for (int i = 0; i < 400; ++i) wave.emplace_back(i * 0.6, 150 + 145 * std::sin(i * 0.037));
+    tq_raster::Batch whole, pieces;
+    whole.addPolyline(wave.data(), wave.size(), 0xff20c040u);
+    for (size_t i = 0; i + 1 < wave.size(); ++i) pieces.addPolyline(&wave[i], 2, 0xff20c040u);
+    QImage images[2];
+    for (int k = 0; k < 2; ++k) {
+        images[k] = QImage(kWidth, kHeight, QImage::Format_ARGB32_Premultiplied);
+        images[k].fill(0);
+        tq_raster::Surface band = tq_raster::Surface::of(images[k]);
+        for (int top = 0; top < kHeight; top += 64) {
+            band.clip = QRect(0, top, kWidth, 64).intersected(images[k].rect());
+            (k == 0 ? whole : pieces).paintBand(band);
+        }
+    }
+    EXPECT_TRUE(images[0] == images[1]);
 }
 
 }  // namespace
