@@ -78,9 +78,8 @@ private:
 CMTime plusOffset(const CMTime& time, const CMTime& offset) {
     if (CMTIME_IS_NUMERIC(time) && CMTIME_IS_NUMERIC(offset) && offset.value == 0 &&
         offset.epoch == 0 && offset.timescale > 0 && time.timescale % offset.timescale == 0) {
-        CMTime sum = CMTimeMake(time.value, time.timescale);
-        sum.flags |= (time.flags | offset.flags) & kCMTimeFlags_HasBeenRounded;
-        sum.epoch = time.epoch;
+        CMTime sum = time;
+        sum.flags |= offset.flags & kCMTimeFlags_HasBeenRounded;
         return sum;
     }
     return BN_CMTimeSaferAdd(time, offset);
@@ -97,17 +96,24 @@ struct WorldY {
     double operator()(double value) const { return (value * conversion - offset) / scale; }
 };
 
-HXDExtraInfo curveInfo(uint32_t channelId, size_t room = 1) {
+HXDExtraInfo curveInfo(uint32_t channelId) {
     HXDExtraInfo info;
-    info.reserve(room);
     info.setObject("ID", HXDNumber::numberWithInteger(channelId));
     return info;
 }
 
-HXDExtraInfo keyframeInfo(uint32_t channelId, TQKeyframeHandle handle) {
-    HXDExtraInfo info = curveInfo(channelId, 2);  // one allocation per keypoint, not two
+// A keypoint's dictionary: its channel and its keyframe. A kept quad's is refilled in place,
+// where both keys exist already.
+void fillKeyframeInfo(HXDExtraInfo& info, uint32_t channelId, TQKeyframeHandle handle) {
+    info.setObject("ID", HXDNumber::numberWithInteger(channelId));
     info.setObject("Handle",
                    HXDNumber::numberWithUnsignedLongLong(reinterpret_cast<uintptr_t>(handle)));
+}
+
+HXDExtraInfo keyframeInfo(uint32_t channelId, TQKeyframeHandle handle) {
+    HXDExtraInfo info;
+    info.reserve(2);  // one allocation per keypoint, not two
+    fillKeyframeInfo(info, channelId, handle);
     return info;
 }
 
@@ -346,7 +352,8 @@ void TQCurveEditorViewBase::drawPoints(TQCurveEditorItem* item, char drawTangent
     TQChannel* channel = channelItem ? channelItem->channel() : nullptr;
     if (!channel || !channel->canKeyframe()) return;
 
-    const std::vector<TQKeyframeHandle> keypoints = *channelItem->keypoints();
+    // Nothing below reads the item's keypoints again: the list is taken as it stands.
+    const std::vector<TQKeyframeHandle>& keypoints = *channelItem->keypoints();
     // The six images this item can show, by slot. The selected images are the same in every
     // colour; the selected normal and the unselected pressed image are loaded but never shown:
     // a selected keypoint that can be edited shows as pressed.
@@ -475,13 +482,9 @@ std::shared_ptr<HXDQuadTexture> TQCurveEditorViewBase::keypointQuad(const Keyfra
     if (_keypointQuadsUsed == _keypointQuads.size()) _keypointQuads.emplace_back();
     std::shared_ptr<HXDQuadTexture>& quad = _keypointQuads[_keypointQuadsUsed++];
     if (quad && quad.use_count() == 1) {
-        // The dictionary has both keys already: they are replaced in place.
         quad->setTexture(asset.texture);
         quad->setDestinationRect(destination);
-        HXDExtraInfo& info = quad->hitInfo().extraInfo();
-        info.setObject("ID", HXDNumber::numberWithInteger(channelId));
-        info.setObject("Handle",
-                       HXDNumber::numberWithUnsignedLongLong(reinterpret_cast<uintptr_t>(handle)));
+        fillKeyframeInfo(quad->hitInfo().extraInfo(), channelId, handle);
         return quad;
     }
     quad = std::make_shared<HXDQuadTexture>(0, asset.texture, destination, 1.0f);
