@@ -30,12 +30,6 @@ int64_t floorToInt(double v) {
     return i - (v < static_cast<double>(i) ? 1 : 0);
 }
 
-// One segment along its major axis `a` (one pixel per step) with `b` the minor axis, in
-// coordinates where pixel centres are whole numbers; a0 < a1. Steep: a is y.
-//
-// Pixel c of the major axis spans [c - 0.5, c + 0.5); the line's minor position at its
-// centre splits the coverage between the two pixels either side, weighted at the ends by
-// the part of the pixel the segment covers.
 // A colour at each coverage: one lookup per pixel instead of a multiply.
 void fillShades(uint32_t color, uint32_t* shades) {
     for (uint32_t c = 0; c < 256; ++c) shades[c] = byteMul(color, c);
@@ -86,6 +80,12 @@ inline void blendPair(uint32_t* p0, uint32_t* p1, uint32_t s0, uint32_t s1) {
 #endif
 }
 
+// One segment along its major axis `a` (one pixel per step) with `b` the minor axis, in
+// coordinates where pixel centres are whole numbers; a0 < a1. Steep: a is y.
+//
+// Pixel c of the major axis spans [c - 0.5, c + 0.5); the line's minor position at its
+// centre splits the coverage between the two pixels either side, weighted at the ends by
+// the part of the pixel the segment covers.
 template <bool Steep>
 void strokeSpan(const Surface& s, double a0, double b0, double a1, double b1,
                 const uint32_t* shades) noexcept {
