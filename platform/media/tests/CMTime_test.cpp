@@ -111,7 +111,7 @@ TEST(CMTimeArithmetic, everyOperation__exactRoundedSaturatedAndNonNumeric) {
         "5/1 +- indef = indef indef -1; indef +- +inf = +inf -inf -1; indef +- -inf = -inf +inf 1; "
         "indef +- indef = indef indef 0; inval +- +inf = inval inval 1; "
         "indef +- inval = inval inval -1; inval +- 5/1 = inval inval 1; "
-        "5/1 +- 1/0 = inval inval 1; 3/4~ +- 1/4 = 4/4~ 2/4~ 1; "
+        "5/1 +- 1/0 = inval inval 1; 1/0 +- 5/1 = inval inval -1; 3/4~ +- 1/4 = 4/4~ 2/4~ 1; "
         // Of equal times the first is the minimum and the maximum; |INT64_MIN| does not fit.
         "1/2 min 2/4 = 1/2; 2/4 max 1/2 = 2/4; abs of MIN/1 = +inf; abs of -3/4~ = 3/4~; "
         "abs of -inf = +inf; abs of -5/0 = -5/0; "

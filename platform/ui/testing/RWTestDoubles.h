@@ -7,6 +7,7 @@
 #include <deque>
 #include <functional>
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "platform/ui/RWControl.h"
@@ -53,7 +54,7 @@ public:
     void setNeedsDisplayInRect(const CGRect&) override {}
     void displayNow() override {}
     void setCursor(RWCursor cursor) override { _cursors.push_back(cursor); }
-    void setCursorHidden(bool) override {}
+    void setCursorHidden(bool hidden) override { _hiding += hidden ? 'H' : 'S'; }
     // The view fills the window, whose origin is the view's.
     CGPoint convertPointFromWindow(const CGPoint& p) const override { return p - _bounds.origin; }
     // The window sits at screenOrigin (bottom left).
@@ -78,6 +79,8 @@ public:
     int redrawRequests() const { return _redrawRequests; }
     void resetRedrawRequests() { _redrawRequests = 0; }
     const std::vector<RWCursor>& cursors() const { return _cursors; }
+    // Each call to setCursorHidden: H hides, S shows.
+    const std::string& hiding() const { return _hiding; }
 
 private:
     CGRect _bounds;
@@ -85,6 +88,7 @@ private:
     CGPoint _screenOrigin = CGPointZero;
     int _redrawRequests = 0;
     std::vector<RWCursor> _cursors;
+    std::string _hiding;
     std::deque<RWEvent> _queued;
 };
 

@@ -144,6 +144,8 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
     set->setItem(y);
     EXPECT_FALSE(set->removeItem(nullptr) || set->removeItem(z)) << "z is no longer there";
     EXPECT_EQ(text(*set), "Cube[Y]");
+    EXPECT_TRUE(set->removeItemWithIdentifier(y->channelId()));
+    EXPECT_EQ(text(*set), "") << "a root left empty goes with its last child";
 
     host.scene().removeObject(cube);
     set->appendItem(itemFor(ball, "./1/200/202"));

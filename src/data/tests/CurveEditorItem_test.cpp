@@ -260,4 +260,7 @@ TEST_F(ItemFixture, compound__componentsOwnFirst) {
     auto item = channelItem(y);
     EXPECT_TRUE(item->isCompound() && !channelItem(opacity)->isCompound());
     EXPECT_EQ(item->compoundChannelComponents(), (std::vector<TQChannelBase*>{y, x}));
+    auto orphan = std::make_shared<TQCurveEditorChannelItem>();
+    orphan->initWithChannel(x, 0, nullptr, 1);
+    EXPECT_EQ(orphan->channelBase(), nullptr) << "without a host there is no scene to look in";
 }

@@ -1,6 +1,6 @@
 // The controller's edits, each a row run on a fresh scene through the reference host: what the
 // channels hold after it (every keyframe with its handles), what the host saw of it (the
-// bracket as one line, see bracketText), the order the channels moved their keyframes in,
+// bracket as one line, see bracketText, and the channels it heard announced), the order the channels moved their keyframes in,
 // the view's selection and the curves marked for a redraw are held in a recorded baseline
 // (baselines/edits.txt, see TextBaseline.h); every row is undone to the very scene it started
 // from and redone to the one it made.
@@ -117,16 +117,21 @@ TEST_P(CtrlEdits, edit__as_recorded_and_undone_exactly) {
     const auto before = snapshot();
     moves.clear();
     recorder.clearCalls();
+    host.resetModifiedChannels();
     run(script.substr(bar == script.npos ? 0 : bar + 1));
-    std::string redraw;
+    std::string redraw, announced;
     for (const auto& i : items)
         redraw += i->originalCurveDirty() ? i->channelBase()->getName() : "";
+    for (const TQChannelRef& ref : host.modifiedChannels()) {
+        const TQChannelBase* c = ref.getChannel(host.sceneChannelRoot());
+        announced.append(c ? c->getName() : "?").append(" ");
+    }
     const size_t steps = host.undoStack().undoCount();
     EXPECT_TRUE(tests_support::matchesBaselineBlock(
         "edits", e.name,
         "scene: " + sceneText(*object, true) + "\ncalls: " + recorder.bracketText() +
             "\nmoves: " + moves + "\nselection: " + selectionText() + "\nredraw: " + redraw +
-            "\nundo steps: " + std::to_string(steps) + "\n",
+            "\nannounced: " + announced + "\nundo steps: " + std::to_string(steps) + "\n",
         "src/engine/tests/baselines"));
     EXPECT_EQ(recorder.captureBalance(), 0);
     // Edits made outside a bracket are one step the host makes of them.

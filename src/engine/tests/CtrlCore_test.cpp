@@ -63,6 +63,11 @@ TEST_F(CtrlCore, absent_arguments__change_nothing_and_announce_nothing) {
     EXPECT_EQ(c.addVertex(nullptr, t), nullptr);
     EXPECT_EQ(c.addVertex(nullptr, t, 1.0, 1), nullptr);
     EXPECT_EQ(c.setupDeformSelected(nullptr), CGRectZero);
+    unsigned count = 7;
+    const CMTime* samplesU = &t;
+    const double* samplesV = &u;
+    c.getSamples(nullptr, 0, t, t, &samplesU, &samplesV, &count);
+    EXPECT_TRUE(!samplesU && !samplesV && !count);
     const std::function<void(TQCurveSelectionList*)> onLists[] = {
         [&](auto* l) { c.willModify(l); },
         [&](auto* l) { c.didModify(l); },

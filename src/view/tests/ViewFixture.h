@@ -188,7 +188,8 @@ protected:
         for (size_t i = 0; i < viewHost.cursors().size(); ++i)
             if (i == 0 || viewHost.cursors()[i] != viewHost.cursors()[i - 1])
                 out << " " << static_cast<int>(viewHost.cursors()[i]);
-        out << (view.needsAutoZoom() ? ", zoom due" : "")
+        out << (viewHost.hiding().empty() ? "" : " hiding ") << viewHost.hiding()
+            << (view.needsAutoZoom() ? ", zoom due" : "")
             << (view.fourCornerBoxInitialized() ? ", box" : "") << ", offsets";
         for (double o : range().offsets) out << " " << o;
         out << ", pans";

@@ -97,17 +97,24 @@ TEST_F(ViewPick, validateSelectedHandles__matches_by_time_and_drops_deleted_keyp
     c->setKeyframe(seconds(8.0), 1.0);
     view.validateSelectedHandles(&saved);
     EXPECT_EQ(selectionText(), "A@8 A@2") << "order kept, value ignored";
+    view.validateSelectedHandles(view.getSelection());
+    view.validateSelectedHandles(nullptr);
+    EXPECT_EQ(selectionText(), "A@8 A@2") << "its own list, or none, changes nothing";
 }
 
 TEST_F(ViewPick, selectAll__skips_disabled_items_and_takes_locked_keypoints) {
     build("A: 2=0/1 5=0/1L 8=0/1; B: 1=0; Gone: 1=0");
     item("B")->channel()->resetFlag(kTQChannelFlagEnabledInCurveEditor);
     item("A")->channel()->setFlag(kTQChannelFlagEnabledInCurveEditor);
-    object->removeChild(item("Gone")->channel());
+    const auto gone = item("Gone");
+    object->removeChild(gone->channel());
     ctrl().selectAll(nullptr);
     EXPECT_EQ(selectionText(), "A@2 A@5 A@8");
     ctrl().selectNone(nullptr);
     EXPECT_EQ(selectionText(), "");
+    for (const auto& selected : {gone, item("B"), item("A")}) selected->select(1);
+    EXPECT_EQ(view.channelsForSelection(),
+              (std::vector<TQChannelBase*>{item("A")->channel(), item("B")->channel()}));
 }
 
 }  // namespace
