@@ -1,9 +1,9 @@
 // The controller's edits, each a row run on a fresh scene through the reference host: what the
 // channels hold after it (every keyframe with its handles), what the host saw of it (the
-// bracket as one line, see bracketText, and the channels it heard announced), the order the channels moved their keyframes in,
-// the view's selection and the curves marked for a redraw are held in a recorded baseline
-// (baselines/edits.txt, see TextBaseline.h); every row is undone to the very scene it started
-// from and redone to the one it made.
+// bracket as one line, see bracketText, and the channels it heard announced), the order the
+// channels moved their keyframes in, the view's selection and the curves marked for a redraw
+// are held in a recorded baseline (baselines/edits.txt, see TextBaseline.h); every row is
+// undone to the very scene it started from and redone to the one it made.
 
 #include <string>
 
