@@ -203,6 +203,8 @@ TEST_F(TreeFolderTest, children__ownershipMovesAndBadIndices) {
     EXPECT_EQ(wide.findChild(3)->getName(), "Inserted");
     EXPECT_EQ(wide.findChild(4), nullptr);
     EXPECT_EQ(wide.findChild(10)->getName(), "C");
+    EXPECT_TRUE(wide.removeChildAt(0));
+    EXPECT_EQ(wide.findChild(3), nullptr);
 
     object.removeAllChildren();
     EXPECT_EQ(object.getChildren(), nullptr) << "no children: a null vector";

@@ -133,7 +133,8 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
     y->enableItem(0);
     set->insertItem(y, z->channelId());  // enabled as it comes in
     set->appendItem(itemFor(ball, "./1/200/202"));
-    EXPECT_EQ(text(*set), "Cube[X Y Z] Ball[Opacity]");
+    set->insertItem(x, z->channelId());
+    EXPECT_EQ(text(*set), "Cube[X Y Z] Ball[Opacity]") << "present: not inserted again";
     EXPECT_EQ(std::tuple(set->channeItemAtIndex(2), set->channeItemAtIndex(4),
                          set->itemWithIdentifier(y->channelId())),
               std::tuple(z, nullptr, y));

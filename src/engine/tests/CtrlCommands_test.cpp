@@ -202,6 +202,8 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"moveSegment", "A*2: 1=0 3=1", "A~", "move 2 0.5; offsetcurve 2 0.25"},
         Edit{"nudge", "A*4: 1=1 2=2", "A@1 A@2", "nudge 0 0.5; nudge 0.5 0"},
         Edit{"nudgeSegment", "A: 1=0 3=1", "A~", "nudge 2 1"},
+        Edit{"nudgeLinked", "Pos.X: 1=0 2=1; Pos.Y: 1=0 2=1; Pos.Z: 1=0 2=1", "X@1",
+             "linked | nudge 0.5 0.25"},
         Edit{"nothingToMove", "A: 1=0", "A@1",
              "select; move 1 0; nudge 1 0; offsetcurve 1 0; select A@1; unlist A; move 2 1"},
         // A keypoint alone lands on a frame, a group keeps its spacing, a nudge is in frames.

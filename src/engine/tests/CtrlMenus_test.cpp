@@ -211,6 +211,17 @@ TEST_F(CtrlMenus, actions__changeWhatTheKindNeedsInOneUndoStepThatGivesItBack) {
         EXPECT_TRUE(sceneIs(*before));
         host.undoStack().clear();
     }
+    // No entry, or a tag that names no interpolation: not even an empty step.
+    auto item = fourKeys();
+    const std::string action = "menuSetSegmentInterpolation:";
+    RWMenuItem sender(action, action);
+    selectInView({});
+    sender.setTag(C);
+    EXPECT_TRUE(ctrl().performAction(action, sender));
+    selectInView({curveEntry(item)});
+    sender.setTag(-1);
+    EXPECT_TRUE(ctrl().performAction(action, sender));
+    EXPECT_EQ(recorder.bracketText() + std::to_string(host.undoStack().undoCount()), "0");
 }
 
 TEST_F(CtrlMenus, everyAction__chosenAfterItsChannelWentAwayChangesNothing) {
