@@ -377,4 +377,14 @@ TEST(CurveSimplify, keeps_whole_segments_as_stored_and_ignores_a_handle_pointing
                         kTQSimplifyOnFrames);
     ASSERT_EQ(join->numberOfKeyframes(), 3u);
     EXPECT_FALSE(join->getKeyframeTangentsBroken(join->getKeyframe(frame(30))));
+
+    // A Catmull-Rom zigzag with nothing to drop: every segment and both of its neighbours
+    // stay, so nothing is written out as Bezier.
+    auto zigzag = std::make_unique<TQChannel>("zigzag", 1, 0.0);
+    zigzag->setInterpolation(kTQInterpolationCatmullRom);
+    for (int64_t k = 0; k <= 60; k += 10) zigzag->setKeyframe(frame(k), double(k / 10 % 2));
+    const auto stored = cloneOf(*zigzag);
+    zigzag->simplifyCurve(frame(0), frame(60), frameDuration(), kTQSimplifyBezier, 0, 0.1,
+                          kTQSimplifyOnFrames);
+    EXPECT_TRUE(*zigzag == *stored);
 }

@@ -221,6 +221,8 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"snap45", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 5.9 0.3 0"},
         Edit{"snap45FromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
              "save A>5; tangent45 A>5 5.5 0.5 1"},
+        Edit{"snap45InputFromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
+             "save A<5; tangent45 A<5 4.5 0.5 1"},
         // Selected keypoints copy the first handle's movement on its side; handle entries
         // after the first are left alone.
         Edit{"tangentsSelected",

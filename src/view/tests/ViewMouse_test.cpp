@@ -86,6 +86,8 @@ INSTANTIATE_TEST_SUITE_P(
         // it does when the view loses its controller in mid-drag.
         Gesture{"lostRelease", kLinear, "", "d 5 .5|m 5.5 .6|d 5.5 .6|u 5.5 .6"},
         Gesture{"controllerGoneInMidDrag", kLinear, "", "d 5 .5|m 5.5 .6|D|u 5.5 .6"},
+        // A drag whose press went to another view starts where it arrives.
+        Gesture{"dragWithoutItsPress", kLinear, "", "m 5 .5|q 5.5 .6|m 5.5 .6|u 5.5 .6"},
         // The second click of a pair on a keypoint opens the value panel inside one step.
         Gesture{"doubleClickTypesAValue", kLinear, "", "c 5 .5|2 5 .5"},
         Gesture{"gateDropsAStep", kLinear, "", "d 5 .5|m 5.25 .5|q 5.5 .5|m 6 .5|u 6 .5"},
