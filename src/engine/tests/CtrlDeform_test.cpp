@@ -175,6 +175,12 @@ TEST_F(CtrlDeform, deformSelected__linked_components_follow_in_time) {
     }
 }
 
+TEST_F(CtrlDeform, deformSelected__every_curve_whatever_the_order_of_the_selection) {
+    build("A: 1=0 2=1; B: 1=0 2=1");
+    deform(setupAll({item("B"), item("A")}).moved(0.5));
+    EXPECT_EQ(sceneText(*object), "A: 1.5=0 2.5=1; B: 1.5=0 2.5=1");
+}
+
 TEST_F(CtrlDeform, deformSelected__only_the_last_deformation_snaps_to_frames) {
     TearDown();
     onGrid = true;

@@ -123,6 +123,8 @@ TEST_F(ViewBox, drag__keeps_the_curves_whole_and_pans_once_the_box_enters_the_ba
     const CGPoint fromPress = view.getOffsetFromOriginWorld(0.0, 0.0);
     EXPECT_NEAR(fromPress.x, 0.0, kWorldTolerance);
     EXPECT_NEAR(fromPress.y, 0.3, kWorldTolerance);
+    const CGPoint step = view.getPointWorld(CGPointMake(20, 0)) - view.getPointWorld(CGPointZero);
+    EXPECT_NEAR(view.getOffsetFromOriginWorld(20, 0).x, step.x, kWorldTolerance);
     gesture("u 4 .3");
     ASSERT_TRUE(frame());
     gesture("d 4 .3|m 4 -.3|u 4 -.3");
