@@ -5,6 +5,8 @@
 #include <memory>
 #include <random>
 #include <sstream>
+#include <tuple>
+#include <utility>
 
 #include "platform/draw/HXDPrimitives.h"
 #include "platform/draw/internal/HXDGeometry2D.h"
@@ -146,6 +148,21 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
             }
             EXPECT_EQ(inBand({line}, band).size(), crossed ? 1u : 0u)
                 << "band of trial " << trial << " loop " << line->loop();
+
+            // A column's y extent, for the lines ordered in x: the ends of every segment in it.
+            const double x0 = px, x1 = px + (trial % 4) * 0.3;
+            double lo = HUGE_VAL, hi = -HUGE_VAL, gotLo = 0, gotHi = 0;
+            for (size_t s = 0; s + 1 < v.size(); ++s)
+                if (v[s + 1].start.x >= x0 && v[s].start.x <= x1)
+                    for (const HXDLineVertex& e : {v[s], v[s + 1]})
+                        std::tie(lo, hi) = std::pair(std::min(lo, double(e.start.y)),
+                                                     std::max(hi, double(e.start.y)));
+            const bool found = !line->loop() && line->hitYExtentOverX(x0, x1, gotLo, gotHi);
+            if (!line->loop()) {
+                EXPECT_EQ(found ? std::pair(gotLo, gotHi) : std::pair(HUGE_VAL, -HUGE_VAL),
+                          std::pair(lo, hi))
+                    << "column of trial " << trial;
+            }
 
             const auto hits = pick({line}, p);
             const bool expected = best <= 0.5 + 3.0;

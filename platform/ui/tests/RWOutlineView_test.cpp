@@ -132,6 +132,20 @@ TEST_F(OutlineTest, editing__endsByMovement) {
     EXPECT_EQ(tree.typed, (std::vector<std::string>{"value:a0=x", "value:a1=y"}));
 }
 
+// Nothing to act on changes nothing: an item not in the outline, no edit open, a single
+// selection asked for every row, and no data source at all.
+TEST_F(OutlineTest, guards__nothingToActOnChangesNothing) {
+    outline.expandItem(&tree);
+    outline.userEndEditing("x", RWReturnTextMovement);
+    outline.setAllowsMultipleSelection(false);
+    outline.selectAll();
+    EXPECT_TRUE(outline.selectedRowIndexes().empty() && tree.typed.empty());
+    EXPECT_EQ(rows(), (std::vector<std::string>{"a", "b"}));
+    RWOutlineView bare;
+    bare.reloadData();
+    EXPECT_EQ(bare.numberOfRows(), 0);
+}
+
 TEST(NumberFormatterTest, patterns__showAndReadBack) {
     RWNumberFormatter f;
     ASSERT_TRUE(f.setFormat("#,##0.000"));
