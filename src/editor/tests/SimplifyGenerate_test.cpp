@@ -58,8 +58,11 @@ TEST_F(SimplifyGenerate, simplify__moves_start_from_the_opening_curve_ok_is_one_
         EXPECT_TRUE(c() == *want) << "three moves: one simplification of the opening curve";
         press(*panels.reducePanel, "reduceOk:");
     });
+    recorder.clearCalls();
     ctrl.animMenuSimplifyCurve();
     EXPECT_TRUE(c() == *want);
+    EXPECT_EQ(recorder.bracketText(),
+              "{Simplify Channel 4*[!8 {Simplify Channel <X (X X) X> } !8] }");
     EXPECT_EQ(panels.tolerance->intValue(), 1) << "the panel is ready for the next time";
     ASSERT_NE(c().numberOfKeyframes(), static_cast<TQChannel&>(*opening).numberOfKeyframes());
     EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Simplify"));
