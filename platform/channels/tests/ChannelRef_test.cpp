@@ -85,7 +85,7 @@ TEST_F(ChannelRefTest, getChannel__deadOnceAStepIsGone) {
 
 TEST_F(ChannelRefTest, text__roundTripsAndKeepsWhatDoesNotParse) {
     for (const char* text : {"", "1/100", "/1", "./", "./1/", "./a", "./1//2", "./-1", "./+1",
-                             "./ 1", "./1 ", "./4294967296", "..", "./1/100x", "x./1"}) {
+                             "./ 1", "./1 ", "./4294967296", "..", "./1/100x", "x./1", ".12/3"}) {
         const TQChannelRef ref{BNString(text)};
         EXPECT_FALSE(ref.isValid()) << "'" << text << "' should not parse";
         EXPECT_EQ(ref.getChannel(objectA), nullptr) << "'" << text << "' resolved";
