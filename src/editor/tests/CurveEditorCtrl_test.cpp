@@ -120,6 +120,9 @@ TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
         ctrl.notify(kTQNotifyChannelsChanged);
         EXPECT_EQ(log, (Log{mod, beh, r}));
     }
+    viewHost.resetRedrawRequests();
+    ctrl.notify(kTQNotifyCurvesInvalidated);
+    EXPECT_EQ(viewHost.redrawRequests(), 1) << "invalidated curves are drawn again";
     SCOPED_TRACE("curves beyond a view out of focus zoom it");
     state(&C::showAll, {title});
     view.setIsInCurveEditor(0);

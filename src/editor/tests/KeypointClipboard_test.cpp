@@ -60,7 +60,7 @@ protected:
 };
 
 TEST_F(KeypointClipboard, paste_into_another_channel__exact_keypoints_at_the_playhead_one_step) {
-    selectKeypoints({1.0, 3.0});
+    selectKeypoints({1.0, 3.0, 1.0});  // one listed twice is copied once
     ctrl.copy();
     // Only B shown, and selected: the channel the keypoints came from is not.
     ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("B alone"));
@@ -77,8 +77,10 @@ TEST_F(KeypointClipboard, paste_into_another_channel__exact_keypoints_at_the_pla
     const Copy want = copyOf(b());
     ASSERT_TRUE(static_cast<TQChannel&>(*want).setKeyframeStates(states));
 
+    recorder.clearCalls();
     ctrl.paste();
     EXPECT_TRUE(*b() == *want && *a() == *aBefore);
+    EXPECT_EQ(recorder.bracketText(), "{Paste Keypoints <Y (Y Y) Y> } !8");
     // The pasted keypoints are the selection, in one step.
     EXPECT_EQ(std::tuple(view.getSelection()->size(), host.undoStack().undoCount(),
                          host.undoDescription()),
