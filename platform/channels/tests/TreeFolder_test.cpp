@@ -211,6 +211,24 @@ TEST_F(TreeFolderTest, children__ownershipMovesAndBadIndices) {
     EXPECT_EQ(object.findChild(100), nullptr);
 }
 
+// A flag changed with notify is announced first, up to the observer above; without, silently.
+TEST_F(TreeFolderTest, flags__announcedOnlyWhenAsked) {
+    struct Count : TQChannelChangeObserver {
+        int n = 0;
+        void channelWillChange(TQChannelBase&) override { ++n; }
+    } count;
+    object.setChangeObserver(&count);
+    std::vector<int> heard;
+    for (bool notify : {false, true}) {
+        opacity->setFlag(kTQChannelFlagShowFlattened, notify);
+        heard.push_back(count.n);
+        opacity->resetFlag(kTQChannelFlagShowFlattened, notify);
+        heard.push_back(count.n);
+    }
+    EXPECT_EQ(heard, (std::vector{0, 0, 1, 2}));
+    object.setChangeObserver(nullptr);
+}
+
 TEST_F(TreeFolderTest, animatedAndReset__aFolderAnswersForItsDescendants) {
     TQChannelFolder("Empty", 1).reset(false);  // nothing to reset
     EXPECT_FALSE(transform->isAnimated(false)) << "a folder has no animation of its own";
