@@ -176,8 +176,9 @@ protected:
     }
 
     // What the view shows and asked for: its volume, its display range, the cursors it set
-    // (each change once), whether it waits to zoom to fit, and the controller's requests
-    // (horizontal offsets, pans, selection and volume changes).
+    // (each change once) and its hiding and showing of the cursor, whether it waits to zoom to
+    // fit, and the controller's requests (horizontal offsets, pans, selection and volume
+    // changes).
     std::string viewText() {
         std::ostringstream out;
         out.precision(5);
