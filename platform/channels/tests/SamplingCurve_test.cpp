@@ -166,10 +166,10 @@ TEST(SamplingCurve, processedCurve__addsEnabledOrSelectedBehavioursInOrder) {
 
     // Behaviours are owned in order; out of range answers nothing and removes nothing.
     EXPECT_FALSE(c->getBehavior(2) || c->removeBehavior(2));
-    const std::unique_ptr<TQChannelBehavior> removed = c->removeBehavior(0);
+    const std::unique_ptr<TQChannelBehavior> removed = c->removeBehavior(1);
     c->addBehavior(nullptr);
     ASSERT_TRUE(removed && c->numberOfBehaviors() == 1u);
-    EXPECT_EQ(removed->kindName() + " " + c->getBehavior(0)->kindName(), "Oscillate Noise");
+    EXPECT_EQ(removed->kindName() + " " + c->getBehavior(0)->kindName(), "Noise Oscillate");
     c->removeBehavior(0);
     EXPECT_FALSE(c->isChannelAffectedByBehaviors(false));
 }
