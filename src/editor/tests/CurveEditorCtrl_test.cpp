@@ -259,6 +259,17 @@ TEST_F(CurveEditorCtrl, frame_grid__nearest_frame_with_a_half_going_up) {
         << "without a host there is no grid";
 }
 
+// A resize fits the curves of every set to the new width: a sample a point, and one more.
+TEST_F(CurveEditorCtrl, resize__every_sets_curves_take_a_sample_a_point) {
+    ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("Mine"));
+    const auto item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(
+        ctrl.appendChannelToCurveSet(channel(kTQHostSampleTitleObject, TQHostProperty::Opacity)));
+    ASSERT_TRUE(item);
+    ctrl.viewDidResize();
+    item->refreshOriginalCurve(kCMTimeZero, CMTimeMake(1, 30));
+    EXPECT_EQ(item->numberOfSamples(), uint32_t(view.width()) + 1);
+}
+
 TEST_F(CurveEditorCtrl, sketch__writes_only_on_selected_channels) {
     host.setSelectedObjects({object(kTQHostSampleTitleObject)});
     static_cast<TQCurveEditorCtrlBase&>(ctrl).setCurrentTool(TQTool::kSketch);

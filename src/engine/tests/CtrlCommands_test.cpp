@@ -185,6 +185,7 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"duplicateOnATinyFrame", "A: 1=3", "A@1", "fps 100000000 | menu menuDuplicate:"},
         Edit{"addToLinked", "Pos.X: 0=0 4=8; Pos.Y: 0=0 4=8; Pos.Z: 0=0 4=8", "",
              "add X~ 2.01; addvalue X~ 3 6.5", true},
+        Edit{"deleteVertex", "A: 1=0 2=1 3=0", "", "deletevertex A@2 2"},
         Edit{"deleteFromLinked", "Pos.X: 0=0 3=2 4=8; Pos.Y: 0=0 3=2 4=8; Pos.Z: 0=0 3=2 4=8", "",
              "deletevertex Y@3 3"},
         Edit{"purgeAndClean", "A: 1=1 2=2", "", "movekey A 1 2; select A@2 | clean; purge"},

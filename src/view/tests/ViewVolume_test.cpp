@@ -43,7 +43,7 @@ protected:
             {"wheel",
              [&] {
                  for (int i = 0; i < N(0); ++i)
-                     viewHost.queueEvent(RWEvent::scrollWheelEvent(0, 1));
+                     viewHost.queueEvent(RWEvent::scrollWheelEvent(-1, 1));
                  viewHost.queueEvent(RWEvent::keyEvent(RWEventType::KeyDown, "x"));
                  view.scrollWheel(RWEvent::scrollWheelEvent(0.0, 1.0));
                  out << "queued " << viewHost.queuedCount() << " / ";
@@ -105,9 +105,10 @@ TEST_F(ViewVolume, operations__table) {
         {"a page in time", "page 0.05 0", "0.5 -1 10 2 *1 *1 #1 !1800 >0.5 "},
         {"a pan that would reach time zero moves only y", "pan 80 40",
          "0 -0.8 10 2 *1 *1 #1 !1800 "},
-        // Four events of a line, four pixels a line: 16 px of 400; only wheel events taken.
+        // Four events of a line, four pixels a line: 16 px of 400 up, and the three queued
+        // ones sideways 12 px of 800; only wheel events taken.
         {"queued wheel events fold into one pan", "wheel 3",
-         "queued 1 / 0 -0.92 10 2 *1 *1 #1 !1800 !4 ~8 "},
+         "queued 1 / 0.15 -0.92 10 2 *1 *1 #1 !1800 !4 >0.15 ~8 "},
         // One keypoint each at 2 s: the display range widened by 5 % on each side; the
         // factor is taken before the padding.
         {"frame all on single keypoints", "A: 2=3; B: 2=5; zoom 1 4; clear; frame all",
