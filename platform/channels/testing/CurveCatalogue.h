@@ -44,6 +44,12 @@ inline std::unique_ptr<TQChannel> cloneOf(const TQChannel& c) {
     return std::unique_ptr<TQChannel>(static_cast<TQChannel*>(c.cloneChannel()));
 }
 
+// Counts the change notices that reach it from the channels below it.
+struct AnnouncementCounter : TQChannelChangeObserver {
+    int count = 0;
+    void channelWillChange(TQChannelBase&) override { ++count; }
+};
+
 // A channel whose values step whatever the interpolation codes say (as booleans do).
 struct SteppedChannel : TQChannel {
     SteppedChannel() : TQChannel("stepped", 1, 0.0) { setDiscrete(true); }

@@ -133,16 +133,11 @@ TEST(CurveGenerate, copies_keep_the_state_of_their_originals_and_existing_handle
               std::tuple(last.inU, last.inV, first.outU, first.outV));
 }
 
-struct Announcements : TQChannelChangeObserver {
-    int count = 0;
-    void channelWillChange(TQChannelBase&) override { ++count; }
-};
-
 TEST(CurveGenerate, refuses_what_it_cannot_bake_and_changes_nothing) {
     auto curve = mixedCurve();
     curve->setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationAfter);
     const auto untouched = cloneOf(*curve);
-    Announcements announced;
+    curve_catalogue::AnnouncementCounter announced;
     curve->setChangeObserver(&announced);
     struct Case {
         const char* what;

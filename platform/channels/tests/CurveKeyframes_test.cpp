@@ -85,13 +85,12 @@ TEST_F(CurveKeyframes, reading__neighboursExtremesAndLookupsByTime) {
 
 TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywhere) {
     // A handle looked up before an earlier keyframe goes still finds its own keyframe after.
-    auto copy = cloneOf(*c);
-    auto& keys = static_cast<TQChannel&>(*copy);
-    const std::vector<TQKeyframeHandle> held = keys.getKeyframes(false);
+    const auto keys = cloneOf(*c);
+    const std::vector<TQKeyframeHandle> held = keys->getKeyframes(false);
     double value = 0.0;
-    ASSERT_TRUE(keys.getKeyframe(held[1], nullptr, nullptr));
-    keys.deleteKeyframe(held[0]);
-    EXPECT_TRUE(keys.getKeyframe(held[1], nullptr, &value) && value == 20.0);
+    ASSERT_TRUE(keys->getKeyframe(held[1], nullptr, nullptr));
+    keys->deleteKeyframe(held[0]);
+    EXPECT_TRUE(keys->getKeyframe(held[1], nullptr, &value) && value == 20.0);
     c->deleteKeyframe(b);
     EXPECT_FALSE(live(b));
     TQKeyframeHandle again = c->setKeyframe(seconds(2.0), 20.0);

@@ -247,14 +247,9 @@ TEST(CurveSimplify, fits_a_stepped_channel_with_steps_on_its_own_levels) {
     }
 }
 
-struct AnnouncementCounter : TQChannelChangeObserver {
-    int count = 0;
-    void channelWillChange(TQChannelBase&) override { ++count; }
-};
-
 TEST(CurveSimplify, refuses_bad_input_without_a_change_or_an_announcement) {
     auto c = sketchedStroke(60);
-    AnnouncementCounter announcements;
+    curve_catalogue::AnnouncementCounter announcements;
     c->setChangeObserver(&announcements);
     const auto untouched = cloneOf(*c);
     const double nan = std::numeric_limits<double>::quiet_NaN();

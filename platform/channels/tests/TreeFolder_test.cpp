@@ -10,6 +10,7 @@
 #include "platform/channels/TQChannelObjectRootBase.h"
 #include "platform/channels/TQChannelTypes.h"
 #include "platform/channels/TQFactory.h"
+#include "platform/channels/testing/CurveCatalogue.h"
 #include "platform/channels/tests/KeyframeText.h"
 
 namespace {
@@ -213,17 +214,14 @@ TEST_F(TreeFolderTest, children__ownershipMovesAndBadIndices) {
 
 // A flag changed with notify is announced first, up to the observer above; without, silently.
 TEST_F(TreeFolderTest, flags__announcedOnlyWhenAsked) {
-    struct Count : TQChannelChangeObserver {
-        int n = 0;
-        void channelWillChange(TQChannelBase&) override { ++n; }
-    } count;
+    curve_catalogue::AnnouncementCounter count;
     object.setChangeObserver(&count);
     std::vector<int> heard;
     for (bool notify : {false, true}) {
         opacity->setFlag(kTQChannelFlagShowFlattened, notify);
-        heard.push_back(count.n);
+        heard.push_back(count.count);
         opacity->resetFlag(kTQChannelFlagShowFlattened, notify);
-        heard.push_back(count.n);
+        heard.push_back(count.count);
     }
     EXPECT_EQ(heard, (std::vector{0, 0, 1, 2}));
     object.setChangeObserver(nullptr);
