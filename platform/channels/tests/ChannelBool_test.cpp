@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <utility>
+
 #include "platform/channels/TQChannelTypes.h"
 
 namespace {
@@ -10,18 +12,13 @@ CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, 600); }
 // and without: the saved project keeps booleans, so a value between would not come back.
 TEST(ChannelBool, curveDrags__leaveOnlyOffAndOn) {
     const CMTime at = seconds(1.0);
-    TQChannelBool keyed("Visible", 1);
-    keyed.setKeyframe(seconds(1.0), 0.0);
-    keyed.setKeyframe(seconds(2.0), 1.0);
+    TQChannelBool keyed("Visible", 1), segment("Visible", 1), expected("Visible", 1);
+    for (const auto& [c, first] : {std::pair{&keyed, 0.0}, {&segment, 0.0}, {&expected, 1.0}}) {
+        c->setKeyframe(seconds(1.0), first);
+        c->setKeyframe(seconds(2.0), 1.0);
+    }
     keyed.offsetCurve(&at, 0.7);
-    TQChannelBool expected("Visible", 1);
-    expected.setKeyframe(seconds(1.0), 1.0);
-    expected.setKeyframe(seconds(2.0), 1.0);
     EXPECT_TRUE(keyed == expected);
-
-    TQChannelBool segment("Visible", 1);
-    segment.setKeyframe(seconds(1.0), 0.0);
-    segment.setKeyframe(seconds(2.0), 1.0);
     segment.setCurveSegmentValue(seconds(1.5), 0.9);
     EXPECT_TRUE(segment == expected) << "the segment from off to on lifted: both on";
 

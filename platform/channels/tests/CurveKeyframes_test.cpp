@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <array>
 #include <functional>
 
 #include "platform/channels/testing/CurveCatalogue.h"
@@ -124,12 +125,7 @@ TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywher
     std::vector<TQKeyframeState> states = c->getKeyframeStates();
     ASSERT_TRUE(c->setKeyframeStates(states));
     EXPECT_FALSE(live(a)) << "states make new keyframes";
-    const std::vector<TQKeyframeHandle> handles = c->getKeyframes(false);
-    for (size_t i = 0; i < handles.size(); ++i) {
-        CMTime t;
-        ASSERT_TRUE(c->getKeyframe(handles[i], &t, nullptr));
-        EXPECT_EQ(CMTimeCompare(t, states[i].time), 0) << "each with a handle of its own";
-    }
+    EXPECT_EQ(keyText(*c, true), keyText(*before, true)) << "each with a handle of its own";
     std::swap(states[0], states[1]);
     EXPECT_FALSE(c->setKeyframeStates(states));
     std::swap(states[0], states[1]);
@@ -368,42 +364,30 @@ TEST_F(CurveKeyframes, cloneAssignCompareAndReset__roundTripEveryPartOfTheState)
 
 // The extremes are kept from one read to the next; every edit must make them read anew.
 TEST_F(CurveKeyframes, extremes__follow_every_kind_of_edit) {
+    const CMTime later = seconds(2.5);
+    const double hundred = 100.0;
     const struct {
         const char* edit;
         std::function<void()> apply;
-        double min, max, minEnabled, maxEnabled;
+        std::array<double, 4> minMaxThenEnabledOnly;
     } steps[] = {
-        {"as set", [] {}, 10, 30, 10, 30},
-        {"a value", [&] { c->setKeyframeValue(d, 50.0); }, 10, 50, 10, 50},
-        {"disabled", [&] { c->setKeyframeEnabled(a, false); }, 10, 50, 20, 50},
-        {"a new keyframe", [&] { c->setKeyframe(seconds(4.0), -5.0); }, -5, 50, -5, 50},
-        {"a move",
-         [&] {
-             const CMTime later = seconds(2.5);
-             const double value = 100.0;
-             c->setKeyframeTime(b, &later, &value);
-         },
-         -5, 100, -5, 100},
-        {"an offset",
-         [&] {
-             const CMTime at = seconds(2.5);
-             c->offsetCurve(&at, 101.0);
-         },
-         -4, 101, -4, 101},
-        {"a deletion", [&] { c->deleteKeyframe(b); }, -4, 51, -4, 51},
+        {"as set", [] {}, {10, 30, 10, 30}},
+        {"a value", [&] { c->setKeyframeValue(d, 50.0); }, {10, 50, 10, 50}},
+        {"disabled", [&] { c->setKeyframeEnabled(a, false); }, {10, 50, 20, 50}},
+        {"a new keyframe", [&] { c->setKeyframe(seconds(4.0), -5.0); }, {-5, 50, -5, 50}},
+        {"a move", [&] { c->setKeyframeTime(b, &later, &hundred); }, {-5, 100, -5, 100}},
+        {"an offset", [&] { c->offsetCurve(&later, 101.0); }, {-4, 101, -4, 101}},
+        {"a deletion", [&] { c->deleteKeyframe(b); }, {-4, 51, -4, 51}},
         {"all gone: the initial value",
-         [&] {
-             c->deleteAllKeyframes(seconds(0.0));
-             c->setInitialValue(7.0);
-         },
-         7, 7, 7, 7},
+         [&] { c->deleteAllKeyframes(seconds(0.0)), c->setInitialValue(7.0); },
+         {7, 7, 7, 7}},
     };
     for (const auto& step : steps) {
         step.apply();
-        EXPECT_DOUBLE_EQ(c->getKeyframeMinValue(false), step.min) << step.edit;
-        EXPECT_DOUBLE_EQ(c->getKeyframeMaxValue(false), step.max) << step.edit;
-        EXPECT_DOUBLE_EQ(c->getKeyframeMinValue(true), step.minEnabled) << step.edit;
-        EXPECT_DOUBLE_EQ(c->getKeyframeMaxValue(true), step.maxEnabled) << step.edit;
+        EXPECT_EQ((std::array{c->getKeyframeMinValue(false), c->getKeyframeMaxValue(false),
+                              c->getKeyframeMinValue(true), c->getKeyframeMaxValue(true)}),
+                  step.minMaxThenEnabledOnly)
+            << step.edit;
     }
     auto copy = flat();
     *copy = static_cast<const TQChannelBase&>(*c);
