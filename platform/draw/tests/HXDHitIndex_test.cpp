@@ -46,15 +46,13 @@ class HitIndexFixture : public HitFixture {
 protected:
     static std::shared_ptr<HXDMultiline> curve(double y, double amplitude, float width, int samples,
                                                double power = 1.0) {
-        std::vector<HXDLineVertex> v;
-        for (int i = 0; i < samples; ++i) {
+        auto curve = line(samples, [&](int i) {
             // power > 1 crowds the samples at the start: the bins' guesses are then far off.
             const double x = 10.0 * std::pow(i / double(samples - 1), power);
-            v.push_back({{float(x), float(y + amplitude * std::sin(x * 2.3 + y)), 0}, {}});
-        }
-        auto line = std::make_shared<HXDMultiline>(std::move(v));
-        line->setWidth(width);
-        return line;
+            return xy(x, y + amplitude * std::sin(x * 2.3 + y));
+        });
+        curve->setWidth(width);
+        return curve;
     }
 
     // A frame's worth of everything a view draws: curves of several widths in bands, their
@@ -80,12 +78,8 @@ protected:
                         100 + k, nullptr, CGRectMake(x + 0.3, y, -0.15, 0.3), 1.0f));
             }
         }
-        std::vector<HXDLineVertex> ring;
-        ring.reserve(60);
-        for (int i = 0; i < 60; ++i)
-            ring.push_back(
-                {{float(5 + 3 * std::cos(i * 0.1)), float(3 * std::sin(i * 0.1)), 0}, {}});
-        auto loop = std::make_shared<HXDMultiline>(std::move(ring));
+        auto loop =
+            line(60, [](int i) { return xy(5 + 3 * std::cos(i * 0.1), 3 * std::sin(i * 0.1)); });
         loop->setLoop(true);  // its closing chord crosses columns its vertices do not reach
         list.push_back(loop);
         list.push_back(nullptr);

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 #include <memory>
@@ -99,27 +100,17 @@ TEST_F(HitTestFixture, multiline__hitOnTheLineWithinTheToleranceAndOnlyAfterAFra
 // (x in order, bins filled as queries reach them) and for anything else (a loop, x going back).
 TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
     std::mt19937 rng(1234);
-    std::uniform_real_distribution<double> ux(-0.5, 10.5), uy(-5.5, 5.5);
-    std::vector<HXDLineVertex> monotone, wandering;
-    for (int i = 0; i < 2000; ++i) {
-        const float x = static_cast<float>(i * 10.0 / 1999.0);
-        monotone.push_back({{x, static_cast<float>(4.0 * std::sin(x * 3.0)), 0}, {}});
-        wandering.push_back({{static_cast<float>(5 + 4 * std::cos(i * 0.01)),
-                              static_cast<float>(4 * std::sin(i * 0.013)), 0},
-                             {}});
-    }
+    std::uniform_real_distribution<double> ux(-0.5, 10.5), uy(-5.5, 5.5), jy(-4.5, 4.5);
+    const auto monotone =
+        line(2000, [](int i) { return xy(i * 10.0 / 1999.0, 4.0 * std::sin(i * 30.0 / 1999.0)); });
     // Jagged: few, long segments, so that each one decides some answers.
-    std::vector<HXDLineVertex> jagged;
-    jagged.reserve(120);
-    std::uniform_real_distribution<double> jy(-4.5, 4.5);
-    for (int i = 0; i < 120; ++i)
-        jagged.push_back(
-            {{static_cast<float>(i * 10.0 / 119.0), static_cast<float>(jy(rng)), 0}, {}});
-    auto looped = curve(wandering);
+    const auto jagged = line(120, [&](int i) { return xy(i * 10.0 / 119.0, jy(rng)); });
+    const auto looped =
+        line(2000, [](int i) { return xy(5 + 4 * std::cos(i * 0.01), 4 * std::sin(i * 0.013)); });
     looped->setLoop(true);
     const HXDScreenMapping mapping(controller.renderingContext()->projection(),
                                    CGSizeMake(200, 100));
-    for (const auto& line : {curve(monotone), curve(jagged), looped}) {
+    for (const auto& line : {monotone, jagged, looped}) {
         const auto& v = line->vertices();
         const size_t segments = v.size() - 1 + (line->loop() ? 1 : 0);
         for (int trial = 0; trial < 300; ++trial) {
@@ -129,7 +120,9 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
             const CGPoint p = pixel(px, py);
             // A band of up to 30 px around the point: crossed by some segment, or not.
             const CGRect band = CGRectMake(p.x, p.y, (trial % 7) * 5.0, (trial % 5) * 6.0);
-            double best = std::numeric_limits<double>::infinity();
+            // A column's y extent, for the lines ordered in x: the ends of every segment in it.
+            const double x0 = px, x1 = px + (trial % 4) * 0.3;
+            double best = std::numeric_limits<double>::infinity(), lo = HUGE_VAL, hi = -HUGE_VAL;
             bool crossed = false;
             for (size_t s = 0; s < segments; ++s) {
                 const HXDLineVertex& a = v[s];
@@ -144,20 +137,16 @@ TEST_F(HitTestFixture, multiline__indexAgreesWithABruteForceWalk) {
                                          pa.x, pa.y, pb.x, pb.y, band.origin.x - 0.5,
                                          band.origin.y - 0.5, band.origin.x + band.size.width + 0.5,
                                          band.origin.y + band.size.height + 0.5);
+                if (s + 1 < v.size() && b.start.x >= x0 && a.start.x <= x1) {
+                    lo = std::min({lo, double(a.start.y), double(b.start.y)});
+                    hi = std::max({hi, double(a.start.y), double(b.start.y)});
+                }
             }
             EXPECT_EQ(inBand({line}, band).size(), crossed ? 1u : 0u)
                 << "band of trial " << trial << " loop " << line->loop();
 
-            // A column's y extent, for the lines ordered in x: the ends of every segment in it.
-            const double x0 = px, x1 = px + (trial % 4) * 0.3;
-            double lo = HUGE_VAL, hi = -HUGE_VAL, gotLo = 0, gotHi = 0;
-            for (size_t s = 0; s + 1 < v.size(); ++s)
-                if (v[s + 1].start.x >= x0 && v[s].start.x <= x1)
-                    for (const HXDLineVertex& e : {v[s], v[s + 1]}) {
-                        lo = std::min(lo, double(e.start.y));
-                        hi = std::max(hi, double(e.start.y));
-                    }
             if (!line->loop()) {
+                double gotLo = 0, gotHi = 0;
                 const bool found = line->hitYExtentOverX(x0, x1, gotLo, gotHi);
                 EXPECT_EQ(found ? std::pair(gotLo, gotHi) : std::pair(HUGE_VAL, -HUGE_VAL),
                           std::pair(lo, hi))

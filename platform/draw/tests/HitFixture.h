@@ -3,6 +3,7 @@
 // second across, 10 pixels per unit up; picks and bands in its pixels.
 #include <gtest/gtest.h>
 
+#include <memory>
 #include <vector>
 
 #include "platform/draw/HXDPrimitives.h"
@@ -34,6 +35,15 @@ protected:
         return controller.newHitTestResultForPrimitives(
             list, controller.renderingContextForHitTestInRect(band), false);
     }
+
+    // A line through n points, the i-th at(i).
+    template <class At>
+    static std::shared_ptr<HXDMultiline> line(int n, const At& at) {
+        std::vector<HXDLineVertex> v;
+        for (int i = 0; i < n; ++i) v.push_back({at(i), {}});
+        return std::make_shared<HXDMultiline>(std::move(v));
+    }
+    static HXDFloat3 xy(double x, double y) { return {float(x), float(y), 0}; }
 
     HXDRenderController controller{nullptr, 1.0f};
 };
