@@ -3,6 +3,7 @@
 #include <climits>
 #include <memory>
 #include <tuple>
+#include <utility>
 
 #include "platform/channels/testing/ReferenceCurves.h"
 
@@ -85,18 +86,13 @@ TEST(CurveGenerate, bakes_cycles_that_equal_the_extrapolated_curve_at_every_fram
                     const int64_t blind = jumpBakedAfter ? 40 * int64_t(cycles + 1) : 0;
                     EXPECT_EQ(differingFrames(*curve, *baked, cycles, blind), 0);
                     // The keyframes now reach over the cycles on the side baked.
-                    const CMTime reach = frame(40 * int64_t(cycles));
-                    if (direction == kTQExtrapolationBefore) {
-                        EXPECT_EQ(CMTimeCompare(baked->getKeyframeMinTime(),
-                                                CMTimeSubtract(kCMTimeZero, reach)),
-                                  0);
-                        EXPECT_EQ(CMTimeCompare(baked->getKeyframeMaxTime(), frame(40)), 0);
-                    } else {
-                        EXPECT_EQ(CMTimeCompare(baked->getKeyframeMinTime(), frame(0)), 0);
-                        EXPECT_EQ(
-                            CMTimeCompare(baked->getKeyframeMaxTime(), CMTimeAdd(frame(40), reach)),
-                            0);
-                    }
+                    const int64_t reach = 40 * int64_t(cycles);
+                    EXPECT_EQ(std::pair(CMTimeGetSeconds(baked->getKeyframeMinTime()),
+                                        CMTimeGetSeconds(baked->getKeyframeMaxTime())),
+                              direction == kTQExtrapolationBefore
+                                  ? std::pair(CMTimeGetSeconds(frame(-reach)),
+                                              CMTimeGetSeconds(frame(40)))
+                                  : std::pair(0.0, CMTimeGetSeconds(frame(40 + reach))));
                     EXPECT_EQ(reference_curves::backwardSegments(*baked), 0u);
                     EXPECT_EQ(baked->getKeyframeMaxValue(false),
                               reference_curves::greatestKeyframeValue(*baked));
@@ -139,18 +135,13 @@ TEST(CurveGenerate, refuses_what_it_cannot_bake_and_changes_nothing) {
     const auto untouched = cloneOf(*curve);
     curve_catalogue::AnnouncementCounter announced;
     curve->setChangeObserver(&announced);
-    struct Case {
-        const char* what;
-        unsigned direction;
-        unsigned cycles;
-    };
-    const Case cases[] = {{"no cycle", kTQExtrapolationAfter, 0},
-                          {"unknown direction", 2, 1},
-                          {"more keyframes than a channel holds", kTQExtrapolationAfter, UINT_MAX},
-                          {"18 million keyframes", kTQExtrapolationAfter, 2'000'000}};
-    for (const Case& c : cases) {
-        curve->generateKeypoints(c.direction, c.cycles);
-        EXPECT_TRUE(*curve == *untouched) << c.what;
+    for (const auto& [what, direction, cycles] :
+         {std::tuple<const char*, unsigned, unsigned>{"no cycle", kTQExtrapolationAfter, 0},
+          {"unknown direction", 2, 1},
+          {"more keyframes than a channel holds", kTQExtrapolationAfter, UINT_MAX},
+          {"18 million keyframes", kTQExtrapolationAfter, 2'000'000}}) {
+        curve->generateKeypoints(direction, cycles);
+        EXPECT_TRUE(*curve == *untouched) << what;
     }
 
     // A single keyframe has no cycle to copy; cycles that would end past the range of time

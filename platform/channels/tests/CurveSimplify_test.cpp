@@ -46,26 +46,22 @@ void simplifyAndCheck(TQChannel& c, int64_t first, int64_t last, double error, i
 }
 
 TEST(CurveSimplify, keeps_its_promise_on_the_reference_curves_with_few_keyframes) {
-    struct Case {
-        const char* name;
-        std::unique_ptr<TQChannel> (*make)();
-        double error;  // the worst error asked, in the curve's units or of its height
-        bool ofHeight;
-        unsigned most;  // keyframes at most
-    };
-    // A shorter noisy sine than the benchmark's, with the same rate of keyframes allowed.
-    const Case cases[] = {{"noisy sine", [] { return noisySine(6000); }, 0.05, false, 270},
-                          {"catmull-rom keys", [] { return catmullRomKeys(); }, 0.001, true, 500},
-                          {"sketched stroke", [] { return sketchedStroke(); }, 0.01, true, 35}};
-    for (const Case& k : cases) {
+    using Make = std::unique_ptr<TQChannel> (*)();
+    // The worst error asked, in the curve's units or of its height, and the keyframes allowed
+    // at most. A shorter noisy sine than the benchmark's, with the same rate of keyframes.
+    for (const auto& [name, make, asked, ofHeight, most] :
+         {std::tuple<const char*, Make, double, bool, unsigned>{
+              "noisy sine", [] { return noisySine(6000); }, 0.05, false, 270},
+          {"catmull-rom keys", [] { return catmullRomKeys(); }, 0.001, true, 500},
+          {"sketched stroke", [] { return sketchedStroke(); }, 0.01, true, 35}}) {
         for (int smoothness : {0, 3, 10}) {
-            SCOPED_TRACE(testing::Message() << k.name << ", smoothness " << smoothness);
-            auto c = k.make();
+            SCOPED_TRACE(testing::Message() << name << ", smoothness " << smoothness);
+            auto c = make();
             const int64_t first = frameOf(c->getKeyframeMinTime());
             const int64_t last = frameOf(c->getKeyframeMaxTime());
-            const double error = k.ofHeight ? k.error * height(*c, first, last) : k.error;
+            const double error = ofHeight ? asked * height(*c, first, last) : asked;
             simplifyAndCheck(*c, first, last, error, smoothness);
-            EXPECT_LE(c->numberOfKeyframes(), k.most);
+            EXPECT_LE(c->numberOfKeyframes(), most);
         }
     }
 }
@@ -190,29 +186,23 @@ TEST(CurveSimplify, at_zero_tolerance_keeps_every_frame_and_drops_keyframes_that
 }
 
 TEST(CurveSimplify, fits_lines_steps_and_existing_keyframes_within_the_same_promise) {
-    struct Case {
-        const char* name;
-        int shape;
-        int placement;
-        unsigned interpolation;  // of every new segment, or kTQInterpolationMixed
-    };
-    const Case cases[] = {
-        {"lines", kTQSimplifyLinear, kTQSimplifyOnFrames, kTQInterpolationLinear},
-        {"steps", kTQSimplifyConstant, kTQSimplifyOnFrames, kTQInterpolationConstant},
-        {"existing keyframes", kTQSimplifyBezier, kTQSimplifyOnExistingKeyframes,
-         kTQInterpolationMixed},
-    };
-    for (const Case& k : cases) {
-        SCOPED_TRACE(k.name);
+    // The interpolation of every new segment, or kTQInterpolationMixed for none new.
+    for (const auto& [name, shape, placement, interpolation] :
+         {std::tuple<const char*, int, int, unsigned>{"lines", kTQSimplifyLinear,
+                                                      kTQSimplifyOnFrames, kTQInterpolationLinear},
+          {"steps", kTQSimplifyConstant, kTQSimplifyOnFrames, kTQInterpolationConstant},
+          {"existing keyframes", kTQSimplifyBezier, kTQSimplifyOnExistingKeyframes,
+           kTQInterpolationMixed}}) {
+        SCOPED_TRACE(name);
         auto c = sketchedStroke(120);
         const auto before = cloneOf(*c);
         const int64_t last = frameOf(c->getKeyframeMaxTime());
-        simplifyAndCheck(*c, 0, last, 0.02 * height(*c, 0, last), 2, k.shape, k.placement);
+        simplifyAndCheck(*c, 0, last, 0.02 * height(*c, 0, last), 2, shape, placement);
         EXPECT_LT(c->numberOfKeyframes(), before->numberOfKeyframes());
         const std::vector<TQKeyframeState> now = c->getKeyframeStates();
         for (size_t i = 0; i + 1 < now.size(); ++i) {
-            if (k.interpolation != kTQInterpolationMixed)
-                EXPECT_EQ(now[i].interpolation, k.interpolation);
+            if (interpolation != kTQInterpolationMixed)
+                EXPECT_EQ(now[i].interpolation, interpolation);
             else  // only keyframes that were there, with their values
                 EXPECT_EQ(now[i].value, keyValue(*before, now[i].time))
                     << "keyframe at " << CMTimeGetSeconds(now[i].time) << " s";
@@ -244,15 +234,10 @@ TEST(CurveSimplify, refuses_bad_input_without_a_change_or_an_announcement) {
     const auto untouched = cloneOf(*c);
     const double nan = std::numeric_limits<double>::quiet_NaN();
     const double inf = std::numeric_limits<double>::infinity();
-    struct Case {
-        const char* what;
-        CMTime start, end, duration;
-        int shape, smoothness;
-        double tolerance;
-        int placement;
-    };
     const CMTime f = frameDuration();
-    const Case cases[] = {
+    // What is wrong, then the arguments: start, end, frame duration, shape, smoothness,
+    // tolerance and placement.
+    const std::tuple<const char*, CMTime, CMTime, CMTime, int, int, double, int> cases[] = {
         {"invalid start", kCMTimeInvalid, frame(59), f, 2, 0, 1.0, 0},
         {"infinite end", frame(0), kCMTimePositiveInfinity, f, 2, 0, 1.0, 0},
         {"zero frame duration", frame(0), frame(59), CMTimeMake(0, kFps), 2, 0, 1.0, 0},
@@ -268,10 +253,10 @@ TEST(CurveSimplify, refuses_bad_input_without_a_change_or_an_announcement) {
         {"span reversed", frame(59), frame(0), f, 2, 0, 1.0, 0},
         {"too many frames", frame(0), frame(59), CMTimeMake(1, 1'000'000'000), 2, 0, 1.0, 0},
     };
-    for (const Case& k : cases) {
-        c->simplifyCurve(k.start, k.end, k.duration, k.shape, k.smoothness, k.tolerance,
-                         k.placement);
-        EXPECT_TRUE(*c == *untouched) << k.what;
+    for (const auto& [what, start, end, duration, shape, smoothness, tolerance, placement] :
+         cases) {
+        c->simplifyCurve(start, end, duration, shape, smoothness, tolerance, placement);
+        EXPECT_TRUE(*c == *untouched) << what;
     }
     EXPECT_EQ(announcements.count, 0);
 
