@@ -93,7 +93,6 @@ TEST_F(ChannelRefTest, text__roundTripsAndKeepsWhatDoesNotParse) {
         EXPECT_EQ(ref.depth(), 0u);
     }
     const TQChannelRef parsed(BNString("./1/100/101/1"));
-    ASSERT_TRUE(parsed.isValid());
     EXPECT_EQ(parsed, TQChannelRef(xA, objectA));
     EXPECT_EQ(parsed.getChannel(objectA), xA);
     EXPECT_EQ(TQChannelRef(BNString("./43/4294967295")).getText(), "./43/4294967295");

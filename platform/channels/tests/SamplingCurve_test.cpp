@@ -18,13 +18,17 @@ struct Samples {
     unsigned count;
 };
 
-// Samples over [start, start + step * n), of the keyframed curve without a context.
+// Samples over [start, start + step * n): of the keyframed curve without a context, of the
+// processed curve with one or when asked.
 Samples sample(const TQChannel& c, CMTime start, CMTime step, unsigned n,
-               const TQSampleContext* context = nullptr) {
+               const TQSampleContext* context = nullptr, bool processed = false) {
     Samples s{std::vector<CMTime>(n + 1), std::vector<double>(n + 1), n};
     CMTime* t = s.times.data();
     double* v = s.values.data();
-    c.getSamples(context, start, step, s.count, &t, &v);
+    if (processed && !context)
+        c.getSamples(start, step, s.count, &t, &v);
+    else
+        c.getSamples(context, start, step, s.count, &t, &v);
     return s;
 }
 
@@ -57,7 +61,13 @@ std::unique_ptr<TQChannel> clustered() {
 }
 
 TEST(SamplingCurve, keyframedSamples__matchPointQueriesAtEveryDensityAndPastTheEnds) {
-    std::unique_ptr<TQChannel> curves[] = {flat(), overshoot(), cusp(), dense(400), clustered()};
+    // Stairs: constant segments tell a sample that lands on a keyframe from one that lands in
+    // the segment before it, however far the walk jumps.
+    auto stairs = makeChannel("stairs");
+    for (int k = 0; k < 300; ++k) stairs->setKeyframe(seconds(k), k);
+    stairs->setInterpolation(kTQInterpolationConstant);
+    std::unique_ptr<TQChannel> curves[] = {flat(),     overshoot(), cusp(),
+                                           dense(400), clustered(), std::move(stairs)};
     for (auto& c : curves) {
         c->setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter);
         c->setExtrapolation(kTQExtrapolationProgressive, kTQExtrapolationBefore);
@@ -69,25 +79,14 @@ TEST(SamplingCurve, keyframedSamples__matchPointQueriesAtEveryDensityAndPastTheE
               {seconds(0.0), CMTimeMakeWithSeconds(span / 100, 1000000000), 100u},
               {seconds(0.0), CMTimeMakeWithSeconds(span / 60000, 1000000000), 60000u},
               {seconds(0.0), seconds(0.37), unsigned(span / 0.37)},
+              {seconds(0.0), seconds(1.0), unsigned(span)},
+              {seconds(0.0), seconds(7.0), unsigned(span / 7.0)},
+              {seconds(0.0), seconds(40.0), unsigned(span / 40.0)},
               {c->getKeyframeMaxTime(), seconds(0.05), 4000u}}) {
             const Samples s = sample(*c, start, step, n);
             ASSERT_EQ(s.count, n) << c->getName();
             expectPointQueries(*c, s, start, step, c->getName().c_str());
         }
-    }
-}
-
-TEST(SamplingCurve, stairs__samplesOnKeyframeTimesTakeTheKeyframeThereAtAnyStride) {
-    // Constant segments tell a sample that lands on a keyframe from one that lands in the
-    // segment before it, however far the walk jumps.
-    auto c = makeChannel("stairs");
-    for (int k = 0; k < 300; ++k) c->setKeyframe(seconds(k), k);
-    c->setInterpolation(kTQInterpolationConstant);
-    for (const int stride : {1, 2, 3, 7, 40}) {
-        const Samples s = sample(*c, seconds(0.0), seconds(stride), 300 / stride);
-        for (unsigned i = 0; i < s.count; ++i)
-            ASSERT_EQ(s.values[i], double(i * stride)) << "stride " << stride;
-        ASSERT_EQ(c->getCurveValue(seconds(3 * stride)), 3.0 * stride);
     }
 }
 
@@ -130,13 +129,7 @@ TEST(SamplingCurve, processedCurve__addsEnabledOrSelectedBehavioursInOrder) {
     const auto noise = [](double s) { return TQNoiseBehavior::noise(3.0 * s, 42); };
     const auto expectProcessed = [&](const auto& expected, const TQSampleContext* context,
                                      const char* what) {
-        Samples s{std::vector<CMTime>(201), std::vector<double>(201), 200};
-        CMTime* t = s.times.data();
-        double* v = s.values.data();
-        if (context)
-            c->getSamples(context, seconds(0.0), seconds(0.01), s.count, &t, &v);
-        else
-            c->getSamples(seconds(0.0), seconds(0.01), s.count, &t, &v);
+        const Samples s = sample(*c, seconds(0.0), seconds(0.01), 200, context, true);
         ASSERT_EQ(s.count, 200u);
         for (unsigned i = 0; i < s.count; ++i) {
             const double secs = CMTimeGetSeconds(s.times[i]);

@@ -51,8 +51,6 @@ TEST(HXDPrimitivesTest,
     EXPECT_EQ(controller.renderingContext()->projection(), projection)
         << "the last projection stays for hit tests";
     EXPECT_EQ(controller.renderingContext()->drawableSize(), CGSizeMake(100, 50)) << "and the size";
-    encoder.setDrawableAvailable(false);
-    EXPECT_EQ(encoder.nextDrawable(), nullptr);
 }
 
 TEST(HXDPrimitivesTest, values__joinsTexturesNumbersAndExtraInfoTakeBadInputSafely) {

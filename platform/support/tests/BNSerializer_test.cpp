@@ -6,6 +6,7 @@
 #include <limits>
 #include <memory>
 #include <string>
+#include <tuple>
 #include <vector>
 
 #include "platform/support/BNSerializerReadStream.h"
@@ -42,6 +43,13 @@ struct Book final : BNSerializer {
     uint32_t copies = 0;
     bool inPrint = false;
     std::vector<BNString> notes;
+
+    // Everything a book holds: the price by its bits, the time by every field.
+    auto fields() const {
+        return std::tuple(title, std::bit_cast<uint64_t>(price), published.value,
+                          published.timescale, published.flags, published.epoch, copies, inPrint,
+                          notes);
+    }
 
     void writeHeader(BNSerializerWriteStream& s, bool) override {
         s.pushScope(kShelfScope);
@@ -164,17 +172,9 @@ TEST(BNSerializerTest, roundTrip__textNumbersAndTimesComeBackExactly) {
     ASSERT_FALSE(error) << textOf(error);
     ASSERT_EQ(back.books.size(), shelf.books.size());
     for (size_t i = 0; i < shelf.books.size(); ++i) {
-        SCOPED_TRACE(i);
-        const Book& a = *shelf.books[i];
-        const Book& b = *back.books[i];
-        EXPECT_EQ(b.title, a.title) << "attribute text must survive escaping as it was";
-        EXPECT_EQ(std::bit_cast<uint64_t>(b.price), std::bit_cast<uint64_t>(a.price)) << a.price;
-        EXPECT_TRUE(CMTimeIdentical(b.published, a.published))
-            << "value, timescale, flags and epoch must all come back";
-        EXPECT_EQ(b.copies, a.copies);
-        EXPECT_EQ(b.inPrint, a.inPrint);
         // Content is stripped at its ends: the inner blanks stay, the outer ones go.
-        EXPECT_EQ(b.notes, (std::vector<BNString>{a.notes[0], "kept inner  space"}));
+        shelf.books[i]->notes[1] = "kept inner  space";
+        EXPECT_EQ(back.books[i]->fields(), shelf.books[i]->fields()) << "book " << i;
     }
 }
 
