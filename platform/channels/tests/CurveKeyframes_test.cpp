@@ -64,8 +64,6 @@ TEST_F(CurveKeyframes, reading__neighboursExtremesAndLookupsByTime) {
         CMTimeGetSeconds(c->getKeyframeMinTime()) + 10 * CMTimeGetSeconds(c->getKeyframeMaxTime()),
         31.0);
     auto empty = makeChannel("empty");
-    empty->setInitialValue(7.0);
-    EXPECT_EQ(empty->getKeyframeMinValue() + empty->getKeyframeMaxValue(), 14.0);
     EXPECT_TRUE(CMTIME_IS_INVALID(empty->getKeyframeMinTime()) &&
                 CMTIME_IS_INVALID(empty->getKeyframeMaxTime()));
     EXPECT_FALSE(empty->getFirstKeyframe(nullptr, nullptr) ||
@@ -191,7 +189,6 @@ TEST_F(CurveKeyframes, meetingKeyframes__bothLiveUntilPurgeKeepsTheArrival) {
     EXPECT_EQ(e->getKeyframe(seconds(3.0)), e->getKeyframes(false).back())
         << "a copy arrives after";
     editScript(*e, "delaxis 3 last; => 2=2 3=5; clone 2 3; delaxis 3; => 2=2; del 2; => (0)");
-    EXPECT_EQ(e->numberOfKeyframes(), 0u);
     e->setKeyframe(two, 1.0);
     e->cloneKeyframe(e->getKeyframe(two), two);
     e->deleteKeyframeAtTime(&two);
@@ -309,8 +306,7 @@ TEST_F(CurveKeyframes, valuesAndAnimation__deleteAllKeepsWhatWasShownDisabledSho
     EXPECT_EQ(c->getValueAsDouble(seconds(2.0), 0.25), 13.5) << "the sub-frame offset counts";
 
     c->deleteAllKeyframes(seconds(2.25));
-    EXPECT_EQ(c->numberOfKeyframes(), 0u);
-    EXPECT_NEAR(c->getInitialValue(), 13.5, kTolerance);
+    EXPECT_EQ(keyText(*c), "(13.5)") << "no keyframes, the value shown kept";
     EXPECT_FALSE(live(a) || live(b) || live(d));
     c->setValue(&t, 8.0);
     EXPECT_EQ(c->getInitialValue(), 8.0) << "without keyframes a value edit sets the initial value";

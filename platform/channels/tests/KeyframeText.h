@@ -43,7 +43,6 @@ inline void editScript(TQChannel& c, const std::string& script) {
         {"out", [&] { c.setKeyframeOutputTangents(k0, N(1), N(2), W(3) != "abs", aligned()); }},
         {"broken", [&] { c.setKeyframeTangentsBroken(k0, N(1) != 0); }},
         {"scaled", [&] { c.setKeyframeTangentsScaled(k0, N(1) != 0); }},
-        {"enable", [&] { c.setKeyframeEnabled(k0, N(1) != 0); }},
         {"smooth", [&] { c.smoothKeyframe(k0, W(1) != "keep"); }},
         {"reverse", [&] { c.reverseKeyframes(k0, k1); }},
         {"segment", [&] { c.setCurveSegmentValue(t0, N(1)); }},

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <string>
+#include <tuple>
 #include <vector>
 
 #include "platform/ui/RWServices.h"
@@ -15,13 +16,13 @@ TEST(RWUserDefaultsTest, readers__convertBetweenNumbersBooleansAndTextsOverRegis
     defaults.setObject(std::string("abc"), "text-word");
     defaults.setDouble(3.75, "double");
     defaults.setBool(true, "bool");
-    EXPECT_TRUE(defaults.boolForKey("text-yes"));
-    EXPECT_DOUBLE_EQ(defaults.doubleForKey("text-number"), 2.5);
-    EXPECT_EQ(defaults.integerForKey("double"), 3) << "doubles truncate to integers";
-    EXPECT_EQ(defaults.integerForKey("bool"), 1);
-    EXPECT_FALSE(defaults.boolForKey("text-word")) << "a text that is no number reads as false";
-    EXPECT_EQ(defaults.stringForKey("double"), "") << "numbers are not formatted as texts";
-    EXPECT_FALSE(defaults.boolForKey("missing"));
+    // Doubles truncate to integers, a text that is no number reads as false, and numbers are
+    // not formatted as texts.
+    EXPECT_EQ(std::tuple(defaults.boolForKey("text-yes"), defaults.doubleForKey("text-number"),
+                         defaults.integerForKey("double"), defaults.integerForKey("bool"),
+                         defaults.boolForKey("text-word"), defaults.stringForKey("double"),
+                         defaults.boolForKey("missing")),
+              std::tuple(true, 2.5, 3, 1, false, std::string(), false));
     // Registered defaults stand below stored values and come back when those are removed.
     defaults.registerDefaults({{"TQPreferenceManager::flag", RWDefaultsValue{true}}});
     EXPECT_TRUE(defaults.boolForKey("TQPreferenceManager::flag"));
