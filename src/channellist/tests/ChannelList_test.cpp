@@ -80,8 +80,8 @@ TEST_F(ChannelListTest, showBoxes__folderTriStateGroupToggleAndSolo) {
     click(Ctrl::kNameColumn, 1);
     click(Ctrl::kNameColumn, 3, RWEventModifierFlagShift);
     click(Ctrl::kShowColumn, 2);
-    for (int64_t row : {1, 2, 3}) EXPECT_EQ(state(row), RWOffState) << "row " << row;
-    EXPECT_EQ(state(4), RWOnState);
+    EXPECT_EQ((std::vector{state(1), state(2), state(3), state(4)}),
+              (std::vector<int>{RWOffState, RWOffState, RWOffState, RWOnState}));
     EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1, 2, 3}));
     // Option solos the row and selects it alone; again shows everything.
     ctrl.selectedCurveSet()->enableAll(true, nullptr);

@@ -60,10 +60,12 @@ protected:
         view.setIsInCurveEditor(1);  // no auto-zoom in step 7 unless a row asks for it
         title = object(kTQHostSampleTitleObject);
     }
-    // The set shown, the objects selected and the channels changed since the last reset.
-    void state(void (TQCurveEditorCtrl::*show)(RWActionSender*),
-               const std::vector<TQChannelBase*>& selected, TQChannel* modified = nullptr) {
-        host.setSelectedObjects(selected);
+    // The set shown, the title selected (or nothing) and the channel changed since the last
+    // reset.
+    void state(void (TQCurveEditorCtrl::*show)(RWActionSender*), TQChannel* modified = nullptr,
+               bool noneSelected = false) {
+        host.setSelectedObjects(noneSelected ? std::vector<TQChannelBase*>{}
+                                             : std::vector<TQChannelBase*>{title});
         (ctrl.*show)(nullptr);
         host.resetModifiedChannels();
         if (modified) modified->noteWillChange(true);
@@ -82,44 +84,48 @@ TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
     const std::string r = "resetModifiedChannels", sel = "objectsSelectedInScene",
                       mod = "modifiedChannels", ref = "refreshSelectedCurveSet",
                       tool = "currentToolChanged", beh = "updateIfModifiedByBehaviors";
-    using Show = void (C::*)(RWActionSender*);
-    auto check = [&](const char* what, Show show, const std::vector<TQChannelBase*>& selected,
-                     TQChannel* modified, TQNotificationWord word, const Log& expected) {
-        SCOPED_TRACE(what);
-        state(show, selected, modified);
-        ctrl.notify(word);
-        EXPECT_EQ(log, expected);
+    const char* pop = "refreshPopUp";
+    // The set shown, the word, what follows in order, the channel changed, and whether no object
+    // is selected or the changed channel is hidden.
+    const struct {
+        void (C::*show)(RWActionSender*);
+        TQNotificationWord word;
+        Log expected;
+        TQChannel* modified = nullptr;
+        bool noneSelected = false, hidden = false;
+    } rows[] = {
+        {&C::showAnimated, 0x40000140u, {r}},  // unknown bits only
+        {&C::showAnimated, kTQNotifySceneChanged, {ref, r}},
+        {&C::showActive, kTQNotifySceneChanged, {sel, r}},
+        {&C::showActive, kTQNotifySceneChanged, {sel, ref, mod, r}, nullptr, true},
+        {&C::showActive, kTQNotifySceneReset, {tool, r}},
+        // Changes and set content: stale from step 5 carried into step 7.
+        {&C::showAnimated,
+         kTQNotifyChannelsChanged | kTQNotifyCurveSetContentChanged,
+         {tool, ref, ref, pop, r}},
+        // An animated channel outside Animated makes it stale; one without keys does not, but
+        // does for Modified; a set by property does not follow changes.
+        {&C::showAnimated, kTQNotifyChannelsChanged, {mod, ref, r}, bounce},
+        {&C::showAnimated, kTQNotifyChannelsChanging, {mod, beh, r}, pivot},
+        {&C::showModified, kTQNotifyChannelsChanging, {mod, ref, r}, pivot},
+        {&C::showPosition, kTQNotifyChannelsChanged, {beh, r}, bounce},
+        {&C::showAll, kTQNotifyObjectSelectionChanged, {ref, r}},
+        {&C::showAll, kTQNotifyToolChanged | kTQNotifyCurveSetContentChanged, {tool, ref, pop, r}},
+        // A hidden channel never makes a set stale.
+        {&C::showModified, kTQNotifyChannelsChanged, {mod, beh, r}, pivot, false, true},
     };
-    check("unknown bits only", &C::showAnimated, {title}, nullptr, 0x40000140u, {r});
-    check("scene change", &C::showAnimated, {title}, nullptr, kTQNotifySceneChanged, {ref, r});
-    check("scene change, Active, objects selected", &C::showActive, {title}, nullptr,
-          kTQNotifySceneChanged, {sel, r});
-    check("scene change, Active, none selected", &C::showActive, {}, nullptr, kTQNotifySceneChanged,
-          {sel, ref, mod, r});
-    check("scene reset, Active", &C::showActive, {title}, nullptr, kTQNotifySceneReset, {tool, r});
-    check("changes and set content: stale from step 5 carried into step 7", &C::showAnimated,
-          {title}, nullptr, kTQNotifyChannelsChanged | kTQNotifyCurveSetContentChanged,
-          {tool, ref, ref, "refreshPopUp", r});
-    check("an animated channel outside Animated makes it stale", &C::showAnimated, {title}, bounce,
-          kTQNotifyChannelsChanged, {mod, ref, r});
-    check("a channel without keys does not, for Animated", &C::showAnimated, {title}, pivot,
-          kTQNotifyChannelsChanging, {mod, beh, r});
-    check("but does for Modified", &C::showModified, {title}, pivot, kTQNotifyChannelsChanging,
-          {mod, ref, r});
-    check("a set by property does not follow changes", &C::showPosition, {title}, bounce,
-          kTQNotifyChannelsChanged, {beh, r});
-    check("object selection", &C::showAll, {title}, nullptr, kTQNotifyObjectSelectionChanged,
-          {ref, r});
-    check("tool change with set content", &C::showAll, {title}, nullptr,
-          kTQNotifyToolChanged | kTQNotifyCurveSetContentChanged, {tool, ref, "refreshPopUp", r});
-    pivot->setFlag(kTQChannelFlagHidden);
-    check("a hidden channel never makes a set stale", &C::showModified, {title}, pivot,
-          kTQNotifyChannelsChanged, {mod, beh, r});
+    for (const auto& row : rows) {
+        SCOPED_TRACE(&row - rows);
+        if (row.hidden) row.modified->setFlag(kTQChannelFlagHidden);
+        state(row.show, row.modified, row.noneSelected);
+        ctrl.notify(row.word);
+        EXPECT_EQ(log, row.expected);
+    }
     viewHost.resetRedrawRequests();
     ctrl.notify(kTQNotifyCurvesInvalidated);
     EXPECT_EQ(viewHost.redrawRequests(), 1) << "invalidated curves are drawn again";
     SCOPED_TRACE("curves beyond a view out of focus zoom it");
-    state(&C::showAll, {title});
+    state(&C::showAll);
     view.setIsInCurveEditor(0);
     view.setCurrentViewVolume(CGRectMake(0, 0, 6, 0.001));
     ctrl.notify(kTQNotifyChannelsChanged);
@@ -127,7 +133,7 @@ TEST_F(Notify, words__several_flags_act_in_the_fixed_order) {
 }
 
 TEST_F(Notify, rows__time_refreshes_animated_rows_and_keypoints_select_their_rows) {
-    state(&TQCurveEditorCtrl::showAll, {title});
+    state(&TQCurveEditorCtrl::showAll);
     const TQCurveSetPtr set = ctrl.selectedCurveSet();
     // The title's animated rows (and the ones behaviours move); the others stand still.
     const Log expected = {"refreshRowWithoutTitle 0",  "refreshRowWithoutTitle 1",
