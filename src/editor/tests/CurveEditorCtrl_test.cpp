@@ -21,7 +21,6 @@ TEST_F(CurveEditorCtrl, setup__wires_the_controls_and_a_dead_controller_stops_ob
     ctrl.tools()->userClickSegment(2);
     EXPECT_EQ(ctrl.getCurrentTool(), TQTool::kBox) << "the segment holds the tool";
     EXPECT_EQ(log.front(), "currentToolChanged");
-    EXPECT_EQ(ctrl.curveSetsPopUp()->title(), "Animated");
     EXPECT_EQ(view.getOriginalViewVolume().size.width, 6.0) << "the total range is the reference";
 
     const auto popUp = ctrl.curveSetsPopUp();
