@@ -82,14 +82,28 @@ protected:
             RWEvent::mouseEvent(RWEventType::RightMouseDown, at(Ctrl::kMenuColumn, r)));
         return menus.shown;
     }
-    static RWMenuItemPtr item(const RWMenuPtr& menu, const char* key) {
-        const std::string title = TQLocalizedString(key);
+    // The item of the animation menu's key "Anim Menu <name>", in any submenu.
+    static RWMenuItemPtr item(const RWMenuPtr& menu, const std::string& name) {
+        const std::string title = TQLocalizedString("Anim Menu " + name);
         for (const RWMenuItemPtr& i : menu->itemArray()) {
             if (i->title() == title) return i;
             if (i->hasSubmenu())
-                if (RWMenuItemPtr found = item(i->submenu(), key)) return found;
+                if (RWMenuItemPtr found = item(i->submenu(), name)) return found;
         }
         return nullptr;
+    }
+    // The named items of the row's menu, each as its state (M mixed, 1 on, 0 off) and whether
+    // it is enabled (+ or -).
+    std::string states(std::initializer_list<const char*> names) {
+        const RWMenuPtr menu = openMenu(row);
+        std::string out;
+        for (const char* name : names) {
+            const RWMenuItemPtr i = item(menu, name);
+            if (!i) return out + "?" + name;
+            out += i->state() == RWMixedState ? 'M' : i->state() == RWOnState ? '1' : '0';
+            out += i->isEnabled() ? '+' : '-';
+        }
+        return out;
     }
 
     std::shared_ptr<TQCurveEditorAnimStatusCell> keyCell =
@@ -101,13 +115,31 @@ protected:
     TQChannel* channel = nullptr;
 };
 
-TEST_F(AnimStatusCells, drawing__key_mark_at_the_playhead_and_arrows_and_menu_on_hover_only) {
+TEST_F(AnimStatusCells, hover__parts_and_tips_of_the_key_cell_and_arrows_and_menu_drawn_only_so) {
     host.setCurrentTime(sec(2));
     EXPECT_EQ(drawn(Ctrl::kKeyColumn, row), (std::vector<std::string>{"AnimStatusKeyframe"}));
     EXPECT_TRUE(drawn(Ctrl::kMenuColumn, row).empty()) << "not under the pointer";
 
-    moveTo(keyPoint(5));
+    using L = TQCurveEditorChannelList;
+    const struct {
+        double x;
+        int part;
+        const char* tip;
+    } parts[] = {{5, L::kPartPrevious, "Anim Tool Tip Previous Keyframe"},
+                 {25, L::kPartNext, "Anim Tool Tip Next Keyframe"},
+                 {45, L::kPartAddOrDelete, "Anim Tool Tip Delete Keyframe"},
+                 {-30, L::kPartOutside, nullptr}};
+    for (const auto& p : parts) {
+        moveTo(keyPoint(p.x));
+        EXPECT_EQ(controller.mouseInRow(), row);
+        EXPECT_EQ(controller.mouseInPartIndex(), p.part) << p.x;
+        EXPECT_EQ(list.toolTip(), p.tip ? std::optional(TQLocalizedString(p.tip)) : std::nullopt);
+    }
+    EXPECT_EQ(controller.mouseInChan(), channel);
+
     host.setCurrentTime(sec(2.5));
+    moveTo(keyPoint(45));
+    EXPECT_EQ(list.toolTip(), TQLocalizedString("Anim Tool Tip Add Keyframe"));
     EXPECT_EQ(
         drawn(Ctrl::kKeyColumn, row),
         (std::vector<std::string>{"AnimStatusPrevious", "AnimStatusNext", "AnimStatusNoKeyframe"}));
@@ -118,6 +150,9 @@ TEST_F(AnimStatusCells, drawing__key_mark_at_the_playhead_and_arrows_and_menu_on
     moveTo(at(Ctrl::kMenuColumn, 0));
     EXPECT_TRUE(drawn(Ctrl::kKeyColumn, 0).empty());
     EXPECT_TRUE(drawn(Ctrl::kMenuColumn, 0).empty());
+    list.mouseLeftView(RWEvent::mouseEvent(RWEventType::MouseExited, CGPointZero));
+    EXPECT_EQ(controller.mouseInRow(), Ctrl::kNone);
+    EXPECT_EQ(controller.mouseInChan(), nullptr);
 }
 
 TEST_F(AnimStatusCells, key_parts__step_between_keyframes_and_add_or_delete_one_undoably) {
@@ -149,13 +184,12 @@ TEST_F(AnimStatusCells, menu__built_for_the_selection_and_its_items_reach_the_ed
     const RWMenuPtr menu = openMenu(row);
     ASSERT_TRUE(menu);
     EXPECT_EQ(menu->itemAtIndex(0)->title(), TQLocalizedString("Anim Menu Reset Channel"));
-    EXPECT_TRUE(item(menu, "Anim Menu Disable Animation")) << "the channel is animated";
-    EXPECT_TRUE(item(menu, "Anim Menu Lock Channel"));
-    EXPECT_FALSE(item(menu, "Anim Menu KEYFRAMES")->isEnabled());
-    EXPECT_FALSE(item(menu, "Anim Menu Set To Ghost")->isEnabled()) << "no ghosts are kept";
-    EXPECT_TRUE(item(menu, "Anim Menu Simplify Channel")->isEnabled()) << "one channel";
+    // An animated channel, unlocked, alone, without a ghost.
+    EXPECT_EQ(states({"Disable Animation", "Lock Channel", "KEYFRAMES", "Set To Ghost",
+                      "Simplify Channel"}),
+              "0+0+0-0-0+");
 
-    const RWMenuItemPtr linear = item(menu, "Anim Menu Interpolation Linear");
+    const RWMenuItemPtr linear = item(menu, "Interpolation Linear");
     RWMenu* interpolation = linear->menu();
     interpolation->performActionForItemAtIndex(interpolation->indexOfItem(*linear));
     EXPECT_EQ(std::tuple(channel->getInterpolation(), linear->state(), host.undoDescription()),
@@ -182,42 +216,26 @@ TEST_F(AnimStatusCells, validation__locked_mixed_and_several_channels) {
     list.selectRowIndexes(RWIndexSet{row}, false);
     list.selectRowIndexes(RWIndexSet{other}, true);
     host.setCurrentTime(sec(2));
-    // Each item's state or enabled flag: M mixed, 1 on, 0 off; + enabled, - disabled.
-    auto states = [&](std::initializer_list<const char*> keys) {
-        const RWMenuPtr menu = openMenu(row);
-        std::string out;
-        for (const char* key : keys) {
-            const RWMenuItemPtr i = item(menu, key);
-            if (!i) return out + "?" + key;
-            out += i->state() == RWMixedState ? 'M' : i->state() == RWOnState ? '1' : '0';
-            out += i->isEnabled() ? '+' : '-';
-        }
-        return out;
-    };
     // Two channels, Linear and Bezier, both keyed at 2 s.
-    EXPECT_EQ(states({"Anim Menu Interpolation Linear", "Anim Menu Interpolation Bezier",
-                      "Anim Menu Interpolation Constant", "Anim Menu Simplify Channel",
-                      "Anim Menu Extrapolation Generate", "Anim Menu Delete Keyframe",
-                      "Anim Menu Add Keyframe"}),
-              "M+M+0+0-0-0+0-");
+    EXPECT_EQ(
+        states({"Interpolation Linear", "Interpolation Bezier", "Interpolation Constant",
+                "Simplify Channel", "Extrapolation Generate", "Delete Keyframe", "Add Keyframe"}),
+        "M+M+0+0-0-0+0-");
     // One channel whose keyframes differ marks each kind it holds.
     channel->setKeyframeInterpolation(channel->getKeyframe(sec(1)), kTQInterpolationCatmullRom);
     list.selectRowIndexes(RWIndexSet{row}, false);
-    EXPECT_EQ(states({"Anim Menu Interpolation Catmull Rom", "Anim Menu Interpolation Linear",
-                      "Anim Menu Interpolation Bezier"}),
+    EXPECT_EQ(states({"Interpolation Catmull Rom", "Interpolation Linear", "Interpolation Bezier"}),
               "M+M+0+");
     // One of two locked: still Lock, mixed, and edits stay allowed.
     second->setLocked(true);
     list.selectRowIndexes(RWIndexSet{row, other}, false);
-    EXPECT_EQ(states({"Anim Menu Lock Channel", "Anim Menu Reset Channel"}), "M+0+");
+    EXPECT_EQ(states({"Lock Channel", "Reset Channel"}), "M+0+");
     // All locked: Unlock, and nothing that edits; moving time is fine.
     channel->setLocked(true);
-    EXPECT_EQ(
-        states({"Anim Menu Unlock Channel", "Anim Menu Reset Channel", "Anim Menu Add Keyframe",
-                "Anim Menu Delete Keyframe", "Anim Menu Disable Animation",
-                "Anim Menu Interpolation Linear", "Anim Menu Extrapolation Repeat",
-                "Anim Menu Simplify Channel", "Anim Menu Next Keyframe"}),
-        "0+0-0-0-0-M-0-0-0+");
+    EXPECT_EQ(states({"Unlock Channel", "Reset Channel", "Add Keyframe", "Delete Keyframe",
+                      "Disable Animation", "Interpolation Linear", "Extrapolation Repeat",
+                      "Simplify Channel", "Next Keyframe"}),
+              "0+0-0-0-0-M-0-0-0+");
 }
 
 TEST_F(AnimStatusCells, folder_keyframes__hidden_children_do_not_count) {

@@ -80,8 +80,8 @@ TEST_F(ChannelListTest, showBoxes__folderTriStateGroupToggleAndSolo) {
     click(Ctrl::kNameColumn, 1);
     click(Ctrl::kNameColumn, 3, RWEventModifierFlagShift);
     click(Ctrl::kShowColumn, 2);
-    for (int64_t row : {1, 2, 3}) EXPECT_EQ(state(row), RWOffState) << "row " << row;
-    EXPECT_EQ(state(4), RWOnState);
+    EXPECT_EQ((std::vector{state(1), state(2), state(3), state(4)}),
+              (std::vector<int>{RWOffState, RWOffState, RWOffState, RWOnState}));
     EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{1, 2, 3}));
     // Option solos the row and selects it alone; again shows everything.
     ctrl.selectedCurveSet()->enableAll(true, nullptr);
@@ -192,36 +192,6 @@ TEST_F(ChannelListTest, routing__byColumnAndModifier) {
     EXPECT_EQ(ran, 1);
     list.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, "\xEF\x9C\x81"));  // down arrow
     EXPECT_EQ(list.selectedRowIndexes(), (RWIndexSet{2}));
-}
-
-TEST_F(ChannelListTest, hover__partsOfTheKeyCellAndTheirTips) {
-    const int64_t row = rowOf("Opacity");
-    const CGRect key = list.frameOfCellAtColumn(list.columnWithIdentifier(Ctrl::kKeyColumn), row);
-    auto over = [&](double x) {
-        moveTo(list.convertPointToWindow(CGPointMake(key.origin.x + x, key.origin.y + 5)));
-    };
-    CMTime now = host.currentTime();
-    const bool keyed = itemAt(row)->channel()->hasKeyframeAtTime(&now, 0);
-    using L = TQCurveEditorChannelList;
-    const struct {
-        double x;
-        int part;
-        const char* tip;
-    } parts[] = {{5, L::kPartPrevious, "Anim Tool Tip Previous Keyframe"},
-                 {25, L::kPartNext, "Anim Tool Tip Next Keyframe"},
-                 {45, L::kPartAddOrDelete,
-                  keyed ? "Anim Tool Tip Delete Keyframe" : "Anim Tool Tip Add Keyframe"},
-                 {-30, L::kPartOutside, nullptr}};
-    for (const auto& p : parts) {
-        over(p.x);
-        EXPECT_EQ(controller.mouseInRow(), row);
-        EXPECT_EQ(controller.mouseInPartIndex(), p.part) << p.x;
-        EXPECT_EQ(list.toolTip(), p.tip ? std::optional(TQLocalizedString(p.tip)) : std::nullopt);
-    }
-    EXPECT_EQ(controller.mouseInChan(), itemAt(row)->channelBase());
-    list.mouseLeftView(RWEvent::mouseEvent(RWEventType::MouseExited, CGPointZero));
-    EXPECT_EQ(controller.mouseInRow(), Ctrl::kNone);
-    EXPECT_EQ(controller.mouseInChan(), nullptr);
 }
 
 }  // namespace

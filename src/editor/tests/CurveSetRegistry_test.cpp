@@ -92,25 +92,25 @@ TEST_F(CurveSetRegistry, custom_sets__adding_cloning_and_merging) {
     TQChannelObjectRootBase* title = object(kTQHostSampleTitleObject);
     {
         SCOPED_TRACE("adds while an automatic set shows start a custom set");
+        TQChannel *opacity = channel("Title", "./1/200/202"),
+                  *x = channel("Title", "./1/100/101/1"),
+                  *scale = channel("Title", "./1/100/105/1");
         gNewCurveSetIndex = 1;
         ctrl.showActive();
         ASSERT_TRUE(ctrl.canModifySelectedCurveSet()) << "Active takes channels by hand";
-        ctrl.appendChannelToCurveSet(channel("Title", "./1/200/202"));
-        ctrl.appendChannelToCurveSet(channel("Title", "./1/100/101/1"));
+        ctrl.appendChannelToCurveSet(opacity);
+        ctrl.appendChannelToCurveSet(x);
         const TQCurveSetPtr added = ctrl.selectedCurveSet();
         // "Untitled Set 1" asked for; a number 1 is dropped by the unique form.
         EXPECT_EQ(added->curveSetName(), "Untitled Set");
         EXPECT_EQ(gNewCurveSetIndex, 2u) << "the second add went into the same set";
-        EXPECT_EQ(shownChannels(),
-                  (std::vector<const TQChannelBase*>{channel("Title", "./1/200/202"),
-                                                     channel("Title", "./1/100/101/1")}));
+        EXPECT_EQ(shownChannels(), (std::vector<const TQChannelBase*>{opacity, x}));
         ctrl.showAll();
-        ctrl.appendChannelToCurveSet(channel("Title", "./1/200/202"));
+        ctrl.appendChannelToCurveSet(opacity);
         EXPECT_EQ(ctrl.selectedCurveSet()->curveSetName(), "Untitled Set 2");
         EXPECT_EQ(ctrl.getCurveSetById(added->curveSetId()), added);
-        ctrl.setChannelInList(channel("Title", "./1/100/105/1"));
-        EXPECT_EQ(shownChannels(),
-                  (std::vector<const TQChannelBase*>{channel("Title", "./1/100/105/1")}));
+        ctrl.setChannelInList(scale);
+        EXPECT_EQ(shownChannels(), std::vector<const TQChannelBase*>{scale});
     }
     {
         SCOPED_TRACE("a clone of the shown set is absolute, selected and named uniquely");

@@ -166,13 +166,9 @@ protected:
         ctrl.setAppDelegate(&recorder);
         ctrl.setView(&view);
         TQCurveEditorOutlets outlets;
-        outlets.verticalScroller = std::make_shared<RWZoomScroller>();
-        outlets.verticalScroller->setTarget(&ctrl);
-        outlets.verticalScroller->setAction("verticalZoomScroll:");
+        outlets.verticalScroller = wired<RWZoomScroller>(ctrl, "verticalZoomScroll:");
         outlets.verticalScroller->setSuperview(&superview);
-        outlets.tools = std::make_shared<RWSegmentedControl>();
-        outlets.tools->setTarget(&ctrl);
-        outlets.tools->setAction("setCurrentTool:");
+        outlets.tools = wired<RWSegmentedControl>(ctrl, "setCurrentTool:");
         outlets.curveSetsPopUp = std::make_shared<RWPopUpButton>();
         connect(outlets);
         ctrl.connectOutlets(outlets);

@@ -55,8 +55,8 @@ protected:
     }
     // One edit is one undo step of the rows' name, and undo gives the scene back.
     void expectOneUndoStep(const TQChannelBase& before) {
-        EXPECT_EQ(recorder.captureBalance(), 0);
-        EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Set Value"));
+        EXPECT_EQ(std::pair(host.undoDescription(), recorder.captureBalance()),
+                  std::pair(TQLocalizedString("Undo Set Value"), 0));
         ASSERT_TRUE(host.undo());
         EXPECT_TRUE(*object == before) << "undo restores the scene exactly";
         EXPECT_FALSE(host.canUndo()) << "one step, not several";
@@ -68,7 +68,7 @@ protected:
     TQMiniCurveEditorInspector* rows = nullptr;
 };
 
-TEST_F(OverRangeRows, valueRow__a_typed_value_or_a_slider_drag_moves_the_keypoint_in_one_step) {
+TEST_F(OverRangeRows, valueRow__typed_or_dragged_one_step_and_typing_stands_through_updates) {
     selectInGroup(gain, 0.5);
     auto before = snapshot();
     valueRow().userEnterNumber("42");
@@ -84,9 +84,8 @@ TEST_F(OverRangeRows, valueRow__a_typed_value_or_a_slider_drag_moves_the_keypoin
     valueRow().endSliderAction(slider);
     EXPECT_DOUBLE_EQ(keyValue(*gain, 1.0), 27.0);
     expectOneUndoStep(*before);
-}
 
-TEST_F(OverRangeRows, valueRow__a_field_being_typed_in_keeps_its_text_through_updates) {
+    // A field being typed in keeps its text through updates.
     selectInGroup(gain, 0.5);
     RWTextField& field = valueRow().textField();
     const double was = field.doubleValue();
@@ -100,24 +99,7 @@ TEST_F(OverRangeRows, valueRow__a_field_being_typed_in_keeps_its_text_through_up
     EXPECT_DOUBLE_EQ(field.doubleValue(), was + 5.0) << "once left, the field follows again";
 }
 
-TEST_F(OverRangeRows, positionRow__percent_moves_the_keypoint_and_clamps) {
-    selectInGroup(gain, 0.5);
-    const auto before = snapshot();
-    positionRow().userEnterNumber("25");
-    EXPECT_EQ(keyText(*gain), "0=10 0.25=30 1=20");
-    EXPECT_EQ(shown(), (std::pair{30.0, 25.0}));
-    expectOneUndoStep(*before);
-
-    selectInGroup(gain, 0.5);
-    positionRow().userEnterNumber("150");
-    EXPECT_EQ(shown().second, 100.0) << "clamped to the range";
-    selectInGroup(gain, 0.0);
-    positionRow().userEnterNumber("-5");
-    EXPECT_NE(gain->getKeyframe(position(0.0)), nullptr);
-    EXPECT_EQ(shown().second, 0.0);
-}
-
-TEST_F(OverRangeRows, rows__follow_the_selection_and_disable_without_one) {
+TEST_F(OverRangeRows, rows__follow_the_selection_and_the_position_row_moves_and_clamps) {
     EXPECT_FALSE(valueRow().isEnabled() || positionRow().isEnabled() ||
                  valueRow().textField().isEnabled());
     selectInGroup(gain, 0.5);
@@ -137,9 +119,25 @@ TEST_F(OverRangeRows, rows__follow_the_selection_and_disable_without_one) {
     rows->update();
     group->update();
     EXPECT_FALSE(valueRow().isEnabled());
+
+    // The position row: a percent of the range, clamped to it.
+    selectInGroup(gain, 0.5);
+    const auto before = snapshot();
+    positionRow().userEnterNumber("25");
+    EXPECT_EQ(keyText(*gain), "0=10 0.25=30 1=20");
+    EXPECT_EQ(shown(), (std::pair{30.0, 25.0}));
+    expectOneUndoStep(*before);
+
+    selectInGroup(gain, 0.5);
+    positionRow().userEnterNumber("150");
+    EXPECT_EQ(shown().second, 100.0) << "clamped to the range";
+    selectInGroup(gain, 0.0);
+    positionRow().userEnterNumber("-5");
+    EXPECT_NE(gain->getKeyframe(position(0.0)), nullptr);
+    EXPECT_EQ(shown().second, 0.0);
 }
 
-TEST_F(OverRangeRows, strip__reset_restores_the_channel_in_one_step) {
+TEST_F(OverRangeRows, strip__reset_restores_the_channel_in_one_step_group_opens_from_it) {
     TQMiniCurveEditorStripController* strip = group->stripController();
     ASSERT_NE(strip, nullptr);
     auto want = snapshot();
@@ -151,9 +149,8 @@ TEST_F(OverRangeRows, strip__reset_restores_the_channel_in_one_step) {
               std::pair(TQLocalizedString("Undo Folder Reset"), 0));
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(*object == *before);
-}
 
-TEST_F(OverRangeRows, group__starts_closed_with_the_strip_and_opens) {
+    // The group starts closed with the strip, and opens.
     auto state = [&] {
         return std::array{group->editorGroup()->isCollapsed(),
                           group->editorController()->isHidden(),
