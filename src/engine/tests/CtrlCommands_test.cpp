@@ -219,7 +219,11 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"undrawnViewNoNaN", "A: 5=0(-0.5,-0.1|0.5,0.1)", "", "undrawn; tangent A>5 5.2 0.3"},
         Edit{"undrawnViewNoSnap", "A: 5=0(-0.5,-0.1|0.5,0.1)", "",
              "| undrawn; tangent45 A>5 5.2 0.3 0"},
+        // The pointer 40, 80, -10 and 150 degrees on screen from the keypoint.
         Edit{"snap45", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 5.9 0.3 0"},
+        Edit{"snap45Upright", "A: 0=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>0 0.217 0.492 0"},
+        Edit{"snap45Level", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 6.231 -0.087 0"},
+        Edit{"snap45Backward", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 3.917 0.25 0"},
         Edit{"snap45FromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
              "save A>5; tangent45 A>5 5.5 0.5 1"},
         Edit{"snap45InputFromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
@@ -231,8 +235,8 @@ INSTANTIATE_TEST_SUITE_P(
              "A>2 B@4 C<6", "tangents 2.8 0.3"},
         Edit{"tangents45Selected",
              "A: 2=0.2(-0.5,-0.1|0.5,0.1); B*2: 4=0.5(-0.2,-0.3|0.2,0.3); C*0.5: "
-             "6=-0.1(-0.4,0|0.4,0)",
-             "A>2 B@4 C@6", "tangents45 2.75 0.485 0"},
+             "6=-0.1(-0.4,0|0.4,0); D: 8=0(-0.4,0|0.4,0)b",
+             "A>2 B@4 C@6 D<8", "tangents45 2.75 0.485 0"},
         // The list forms take one state for all; the single forms toggle.
         Edit{"breakAndWeight", "A: 2=0(-0.5,0|0.5,0)b; B: 4=0(-0.5,0|0.5,0)", "A@2 B>4",
              "breaks; break A@2; weight A@2 1; weights 0"},
