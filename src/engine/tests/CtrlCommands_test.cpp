@@ -48,7 +48,7 @@ protected:
             EXPECT_TRUE(ctrl().performAction(action, sender));
         };
         const tests_support::Steps steps = {
-            {"menu", [&] { perform(a.rest, 0); }},
+            {"menu", [&] { perform(a.word(0), N(1)); }},  // an action and its tag
             {"interp", [&] { perform("menuSetKeypointInterpolation:", N(0)); }},
             {"select", [&] { select(a.rest); }},
             {"move", [&] { ctrl().moveSelected(s, T(0), N(1), 1, char(N(2))); }},
@@ -147,6 +147,7 @@ TEST_P(CtrlEdits, edit__as_recorded_and_undone_exactly) {
 constexpr const char* kMenuScene =
     "A: 1=1L 2=3 3=2; B: 0=10 4=20; Pos.X: 1=2 2=5; Pos.Y: 1=2 2=5; Pos.Z: 1=2 2=5";
 constexpr const char* kMenuSelection = "A@2 X@1 B@4 A@1 B@0";
+constexpr const char* kFourKeys = "A: 1=0/1 2=1/1 3=0/1 4=1/1";
 
 INSTANTIATE_TEST_SUITE_P(
     Engine, CtrlEdits,
@@ -169,6 +170,19 @@ INSTANTIATE_TEST_SUITE_P(
              "menu menuAlignTangent:"},
         Edit{"menuAddKeyframe", "A: 1=2", "A~", "mouse 0.5 0 | menu menuAddKeyframe:"},
         Edit{"menuInterpolationLinked", kMenuScene, "X@1", "interp 1"},
+        // Bezier shapes a segment from both ends: the keypoint before follows; Exp does not.
+        Edit{"menuBezier", kFourKeys, "A@3", "interp 4"},
+        Edit{"menuExponential", kFourKeys, "A@3", "interp 13"},
+        // The segment under the click (at 2.5) is its first keypoint's; without an entry, or
+        // with a tag that names no interpolation, not even an empty step.
+        Edit{"menuSegmentConstant", kFourKeys, "A~",
+             "mouse 2.5 0.5 | menu menuSetSegmentInterpolation: 0"},
+        Edit{"menuSegmentRefused", kFourKeys, "",
+             "mouse 2.5 0.5 | menu menuSetSegmentInterpolation: 0; select A~; "
+             "menu menuSetSegmentInterpolation: -1"},
+        // The cleared channel shows what it showed at the playhead.
+        Edit{"menuDeleteAllKeyframes", kFourKeys, "A~",
+             "now 1.5; mouse 2.5 0.5 | menu menuDeleteAllKeyframes:"},
         // Each channel announced once per phase; each step measures from where the last left.
         Edit{"drag", "A: 1=0 2=1; B: 1=0", "A@1 A@2 B@1", "drag 10 1 0.05 0.1"},
         Edit{"vanishedChannel", "A: 1=0 2=1; Gone: 1=0; B: 1=0", "A@1 Gone@1 B@1 A@2",

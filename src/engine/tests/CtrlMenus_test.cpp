@@ -166,64 +166,6 @@ TEST_F(CtrlMenus, curveAndTangentMenus__followTheSegmentUnderTheClickAndTheHandl
     EXPECT_EQ(reading(ctrl().getTangentMenu()), "[Link Tangents] [Align Tangents]");
 }
 
-TEST_F(CtrlMenus, actions__changeWhatTheKindNeedsInOneUndoStepThatGivesItBack) {
-    constexpr unsigned L = kTQInterpolationLinear, B = kTQInterpolationBezier;
-    constexpr unsigned E = kTQInterpolationExp, C = kTQInterpolationConstant;
-    struct Case {
-        const char* action;
-        int64_t tag;
-        std::vector<unsigned> want;  // the interpolations of the keypoints after
-        const char* undoKey;
-    };
-    const std::vector<Case> cases = {
-        // Bezier shapes a segment from both ends: the keypoint before follows; Exp does not.
-        {"menuSetKeypointInterpolation:", B, {L, B, B, L}, "Undo Set Interpolation"},
-        {"menuSetKeypointInterpolation:", E, {L, L, E, L}, "Undo Set Interpolation"},
-        // The segment under the click (at 2.5) is its first keypoint's.
-        {"menuSetSegmentInterpolation:", C, {L, C, L, L}, "Undo Set Interpolation"},
-        {"menuDeleteAllKeyframes:", 0, {}, "Undo Delete All Keypoints"},
-    };
-    for (const Case& c : cases) {
-        SCOPED_TRACE(c.action);
-        object->removeAllChildren();
-        set->clear();
-        auto item = fourKeys();
-        const bool onCurve = std::string(c.action) != "menuSetKeypointInterpolation:";
-        selectInView({onCurve ? curveEntry(item) : keypointEntry(item, 3)});
-        view.setMouseOrigin(view.getPointScreen(CGPointMake(2.5, 0.5)));
-        host.setCurrentTime(seconds(1.5));
-        const auto before = snapshot();
-        recorder.clearCalls();
-        ASSERT_TRUE(
-            choose(onCurve ? ctrl().getCurveMenu() : ctrl().getKeyframeMenu(), c.action, c.tag));
-        EXPECT_NE(recorder.bracketText().find("!8"), std::string::npos) << "channels changed";
-        std::vector<unsigned> got;
-        for (TQKeyframeHandle h : item->channel()->getKeyframes(false))
-            got.push_back(item->channel()->getKeyframeInterpolation(h));
-        EXPECT_EQ(got, c.want) << sceneText(*object);
-        if (c.want.empty()) {  // the cleared channel shows what it showed at the playhead
-            EXPECT_NEAR(item->channel()->getInitialValue(), 0.5, kValueTolerance);
-        }
-        EXPECT_EQ(std::tuple(recorder.captureBalance(), host.undoStack().undoCount(),
-                             host.undoDescription()),
-                  std::tuple(0, 1u, TQLocalizedString(c.undoKey)));
-        ASSERT_TRUE(host.undo());
-        EXPECT_TRUE(sceneIs(*before));
-        host.undoStack().clear();
-    }
-    // No entry, or a tag that names no interpolation: not even an empty step.
-    auto item = fourKeys();
-    const std::string action = "menuSetSegmentInterpolation:";
-    RWMenuItem sender(action, action);
-    selectInView({});
-    sender.setTag(C);
-    EXPECT_TRUE(ctrl().performAction(action, sender));
-    selectInView({curveEntry(item)});
-    sender.setTag(-1);
-    EXPECT_TRUE(ctrl().performAction(action, sender));
-    EXPECT_EQ(recorder.bracketText() + std::to_string(host.undoStack().undoCount()), "0");
-}
-
 TEST_F(CtrlMenus, everyAction__chosenAfterItsChannelWentAwayChangesNothing) {
     for (const RWMenuPtr& menu :
          {ctrl().getKeyframeMenu(), ctrl().getCurveMenu(), ctrl().getTangentMenu()}) {
