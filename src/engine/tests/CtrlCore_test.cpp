@@ -1,5 +1,5 @@
 // The controller's core: queries, the maximum view volume, sets, sampling, the selection's
-// repair, the value panel and the menus.
+// repair and the value panel.
 
 #include <cfloat>
 #include <functional>
@@ -9,7 +9,6 @@
 
 #include "platform/channels/TQChannelTypes.h"
 #include "tests/support/EngineFixture.h"
-#include "tests/support/TextBaseline.h"
 
 using namespace engine_test;
 
@@ -245,22 +244,4 @@ TEST_F(CtrlCore, showValue__writes_the_accepted_value_in_channel_units) {
     ctrl().setView(&view);
     EXPECT_EQ(modal.runs().size(), 2u);
     RWResetServices();
-}
-
-// The three context menus as a user opens them: titles, actions and tags, submenus indented.
-TEST_F(CtrlCore, menus__as_recorded) {
-    std::string text;
-    const std::function<void(const RWMenu&, int)> walk = [&](const RWMenu& menu, int depth) {
-        for (const auto& item : menu.itemArray()) {
-            text += std::string(2 * depth, ' ') + item->title() + " | " + item->action() + " | " +
-                    std::to_string(item->tag()) + "\n";
-            if (item->hasSubmenu()) walk(*item->submenu(), depth + 1);
-        }
-    };
-    for (const RWMenuPtr& menu :
-         {ctrl().getKeyframeMenu(), ctrl().getCurveMenu(), ctrl().getTangentMenu()}) {
-        walk(*menu, 0);
-        text += "--\n";
-    }
-    EXPECT_TRUE(tests_support::matchesBaseline("menus", text, "src/engine/tests/baselines"));
 }
