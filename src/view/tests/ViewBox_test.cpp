@@ -1,8 +1,7 @@
 // The box tool through the view: the box a band leaves (with any tool), its parts, how each
-// part's drag moves the corners with each modifier and the keypoints with them, and one undo
-// step per drag.
+// part's drag moves the corners with each modifier and the keypoints with them. A box drag as
+// one undo step is in the gesture table.
 
-#include <any>
 #include <sstream>
 #include <string>
 
@@ -42,6 +41,7 @@ TEST_F(ViewBox, band__leaves_a_box_around_what_it_caught_with_any_tool) {
     EXPECT_TRUE(frameMatches("frame-band")) << "the band as it is dragged";
     gesture("u 7 -.9");
     EXPECT_EQ(corners(), "2=-0.25 6=-0.25 6=0.5 2=0.5");
+    EXPECT_EQ(view.getEditBox(), CGRectMake(2, -0.25, 4, 0.75)) << "what a host keeps for undo";
     ASSERT_TRUE(frame());
     EXPECT_TRUE(frameMatches("frame-box"));
     gesture("c 9 .9");
@@ -119,6 +119,7 @@ TEST_F(ViewBox, drag__keeps_the_curves_whole_and_pans_once_the_box_enters_the_ba
     ASSERT_TRUE(frame());
     const uint32_t full = item("A")->numberOfSamples();
     gesture("d 4 0|m 4 .3");
+    EXPECT_TRUE(item("A")->drawGhost()) << "from the first step";
     EXPECT_EQ(item("A")->numberOfSamples(), full);
     const CGPoint fromPress = view.getOffsetFromOriginWorld(0.0, 0.0);
     EXPECT_NEAR(fromPress.x, 0.0, kWorldTolerance);
@@ -134,45 +135,6 @@ TEST_F(ViewBox, drag__keeps_the_curves_whole_and_pans_once_the_box_enters_the_ba
     ASSERT_TRUE(frame());
     gesture("d 2.5 -.3|m 2.5 .45|u 2.5 .45");
     EXPECT_EQ(range().panned.size(), 1u) << "a top at 0.95 is in it";
-}
-
-// The box as a host keeps it for its undo: what getEditBox answers, given back by setEditBox.
-class BoxUndoClient : public TQHostUndoClient {
-public:
-    explicit BoxUndoClient(TQCurveEditorViewBase& view) : _view(view) {}
-    std::any captureUndoState(uint32_t, uint32_t) override { return _view.getEditBox(); }
-    void restoreUndoState(uint32_t, uint32_t, const std::any& state) override {
-        _view.setEditBox(std::any_cast<CGRect>(state));
-    }
-
-private:
-    TQCurveEditorViewBase& _view;
-};
-
-class ViewBoxUndo : public WithReferenceHost<ViewBox> {};
-
-// A free distortion of the top-right corner in five steps: one step, each drag step and the
-// release announced per channel, that restores every channel and the box.
-TEST_F(ViewBoxUndo, drag__is_one_undo_step_that_restores_every_channel) {
-    build("A: 2=-0.5/1 4=0.25/1 6=0.5/1; B: 3=0/1 5=-0.25/1");
-    const auto before = snapshot();
-    BoxUndoClient client(view);
-    host.registerUndoClient(&view, &client);
-    band();
-    const CGRect box = view.getEditBox();
-    recorder.clearCalls();
-    ASSERT_TRUE(frame());
-    gesture("d 6 .5 c|m 6.2 .55 c");
-    EXPECT_TRUE(item("A")->drawGhost()) << "from the first step";
-    gesture("m 6.4 .6 c|m 6.6 .65 c|m 6.8 .7 c|m 7 .75 c|u 7 .75 c");
-    EXPECT_EQ(recorder.bracketText(),
-              "{Transform Keypoints <A <B +1.0:Transform Keypoints 5*[(A (B B) A) !4] (A (B B) A) "
-              "B> A> } !8");
-    ASSERT_EQ(host.undoStack().undoCount(), 1u) << "the band made no step";
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(sceneIs(*before)) << "undo restores every channel exactly";
-    EXPECT_EQ(view.getEditBox(), box) << "and the box";
-    host.unregisterUndoClient(&view);
 }
 
 }  // namespace

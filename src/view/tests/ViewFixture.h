@@ -209,9 +209,10 @@ protected:
     // inside it), "u t v", "c t v" (a click), "2 t v" (a double click), each point followed by
     // its modifiers if any: s Shift, o Option, c Command, x Control; "r t v" a right click
     // on a fresh frame (notes the menu it answers); "k" and "K" press and release the space
-    // bar, "R" repeats its key, "z" turns auto-zoom off, "b" takes the box tool, "S" the sketch tool with every
-    // item selected, "a name:" sends a key map's action (notes one the view does not know),
-    // "D" detaches the controller. Steps are separated by "|".
+    // bar, "R" repeats its key, "z" turns auto-zoom off, "f" draws a frame, "b" takes the box
+    // tool, "S" the sketch tool with every item selected, "a name:" sends a key map's action
+    // (notes one the view does not know), "D" detaches the controller. Steps are separated by
+    // "|".
     void gesture(const std::string& script) {
         std::istringstream in(script);
         for (std::string step; std::getline(in, step, '|');) {
@@ -244,6 +245,7 @@ protected:
             if (op == 'K') view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " "));
             if (op == 'R') view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, " ", 0, 0, true));
             if (op == 'z') view.setAutoZoom(0);
+            if (op == 'f') frame();
             if (op == 'D') view.setController(nullptr);
             if (op == 'b') ctrl().setCurrentTool(TQTool::kBox);
             if (op == 'S') {

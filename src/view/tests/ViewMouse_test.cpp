@@ -152,6 +152,11 @@ INSTANTIATE_TEST_SUITE_P(
         // Delete takes the selected keypoints; with the box tool only the box.
         Gesture{"deleteKeys", kBezier, "A@5 A@8", "a delete:"},
         Gesture{"deleteTheBox", kBezier, "", "b|d 1 .9|m 6 -.2|u 6 -.2|?|a delete:"},
+        // A free distortion of the box's top-right corner in five steps is one undo step, each
+        // drag step and the release announced per channel.
+        Gesture{"boxDistortion", "A: 2=-0.5/1 4=0.25/1 6=0.5/1; B: 3=0/1 5=-0.25/1", "",
+                "b|d 1 .9|m 4 0|m 7 -.9|u 7 -.9|f|d 6 .5 c|m 6.2 .55 c|m 6.4 .6 c|m 6.6 .65 c|"
+                "m 6.8 .7 c|m 7 .75 c|u 7 .75 c"},
         // A right click selects what it hits and answers that kind's menu: a keypoint alone
         // unless already selected (then it leads), a handle, a curve replacing the selection;
         // empty space leaves the selection.
