@@ -126,15 +126,13 @@ TEST_F(ItemFixture, folderItem__hiddenInCurveEditorsReadsBackwards) {
     EXPECT_TRUE(channelItem(opacity)->isHidden() && !channelItem(x)->isHidden());
 }
 
-TEST_F(ItemFixture, colours__wrapAfterEight) {
+TEST_F(ItemFixture, colours__wrapAfterEight_and_a_copy_has_a_new_identity_and_no_samples) {
     std::vector<TQCurveEditorChannelItemPtr> items;
     for (int i = 0; i < 9; ++i) items.push_back(channelItem(opacity));
-    EXPECT_EQ(items[7]->colorIndex(), 7u);
-    EXPECT_EQ(items[8]->colorIndex(), 0u) << "the ninth item after a reset wraps to colour 0";
+    EXPECT_EQ(std::tuple(items[7]->colorIndex(), items[8]->colorIndex()), std::tuple(7u, 0u))
+        << "the ninth item after a reset wraps to colour 0";
     EXPECT_NE(items[0]->channelId(), items[1]->channelId());
-}
 
-TEST_F(ItemFixture, copy__newIdentitySameColourNoSamples) {
     opacity->setKeyframe(sec(0), 1.0);
     opacity->setKeyframe(sec(1), 2.0);
     opacity->setKeyframeEnabled(opacity->setKeyframe(sec(9), 50.0), false);

@@ -236,28 +236,10 @@ TEST_F(ViewMouse, constraints__a_tie_is_vertical_and_time_stays_in_the_ranges) {
 }
 
 // A drag left without its release closes its step as the release would have, in reverse
-// order, when the view goes; the step undoes whole.
+// order, when the view goes in mid-drag; the step undoes whole.
 TEST_F(ViewMouseUndo, drag__an_abandoned_one_closes_its_step_and_undoes_whole) {
     build("A: 2=0/1 5=0.25/1 8=0/1; B: 5=-0.5/1");
     const auto before = snapshot();
-    const auto startDrag = [&](TQCurveEditorViewBase& on) {
-        on.getSelection()->reset();
-        for (const char* e : {"A@5", "B@5"}) on.getSelection()->addSelection(entry(e));
-        clock.advance(1.0);
-        ASSERT_TRUE(on.displayLayer(&encoder));
-        on.mouseDown(mouseAt(RWEventType::LeftMouseDown, CGPointMake(5.0, 0.25), 0));
-        clock.advance(kStepSeconds);
-        on.mouseDragged(mouseAt(RWEventType::LeftMouseDragged, CGPointMake(5.5, 0.5), 0));
-        ASSERT_TRUE(on.getCapturing());
-        recorder.clearCalls();
-    };
-    const auto closedAndUndone = [&](const char* what) {
-        EXPECT_EQ(recorder.bracketText(), "B> A> }") << what;
-        EXPECT_FALSE(host.undoStack().isStepOpen()) << what;
-        ASSERT_EQ(host.undoStack().undoCount(), 1u) << what;
-        ASSERT_TRUE(host.undo()) << what;
-        EXPECT_TRUE(sceneIs(*before)) << what;
-    };
     auto doomed = std::make_unique<TQCurveEditorViewBase>();
     doomed->setViewHost(&viewHost);
     doomed->setClock(&clock);
@@ -268,10 +250,21 @@ TEST_F(ViewMouseUndo, drag__an_abandoned_one_closes_its_step_and_undoes_whole) {
     doomed->setOriginalViewVolume(view.getOriginalViewVolume());
     const CMTimeRange range = view.getDisplayRange();
     doomed->setDisplayRange(&range.start, &range.duration);
-    startDrag(*doomed);
+    for (const char* e : {"A@5", "B@5"}) doomed->getSelection()->addSelection(entry(e));
+    clock.advance(1.0);
+    ASSERT_TRUE(doomed->displayLayer(&encoder));
+    doomed->mouseDown(mouseAt(RWEventType::LeftMouseDown, CGPointMake(5.0, 0.25), 0));
+    clock.advance(kStepSeconds);
+    doomed->mouseDragged(mouseAt(RWEventType::LeftMouseDragged, CGPointMake(5.5, 0.5), 0));
+    ASSERT_TRUE(doomed->getCapturing());
+    recorder.clearCalls();
     doomed.reset();
     ctrl().setView(&view);
-    closedAndUndone("the view torn down");
+    EXPECT_EQ(recorder.bracketText(), "B> A> }");
+    EXPECT_FALSE(host.undoStack().isStepOpen());
+    ASSERT_EQ(host.undoStack().undoCount(), 1u);
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(sceneIs(*before));
 }
 
 }  // namespace
