@@ -41,6 +41,7 @@ protected:
         const auto T = [&](size_t i) { return seconds(N(i)); };
         const auto E = [&](size_t i) { return entry(a.words.at(i)); };
         const auto C = [&] { return item(a.rest)->channel(); };  // the named channel
+        const auto C0 = [&] { return item(a.word(0))->channel(); };
         TQCurveSelectionList* s = view.getSelection();
         const auto perform = [&](const std::string& action, double tag) {
             RWMenuItem sender(action, action);
@@ -85,8 +86,18 @@ protected:
             {"movekey",
              [&] {
                  const CMTime from = T(1), to = T(2);
-                 item(a.word(0))->channel()->moveKeyframe(&from, &to, true);
+                 C0()->moveKeyframe(&from, &to, true);
              }},
+            // The keyframe at a time deleted, or deleted and set again as an undo rebuilds it:
+            // the same time and value, a new handle.
+            {"unkey", [&] { C0()->deleteKeyframe(C0()->getKeyframe(T(1))); }},
+            {"rekey",
+             [&] {
+                 const double v = C0()->getCurveValue(T(1));
+                 C0()->deleteKeyframe(C0()->getKeyframe(T(1)));
+                 C0()->setKeyframe(T(1), v);
+             }},
+            {"validate", [&] { ctrl().validateSelection(s); }},
             {"noview", [&] { ctrl().setView(nullptr); }},
             {"undrawn", [&] { ctrl().setView(&undrawn); }},
             {"fps", [&] { EXPECT_TRUE(host.setFrameDuration(CMTimeMake(1, int32_t(N(0))))); }},
@@ -203,6 +214,11 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"deleteFromLinked", "Pos.X: 0=0 3=2 4=8; Pos.Y: 0=0 3=2 4=8; Pos.Z: 0=0 3=2 4=8", "",
              "deletevertex Y@3 3"},
         Edit{"purgeAndClean", "A: 1=1 2=2", "", "movekey A 1 2; select A@2 | clean; purge"},
+        // A stale handle is found again by its stored time, also by the operations on a
+        // selection before they run; with nothing at that time the entry stays stale.
+        Edit{"staleHandleRepaired", "A: 1=3/1 2=4/1", "A@2", "rekey A 2 | validate"},
+        Edit{"staleHandleRepairedFirst", "A: 1=3/1 2=4/1", "A@2", "rekey A 2 | beziers"},
+        Edit{"staleHandleWithoutAKeyframe", "A: 1=3/1 2=4/1", "A@2", "unkey A 2 | validate"},
         // Moves: the anchor first; the one leading the direction of travel moves first.
         Edit{"moveForward", "A*2: 1=0 2=0 3=0", "A@2 A@3 A@1", "move 3 0"},
         Edit{"moveBackward", "A*2: 2=0 3=0 4=0", "A@3 A@4 A@2", "move 2 0"},
