@@ -95,6 +95,9 @@ INSTANTIATE_TEST_SUITE_P(
         Gesture{"shiftHoldsTheValue", kLinear, "",
                 "d 5 .5|m 5.1 .6|m 5.5 .65 s|m 5.75 .8 s|u 5.75 .8 s"},
         Gesture{"shiftUpwardHoldsTheTime", kLinear, "", "d 5 .5|m 5.05 .7 s|m 6 .8 s|u 6 .8 s"},
+        // A free drag lands on the grid; one held upright keeps the time it had, off the grid.
+        Gesture{"onTheGrid", "A: 5.01=0/1 8=0/1", "",
+                "g|d 5.01 0|m 5.02 .5 s|u 5.02 .5 s|d 8 0|m 8.51 .2|u 8.51 .2"},
         // A segment moves its two keypoints, only vertically.
         Gesture{"segmentDrag", kLinear, "", "d 3.5 .25|m 4.5 .55|u 4.5 .55"},
         // The curve passes through the pointer at each step; from a keypoint the time
@@ -190,28 +193,6 @@ TEST_F(ViewMouse, snapshot__the_ghost_stays_the_curve_before_the_first_drag) {
     ASSERT_TRUE(ghost && item("A")->drawGhost());
     EXPECT_EQ(keyText(*ghost, true), before);
     EXPECT_NE(keyText(*item("A")->channel(), true), before);
-}
-
-// A controller that puts a moved keypoint on the 1/30 s grid, as the full editor does.
-class GridRangeController : public RangeController {
-public:
-    CMTime convertToCurveEditorAxis(CMTime time) const override {
-        return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, CMTimeMake(1, 60)),
-                                              CMTimeMake(1, 30));
-    }
-};
-class ViewMouseOnGrid : public ViewFixture {
-    std::unique_ptr<TQCurveEditorCtrlBase> makeController() override {
-        return std::make_unique<GridRangeController>();
-    }
-};
-
-// A free drag lands on the grid; one held upright keeps the time it had, even off the grid.
-TEST_F(ViewMouseOnGrid, drag__lands_on_the_grid_unless_held_upright) {
-    build("A: 5.01=0/1 8=0/1");
-    ASSERT_TRUE(frame());
-    gesture("d 5.01 0|m 5.02 .5 s|u 5.02 .5 s|d 8 0|m 8.51 .2|u 8.51 .2");
-    EXPECT_EQ(sceneText(*object, false), "A: 5.01=0.5/1 8.5=0.2/1");
 }
 
 // The space bar's release stops at the view only after its press was taken.
