@@ -76,7 +76,7 @@ TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
     EXPECT_EQ(channelItem(loose)->rootName(), std::nullopt);
 }
 
-TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
+TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItemsWithTheirStates) {
     auto root = std::make_shared<TQCurveEditorFolderItem>();
     root->initWithChannel(cube, 10, &host, 1);
     std::vector<BNString> names;
@@ -87,6 +87,25 @@ TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
     auto again = std::make_shared<TQCurveEditorFolderItem>();
     again->initWithChannel(cube, 10, &host, 1);
     EXPECT_EQ(again->numberOfChildren(), 3u) << "hidden channels are excluded";
+
+    // Enabled states, selection and animation.
+    auto empty = std::make_shared<TQCurveEditorFolderItem>();
+    empty->initWithRoot(cube, 0, &host, 1);
+    EXPECT_TRUE(empty->isEnabledItem() == 1 && empty->isAnimatedChannel());
+
+    EXPECT_EQ(root->isEnabledItem(), 1) << "new items enable their curves";
+    root->childrenAtIndex(0)->enableItem(0);
+    EXPECT_EQ(root->isEnabledItem(), -1) << "children that disagree";
+    EXPECT_EQ(root->childrenAtIndex(99), nullptr);
+    root->select(1);
+    EXPECT_TRUE(root->childrenAtIndex(3)->isSelected()) << "a folder selects its children";
+    // A folder added to a folder comes in once per valid child of it not there yet: merged
+    // roots rely on it, kept so.
+    auto merged = std::make_shared<TQCurveEditorFolderItem>();
+    merged->initWithRoot(cube, 0, &host, 1);
+    merged->addChild(root->childrenAtIndex(0));
+    merged->addChild(root);
+    EXPECT_EQ(merged->numberOfChildren(), 4u);
 }
 
 // "Hidden in curve editors" reads backwards, deliberately: the flagged root itself, or a
@@ -202,28 +221,6 @@ TEST_F(ItemFixture, newSampleCount__readersTakeOnlyWhatTheHeldArraysHoldUntilThe
     item->takeCurveSnapshot(0);
     EXPECT_EQ(item->numberOfSamplesSnapshot(), 5000u);
     EXPECT_EQ(item->snapshotChannel(), nullptr) << "a ghost without its channel";
-}
-
-TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
-    auto empty = std::make_shared<TQCurveEditorFolderItem>();
-    empty->initWithRoot(cube, 0, &host, 1);
-    EXPECT_TRUE(empty->isEnabledItem() == 1 && empty->isAnimatedChannel());
-
-    auto root = std::make_shared<TQCurveEditorFolderItem>();
-    root->initWithChannel(cube, 0, &host, 1);
-    EXPECT_EQ(root->isEnabledItem(), 1) << "new items enable their curves";
-    root->childrenAtIndex(0)->enableItem(0);
-    EXPECT_EQ(root->isEnabledItem(), -1) << "children that disagree";
-    EXPECT_EQ(root->childrenAtIndex(99), nullptr);
-    root->select(1);
-    EXPECT_TRUE(root->childrenAtIndex(3)->isSelected()) << "a folder selects its children";
-    // A folder added to a folder comes in once per valid child of it not there yet: merged
-    // roots rely on it, kept so.
-    auto merged = std::make_shared<TQCurveEditorFolderItem>();
-    merged->initWithRoot(cube, 0, &host, 1);
-    merged->addChild(root->childrenAtIndex(0));
-    merged->addChild(root);
-    EXPECT_EQ(merged->numberOfChildren(), 4u);
 }
 
 TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {

@@ -49,16 +49,6 @@ TEST(TQCurveSelection, compare__usesStoredTimes) {
         std::tuple(-1, 1, 0));
 }
 
-TEST(TQCurveSelectionList, equality__curveEntriesOfDifferentCurvesAreOne) {
-    TQCurveSelectionList list;
-    auto a = entry(0, TQSelectionCurve, 1), b = entry(0, TQSelectionCurve, 2);
-    list.addSelection(a);
-    list.addSelection(b);
-    EXPECT_TRUE(list.isSelection(*b));
-    list.delSelection(*b);
-    EXPECT_TRUE(list.empty()) << "delSelection removes every equal entry, whatever its curve";
-}
-
 TEST(TQCurveSelectionList, queries__tangentCountsAsSelectedKeypoint) {
     TQCurveSelectionList list;
     list.addSelection(entry(5, TQSelectionInTangent, 3));
@@ -67,7 +57,15 @@ TEST(TQCurveSelectionList, queries__tangentCountsAsSelectedKeypoint) {
     EXPECT_EQ(list.selectionAtIndex(1), nullptr) << "out of range answers null";
 }
 
-TEST(TQCurveSelectionList, purge__takesEqualEntriesOfOtherCurvesAlong) {
+TEST(TQCurveSelectionList, equalEntries__ofOtherCurvesGoAlongOnDeletionAndPurge) {
+    TQCurveSelectionList curves;
+    auto a = entry(0, TQSelectionCurve, 1), b = entry(0, TQSelectionCurve, 2);
+    curves.addSelection(a);
+    curves.addSelection(b);
+    EXPECT_TRUE(curves.isSelection(*b));
+    curves.delSelection(*b);
+    EXPECT_TRUE(curves.empty()) << "delSelection removes every equal entry, whatever its curve";
+
     TQCurveSelectionList list;
     list.addSelection(entry(5, TQSelectionKeypoint, 1));
     list.addSelection(entry(5, TQSelectionKeypoint, 2));  // same handle and kind, other curve
