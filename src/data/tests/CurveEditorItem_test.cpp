@@ -57,7 +57,7 @@ protected:
 
 }  // namespace
 
-TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
+TEST_F(ItemFixture, names__compoundsAndParents_and_a_component_owns_its_compound) {
     // A component reads compound dot component, naming stops at the object root, the parent
     // folder is named; a flagged root names itself, and takes part above the parent.
     const auto names = [&] {
@@ -74,6 +74,14 @@ TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
     auto* loose = add<TQChannel>(scene.get(), "Loose", 900);
     EXPECT_EQ(channelItem(loose)->simpleName(), "Loose") << "outside any object";
     EXPECT_EQ(channelItem(loose)->rootName(), std::nullopt);
+
+    // A component's item stands for its compound, its own channel first.
+    auto item = channelItem(y);
+    EXPECT_TRUE(item->isCompound() && !channelItem(opacity)->isCompound());
+    EXPECT_EQ(item->compoundChannelComponents(), (std::vector<TQChannelBase*>{y, x}));
+    auto orphan = std::make_shared<TQCurveEditorChannelItem>();
+    orphan->initWithChannel(x, 0, nullptr, 1);
+    EXPECT_EQ(orphan->channelBase(), nullptr) << "without a host there is no scene to look in";
 }
 
 TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItemsWithTheirStates) {
@@ -249,13 +257,4 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     EXPECT_TRUE(!item->numberOfSamples() && !item->processedSamplesU() &&
                 !item->processedSamplesV() && !item->numberOfSamplesSnapshot() &&
                 !item->snapshotChannel());
-}
-
-TEST_F(ItemFixture, compound__componentsOwnFirst) {
-    auto item = channelItem(y);
-    EXPECT_TRUE(item->isCompound() && !channelItem(opacity)->isCompound());
-    EXPECT_EQ(item->compoundChannelComponents(), (std::vector<TQChannelBase*>{y, x}));
-    auto orphan = std::make_shared<TQCurveEditorChannelItem>();
-    orphan->initWithChannel(x, 0, nullptr, 1);
-    EXPECT_EQ(orphan->channelBase(), nullptr) << "without a host there is no scene to look in";
 }

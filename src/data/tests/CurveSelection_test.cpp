@@ -29,7 +29,7 @@ TEST(TQCurveSelection, isKeypoint__excludesOtherKindsRatherThanMatchingKeypoint)
         (std::vector{true, false, false, true, true}));
 }
 
-TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
+TEST(TQCurveSelection, storedTimes__copiedForEveryKindAnsweringTheKindAndCompared) {
     auto tangent = entry(7, TQSelectionOutTangent, 1, 12);
     CMTime u{};
     double v = 0;
@@ -39,9 +39,7 @@ TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
     double t[4] = {};
     tangent->getKeypointTangents(&t[0], &t[1], &t[2], &t[3]);
     EXPECT_EQ(std::vector<double>(t, t + 4), (std::vector<double>{1, 2, 3, 4}));
-}
-
-TEST(TQCurveSelection, compare__usesStoredTimes) {
+    // Keypoints compare by their stored times.
     auto early = entry(1, TQSelectionKeypoint, 1, 3), late = entry(2, TQSelectionKeypoint, 1, 9);
     EXPECT_EQ(
         std::tuple(early->compareKeypointAscending(*late), early->compareKeypointDescending(*late),

@@ -217,7 +217,8 @@ TEST_F(ViewMouse, constraints__a_tie_is_vertical_and_time_stays_in_the_ranges) {
 }
 
 // A drag left without its release closes its step as the release would have, in reverse
-// order, when the view goes in mid-drag; the step undoes whole.
+// order, when the view goes in mid-drag; the step undoes whole, and the view going detaches
+// from its controller.
 TEST_F(ViewMouseUndo, drag__an_abandoned_one_closes_its_step_and_undoes_whole) {
     build("A: 2=0/1 5=0.25/1 8=0/1; B: 5=-0.5/1");
     const auto before = snapshot();
@@ -240,6 +241,7 @@ TEST_F(ViewMouseUndo, drag__an_abandoned_one_closes_its_step_and_undoes_whole) {
     ASSERT_TRUE(doomed->getCapturing());
     recorder.clearCalls();
     doomed.reset();
+    EXPECT_EQ(ctrl().getView(), nullptr) << "the controller must not keep a dangling view";
     ctrl().setView(&view);
     EXPECT_EQ(recorder.bracketText(), "B> A> }");
     EXPECT_FALSE(host.undoStack().isStepOpen());

@@ -136,8 +136,8 @@ TEST_F(ViewVolume, operations__table) {
 }
 
 // Before the first frame conversions are not numbers, and snapping invents none; a change of
-// tool redraws and posts its word; a view going detaches from its controller.
-TEST_F(ViewVolume, no_frame_a_tool_change_and_destruction) {
+// tool redraws and posts its word.
+TEST_F(ViewVolume, no_frame_and_a_tool_change) {
     TQCurveEditorViewBase fresh;
     fresh.setViewHost(&viewHost);
     fresh.setCurrentViewVolume(CGRectMake(0, 0, 1, 1));
@@ -150,12 +150,6 @@ TEST_F(ViewVolume, no_frame_a_tool_change_and_destruction) {
     ctrl().setCurrentTool(TQTool::kBox);
     EXPECT_EQ(std::pair(recorder.bracketText(), viewHost.redrawRequests()),
               std::pair(std::string("!4000008"), 1));
-    auto doomed = std::make_unique<TQCurveEditorViewBase>();
-    doomed->setController(&ctrl());
-    ctrl().setView(doomed.get());
-    doomed.reset();
-    EXPECT_EQ(ctrl().getView(), nullptr) << "the controller must not keep a dangling view";
-    ctrl().setView(&view);
 }
 
 }  // namespace
