@@ -57,7 +57,7 @@ protected:
 
 }  // namespace
 
-TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
+TEST_F(ItemFixture, names__compoundsAndParents_and_a_component_owns_its_compound) {
     // A component reads compound dot component, naming stops at the object root, the parent
     // folder is named; a flagged root names itself, and takes part above the parent.
     const auto names = [&] {
@@ -74,9 +74,17 @@ TEST_F(ItemFixture, refreshNames__compoundsAndParents) {
     auto* loose = add<TQChannel>(scene.get(), "Loose", 900);
     EXPECT_EQ(channelItem(loose)->simpleName(), "Loose") << "outside any object";
     EXPECT_EQ(channelItem(loose)->rootName(), std::nullopt);
+
+    // A component's item stands for its compound, its own channel first.
+    auto item = channelItem(y);
+    EXPECT_TRUE(item->isCompound() && !channelItem(opacity)->isCompound());
+    EXPECT_EQ(item->compoundChannelComponents(), (std::vector<TQChannelBase*>{y, x}));
+    auto orphan = std::make_shared<TQCurveEditorChannelItem>();
+    orphan->initWithChannel(x, 0, nullptr, 1);
+    EXPECT_EQ(orphan->channelBase(), nullptr) << "without a host there is no scene to look in";
 }
 
-TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
+TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItemsWithTheirStates) {
     auto root = std::make_shared<TQCurveEditorFolderItem>();
     root->initWithChannel(cube, 10, &host, 1);
     std::vector<BNString> names;
@@ -87,6 +95,25 @@ TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItems) {
     auto again = std::make_shared<TQCurveEditorFolderItem>();
     again->initWithChannel(cube, 10, &host, 1);
     EXPECT_EQ(again->numberOfChildren(), 3u) << "hidden channels are excluded";
+
+    // Enabled states, selection and animation.
+    auto empty = std::make_shared<TQCurveEditorFolderItem>();
+    empty->initWithRoot(cube, 0, &host, 1);
+    EXPECT_TRUE(empty->isEnabledItem() == 1 && empty->isAnimatedChannel());
+
+    EXPECT_EQ(root->isEnabledItem(), 1) << "new items enable their curves";
+    root->childrenAtIndex(0)->enableItem(0);
+    EXPECT_EQ(root->isEnabledItem(), -1) << "children that disagree";
+    EXPECT_EQ(root->childrenAtIndex(99), nullptr);
+    root->select(1);
+    EXPECT_TRUE(root->childrenAtIndex(3)->isSelected()) << "a folder selects its children";
+    // A folder added to a folder comes in once per valid child of it not there yet: merged
+    // roots rely on it, kept so.
+    auto merged = std::make_shared<TQCurveEditorFolderItem>();
+    merged->initWithRoot(cube, 0, &host, 1);
+    merged->addChild(root->childrenAtIndex(0));
+    merged->addChild(root);
+    EXPECT_EQ(merged->numberOfChildren(), 4u);
 }
 
 // "Hidden in curve editors" reads backwards, deliberately: the flagged root itself, or a
@@ -126,15 +153,13 @@ TEST_F(ItemFixture, folderItem__hiddenInCurveEditorsReadsBackwards) {
     EXPECT_TRUE(channelItem(opacity)->isHidden() && !channelItem(x)->isHidden());
 }
 
-TEST_F(ItemFixture, colours__wrapAfterEight) {
+TEST_F(ItemFixture, colours__wrapAfterEight_and_a_copy_has_a_new_identity_and_no_samples) {
     std::vector<TQCurveEditorChannelItemPtr> items;
     for (int i = 0; i < 9; ++i) items.push_back(channelItem(opacity));
-    EXPECT_EQ(items[7]->colorIndex(), 7u);
-    EXPECT_EQ(items[8]->colorIndex(), 0u) << "the ninth item after a reset wraps to colour 0";
+    EXPECT_EQ(std::tuple(items[7]->colorIndex(), items[8]->colorIndex()), std::tuple(7u, 0u))
+        << "the ninth item after a reset wraps to colour 0";
     EXPECT_NE(items[0]->channelId(), items[1]->channelId());
-}
 
-TEST_F(ItemFixture, copy__newIdentitySameColourNoSamples) {
     opacity->setKeyframe(sec(0), 1.0);
     opacity->setKeyframe(sec(1), 2.0);
     opacity->setKeyframeEnabled(opacity->setKeyframe(sec(9), 50.0), false);
@@ -206,28 +231,6 @@ TEST_F(ItemFixture, newSampleCount__readersTakeOnlyWhatTheHeldArraysHoldUntilThe
     EXPECT_EQ(item->snapshotChannel(), nullptr) << "a ghost without its channel";
 }
 
-TEST_F(ItemFixture, folderItem__enabledStatesAndAnimation) {
-    auto empty = std::make_shared<TQCurveEditorFolderItem>();
-    empty->initWithRoot(cube, 0, &host, 1);
-    EXPECT_TRUE(empty->isEnabledItem() == 1 && empty->isAnimatedChannel());
-
-    auto root = std::make_shared<TQCurveEditorFolderItem>();
-    root->initWithChannel(cube, 0, &host, 1);
-    EXPECT_EQ(root->isEnabledItem(), 1) << "new items enable their curves";
-    root->childrenAtIndex(0)->enableItem(0);
-    EXPECT_EQ(root->isEnabledItem(), -1) << "children that disagree";
-    EXPECT_EQ(root->childrenAtIndex(99), nullptr);
-    root->select(1);
-    EXPECT_TRUE(root->childrenAtIndex(3)->isSelected()) << "a folder selects its children";
-    // A folder added to a folder comes in once per valid child of it not there yet: merged
-    // roots rely on it, kept so.
-    auto merged = std::make_shared<TQCurveEditorFolderItem>();
-    merged->initWithRoot(cube, 0, &host, 1);
-    merged->addChild(root->childrenAtIndex(0));
-    merged->addChild(root);
-    EXPECT_EQ(merged->numberOfChildren(), 4u);
-}
-
 TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     opacity->setKeyframe(sec(0), 1.0);
     auto item = channelItem(opacity, 4);
@@ -254,13 +257,4 @@ TEST_F(ItemFixture, ghost__keptWithoutSamplesAndClearedWhenChannelGoes) {
     EXPECT_TRUE(!item->numberOfSamples() && !item->processedSamplesU() &&
                 !item->processedSamplesV() && !item->numberOfSamplesSnapshot() &&
                 !item->snapshotChannel());
-}
-
-TEST_F(ItemFixture, compound__componentsOwnFirst) {
-    auto item = channelItem(y);
-    EXPECT_TRUE(item->isCompound() && !channelItem(opacity)->isCompound());
-    EXPECT_EQ(item->compoundChannelComponents(), (std::vector<TQChannelBase*>{y, x}));
-    auto orphan = std::make_shared<TQCurveEditorChannelItem>();
-    orphan->initWithChannel(x, 0, nullptr, 1);
-    EXPECT_EQ(orphan->channelBase(), nullptr) << "without a host there is no scene to look in";
 }

@@ -29,7 +29,7 @@ TEST(TQCurveSelection, isKeypoint__excludesOtherKindsRatherThanMatchingKeypoint)
         (std::vector{true, false, false, true, true}));
 }
 
-TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
+TEST(TQCurveSelection, storedTimes__copiedForEveryKindAnsweringTheKindAndCompared) {
     auto tangent = entry(7, TQSelectionOutTangent, 1, 12);
     CMTime u{};
     double v = 0;
@@ -39,24 +39,12 @@ TEST(TQCurveSelection, getKeypointUV__copiesForEveryKindButAnswersKind) {
     double t[4] = {};
     tangent->getKeypointTangents(&t[0], &t[1], &t[2], &t[3]);
     EXPECT_EQ(std::vector<double>(t, t + 4), (std::vector<double>{1, 2, 3, 4}));
-}
-
-TEST(TQCurveSelection, compare__usesStoredTimes) {
+    // Keypoints compare by their stored times.
     auto early = entry(1, TQSelectionKeypoint, 1, 3), late = entry(2, TQSelectionKeypoint, 1, 9);
     EXPECT_EQ(
         std::tuple(early->compareKeypointAscending(*late), early->compareKeypointDescending(*late),
                    late->compareKeypointAscending(*late)),
         std::tuple(-1, 1, 0));
-}
-
-TEST(TQCurveSelectionList, equality__curveEntriesOfDifferentCurvesAreOne) {
-    TQCurveSelectionList list;
-    auto a = entry(0, TQSelectionCurve, 1), b = entry(0, TQSelectionCurve, 2);
-    list.addSelection(a);
-    list.addSelection(b);
-    EXPECT_TRUE(list.isSelection(*b));
-    list.delSelection(*b);
-    EXPECT_TRUE(list.empty()) << "delSelection removes every equal entry, whatever its curve";
 }
 
 TEST(TQCurveSelectionList, queries__tangentCountsAsSelectedKeypoint) {
@@ -67,7 +55,15 @@ TEST(TQCurveSelectionList, queries__tangentCountsAsSelectedKeypoint) {
     EXPECT_EQ(list.selectionAtIndex(1), nullptr) << "out of range answers null";
 }
 
-TEST(TQCurveSelectionList, purge__takesEqualEntriesOfOtherCurvesAlong) {
+TEST(TQCurveSelectionList, equalEntries__ofOtherCurvesGoAlongOnDeletionAndPurge) {
+    TQCurveSelectionList curves;
+    auto a = entry(0, TQSelectionCurve, 1), b = entry(0, TQSelectionCurve, 2);
+    curves.addSelection(a);
+    curves.addSelection(b);
+    EXPECT_TRUE(curves.isSelection(*b));
+    curves.delSelection(*b);
+    EXPECT_TRUE(curves.empty()) << "delSelection removes every equal entry, whatever its curve";
+
     TQCurveSelectionList list;
     list.addSelection(entry(5, TQSelectionKeypoint, 1));
     list.addSelection(entry(5, TQSelectionKeypoint, 2));  // same handle and kind, other curve

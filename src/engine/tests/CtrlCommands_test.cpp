@@ -41,6 +41,7 @@ protected:
         const auto T = [&](size_t i) { return seconds(N(i)); };
         const auto E = [&](size_t i) { return entry(a.words.at(i)); };
         const auto C = [&] { return item(a.rest)->channel(); };  // the named channel
+        const auto C0 = [&] { return item(a.word(0))->channel(); };
         TQCurveSelectionList* s = view.getSelection();
         const auto perform = [&](const std::string& action, double tag) {
             RWMenuItem sender(action, action);
@@ -48,7 +49,7 @@ protected:
             EXPECT_TRUE(ctrl().performAction(action, sender));
         };
         const tests_support::Steps steps = {
-            {"menu", [&] { perform(a.rest, 0); }},
+            {"menu", [&] { perform(a.word(0), N(1)); }},  // an action and its tag
             {"interp", [&] { perform("menuSetKeypointInterpolation:", N(0)); }},
             {"select", [&] { select(a.rest); }},
             {"move", [&] { ctrl().moveSelected(s, T(0), N(1), 1, char(N(2))); }},
@@ -85,8 +86,18 @@ protected:
             {"movekey",
              [&] {
                  const CMTime from = T(1), to = T(2);
-                 item(a.word(0))->channel()->moveKeyframe(&from, &to, true);
+                 C0()->moveKeyframe(&from, &to, true);
              }},
+            // The keyframe at a time deleted, or deleted and set again as an undo rebuilds it:
+            // the same time and value, a new handle.
+            {"unkey", [&] { C0()->deleteKeyframe(C0()->getKeyframe(T(1))); }},
+            {"rekey",
+             [&] {
+                 const double v = C0()->getCurveValue(T(1));
+                 C0()->deleteKeyframe(C0()->getKeyframe(T(1)));
+                 C0()->setKeyframe(T(1), v);
+             }},
+            {"validate", [&] { ctrl().validateSelection(s); }},
             {"noview", [&] { ctrl().setView(nullptr); }},
             {"undrawn", [&] { ctrl().setView(&undrawn); }},
             {"fps", [&] { EXPECT_TRUE(host.setFrameDuration(CMTimeMake(1, int32_t(N(0))))); }},
@@ -147,6 +158,7 @@ TEST_P(CtrlEdits, edit__as_recorded_and_undone_exactly) {
 constexpr const char* kMenuScene =
     "A: 1=1L 2=3 3=2; B: 0=10 4=20; Pos.X: 1=2 2=5; Pos.Y: 1=2 2=5; Pos.Z: 1=2 2=5";
 constexpr const char* kMenuSelection = "A@2 X@1 B@4 A@1 B@0";
+constexpr const char* kFourKeys = "A: 1=0/1 2=1/1 3=0/1 4=1/1";
 
 INSTANTIATE_TEST_SUITE_P(
     Engine, CtrlEdits,
@@ -169,6 +181,19 @@ INSTANTIATE_TEST_SUITE_P(
              "menu menuAlignTangent:"},
         Edit{"menuAddKeyframe", "A: 1=2", "A~", "mouse 0.5 0 | menu menuAddKeyframe:"},
         Edit{"menuInterpolationLinked", kMenuScene, "X@1", "interp 1"},
+        // Bezier shapes a segment from both ends: the keypoint before follows; Exp does not.
+        Edit{"menuBezier", kFourKeys, "A@3", "interp 4"},
+        Edit{"menuExponential", kFourKeys, "A@3", "interp 13"},
+        // The segment under the click (at 2.5) is its first keypoint's; without an entry, or
+        // with a tag that names no interpolation, not even an empty step.
+        Edit{"menuSegmentConstant", kFourKeys, "A~",
+             "mouse 2.5 0.5 | menu menuSetSegmentInterpolation: 0"},
+        Edit{"menuSegmentRefused", kFourKeys, "",
+             "mouse 2.5 0.5 | menu menuSetSegmentInterpolation: 0; select A~; "
+             "menu menuSetSegmentInterpolation: -1"},
+        // The cleared channel shows what it showed at the playhead.
+        Edit{"menuDeleteAllKeyframes", kFourKeys, "A~",
+             "now 1.5; mouse 2.5 0.5 | menu menuDeleteAllKeyframes:"},
         // Each channel announced once per phase; each step measures from where the last left.
         Edit{"drag", "A: 1=0 2=1; B: 1=0", "A@1 A@2 B@1", "drag 10 1 0.05 0.1"},
         Edit{"vanishedChannel", "A: 1=0 2=1; Gone: 1=0; B: 1=0", "A@1 Gone@1 B@1 A@2",
@@ -189,6 +214,11 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"deleteFromLinked", "Pos.X: 0=0 3=2 4=8; Pos.Y: 0=0 3=2 4=8; Pos.Z: 0=0 3=2 4=8", "",
              "deletevertex Y@3 3"},
         Edit{"purgeAndClean", "A: 1=1 2=2", "", "movekey A 1 2; select A@2 | clean; purge"},
+        // A stale handle is found again by its stored time, also by the operations on a
+        // selection before they run; with nothing at that time the entry stays stale.
+        Edit{"staleHandleRepaired", "A: 1=3/1 2=4/1", "A@2", "rekey A 2 | validate"},
+        Edit{"staleHandleRepairedFirst", "A: 1=3/1 2=4/1", "A@2", "rekey A 2 | beziers"},
+        Edit{"staleHandleWithoutAKeyframe", "A: 1=3/1 2=4/1", "A@2", "unkey A 2 | validate"},
         // Moves: the anchor first; the one leading the direction of travel moves first.
         Edit{"moveForward", "A*2: 1=0 2=0 3=0", "A@2 A@3 A@1", "move 3 0"},
         Edit{"moveBackward", "A*2: 2=0 3=0 4=0", "A@3 A@4 A@2", "move 2 0"},
@@ -219,7 +249,11 @@ INSTANTIATE_TEST_SUITE_P(
         Edit{"undrawnViewNoNaN", "A: 5=0(-0.5,-0.1|0.5,0.1)", "", "undrawn; tangent A>5 5.2 0.3"},
         Edit{"undrawnViewNoSnap", "A: 5=0(-0.5,-0.1|0.5,0.1)", "",
              "| undrawn; tangent45 A>5 5.2 0.3 0"},
+        // The pointer 40, 80, -10 and 150 degrees on screen from the keypoint.
         Edit{"snap45", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 5.9 0.3 0"},
+        Edit{"snap45Upright", "A: 0=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>0 0.217 0.492 0"},
+        Edit{"snap45Level", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 6.231 -0.087 0"},
+        Edit{"snap45Backward", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "", "tangent45 A>5 3.917 0.25 0"},
         Edit{"snap45FromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
              "save A>5; tangent45 A>5 5.5 0.5 1"},
         Edit{"snap45InputFromOriginalAngle", "A: 5=0(-0.5,-0.1|0.37,0.05)b", "",
@@ -231,8 +265,8 @@ INSTANTIATE_TEST_SUITE_P(
              "A>2 B@4 C<6", "tangents 2.8 0.3"},
         Edit{"tangents45Selected",
              "A: 2=0.2(-0.5,-0.1|0.5,0.1); B*2: 4=0.5(-0.2,-0.3|0.2,0.3); C*0.5: "
-             "6=-0.1(-0.4,0|0.4,0)",
-             "A>2 B@4 C@6", "tangents45 2.75 0.485 0"},
+             "6=-0.1(-0.4,0|0.4,0); D: 8=0(-0.4,0|0.4,0)b",
+             "A>2 B@4 C@6 D<8", "tangents45 2.75 0.485 0"},
         // The list forms take one state for all; the single forms toggle.
         Edit{"breakAndWeight", "A: 2=0(-0.5,0|0.5,0)b; B: 4=0(-0.5,0|0.5,0)", "A@2 B>4",
              "breaks; break A@2; weight A@2 1; weights 0"},

@@ -1,5 +1,5 @@
 // The controller's core: queries, the maximum view volume, sets, sampling, the selection's
-// repair, the value panel and the menus.
+// repair and the value panel.
 
 #include <cfloat>
 #include <functional>
@@ -9,7 +9,6 @@
 
 #include "platform/channels/TQChannelTypes.h"
 #include "tests/support/EngineFixture.h"
-#include "tests/support/TextBaseline.h"
 
 using namespace engine_test;
 
@@ -175,27 +174,6 @@ TEST_F(CtrlCore, samples__refreshed_when_dirty_and_none_for_a_foreign_item) {
     EXPECT_TRUE(u == nullptr && v == nullptr && n == 0u);
 }
 
-TEST_F(CtrlCore, validateSelection__repairs_a_stale_handle_by_its_stored_time) {
-    build("A: 1=3 2=4");
-    TQCurveSelectionList* list = select("A@2");
-    // An undo rebuilds the keyframe: same time, new handle.
-    TQChannel* a = item("A")->channel();
-    a->deleteKeyframe(list->selectionAtIndex(0)->getHandle());
-    const TQKeyframeHandle after = a->setKeyframe(seconds(2), 4);
-    ctrl().validateSelection(list);
-    EXPECT_EQ(list->selectionAtIndex(0)->getHandle(), after);
-    // The operations on a selection repair it first, and so reach the rebuilt keyframe.
-    a->deleteKeyframe(after);
-    a->setKeyframe(seconds(2), 4);
-    ctrl().setBezierPointSelected(list);
-    EXPECT_EQ(a->getKeyframeInterpolation(a->getKeyframe(seconds(2))), kTQInterpolationBezier);
-    // Nothing at the stored time: the stale handle stays, the entry too.
-    const TQKeyframeHandle last = list->selectionAtIndex(0)->getHandle();
-    a->deleteKeyframe(last);
-    ctrl().validateSelection(list);
-    EXPECT_EQ(selectionText(), "A@stale");
-}
-
 TEST_F(CtrlCore, sortKeypoints__by_time_both_ways_with_ties_and_nulls) {
     const auto key = [](double t) {
         auto k = std::make_shared<TQKeyframe>();
@@ -245,22 +223,4 @@ TEST_F(CtrlCore, showValue__writes_the_accepted_value_in_channel_units) {
     ctrl().setView(&view);
     EXPECT_EQ(modal.runs().size(), 2u);
     RWResetServices();
-}
-
-// The three context menus as a user opens them: titles, actions and tags, submenus indented.
-TEST_F(CtrlCore, menus__as_recorded) {
-    std::string text;
-    const std::function<void(const RWMenu&, int)> walk = [&](const RWMenu& menu, int depth) {
-        for (const auto& item : menu.itemArray()) {
-            text += std::string(2 * depth, ' ') + item->title() + " | " + item->action() + " | " +
-                    std::to_string(item->tag()) + "\n";
-            if (item->hasSubmenu()) walk(*item->submenu(), depth + 1);
-        }
-    };
-    for (const RWMenuPtr& menu :
-         {ctrl().getKeyframeMenu(), ctrl().getCurveMenu(), ctrl().getTangentMenu()}) {
-        walk(*menu, 0);
-        text += "--\n";
-    }
-    EXPECT_TRUE(tests_support::matchesBaseline("menus", text, "src/engine/tests/baselines"));
 }

@@ -1,28 +1,30 @@
-// The context menus as a user meets them: each menu validated for the selections that change
-// it and read back as it would show; the interpolation and delete-all actions, each one undo
-// step; and every action of the menus chosen after its channel went away.
+// The context menus as a user meets them: the three as they are built (titles, actions and
+// tags, submenus indented), each validated for the selections that change it and read back as
+// it would show (both against recorded baselines), and every action of the menus chosen after
+// its channel went away.
 
 #include <functional>
 #include <sstream>
 #include <string>
 #include <vector>
 
-#include "src/engine/tests/EngineFixture.h"
-#include "src/resources/TQStrings.h"
+#include "tests/support/EngineFixture.h"
+#include "tests/support/TextBaseline.h"
 
 namespace engine_test {
 namespace {
 
-// Every item of the menu that sends an action, submenus included, as (menu, index).
-std::vector<std::pair<RWMenu*, int64_t>> actionItems(const RWMenuPtr& menu) {
-    std::vector<std::pair<RWMenu*, int64_t>> out;
-    for (int64_t i = 0; i < menu->numberOfItems(); ++i) {
-        const RWMenuItemPtr item = menu->itemAtIndex(i);
-        if (item->hasSubmenu())
-            for (const auto& inner : actionItems(item->submenu())) out.push_back(inner);
-        if (!item->action().empty()) out.push_back({menu.get(), i});
+using tests_support::matchesBaselineBlock;
+
+// Calls `visit` with every item of the menu as (menu, index, depth), a submenu's items right
+// after the item holding them.
+void eachItem(RWMenu& menu, const std::function<void(RWMenu&, int64_t, int)>& visit,
+              int depth = 0) {
+    for (int64_t i = 0; i < menu.numberOfItems(); ++i) {
+        visit(menu, i, depth);
+        if (menu.itemAtIndex(i)->hasSubmenu())
+            eachItem(*menu.itemAtIndex(i)->submenu(), visit, depth + 1);
     }
-    return out;
 }
 
 class CtrlMenus : public WithReferenceHost<EngineFixture> {
@@ -41,77 +43,43 @@ protected:
     static std::string reading(const RWMenuPtr& menu) {
         menu->update();
         std::string out;
-        std::function<void(const RWMenu&)> walk = [&](const RWMenu& m) {
-            for (const RWMenuItemPtr& item : m.itemArray()) {
-                if (item->hasSubmenu()) walk(*item->submenu());
-                if (item->isSeparatorItem() || item->hasSubmenu()) continue;
-                out += item->isEnabled() ? " " + item->title() : " [" + item->title() + "]";
-                out += item->state() == RWOnState ? "*" : item->state() == RWMixedState ? "~" : "";
-            }
-        };
-        walk(*menu);
+        eachItem(*menu, [&](RWMenu& m, int64_t i, int) {
+            const RWMenuItemPtr item = m.itemAtIndex(i);
+            if (item->isSeparatorItem() || item->hasSubmenu()) return;
+            out += item->isEnabled() ? " " + item->title() : " [" + item->title() + "]";
+            out += item->state() == RWOnState ? "*" : item->state() == RWMixedState ? "~" : "";
+        });
         return out.substr(1);
-    }
-
-    // Performs the item sending `action` with `tag` after validating its menu.
-    bool choose(const RWMenuPtr& menu, const std::string& action, int64_t tag) {
-        menu->update();
-        for (const auto& [holder, index] : actionItems(menu))
-            if (holder->itemAtIndex(index)->action() == action &&
-                holder->itemAtIndex(index)->tag() == tag)
-                return holder->performActionForItemAtIndex(index);
-        return false;
     }
 };
 
+TEST_F(CtrlMenus, menus__as_recorded) {
+    std::string text;
+    for (const RWMenuPtr& menu :
+         {ctrl().getKeyframeMenu(), ctrl().getCurveMenu(), ctrl().getTangentMenu()}) {
+        eachItem(*menu, [&](RWMenu& m, int64_t i, int depth) {
+            const RWMenuItemPtr item = m.itemAtIndex(i);
+            text += std::string(2 * depth, ' ') + item->title() + " | " + item->action() + " | " +
+                    std::to_string(item->tag()) + "\n";
+        });
+        text += "--\n";
+    }
+    EXPECT_TRUE(tests_support::matchesBaseline("menus", text, "src/engine/tests/baselines"));
+}
+
 TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelection) {
-    // Arrangement: "L2" locks the keypoint at 2, "D3" disables the one at 3, "B2" makes the
-    // one at 2 Bezier ("K2" stepped), "C" locks the channel, "@3" selects the keypoint at 3.
-    struct Case {
-        const char* arrange;
-        const char* want;
-    };
-    const std::vector<Case> cases = {
-        {"",
-         "[Delete] [Reverse] [Ease In] [Ease Out] [Ease In and Out] [Constant] [Linear] [Bézier] "
-         "[Catmull-Rom] [Exponential] [Logarithmic] Unlock [Disable]"},
-        {"@3",
-         "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear* Bézier Catmull-Rom "
-         "Exponential Logarithmic Lock Disable"},
-        {"B2 @3",
-         "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear~ Bézier~ Catmull-Rom "
-         "Exponential Logarithmic Lock Disable"},
-        // A stepped segment needs no second end: only its own kind is ticked.
-        {"K3 @3",
-         "Delete Reverse Ease In Ease Out Ease In and Out Constant* Linear Bézier Catmull-Rom "
-         "Exponential Logarithmic Lock Disable"},
-        {"B4 @2 @4",
-         "Delete Reverse Ease In Ease Out Ease In and Out Constant~ Linear~ Bézier~ Catmull-Rom~ "
-         "Exponential~ Logarithmic~ Lock Disable"},
-        {"L2 L3 @2 @3",
-         "Delete Reverse Ease In Ease Out Ease In and Out [Constant] [Linear] [Bézier] "
-         "[Catmull-Rom] [Exponential] [Logarithmic] Unlock [Disable]"},
-        {"L2 @2 @3",
-         "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear* Bézier Catmull-Rom "
-         "Exponential Logarithmic Lock~ Disable"},
-        {"D2 D3 @2 @3",
-         "[Delete] [Reverse] [Ease In] [Ease Out] [Ease In and Out] [Constant] [Linear] [Bézier] "
-         "[Catmull-Rom] [Exponential] [Logarithmic] Lock Enable"},
-        {"D3 @2 @3",
-         "Delete Reverse Ease In Ease Out Ease In and Out Constant Linear* Bézier Catmull-Rom "
-         "Exponential Logarithmic Lock Disable~"},
-        {"C @3",
-         "[Delete] [Reverse] Ease In Ease Out Ease In and Out [Constant] [Linear]* [Bézier] "
-         "[Catmull-Rom] [Exponential] [Logarithmic] [Lock] [Disable]"},
-    };
-    for (const Case& c : cases) {
-        SCOPED_TRACE(std::string("arranged \"") + c.arrange + "\"");
+    // Arrangements: "L2" locks the keypoint at 2, "D3" disables the one at 3, "B2" makes the
+    // one at 2 Bezier ("K2" stepped: a stepped segment needs no second end, so only its own
+    // kind is ticked), "C" locks the channel, "@3" selects the keypoint at 3.
+    std::string text;
+    for (const char* arrange : {"", "@3", "B2 @3", "K3 @3", "B4 @2 @4", "L2 L3 @2 @3", "L2 @2 @3",
+                                "D2 D3 @2 @3", "D3 @2 @3", "C @3"}) {
         object->removeAllChildren();
         set->clear();
         auto item = fourKeys();
         TQChannel* channel = item->channel();
         TQCurveSelectionList* list = selectInView({});
-        std::istringstream words(c.arrange);
+        std::istringstream words(arrange);
         for (std::string w; words >> w;) {
             const TQKeyframeHandle h =
                 w.size() > 1 ? channel->getKeyframe(seconds(w[1] - '0')) : nullptr;
@@ -122,112 +90,53 @@ TEST_F(CtrlMenus, keypointMenu__followsTheLocksStatesAndInterpolationsOfTheSelec
             if (w[0] == 'C') channel->setLocked(true, false);
             if (w[0] == '@') list->addSelection(keypointEntry(item, w[1] - '0'));
         }
-        EXPECT_EQ(reading(ctrl().getKeyframeMenu()), c.want);
+        text += std::string(arrange) + ": " + reading(ctrl().getKeyframeMenu()) + "\n";
     }
+    EXPECT_TRUE(
+        matchesBaselineBlock("menu-states", "keypoint", text, "src/engine/tests/baselines"));
 }
 
+// The curve menu follows the segment under the click, the tangent menu the handles.
 TEST_F(CtrlMenus, curveAndTangentMenus__followTheSegmentUnderTheClickAndTheHandles) {
     auto item = fourKeys();
     TQChannel* c = item->channel();
     c->setKeyframeInterpolation(c->getKeyframe(seconds(2)), kTQInterpolationBezier);
-    const auto curveMenuAt = [&](double t) {
+    std::string text;
+    const auto note = [&](const char* what, const RWMenuPtr& menu) {
+        text += std::string(what) + ": " + reading(menu) + "\n";
+    };
+    const auto curveAt = [&](const char* what, double t) {
         view.setMouseOrigin(view.getPointScreen(CGPointMake(t, 0.0)));
-        return reading(ctrl().getCurveMenu());
+        note(what, ctrl().getCurveMenu());
     };
     selectInView({curveEntry(item)});
-    EXPECT_EQ(curveMenuAt(2.5),
-              "Add Keypoint Delete All Keypoints Constant Linear Bézier* "
-              "Catmull-Rom Exponential Logarithmic");
-    // Before the first keypoint no segment lies under the click.
-    EXPECT_EQ(curveMenuAt(0.5),
-              "Add Keypoint Delete All Keypoints [Constant] [Linear] [Bézier] "
-              "[Catmull-Rom] [Exponential] [Logarithmic]");
+    curveAt("curve, on a Bezier segment", 2.5);
+    curveAt("curve, before the first keypoint", 0.5);
     c->setKeyframeLocked(c->getKeyframe(seconds(2)), true);
-    EXPECT_EQ(curveMenuAt(2.5),
-              "Add Keypoint Delete All Keypoints [Constant] [Linear] [Bézier]* "
-              "[Catmull-Rom] [Exponential] [Logarithmic]");
-    auto empty = addItem(addChannel("Empty", {}));
-    selectInView({curveEntry(empty)});
-    EXPECT_EQ(curveMenuAt(2.5),
-              "Add Keypoint [Delete All Keypoints] [Constant] [Linear] "
-              "[Bézier] [Catmull-Rom] [Exponential] [Logarithmic]");
-
+    curveAt("curve, on a locked segment", 2.5);
+    selectInView({curveEntry(addItem(addChannel("Empty", {})))});
+    curveAt("curve, without keypoints", 2.5);
     selectInView({});
-    EXPECT_EQ(curveMenuAt(2.5),
-              "Add Keypoint [Delete All Keypoints] [Constant] [Linear] "
-              "[Bézier] [Catmull-Rom] [Exponential] [Logarithmic]")
-        << "nothing selected";
-    EXPECT_EQ(reading(ctrl().getTangentMenu()), "[Break Tangents] [Align Tangents]");
+    curveAt("curve, nothing selected", 2.5);
+    note("tangent, nothing selected", ctrl().getTangentMenu());
     selectInView({tangentEntry(item, 3, true)});
-    EXPECT_EQ(reading(ctrl().getTangentMenu()), "Break Tangents Align Tangents");
+    note("tangent", ctrl().getTangentMenu());
     c->setKeyframeTangentsBroken(c->getKeyframe(seconds(3)), true);
-    EXPECT_EQ(reading(ctrl().getTangentMenu()), "Link Tangents Align Tangents");
+    note("tangent, broken", ctrl().getTangentMenu());
     c->setLocked(true, false);
-    EXPECT_EQ(reading(ctrl().getTangentMenu()), "[Link Tangents] [Align Tangents]");
-}
-
-TEST_F(CtrlMenus, actions__changeWhatTheKindNeedsInOneUndoStepThatGivesItBack) {
-    constexpr unsigned L = kTQInterpolationLinear, B = kTQInterpolationBezier;
-    constexpr unsigned E = kTQInterpolationExp, C = kTQInterpolationConstant;
-    struct Case {
-        const char* action;
-        int64_t tag;
-        std::vector<unsigned> want;  // the interpolations of the keypoints after
-        const char* undoKey;
-    };
-    const std::vector<Case> cases = {
-        // Bezier shapes a segment from both ends: the keypoint before follows; Exp does not.
-        {"menuSetKeypointInterpolation:", B, {L, B, B, L}, "Undo Set Interpolation"},
-        {"menuSetKeypointInterpolation:", E, {L, L, E, L}, "Undo Set Interpolation"},
-        // The segment under the click (at 2.5) is its first keypoint's.
-        {"menuSetSegmentInterpolation:", C, {L, C, L, L}, "Undo Set Interpolation"},
-        {"menuDeleteAllKeyframes:", 0, {}, "Undo Delete All Keypoints"},
-    };
-    for (const Case& c : cases) {
-        SCOPED_TRACE(c.action);
-        object->removeAllChildren();
-        set->clear();
-        auto item = fourKeys();
-        const bool onCurve = std::string(c.action) != "menuSetKeypointInterpolation:";
-        selectInView({onCurve ? curveEntry(item) : keypointEntry(item, 3)});
-        view.setMouseOrigin(view.getPointScreen(CGPointMake(2.5, 0.5)));
-        host.setCurrentTime(seconds(1.5));
-        const auto before = snapshot();
-        recorder.clearCalls();
-        ASSERT_TRUE(
-            choose(onCurve ? ctrl().getCurveMenu() : ctrl().getKeyframeMenu(), c.action, c.tag));
-        EXPECT_NE(recorder.bracketText().find("!8"), std::string::npos) << "channels changed";
-        std::vector<unsigned> got;
-        for (TQKeyframeHandle h : item->channel()->getKeyframes(false))
-            got.push_back(item->channel()->getKeyframeInterpolation(h));
-        EXPECT_EQ(got, c.want) << sceneText(*object);
-        if (c.want.empty()) {  // the cleared channel shows what it showed at the playhead
-            EXPECT_NEAR(item->channel()->getInitialValue(), 0.5, kValueTolerance);
-        }
-        EXPECT_EQ(std::tuple(recorder.captureBalance(), host.undoStack().undoCount(),
-                             host.undoDescription()),
-                  std::tuple(0, 1u, TQLocalizedString(c.undoKey)));
-        ASSERT_TRUE(host.undo());
-        EXPECT_TRUE(sceneIs(*before));
-        host.undoStack().clear();
-    }
-    // No entry, or a tag that names no interpolation: not even an empty step.
-    auto item = fourKeys();
-    const std::string action = "menuSetSegmentInterpolation:";
-    RWMenuItem sender(action, action);
-    selectInView({});
-    sender.setTag(C);
-    EXPECT_TRUE(ctrl().performAction(action, sender));
-    selectInView({curveEntry(item)});
-    sender.setTag(-1);
-    EXPECT_TRUE(ctrl().performAction(action, sender));
-    EXPECT_EQ(recorder.bracketText() + std::to_string(host.undoStack().undoCount()), "0");
+    note("tangent, locked channel", ctrl().getTangentMenu());
+    EXPECT_TRUE(matchesBaselineBlock("menu-states", "curve and tangent", text,
+                                     "src/engine/tests/baselines"));
 }
 
 TEST_F(CtrlMenus, everyAction__chosenAfterItsChannelWentAwayChangesNothing) {
     for (const RWMenuPtr& menu :
          {ctrl().getKeyframeMenu(), ctrl().getCurveMenu(), ctrl().getTangentMenu()}) {
-        for (const auto& [holder, index] : actionItems(menu)) {
+        std::vector<std::pair<RWMenu*, int64_t>> actions;
+        eachItem(*menu, [&](RWMenu& m, int64_t i, int) {
+            if (!m.itemAtIndex(i)->action().empty()) actions.push_back({&m, i});
+        });
+        for (const auto& [holder, index] : actions) {
             SCOPED_TRACE(holder->itemAtIndex(index)->action());
             object->removeAllChildren();
             set->clear();

@@ -146,7 +146,7 @@ TEST_F(MiniViews, rows__read_and_write_a_channel_at_the_selected_position) {
     EXPECT_DOUBLE_EQ(editor.getSelectedValueYForChannel(y), 1.0);
 
     setKeys(*x, {{0.5, 3.0}});
-    selectKeys(x, {0.5});
+    selectKeys(editor, x, {0.5});
     EXPECT_DOUBLE_EQ(editor.getSelectedValueYForChannel(y), y->getCurveValue(position(0.5), false))
         << "the curve between keys";
     ASSERT_EQ(y->getKeyframe(position(0.5)), nullptr);
@@ -192,7 +192,7 @@ protected:
     TQMiniCurveEditorStripView strip;
 };
 
-TEST_F(Strip, draws_the_curve_and_its_keypoints_in_the_box) {
+TEST_F(Strip, draws_the_curve_and_its_keypoints_in_the_box_or_flat_forms) {
     source.channel = gain;
     strip.setController(&source);
     EXPECT_EQ(std::pair(strip.numberOfSamples(), strip.numberOfKeypoints()), std::pair(180u, 3u));
@@ -203,9 +203,8 @@ TEST_F(Strip, draws_the_curve_and_its_keypoints_in_the_box) {
     const auto& top = static_cast<const HXDScreenspaceQuad&>(*strip.primitives()[2]);
     EXPECT_DOUBLE_EQ(CGRectGetMidX(top.frame()), 90.0);
     EXPECT_DOUBLE_EQ(CGRectGetMaxY(top.frame()), 18.0);
-}
 
-TEST_F(Strip, flat_forms_one_keypoint_none_and_no_channel) {
+    // The flat forms: one keypoint, none, and no channel.
     TQChannel* one =
         static_cast<TQChannel*>(object->addChild(std::make_unique<TQChannel>("One", 20)));
     setKeys(*one, {{0.25, 5.0}});

@@ -71,10 +71,6 @@ protected:
     TQMiniCurveEditorCtrl& ctrl() { return *editor.controller(); }
     TQMiniCurveEditorView& view() { return editor.curveEditorView(); }
 
-    void selectKeys(TQChannel* channel, std::initializer_list<double> positions) {
-        mini_test::selectKeys(editor, channel, positions);
-    }
-
     std::unique_ptr<TQChannelBase> snapshot() const {
         return std::unique_ptr<TQChannelBase>(object->cloneChannel());
     }

@@ -48,6 +48,13 @@ public:
     void windowWasPanned(double fraction) override { panned.push_back(fraction); }
     void selectionChangedTo(TQCurveSelectionList*) override { ++selectionChanges; }
     void currentViewVolumeChangedTo(const CGRect*) override { ++volumeChanges; }
+    // With onGrid a moved keypoint lands on the 1/30 s grid, as the full editor's does.
+    CMTime convertToCurveEditorAxis(CMTime time) const override {
+        if (!onGrid) return time;
+        return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, CMTimeMake(1, 60)),
+                                              CMTimeMake(1, 30));
+    }
+    bool onGrid = false;
 
     std::vector<double> offsets;
     std::vector<double> panned;
@@ -209,9 +216,10 @@ protected:
     // inside it), "u t v", "c t v" (a click), "2 t v" (a double click), each point followed by
     // its modifiers if any: s Shift, o Option, c Command, x Control; "r t v" a right click
     // on a fresh frame (notes the menu it answers); "k" and "K" press and release the space
-    // bar, "R" repeats its key, "z" turns auto-zoom off, "b" takes the box tool, "S" the sketch tool with every
-    // item selected, "a name:" sends a key map's action (notes one the view does not know),
-    // "D" detaches the controller. Steps are separated by "|".
+    // bar, "R" repeats its key, "z" turns auto-zoom off, "g" puts moves on the 1/30 s grid,
+    // "f" draws a frame, "b" takes the box tool, "S" the sketch tool with every item selected, "a name:" sends a key map's action
+    // (notes one the view does not know), "D" detaches the controller. Steps are separated by
+    // "|".
     void gesture(const std::string& script) {
         std::istringstream in(script);
         for (std::string step; std::getline(in, step, '|');) {
@@ -244,6 +252,8 @@ protected:
             if (op == 'K') view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " "));
             if (op == 'R') view.keyDown(RWEvent::keyEvent(RWEventType::KeyDown, " ", 0, 0, true));
             if (op == 'z') view.setAutoZoom(0);
+            if (op == 'f') frame();
+            if (op == 'g') range().onGrid = true;
             if (op == 'D') view.setController(nullptr);
             if (op == 'b') ctrl().setCurrentTool(TQTool::kBox);
             if (op == 'S') {

@@ -95,6 +95,9 @@ INSTANTIATE_TEST_SUITE_P(
         Gesture{"shiftHoldsTheValue", kLinear, "",
                 "d 5 .5|m 5.1 .6|m 5.5 .65 s|m 5.75 .8 s|u 5.75 .8 s"},
         Gesture{"shiftUpwardHoldsTheTime", kLinear, "", "d 5 .5|m 5.05 .7 s|m 6 .8 s|u 6 .8 s"},
+        // A free drag lands on the grid; one held upright keeps the time it had, off the grid.
+        Gesture{"onTheGrid", "A: 5.01=0/1 8=0/1", "",
+                "g|d 5.01 0|m 5.02 .5 s|u 5.02 .5 s|d 8 0|m 8.51 .2|u 8.51 .2"},
         // A segment moves its two keypoints, only vertically.
         Gesture{"segmentDrag", kLinear, "", "d 3.5 .25|m 4.5 .55|u 4.5 .55"},
         // The curve passes through the pointer at each step; from a keypoint the time
@@ -152,6 +155,11 @@ INSTANTIATE_TEST_SUITE_P(
         // Delete takes the selected keypoints; with the box tool only the box.
         Gesture{"deleteKeys", kBezier, "A@5 A@8", "a delete:"},
         Gesture{"deleteTheBox", kBezier, "", "b|d 1 .9|m 6 -.2|u 6 -.2|?|a delete:"},
+        // A free distortion of the box's top-right corner in five steps is one undo step, each
+        // drag step and the release announced per channel.
+        Gesture{"boxDistortion", "A: 2=-0.5/1 4=0.25/1 6=0.5/1; B: 3=0/1 5=-0.25/1", "",
+                "b|d 1 .9|m 4 0|m 7 -.9|u 7 -.9|f|d 6 .5 c|m 6.2 .55 c|m 6.4 .6 c|m 6.6 .65 c|"
+                "m 6.8 .7 c|m 7 .75 c|u 7 .75 c"},
         // A right click selects what it hits and answers that kind's menu: a keypoint alone
         // unless already selected (then it leads), a handle, a curve replacing the selection;
         // empty space leaves the selection.
@@ -187,28 +195,6 @@ TEST_F(ViewMouse, snapshot__the_ghost_stays_the_curve_before_the_first_drag) {
     EXPECT_NE(keyText(*item("A")->channel(), true), before);
 }
 
-// A controller that puts a moved keypoint on the 1/30 s grid, as the full editor does.
-class GridRangeController : public RangeController {
-public:
-    CMTime convertToCurveEditorAxis(CMTime time) const override {
-        return BN_CMTimeFloorToSampleDuration(BN_CMTimeSaferAdd(time, CMTimeMake(1, 60)),
-                                              CMTimeMake(1, 30));
-    }
-};
-class ViewMouseOnGrid : public ViewFixture {
-    std::unique_ptr<TQCurveEditorCtrlBase> makeController() override {
-        return std::make_unique<GridRangeController>();
-    }
-};
-
-// A free drag lands on the grid; one held upright keeps the time it had, even off the grid.
-TEST_F(ViewMouseOnGrid, drag__lands_on_the_grid_unless_held_upright) {
-    build("A: 5.01=0/1 8=0/1");
-    ASSERT_TRUE(frame());
-    gesture("d 5.01 0|m 5.02 .5 s|u 5.02 .5 s|d 8 0|m 8.51 .2|u 8.51 .2");
-    EXPECT_EQ(sceneText(*object, false), "A: 5.01=0.5/1 8.5=0.2/1");
-}
-
 // The space bar's release stops at the view only after its press was taken.
 TEST_F(ViewMouse, spaceBar__the_release_is_taken_only_after_the_press) {
     EXPECT_FALSE(view.keyUp(RWEvent::keyEvent(RWEventType::KeyUp, " ")));
@@ -231,28 +217,11 @@ TEST_F(ViewMouse, constraints__a_tie_is_vertical_and_time_stays_in_the_ranges) {
 }
 
 // A drag left without its release closes its step as the release would have, in reverse
-// order, when the view goes; the step undoes whole.
+// order, when the view goes in mid-drag; the step undoes whole, and the view going detaches
+// from its controller.
 TEST_F(ViewMouseUndo, drag__an_abandoned_one_closes_its_step_and_undoes_whole) {
     build("A: 2=0/1 5=0.25/1 8=0/1; B: 5=-0.5/1");
     const auto before = snapshot();
-    const auto startDrag = [&](TQCurveEditorViewBase& on) {
-        on.getSelection()->reset();
-        for (const char* e : {"A@5", "B@5"}) on.getSelection()->addSelection(entry(e));
-        clock.advance(1.0);
-        ASSERT_TRUE(on.displayLayer(&encoder));
-        on.mouseDown(mouseAt(RWEventType::LeftMouseDown, CGPointMake(5.0, 0.25), 0));
-        clock.advance(kStepSeconds);
-        on.mouseDragged(mouseAt(RWEventType::LeftMouseDragged, CGPointMake(5.5, 0.5), 0));
-        ASSERT_TRUE(on.getCapturing());
-        recorder.clearCalls();
-    };
-    const auto closedAndUndone = [&](const char* what) {
-        EXPECT_EQ(recorder.bracketText(), "B> A> }") << what;
-        EXPECT_FALSE(host.undoStack().isStepOpen()) << what;
-        ASSERT_EQ(host.undoStack().undoCount(), 1u) << what;
-        ASSERT_TRUE(host.undo()) << what;
-        EXPECT_TRUE(sceneIs(*before)) << what;
-    };
     auto doomed = std::make_unique<TQCurveEditorViewBase>();
     doomed->setViewHost(&viewHost);
     doomed->setClock(&clock);
@@ -263,10 +232,22 @@ TEST_F(ViewMouseUndo, drag__an_abandoned_one_closes_its_step_and_undoes_whole) {
     doomed->setOriginalViewVolume(view.getOriginalViewVolume());
     const CMTimeRange range = view.getDisplayRange();
     doomed->setDisplayRange(&range.start, &range.duration);
-    startDrag(*doomed);
+    for (const char* e : {"A@5", "B@5"}) doomed->getSelection()->addSelection(entry(e));
+    clock.advance(1.0);
+    ASSERT_TRUE(doomed->displayLayer(&encoder));
+    doomed->mouseDown(mouseAt(RWEventType::LeftMouseDown, CGPointMake(5.0, 0.25), 0));
+    clock.advance(kStepSeconds);
+    doomed->mouseDragged(mouseAt(RWEventType::LeftMouseDragged, CGPointMake(5.5, 0.5), 0));
+    ASSERT_TRUE(doomed->getCapturing());
+    recorder.clearCalls();
     doomed.reset();
+    EXPECT_EQ(ctrl().getView(), nullptr) << "the controller must not keep a dangling view";
     ctrl().setView(&view);
-    closedAndUndone("the view torn down");
+    EXPECT_EQ(recorder.bracketText(), "B> A> }");
+    EXPECT_FALSE(host.undoStack().isStepOpen());
+    ASSERT_EQ(host.undoStack().undoCount(), 1u);
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(sceneIs(*before));
 }
 
 }  // namespace

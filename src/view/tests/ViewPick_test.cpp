@@ -67,26 +67,9 @@ TEST_F(ViewPick, hitTest__the_closest_thing_under_the_pointer_is_the_only_record
             << "at " << k.t << ", " << k.v << " + " << k.dx << ", " << k.dy;
 }
 
-// The sketch tool takes nothing; a record of an item that went is skipped, and a miss leaves
-// the list.
-TEST_F(ViewPick, pick__the_sketch_tool_and_stale_records) {
-    build("A: 2=0/1 5=0/1 8=0/1");
-    ASSERT_TRUE(frame());
-    const CGPoint onKey = view.getPointScreen(CGPointMake(5.0, 0.0));
-    ctrl().setCurrentTool(TQTool::kSketch);
-    view.pick(onKey);
-    EXPECT_EQ(view.getCurrentSelection()->size() + view.getCurrentActivePart(), 0u);
-    ctrl().setCurrentTool(TQTool::kEdit);
-    ctrl().removeChannelWithIdentifier(item("A")->channelId(), set);
-    view.getCurrentSelection()->addSelection(entry("A@8"));
-    view.pick(onKey);
-    EXPECT_TRUE(view.getCurrentSelection()->empty()) << "the frame is older than the set";
-    view.getCurrentSelection()->addSelection(entry("A@8"));
-    view.pick(view.getPointScreen(CGPointMake(5.0, 0.9)));
-    EXPECT_EQ(view.getCurrentSelection()->size(), 1u) << "a miss calls nothing";
-}
-
-TEST_F(ViewPick, validateSelectedHandles__matches_by_time_and_drops_deleted_keypoints) {
+// Saved handles are matched again by time; then the sketch tool takes nothing, a record of an
+// item that went is skipped, and a miss leaves the list.
+TEST_F(ViewPick, stale_records__handles_matched_by_time_and_records_of_items_that_went) {
     build("A: 2=0/1 5=0/1 8=0/1");
     TQCurveSelectionList saved;
     for (const char* e : {"A@8", "A@5", "A@2"}) saved.addSelection(entry(e));
@@ -100,6 +83,20 @@ TEST_F(ViewPick, validateSelectedHandles__matches_by_time_and_drops_deleted_keyp
     view.validateSelectedHandles(view.getSelection());
     view.validateSelectedHandles(nullptr);
     EXPECT_EQ(selectionText(), "A@8 A@2") << "its own list, or none, changes nothing";
+
+    ASSERT_TRUE(frame());
+    const CGPoint onKey = view.getPointScreen(CGPointMake(2.0, 0.0));
+    ctrl().setCurrentTool(TQTool::kSketch);
+    view.pick(onKey);
+    EXPECT_EQ(view.getCurrentSelection()->size() + view.getCurrentActivePart(), 0u);
+    ctrl().setCurrentTool(TQTool::kEdit);
+    ctrl().removeChannelWithIdentifier(item("A")->channelId(), set);
+    view.getCurrentSelection()->addSelection(entry("A@8"));
+    view.pick(onKey);
+    EXPECT_TRUE(view.getCurrentSelection()->empty()) << "the frame is older than the set";
+    view.getCurrentSelection()->addSelection(entry("A@8"));
+    view.pick(view.getPointScreen(CGPointMake(5.0, 0.9)));
+    EXPECT_EQ(view.getCurrentSelection()->size(), 1u) << "a miss calls nothing";
 }
 
 TEST_F(ViewPick, selectAll__skips_disabled_items_and_takes_locked_keypoints) {

@@ -82,61 +82,46 @@ protected:
     }
 };
 
-// From the fixture's 0..10 s by -1..1 on 800 x 400 pixels.
+// From the fixture's 0..10 s by -1..1 on 800 x 400 pixels; what each answers is recorded in
+// baselines/volume.txt.
 TEST_F(ViewVolume, operations__table) {
     const struct {
         const char* what;
         const char* script;
-        const char* want;
     } cases[] = {
-        {"vertical zoom clamps at 128 about the centre", "zoom 1 1000",
-         "0 -0.0078125 10 0.015625 *1 *128 #0.0078125 !1800 "},
-        {"and at 1/128", "zoom 1 0.001", "0 -128 10 256 *1 *0.0078125 #128 !1800 "},
-        {"x zoom about the reference centre", "zoom 2 1", "2.5 -1 5 2 *2 *1 #1 !1800 "},
+        {"vertical zoom clamps at 128 about the centre", "zoom 1 1000"},
+        {"and at 1/128", "zoom 1 0.001"},
+        {"x zoom about the reference centre", "zoom 2 1"},
         // Wider in time, taller in value, about the pointer at (200, 100) px = (2.5, -0.5).
-        {"a drag zoom keeps the anchor under the pointer", "at 200 100; drag 40 -40",
-         "0.22727 -0.91667 9.0909 1.6667 *1.1 *1.2 #1 !1800 "},
+        {"a drag zoom keeps the anchor under the pointer", "at 200 100; drag 40 -40"},
         // The factor would reach 200: the height stays, the anchor keeps its fraction.
-        {"a drag zoom past the limit", "zoom 1 100; draw; at 200 100; drag 0 -200",
-         "0 -0.01 10 0.02 *1 *128 #0.0078125 2*[!1800] "},
-        {"pan and back", "pan -160 0; draw; pan -80 -40; ?; draw; pan 80 40",
-         "3 -1.2 10 2 / 2 -1 10 2 *1 *1 #1 3*[!1800] >2 >1 >-1 "},
+        {"a drag zoom past the limit", "zoom 1 100; draw; at 200 100; drag 0 -200"},
+        {"pan and back", "pan -160 0; draw; pan -80 -40; ?; draw; pan 80 40"},
         // A twentieth of a page is half a second: the range moves, as it stays after time zero.
-        {"a page in time", "page 0.05 0", "0.5 -1 10 2 *1 *1 #1 !1800 >0.5 "},
-        {"a pan that would reach time zero moves only y", "pan 80 40",
-         "0 -0.8 10 2 *1 *1 #1 !1800 "},
+        {"a page in time", "page 0.05 0"},
+        {"a pan that would reach time zero moves only y", "pan 80 40"},
         // Four events of a line, four pixels a line: 16 px of 400 up, and the three queued
         // ones sideways 12 px of 800; only wheel events taken.
-        {"queued wheel events fold into one pan", "wheel 3",
-         "queued 1 / 0.15 -0.92 10 2 *1 *1 #1 !1800 !4 >0.15 ~8 "},
+        {"queued wheel events fold into one pan", "wheel 3"},
         // One keypoint each at 2 s: the display range widened by 5 % on each side; the
         // factor is taken before the padding.
-        {"frame all on single keypoints", "A: 2=3; B: 2=5; zoom 1 4; clear; frame all",
-         "-0.5 2.9 11 2.2 *0.90909 *1 #1 !1800 "},
-        {"frame all spans enabled items only", "A: 1=0 2=1; B: 3=0; Off: 9=0; off Off; frame all",
-         "0.9 -0.05 2.2 1.1 *4.5455 *2 #0.5 !1800 "},
-        {"frame all never changes the height for one flat curve", "Flat: 1=0.5 4=0.5; frame values",
-         "0 -1 10 2 *1 *1 #1 !1800 "},
+        {"frame all on single keypoints", "A: 2=3; B: 2=5; zoom 1 4; clear; frame all"},
+        {"frame all spans enabled items only", "A: 1=0 2=1; B: 3=0; Off: 9=0; off Off; frame all"},
+        {"frame all never changes the height for one flat curve",
+         "Flat: 1=0.5 4=0.5; frame values"},
         // 0..100 needs a factor of 1/50, short of the limit; the draw pass calls it: no word.
-        {"auto-zoom only when due", "A: 1=0 2=100; auto; ?; due; auto",
-         "0 -1 10 2 / 0 -5 10 110 *1 *0.02 #32  "},
+        {"auto-zoom only when due", "A: 1=0 2=100; auto; ?; due; auto"},
         // The curve would need 1/50,000: the height stops at 128 times the fixture's, padded.
-        {"auto-zoom clamps at 1/128", "A: 1=0 2=100000; due; auto",
-         "0 -12.8 10 281.6 *1 *0.0078125 #128  "},
-        {"reset zoom", "zoom 2 4; draw; pan -80 -40; clear; reset",
-         "0 -1 10 2 *1 *1 #1 !1800 >0.5 "},
-        {"reset pan keeps the zoom", "zoom 1 2; draw; pan 0 -40; clear; resetpan",
-         "0 -1 10 1 *1 *2 #0.5 !1800 "},
+        {"auto-zoom clamps at 1/128", "A: 1=0 2=100000; due; auto"},
+        {"reset zoom", "zoom 2 4; draw; pan -80 -40; clear; reset"},
+        {"reset pan keeps the zoom", "zoom 1 2; draw; pan 0 -40; clear; resetpan"},
         // 5.0031 s lies at 400.248 px: it snaps back to the pixel at 400.
         {"conversions through the last frame",
-         "screen 5 0; world 800 400; size 80 40; snap 5.0031 0",
-         "400 200 / 10 1 / 1 0.2 / 5 0 / 0 -1 10 2 *1 *1 #1  "},
+         "screen 5 0; world 800 400; size 80 40; snap 5.0031 0"},
         // The zoom shows only when drawn, and has every curve fetched again.
         {"a zoom is seen once drawn",
-         "A: 1=0; clean; zoom 1 2; screen 5 .5; dirty; draw; screen 5 .5",
-         "400 300 / dirty / 400 400 / 0 -0.5 10 1 *1 *2 #0.5 !1800 "},
-        {"drawable pixels, twice as many at a backing scale of 2", "scale 2; screen 5 0",
-         "800 400 / 0 -1 10 2 *1 *1 #1  "},
+         "A: 1=0; clean; zoom 1 2; screen 5 .5; dirty; draw; screen 5 .5"},
+        {"drawable pixels, twice as many at a backing scale of 2", "scale 2; screen 5 0"},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
@@ -145,13 +130,14 @@ TEST_F(ViewVolume, operations__table) {
         SetUp();
         view.resetZoom();  // the view outlives the fixture's set-up
         recorder.clearCalls();
-        EXPECT_EQ(run(c.script), c.want);
+        EXPECT_TRUE(tests_support::matchesBaselineBlock("volume", c.what, run(c.script) + "\n",
+                                                        "src/view/tests/baselines"));
     }
 }
 
 // Before the first frame conversions are not numbers, and snapping invents none; a change of
-// tool redraws and posts its word; a view going detaches from its controller.
-TEST_F(ViewVolume, no_frame_a_tool_change_and_destruction) {
+// tool redraws and posts its word.
+TEST_F(ViewVolume, no_frame_and_a_tool_change) {
     TQCurveEditorViewBase fresh;
     fresh.setViewHost(&viewHost);
     fresh.setCurrentViewVolume(CGRectMake(0, 0, 1, 1));
@@ -164,12 +150,6 @@ TEST_F(ViewVolume, no_frame_a_tool_change_and_destruction) {
     ctrl().setCurrentTool(TQTool::kBox);
     EXPECT_EQ(std::pair(recorder.bracketText(), viewHost.redrawRequests()),
               std::pair(std::string("!4000008"), 1));
-    auto doomed = std::make_unique<TQCurveEditorViewBase>();
-    doomed->setController(&ctrl());
-    ctrl().setView(doomed.get());
-    doomed.reset();
-    EXPECT_EQ(ctrl().getView(), nullptr) << "the controller must not keep a dangling view";
-    ctrl().setView(&view);
 }
 
 }  // namespace
