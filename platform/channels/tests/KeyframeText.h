@@ -96,7 +96,10 @@ public:
             {"near?",
              [&] {
                  const auto found = [&](bool ok, const CMTime& t) {
-                     ok ? read << " " << S(t) : read << " -";
+                     if (ok)
+                         read << " " << S(t);
+                     else
+                         read << " -";
                  };
                  CMTime p = t0, pe = t0, n = t0, ne = t0, h = t0, same = t0;
                  read << "before";
@@ -144,8 +147,7 @@ public:
 private:
     std::string label(TQKeyframeHandle h) {
         if (!h) return "-";
-        const auto [it, added] = letters.try_emplace(h, char('a' + letters.size()));
-        return std::string(1, it->second);
+        return std::string(1, letters.try_emplace(h, char('a' + letters.size())).first->second);
     }
     // keyText with handles, each keyframe led by its letter.
     std::string table() {
