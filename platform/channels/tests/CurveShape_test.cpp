@@ -4,10 +4,12 @@
 
 #include <algorithm>
 #include <cmath>
+#include <sstream>
 #include <vector>
 
 #include "platform/channels/TQChannelTypes.h"
 #include "platform/channels/testing/CurveCatalogue.h"
+#include "tests/support/TextBaseline.h"
 
 using namespace curve_catalogue;
 
@@ -27,29 +29,20 @@ std::unique_ptr<TQChannel> segment(unsigned interpolation) {
 }
 
 TEST(CurveShape, everyCode__theShapeOfItsSegment) {
-    const double e = std::expm1(4.0);  // the exponential shapes reach half their rise at 0.83
-    const struct {
-        unsigned code;
-        double quarter, half, threeQuarters;
-    } shapes[] = {
-        {kTQInterpolationConstant, 0.0, 0.0, 0.0},
-        {kTQInterpolationLinear, 2.5, 5.0, 7.5},
-        {kTQInterpolationEaseBoth, 1.5625, 5.0, 8.4375},    // flat at both ends
-        {kTQInterpolationEaseOut, 1.09375, 3.75, 7.03125},  // flat at the start
-        {kTQInterpolationEaseIn, 2.96875, 6.25, 8.90625},   // flat at the end
-        {kTQInterpolationExp, 10 * std::expm1(1.0) / e, 10 * std::expm1(2.0) / e,
-         10 * std::expm1(3.0) / e},
-        {kTQInterpolationLog, 10 - 10 * std::expm1(3.0) / e, 10 - 10 * std::expm1(2.0) / e,
-         10 - 10 * std::expm1(1.0) / e},
-    };
-    for (const auto& s : shapes) {
-        auto c = segment(s.code);
-        EXPECT_NEAR(at(*c, 0.25), s.quarter, 1e-9) << "code " << s.code;
-        EXPECT_NEAR(at(*c, 0.5), s.half, 1e-9) << "code " << s.code;
-        EXPECT_NEAR(at(*c, 0.75), s.threeQuarters, 1e-9) << "code " << s.code;
-        EXPECT_EQ(at(*c, 1.0), 10.0) << "code " << s.code;
+    // Each shape at a quarter, a half, three quarters, just short of the end and at the end, in
+    // baselines/segment-shapes.txt: eases flat at the ends they name, the exponential shapes
+    // reaching half their rise at 0.83, a step held to the next keyframe.
+    std::ostringstream shapes;
+    shapes.precision(12);
+    for (const unsigned code : {kTQInterpolationConstant, kTQInterpolationLinear,
+                                kTQInterpolationEaseBoth, kTQInterpolationEaseOut,
+                                kTQInterpolationEaseIn, kTQInterpolationExp, kTQInterpolationLog}) {
+        shapes << code << ":";
+        for (double t : {0.25, 0.5, 0.75, 0.999999, 1.0}) shapes << " " << at(*segment(code), t);
+        shapes << "\n";
     }
-    EXPECT_EQ(at(*segment(kTQInterpolationConstant), 0.999999), 0.0) << "held to the next keyframe";
+    EXPECT_TRUE(tests_support::matchesBaseline("segment-shapes", shapes.str(),
+                                               "platform/channels/tests/baselines"));
     // Catmull-Rom: through every keyframe with the slope of the chord through its neighbours.
     auto cr = makeChannel("cr");
     const double values[] = {0.0, 4.0, 1.0, 7.0, 3.0};

@@ -1,8 +1,11 @@
 // Channel trees: folders, object roots, compounds and the typed channels.
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <memory>
 #include <numbers>
+#include <sstream>
+#include <string>
 #include <type_traits>
 #include <typeinfo>
 #include <vector>
@@ -12,6 +15,7 @@
 #include "platform/channels/TQFactory.h"
 #include "platform/channels/testing/CurveCatalogue.h"
 #include "platform/channels/tests/KeyframeText.h"
+#include "tests/support/TextBaseline.h"
 
 namespace {
 
@@ -350,78 +354,89 @@ protected:
     RecordingObserver observer;
 };
 
-TEST_F(TreeCompoundTest, linkedEdits__reachEveryComponentInChildOrderUnlinkedOnlyTheTouchedOne) {
+// Compound edits, each a row run on the compound: a step names a component by its index ("s"
+// a stranger outside the compound, "-" none) and gives times as the call takes them (adds and
+// moves on the axis, deletes and interpolations in channel time); "=V" is a value to move
+// with, "held" the handle the last "hold" step looked up. The record has a line a step: every
+// component's keyframes and the stranger's, then the components announced by id.
+struct CompoundEdit {
+    const char* name;
+    const char* script;
+};
+
+void PrintTo(const CompoundEdit& e, std::ostream* os) { *os << e.name; }
+
+class TreeCompoundEdits : public TreeCompoundTest,
+                          public ::testing::WithParamInterface<CompoundEdit> {};
+
+TEST_P(TreeCompoundEdits, edit__as_recorded) {
     EXPECT_EQ(compound.getComponents(), components);
-    EXPECT_EQ(compound.numberOfComponents(), 3u);
-    compound.addKeyframe(components[1], seconds(4), true);  // axis 4 s = channel 3 s
-    EXPECT_EQ(keys(), "1=10 2=0 3=0 | 1=20 2=0 3=0 | 1=30 2=0 3=0") << "valued from each curve";
-    EXPECT_EQ(observer.told,
-              (std::vector<TQChannelBase*>{components[0], components[1], components[2]}))
-        << "each component is announced, in child order";
-    compound.addKeyframe(components[1], seconds(5.5), false);
-    compound.addKeyframe(components[0], seconds(2), true);  // channel 1 s: taken everywhere
-    EXPECT_EQ(observer.told.size(), 4u) << "nothing to add, nothing announced";
-    EXPECT_EQ(keys(), "1=10 2=0 3=0 | 1=20 2=0 3=0 4.5=0 | 1=30 2=0 3=0");
-
-    const double newValue = 99.0;
-    bool collided = true;
-    compound.moveKeyframe(components[0], seconds(2), seconds(2.5), &newValue, &collided, true);
-    EXPECT_FALSE(collided);
-    EXPECT_EQ(keys(), "1.5=99 2=0 3=0 | 1.5=20 2=0 3=0 4.5=0 | 1.5=30 2=0 3=0")
-        << "each found at the target, the touched one with the new value";
-    compound.moveKeyframe(components[2], seconds(2.5), seconds(3), nullptr, &collided, false);
-    EXPECT_TRUE(collided) << "moved onto the keyframe at channel 2 s";
-    EXPECT_EQ(keys(), "1.5=99 2=0 3=0 | 1.5=20 2=0 3=0 4.5=0 | 2=0 2=30 3=0")
-        << "both stay until a purge";
-    observer.told.clear();
-    compound.moveKeyframe(components[1], seconds(5.5), seconds(6), nullptr, nullptr, true);
-    EXPECT_EQ(observer.told, std::vector<TQChannelBase*>{components[1]})
-        << "a component without a keyframe there is neither moved nor announced";
-    compound.moveKeyframe(components[1], seconds(6), seconds(5.5), nullptr, nullptr, true);
-    compound.deleteKeyframe(components[0], seconds(2), false);
-    compound.deleteKeyframe(components[1], seconds(3), true);
-    EXPECT_EQ(keys(), "1.5=99 | 1.5=20 2=0 4.5=0 | 2=0 2=30") << "deletes take channel times";
-
-    // The compound's own link flag links whatever the caller asks.
-    compound.setLinked(true);
-    compound.addKeyframe(components[1], seconds(7), false);
-    compound.deleteKeyframe(components[0], seconds(1.5), false);
-    EXPECT_EQ(keys(), "6=99 | 2=0 4.5=0 6=0 | 2=0 2=30 6=30");
-}
-
-TEST_F(TreeCompoundTest,
-       interpolationAndStrangers__lockedOutComponentsAndForeignOrNullOnesChangeNothing) {
-    components[2]->setFlag(kTQChannelFlagNoInterpolationChange, false);
-    components[1]->setTimeOffset(
-        seconds(0.5));  // its own offset: the same instant is 0.5 s earlier
-    components[1]->setKeyframe(seconds(0.5), 7.0);
-    TQKeyframeHandle h = components[0]->getKeyframe(seconds(1));
-    compound.setLinkedInterpolation(components[0], h, kTQInterpolationExp, true);
-    EXPECT_EQ(keys(), "1=10/13 2=0 | 0.5=7/13 1=20 2=0 | 1=30 2=0") << "the same instant in each";
-    compound.setLinkedInterpolation(components[1], components[1]->getKeyframe(seconds(1)),
-                                    kTQInterpolationLinear, false);
-    compound.deleteKeyframe(components[1], seconds(0.5), true);
-    EXPECT_EQ(keys(), "2=0 | 1=20/1 2=0 | 2=0") << "its 0.5 s is the others' 1 s";
-    observer.told.clear();
-    compound.setLinkedCurveInterpolation(kTQInterpolationCatmullRom);
-    EXPECT_EQ(keys(), "2=0/6 | 1=20/6 2=0/6 | 2=0") << "except where changes are refused";
-    EXPECT_EQ(observer.told, (std::vector<TQChannelBase*>{components[0], components[1]}));
-
-    observer.told.clear();
-    components[0]->deleteKeyframe(h);
-    compound.setLinkedInterpolation(components[0], h, kTQInterpolationConstant, true);
+    EXPECT_TRUE(compound.isCompoundChannel() && !TQChannelFolder("F", 1).isCompoundChannel());
     TQChannel stranger("Stranger", 1);
     stranger.setKeyframe(seconds(1), 1.0);
-    compound.deleteKeyframe(&stranger, seconds(1), true);
-    compound.addKeyframe(nullptr, seconds(4), true);
-    compound.moveKeyframe(&stranger, seconds(2), seconds(4), nullptr, nullptr, true);
-    compound.setLinkedInterpolation(&stranger, stranger.getKeyframe(seconds(1)),
-                                    kTQInterpolationLinear, true);
-    compound.addKeyframe(components[0], kCMTimeInvalid, true);
-    EXPECT_TRUE(observer.told.empty()) << "a stale handle, a stranger or no time changes nothing";
-    EXPECT_EQ(keyText(stranger), "1=1");
-    EXPECT_EQ(keys(), "2=0/6 | 1=20/6 2=0/6 | 2=0");
-    EXPECT_TRUE(compound.isCompoundChannel() && !TQChannelFolder("F", 1).isCompoundChannel());
+    tests_support::StepArgs a;
+    TQKeyframeHandle held = nullptr;
+    bool collided = false;
+    const auto C = [&](size_t i) -> TQChannel* {
+        if (a.word(i) == "-") return nullptr;
+        return a.word(i) == "s" ? &stranger : components.at(size_t(a.number(i)));
+    };
+    const auto T = [&](size_t i) { return seconds(a.number(i)); };
+    const auto linked = [&] { return a.words.back() == "linked"; };
+    const auto H = [&](size_t i) { return a.word(i) == "held" ? held : C(0)->getKeyframe(T(i)); };
+    const tests_support::Steps steps = {
+        {"add", [&] { compound.addKeyframe(C(0), T(1), linked()); }},
+        {"move",
+         [&] {
+             const double value = std::strtod(a.word(3).c_str() + 1, nullptr);
+             compound.moveKeyframe(C(0), T(1), T(2), a.word(3)[0] == '=' ? &value : nullptr,
+                                   &collided, linked());
+         }},
+        {"del", [&] { compound.deleteKeyframe(C(0), T(1), linked()); }},
+        {"interp",
+         [&] { compound.setLinkedInterpolation(C(0), H(1), unsigned(a.number(2)), linked()); }},
+        {"curveinterp", [&] { compound.setLinkedCurveInterpolation(unsigned(a.number(0))); }},
+        {"link", [&] { compound.setLinked(a.number(0) != 0); }},
+        {"hold", [&] { held = H(1); }},
+        {"key", [&] { C(0)->setKeyframe(T(1), a.number(2)); }},
+        {"shift", [&] { C(0)->setTimeOffset(T(1)); }},
+        {"nointerp", [&] { C(0)->setFlag(kTQChannelFlagNoInterpolationChange, false); }},
+    };
+    std::string record;
+    std::istringstream in(GetParam().script);
+    for (std::string step; std::getline(in, step, ';');) {
+        observer.told.clear();
+        collided = false;
+        tests_support::runSteps(step, a, steps);
+        record += step.substr(step.find_first_not_of(' ')) + ": " + keys() + " | s " +
+                  keyText(stranger) + (collided ? " collided" : "") + ";";
+        for (const TQChannelBase* c : observer.told)
+            record += " " + (c == &stranger ? "s" : std::to_string(c->getChannelId()));
+        record += "\n";
+    }
+    EXPECT_TRUE(tests_support::matchesBaselineBlock("compound-edits", GetParam().name, record,
+                                                    "platform/channels/tests/baselines"));
 }
+
+INSTANTIATE_TEST_SUITE_P(
+    Channels, TreeCompoundEdits,
+    ::testing::Values(
+        // Linked edits reach every component in child order, valued from each curve, the one
+        // touched with the value given; unlinked only the touched one; a component without a
+        // keyframe there is neither moved nor announced; keyframes met both stay until a purge.
+        // The compound's own link flag links whatever the caller asks.
+        CompoundEdit{"linked",
+                     "add 1 4 linked; add 1 5.5; add 0 2 linked; "
+                     "move 0 2 2.5 =99 linked; move 2 2.5 3; move 1 5.5 6 linked; "
+                     "move 1 6 5.5 linked; del 0 2; del 1 3 linked; link 1; add 1 7; "
+                     "del 0 1.5"},
+        // The same instant in each component, whatever its own offset, except where changes
+        // of interpolation are refused; a stale handle, a stranger, no component or no time
+        // changes nothing.
+        CompoundEdit{"interpolationAndStrangers",
+                     "nointerp 2; shift 1 0.5; key 1 0.5 7; hold 0 1; interp 0 1 13 linked; "
+                     "interp 1 1 1; del 1 0.5 linked; curveinterp 6; interp 0 held 0 linked; "
+                     "del s 1 linked; add - 4 linked; move s 2 4 linked; interp s 1 1 linked; "
+                     "add 0 nan linked"}));
 
 }  // namespace

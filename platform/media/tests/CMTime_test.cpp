@@ -1,8 +1,8 @@
-// Media time arithmetic as cases "A op B = R" (or "f of A = R"), separated by ";", in a small
-// notation of times: "7/12" value/timescale, "7/12~" flagged rounded, "5/1@3" of epoch 3, "1/0"
+// Media time arithmetic as cases "A op B" (or "f of A"), separated by ";", each answer recorded
+// after its case in baselines/arithmetic.txt. Times in a small notation: "7/12" value/timescale, "7/12~" flagged rounded, "5/1@3" of epoch 3, "1/0"
 // valid but without a timescale, "+inf", "-inf", "indef", "inval" (the all-zero time), and MAX
-// and MIN for the extremes of a 64-bit value. Times are compared field by field, so a lost or
-// spurious flag shows.
+// and MIN for the extremes of a 64-bit value. Answers show every field, so a lost or spurious
+// flag shows.
 #include "platform/media/CMTime.h"
 
 #include <gtest/gtest.h>
@@ -12,6 +12,8 @@
 #include <map>
 #include <sstream>
 #include <string>
+
+#include "tests/support/TextBaseline.h"
 
 namespace {
 
@@ -48,10 +50,9 @@ std::string text(const CMTime& t) {
 
 std::string text(double v) { return (std::ostringstream() << v).str(); }
 
-// "A +- B = S D c" checks the sum S, the difference D and the order c of A and B (and -c of B
-// and A) at once. Times of the expected answer are compared by their text; an unknown
-// operation throws.
-void expectCases(const std::string& cases) {
+// Each case with its answer, "A +- B = S D c" giving the sum S, the difference D and the order
+// c of A and B (and -c of B and A) at once; an unknown operation throws.
+std::string cases(const std::string& cases) {
     using S = const std::string&;
     const auto T = timeOf;
     const auto x = [](S s) { return std::stod(s); };
@@ -82,70 +83,57 @@ void expectCases(const std::string& cases) {
              return text(double(CMTimeRangeContainsTime(range, T(a))));
          }}};
     std::istringstream all(cases);
+    std::string record;
     for (std::string line; std::getline(all, line, ';');) {
         std::istringstream in(line);
-        std::string a, op, b, eq, want, token;
-        in >> a >> op >> b >> eq;
-        while (in >> token)
-            (want += want.empty() ? "" : " ") += isTime(token) ? text(T(token)) : token;
-        if (op == "of") std::swap(a, op);
-        EXPECT_EQ(ops.at(op)(a, b), want) << line;
+        std::string a, op, b;
+        in >> a >> op >> b;
+        const std::string answer = ops.at(op == "of" ? a : op)(op == "of" ? op : a, b);
+        record += line.substr(line.find_first_not_of(' ')) + " = " + answer + "\n";
     }
+    return record;
 }
 
 TEST(CMTimeArithmetic, everyOperation__exactRoundedSaturatedAndNonNumeric) {
-    expectCases(
-        "1/3 +- 1/4 = 7/12 1/12 1; 1/2 +- 131072/262144 = 262144/262144 0/262144 0; "
-        "262144/262144 +- 1001/30000 = 507920384/491520000 475119616/491520000 1; "
-        // Above a timescale of 1e9 the sum is rounded into it, and exact there when it can be.
-        "1/262144 +- 1/1000000007 = 3816/1000000000~ 3814/1000000000~ 1; "
-        "1/2 +- 6/1200000000 = 500000005/1000000000 499999995/1000000000 1; "
-        "1/2000000000 +- 1/2000000000 = 1/1000000000 0/1000000000 0; "
-        // Too wide for 64 bits: the timescale halves, then the result saturates.
-        "MAX/2 +- MAX/2 = MAX/1 0/2 0; MAX/3 +- MAX/3 = 6148914691236517205/1~ 0/3 0; "
-        "MAX/1 +- -1/1 = 9223372036854775806/1 +inf 1; MIN/1 +- -1/1 = -inf -MAX/1 -1; "
-        "5/1@1 +- 5/1@2 = inval inval -1; 5/1 +- 5/1@3 = 10/1@3 0/1@3 -1; "
-        "5/1 +- +inf = +inf -inf -1; +inf +- 5/1 = +inf +inf 1; -inf +- 5/1 = -inf -inf -1; "
-        "+inf +- +inf = +inf inval 0; -inf +- -inf = -inf inval 0; +inf +- -inf = inval +inf 1; "
-        "-inf +- +inf = inval -inf -1; indef +- 5/1 = indef indef 1; "
-        "5/1 +- indef = indef indef -1; indef +- +inf = +inf -inf -1; indef +- -inf = -inf +inf 1; "
-        "indef +- indef = indef indef 0; inval +- +inf = inval inval 1; "
-        "indef +- inval = inval inval -1; inval +- 5/1 = inval inval 1; "
-        "5/1 +- 1/0 = inval inval 1; 1/0 +- 5/1 = inval inval -1; 3/4~ +- 1/4 = 4/4~ 2/4~ 1; "
-        // Of equal times the first is the minimum and the maximum; |INT64_MIN| does not fit.
-        "1/2 min 2/4 = 1/2; 2/4 max 1/2 = 2/4; abs of MIN/1 = +inf; abs of -3/4~ = 3/4~; "
-        "abs of -inf = +inf; abs of -5/0 = -5/0; "
-        // Scaling keeps the time's timescale, rounds to nearest and saturates.
-        "3/10 * 2.5 = 8/10~; 8/10~ * 2 = 16/10~; 3/10 *u 4 = 12/10; "
-        "1/10 *u 3000000000 = 3000000000/10; 1/2 * 3/1 = 3/2; 1/2 * indef = inval; "
-        "1/2 * nan = inval; +inf * -2 = -inf; +inf * 0 = indef; 0/1 * inf = indef; "
-        "-1/1 * inf = -inf; 4611686018427387903/1 * 3 = +inf; 5/1 * 1 = 5/1; MAX/2 *i 2 = MAX/1; "
-        "MAX/1 *i -3 = -inf; -inf *i 0 = indef; indef *i 3 = indef; 12/10 / 4 = 3/10; "
-        "10/4 / 4 = 3/4~; 6/1 / 3/2 = 4/1; 6/1 / 0 = inval; 6/1 / 0/1 = inval; 6/1 / +inf = inval; "
-        "2/1 / nan = inval; 2/1 / inf = 0/1; +inf / -3 = -inf; MAX/1 / 0.5 = +inf; "
-        "-MAX/1 / 0.5 = -inf; inval / 2 = inval; 1/3 -> 262144 = 87381/262144~; "
-        "1/2 -> 262144 = 131072/262144; 1/2 -> 0 = inval; +inf -> 600 = +inf; MAX/1 -> 2 = +inf; "
-        // The safer forms count an invalid operand (what a missing host answers) as zero.
-        "inval ++ 5/10 = 5/10; 5/10 ++ inval = 5/10; inval -- 2/1 = -2/1; inval ++ inval = inval; "
-        "inval -- inval = inval; +inf ++ inval = +inf; 0/1 -- +inf = -inf; +inf -- +inf = inval; "
-        // Floor to a sample duration, in the duration's timescale.
-        "-1/3 floor 1/24 = -8/24; -35/100 floor 1/24 = -9/24; 35/100 floor 1/24 = 8/24; "
-        "1/1 floor 1001/30000 = 29029/30000; -262144/262144 floor 1001/30000 = -30030/30000; "
-        "3/1 floor 2/4 = 12/4; 7/10 floor 0/1 = 7/10; 7/10 floor -1/24 = 7/10; "
-        "7/10 floor +inf = 7/10; 7/10 floor inval = 7/10; -inf floor 1/24 = -inf; "
-        "inval floor 1/24 = inval; "
-        // Seconds to a channel time, rounded to nearest, halves away from zero.
-        "1.5 in 262144 = 393216/262144; 0.3333333333333333 in 262144 = 87381/262144~; "
-        "9.5367431640625e-06 in 262144 = 3/262144~; -9.5367431640625e-06 in 262144 = -3/262144~; "
-        "-0 in 262144 = 0/262144; 3e13 in 262144 = 7864320000000000000/262144; "
-        "1e20 in 262144 = +inf; -1e20 in 262144 = -inf; -inf in 262144 = -inf; "
-        "nan in 262144 = inval; 1 in 0 = inval; 1 in -600 = inval; "
-        // And back, ranges (start inside, end outside) and decibels (by magnitude).
-        "seconds of -3/4 = -0.75; seconds of +inf = inf; seconds of -inf = -inf; "
-        "seconds of inval = nan; seconds of indef = nan; seconds of 1/0 = nan; "
-        "1/1 within 1/1,1/2 = 1; 1499/1000 within 1/1,1/2 = 1; 3/2 within 1/1,1/2 = 0; "
-        "999/1000 within 1/1,1/2 = 0; 0/1 within inval,inval = 0; dB of 0.5 = -6.0206; "
-        "dB of -10 = 20; dB of -0 = -inf");
+    EXPECT_TRUE(tests_support::matchesBaseline(
+        "arithmetic",
+        cases(
+            "1/3 +- 1/4; 1/2 +- 131072/262144; 262144/262144 +- 1001/30000; "
+            // Above a timescale of 1e9 the sum is rounded into it, and exact there when it can be.
+            "1/262144 +- 1/1000000007; 1/2 +- 6/1200000000; 1/2000000000 +- 1/2000000000; "
+            // Too wide for 64 bits: the timescale halves, then the result saturates.
+            "MAX/2 +- MAX/2; MAX/3 +- MAX/3; MAX/1 +- -1/1; MIN/1 +- -1/1; 5/1@1 +- 5/1@2; "
+            "5/1 +- 5/1@3; 5/1 +- +inf; +inf +- 5/1; -inf +- 5/1; +inf +- +inf; -inf +- -inf; "
+            "+inf +- -inf; -inf +- +inf; indef +- 5/1; 5/1 +- indef; indef +- +inf; indef +- -inf; "
+            "indef +- indef; inval +- +inf; indef +- inval; inval +- 5/1; 5/1 +- 1/0; 1/0 +- 5/1; "
+            "3/4~ +- 1/4; "
+            // Of equal times the first is the minimum and the maximum; |INT64_MIN| does not fit.
+            "1/2 min 2/4; 2/4 max 1/2; abs of MIN/1; abs of -3/4~; abs of -inf; abs of -5/0; "
+            // Scaling keeps the time's timescale, rounds to nearest and saturates.
+            "3/10 * 2.5; 8/10~ * 2; 3/10 *u 4; 1/10 *u 3000000000; 1/2 * 3/1; 1/2 * indef; 1/2 * "
+            "nan; "
+            "+inf * -2; +inf * 0; 0/1 * inf; -1/1 * inf; 4611686018427387903/1 * 3; 5/1 * 1; "
+            "MAX/2 *i 2; MAX/1 *i -3; -inf *i 0; indef *i 3; 12/10 / 4; 10/4 / 4; 6/1 / 3/2; 6/1 / "
+            "0; "
+            "6/1 / 0/1; 6/1 / +inf; 2/1 / nan; 2/1 / inf; +inf / -3; MAX/1 / 0.5; -MAX/1 / 0.5; "
+            "inval / 2; 1/3 -> 262144; 1/2 -> 262144; 1/2 -> 0; +inf -> 600; MAX/1 -> 2; "
+            // The safer forms count an invalid operand (what a missing host answers) as zero.
+            "inval ++ 5/10; 5/10 ++ inval; inval -- 2/1; inval ++ inval; inval -- inval; "
+            "+inf ++ inval; 0/1 -- +inf; +inf -- +inf; "
+            // Floor to a sample duration, in the duration's timescale.
+            "-1/3 floor 1/24; -35/100 floor 1/24; 35/100 floor 1/24; 1/1 floor 1001/30000; "
+            "-262144/262144 floor 1001/30000; 3/1 floor 2/4; 7/10 floor 0/1; 7/10 floor -1/24; "
+            "7/10 floor +inf; 7/10 floor inval; -inf floor 1/24; inval floor 1/24; "
+            // Seconds to a channel time, rounded to nearest, halves away from zero.
+            "1.5 in 262144; 0.3333333333333333 in 262144; 9.5367431640625e-06 in 262144; "
+            "-9.5367431640625e-06 in 262144; -0 in 262144; 3e13 in 262144; 1e20 in 262144; "
+            "-1e20 in 262144; -inf in 262144; nan in 262144; 1 in 0; 1 in -600; "
+            // And back, ranges (start inside, end outside) and decibels (by magnitude).
+            "seconds of -3/4; seconds of +inf; seconds of -inf; seconds of inval; seconds of "
+            "indef; "
+            "seconds of 1/0; 1/1 within 1/1,1/2; 1499/1000 within 1/1,1/2; 3/2 within 1/1,1/2; "
+            "999/1000 within 1/1,1/2; 0/1 within inval,inval; dB of 0.5; dB of -10; dB of -0"),
+        "platform/media/tests/baselines"));
     EXPECT_TRUE(timeOf("1/2") == timeOf("2/4")) << "operator== compares the times, not the fields";
     EXPECT_FALSE(CMTimeIdentical(timeOf("1/2"), timeOf("2/4")));
     EXPECT_TRUE(timeOf("-1/2") < kCMTimeZero);
