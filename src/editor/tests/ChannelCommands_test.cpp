@@ -1,136 +1,223 @@
-// The animation menu's commands on whole channels, run on two selected channels of the sample
-// piece through the reference host: the channels end as an edited copy of them, in one undo
-// step under the command's name that undo and redo walk exactly; the playhead's jumps to the
-// next and previous keyframe; the interpolation step left open on purpose, which the host
-// closes so that undo goes on.
+// The commands on whole channels and the keypoint clipboard, on two selected channels of one
+// kind of the sample piece through the reference host. Each edit is a row run on a fresh
+// piece: both channels as text, the host's brackets, the undo steps, the playhead and the
+// keypoints selected after it are held in a recorded baseline (baselines/channel_edits.txt,
+// see TextBaseline.h); every row is undone to the very channels it started from and redone to
+// the ones it made. Beside the rows: the menus' ticks, what the pasteboard holds that is not
+// ours or is damaged, and which items are enabled.
 
-#include <functional>
+#include <sstream>
+#include <string>
 
+#include "platform/channels/TQChannelTypes.h"
 #include "src/editor/tests/EditorFixture.h"
 #include "src/resources/TQStrings.h"
+#include "tests/support/StepScript.h"
+#include "tests/support/TextBaseline.h"
 
 using namespace editor_test;
 
 namespace {
 
-class ChannelCommands : public EditorFixture {
+class TwoChannels : public EditorFixture {
 protected:
     void SetUp() override {
         EditorFixture::SetUp();
         host.selectObject(object(kTQHostSampleTitleObject));
         ctrl.showAll();
-        const TQCurveSetPtr set = ctrl.selectedCurveSet();
-        ASSERT_TRUE(set);
-        // The first two plain channels of the object, with keyframes of our own.
-        for (uint32_t i = 0; i < set->numberOfChannelItems() && items.size() < 2; ++i) {
-            const TQCurveEditorItemPtr item = set->channeItemAtIndex(i);
-            TQChannel* c = item->channel();
-            if (!c || c->isLocked(true) || c->testFlag(kTQChannelFlagNoInterpolationChange))
+        // The first two unlocked channels of one kind whose interpolation may change.
+        for (const TQCurveEditorItemPtr& item : ctrl.selectedCurveSet()->allItems()) {
+            auto channelItem = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(item);
+            TQChannel* c = channelItem ? channelItem->channel() : nullptr;
+            if (!c || c->isLocked(true) || dynamic_cast<TQChannelFixedInterpolation*>(c) ||
+                c->testFlag(kTQChannelFlagNoInterpolationChange))
                 continue;
-            items.push_back(std::dynamic_pointer_cast<TQCurveEditorChannelItem>(item));
+            if (!itemA)
+                itemA = channelItem;
+            else if (!itemB && TQChannelKind(*c) == TQChannelKind(*a()))
+                itemB = channelItem;
         }
-        ASSERT_EQ(items.size(), 2u);
-        key(*a(), {{1, 1}, {2, 3}, {3, 2}});
-        key(*b(), {{0.5, 10}, {4, 20}});
-        for (const auto& item : items) {
-            item->select(1);
-            item->setOriginalCurveDirty(0);
-        }
+        ASSERT_TRUE(itemA && itemB);
+        key(*a(), "1=1 2=3 3=2");
+        key(*b(), "0.5=10 4=20");
+        for (const auto& item : {itemA, itemB}) item->select(1);
         host.undoStack().clear();
         recorder.clearCalls();
     }
-    static void key(TQChannel& c, std::initializer_list<std::pair<double, double>> keys) {
+    // Keyframes from text, "t=v" each, with "(inU,inV|outU,outV)" for broken handles and "s"
+    // for scaled ones.
+    static void key(TQChannel& c, const std::string& text) {
         c.deleteAllKeyframes(kCMTimeZero);
-        for (const auto& [t, v] : keys) c.setKeyframe(sec(t), v);
+        std::istringstream in(text);
+        for (std::string k; in >> k;) {
+            const size_t eq = k.find('='), open = k.find('(');
+            const TQKeyframeHandle h =
+                c.setKeyframe(sec(std::stod(k)), std::stod(k.substr(eq + 1)));
+            if (open == k.npos) continue;
+            double t[4];
+            char sep = 0;
+            std::istringstream(k.substr(open + 1)) >> t[0] >> sep >> t[1] >> sep >> t[2] >> sep >>
+                t[3];
+            c.setKeyframeInterpolation(h, kTQInterpolationBezier);
+            c.setKeyframeTangentsBroken(h, true);
+            c.setKeyframeTangentsScaled(h, k.back() == 's');
+            c.setKeyframeInputTangents(h, t[0], t[1]);
+            c.setKeyframeOutputTangents(h, t[2], t[3]);
+        }
     }
-    TQChannel* a() const { return items[0]->channel(); }
-    TQChannel* b() const { return items[1]->channel(); }
-    bool channelsAre(const Copy& wantA, const Copy& wantB) const {
-        return *a() == *wantA && *b() == *wantB;
-    }
-    bool run(const char* action, int64_t tag = 0) {
+    TQChannel* a() const { return itemA->channel(); }
+    TQChannel* b() const { return itemB->channel(); }
+    TQChannel* named(const std::string& letter) const { return letter == "A" ? a() : b(); }
+    bool perform(const std::string& action, int64_t tag = 0) {
         RWMenuItem sender(action, action);
         sender.setTag(tag);
         return ctrl.performAction(action, sender);
     }
+    bool enabled(const char* action) {
+        RWMenuItem item(action, action);
+        return ctrl.validateMenuItem(item);
+    }
+    bool enabled(const RWMenuPtr& menu, int64_t index) {
+        return ctrl.validateMenuItem(*menu->itemAtIndex(index));
+    }
 
-    std::vector<TQCurveEditorChannelItemPtr> items;
+    TQCurveEditorChannelItemPtr itemA, itemB;
 };
 
-TEST_F(ChannelCommands, each_command__one_named_step_that_undo_and_redo_walk_exactly) {
-    struct Row {
-        const char* action;
-        int64_t tag;
-        const char* undoKey;
-        std::function<void(TQChannel&)> change;
-    };
-    const CMTime now = sec(2);
-    const Row rows[] = {
-        {"animMenuSetCurveInterpolation:", kTQInterpolationLinear, "Undo Set Interpolation",
-         [](TQChannel& c) { c.setInterpolation(kTQInterpolationLinear); }},
-        {"animMenuSetCurvePreExtrapolation:", kTQExtrapolationRepeat, "Undo Set Pre Extrapolation",
-         [](TQChannel& c) { c.setExtrapolation(kTQExtrapolationRepeat, kTQExtrapolationBefore); }},
-        {"animMenuSetCurvePostExtrapolation:", kTQExtrapolationPingPong,
-         "Undo Set Post Extrapolation",
-         [](TQChannel& c) { c.setExtrapolation(kTQExtrapolationPingPong, kTQExtrapolationAfter); }},
-        {"animMenuLockChannel:", 0, "Undo Lock Keypoint",
-         [](TQChannel& c) { c.setLocked(true, true); }},
-        {"animMenuDisableAnimation:", 0, "Undo Chan Menu Disable Animation",
-         [](TQChannel& c) { c.setAnimationEnabled(false); }},
-        {"animMenuAddKeyframe:", 0, "Undo Chan Menu Add Keyframe",
-         [&](TQChannel& c) { c.addKeyframe(&now); }},
-        {"animMenuDeleteKeyframe:", 0, "Undo Chan Menu Delete Keyframe",
-         [&](TQChannel& c) { c.deleteKeyframeAtTime(&now); }},
-        {"animMenuResetChannel:", 0, "Undo Chan Menu Reset Channel",
-         [](TQChannel& c) { c.reset(false); }},
-    };
-    host.setCurrentTime(now);
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.action);
-        const Copy beforeA = copyOf(a()), beforeB = copyOf(b());
-        Copy wantA = copyOf(a()), wantB = copyOf(b());
-        row.change(static_cast<TQChannel&>(*wantA));
-        row.change(static_cast<TQChannel&>(*wantB));
-        recorder.clearCalls();
+struct Edit {
+    const char* name;
+    std::string script;  // "set-up steps | the edit's steps", each ";"-separated, see run()
+};
 
-        ASSERT_TRUE(run(row.action, row.tag));
-        EXPECT_TRUE(channelsAre(wantA, wantB));
-        EXPECT_TRUE(items[0]->originalCurveDirty() && items[1]->originalCurveDirty());
-        const std::string steps = recorder.bracketText();
-        EXPECT_TRUE(steps.starts_with("{" + TQLocalizedString(row.undoKey) + " ") &&
-                    steps.ends_with(" } !8"))
-            << steps;
-        EXPECT_EQ(host.undoDescription(), TQLocalizedString(row.undoKey));
+void PrintTo(const Edit& e, std::ostream* os) { *os << e.name; }
 
-        ASSERT_TRUE(host.undo());
-        EXPECT_TRUE(channelsAre(beforeA, beforeB)) << "undo";
-        ASSERT_TRUE(host.redo());
-        EXPECT_TRUE(channelsAre(wantA, wantB)) << "redo";
-        ASSERT_TRUE(host.undo());
+class ChannelEdits : public TwoChannels, public ::testing::WithParamInterface<Edit> {
+protected:
+    // Steps: "now 2", "run action: tag", "keys A 1=0 2=1", "select A@1 A@3" (keypoints of one
+    // channel, selected in the view), "off" (neither channel selected), "alone B" (a set of
+    // its own, selected), "all", "copy", "cut", "paste", "idle" (the host's event loop),
+    // "ghost" (A's curve snapshot taken).
+    void run(const std::string& script) {
+        tests_support::StepArgs s;
+        const tests_support::Steps steps = {
+            {"now", [&] { host.setCurrentTime(sec(s.number(0))); }},
+            {"run", [&] { EXPECT_TRUE(perform(s.word(0), int64_t(s.number(1)))); }},
+            {"keys", [&] { key(*named(s.word(0)), s.rest.substr(2)); }},
+            {"select",
+             [&] {
+                 std::vector<TQKeyframeHandle> keys;
+                 for (const std::string& w : s.words)
+                     keys.push_back(
+                         named(w.substr(0, 1))->getKeyframe(sec(std::stod(w.substr(2)))));
+                 selectHandles(named(s.word(0).substr(0, 1)), keys);
+             }},
+            {"off",
+             [&] {
+                 itemA->select(0);
+                 itemB->select(0);
+             }},
+            {"alone",
+             [&] {
+                 ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("Alone"));
+                 ctrl.appendChannelToCurveSet(named(s.word(0)))->select(1);
+             }},
+            {"all", [&] { ctrl.showAll(); }},
+            {"copy", [&] { ctrl.copy(); }},
+            {"cut", [&] { ctrl.cut(); }},
+            {"paste", [&] { ctrl.paste(); }},
+            {"idle", [&] { host.eventLoopDidGoIdle(); }},
+            {"ghost",
+             [&] {
+                 ctrl.setSnapshotChannels(true);
+                 itemA->setNumberOfSamples(8);
+                 itemA->refreshOriginalCurve(kCMTimeZero, sec(0.5));
+                 itemA->takeCurveSnapshot(1);
+             }},
+        };
+        tests_support::runSteps(script, s, steps);
     }
-    // With no channel selected a step is still opened and posted.
-    for (const auto& item : items) item->select(0);
+    // A channel as keyText with handles, then its extrapolations before and after, and its
+    // lock and animation switch when they are on and off.
+    static std::string text(const TQChannel& c) {
+        return keyText(c, true) + " <" +
+               std::to_string(c.getExtrapolation(kTQExtrapolationBefore)) + ">" +
+               std::to_string(c.getExtrapolation(kTQExtrapolationAfter)) +
+               (c.isLocked(false) ? " locked" : "") + (c.isAnimationEnabled() ? "" : " still");
+    }
+};
+
+TEST_P(ChannelEdits, edit__as_recorded_and_undone_exactly) {
+    const std::string script = GetParam().script;
+    const size_t bar = script.find(" | ");
+    if (bar != script.npos) run(script.substr(0, bar));
+    host.undoStack().clear();
+    for (const auto& item : {itemA, itemB}) item->setOriginalCurveDirty(0);
+    const Copy beforeA = copyOf(a()), beforeB = copyOf(b());
     recorder.clearCalls();
-    ASSERT_TRUE(run("animMenuResetChannel:"));
-    EXPECT_EQ(recorder.bracketText(),
-              "{" + TQLocalizedString("Undo Chan Menu Reset Channel") + " } !8");
+    run(script.substr(bar == script.npos ? 0 : bar + 3));
+    const size_t steps = host.undoStack().undoCount();
+    std::string redraw;
+    for (const auto& item : {itemA, itemB})
+        redraw += item->originalCurveDirty() ? item->channel()->getName() : "";
+    EXPECT_TRUE(tests_support::matchesBaselineBlock(
+        "channel_edits", GetParam().name,
+        "A: " + text(*a()) + "\nB: " + text(*b()) + "\ncalls: " + recorder.bracketText() +
+            "\nundo: " + std::to_string(steps) + " " + host.undoDescription() +
+            "\nnow: " + std::to_string(CMTimeGetSeconds(host.currentTime())) +
+            "\nselected keypoints: " + std::to_string(view.getSelection()->size()) +
+            "\nredraw: " + redraw + "\n",
+        "src/editor/tests/baselines"));
+    const Copy afterA = copyOf(a()), afterB = copyOf(b());
+    for (size_t i = 0; i < steps; ++i) ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(*a() == *beforeA && *b() == *beforeB) << "undo";
+    for (size_t i = 0; i < steps; ++i) ASSERT_TRUE(host.redo());
+    EXPECT_TRUE(*a() == *afterA && *b() == *afterB) << "redo";
 }
 
-TEST_F(ChannelCommands, ghost__back_to_the_snapshot_and_a_channel_without_one_stays) {
-    ctrl.setSnapshotChannels(true);
-    items[0]->setNumberOfSamples(8);
-    items[0]->refreshOriginalCurve(kCMTimeZero, sec(0.5));
-    items[0]->takeCurveSnapshot(1);
-    const Copy ghost = copyOf(a());
-    key(*a(), {{5, 5}});
-    key(*b(), {{6, 6}});
-    const Copy untouched = copyOf(b());
-    ASSERT_TRUE(items[0]->snapshotChannel() && !items[1]->snapshotChannel());
-    ASSERT_TRUE(run("animMenuSetChannelToGhost:"));
-    EXPECT_TRUE(channelsAre(ghost, untouched));
-}
+// Keypoints to copy: broken handles, scaled on the last.
+const std::string kHandles =
+    "1=10(-0.25,4.5|0.4,-6.5) 2=20(-0.5,4.5|0.4,-5.5) 3=30(-0.75,4.5|0.4,-4.5)s";
+const std::string kCopied = "keys A " + kHandles + "; keys B 0.5=1; ";
 
-TEST_F(ChannelCommands, interpolation__ticks_its_item_and_skips_channels_that_refuse_it) {
+INSTANTIATE_TEST_SUITE_P(
+    Editor, ChannelEdits,
+    ::testing::Values(
+        // Each command is one step under its name on every selected channel; with none
+        // selected a step is still opened and posted.
+        Edit{"interpolation", "run animMenuSetCurveInterpolation: 1"},
+        Edit{"preExtrapolation", "run animMenuSetCurvePreExtrapolation: 3"},
+        Edit{"postExtrapolation", "run animMenuSetCurvePostExtrapolation: 2"},
+        Edit{"lock", "run animMenuLockChannel:"},
+        Edit{"disableAnimation", "run animMenuDisableAnimation:"},
+        Edit{"addKeyframe", "now 2.5 | run animMenuAddKeyframe:"},
+        Edit{"deleteKeyframe", "now 2 | run animMenuDeleteKeyframe:"},
+        Edit{"reset", "run animMenuResetChannel:"},
+        Edit{"resetNoneSelected", "off | run animMenuResetChannel:"},
+        // Back to the snapshot; a channel without one stays.
+        Edit{"ghost", "ghost; keys A 5=5; keys B 6=6 | run animMenuSetChannelToGhost:"},
+        // The mixed interpolation's step is left open for the host to close when idle; an
+        // empty step leaves no trace. A lock closed so is one step that undo walks.
+        Edit{"mixedInterpolationClosedWhenIdle", "run animMenuSetCurveInterpolation: 100; idle"},
+        Edit{"lockClosedWhenIdle", "run animMenuLockChannel:; idle"},
+        // The playhead goes to the nearest keyframe of any selected channel, or stays unposted.
+        Edit{"nextKeyframe", "now 0.7 | run animMenuNextKeyframe:"},
+        Edit{"nextFromBetween", "now 2.5 | run animMenuNextKeyframe:"},
+        Edit{"nextAtTheLast", "now 4 | run animMenuNextKeyframe:"},
+        Edit{"previousKeyframe", "now 3.5 | run animMenuPreviousKeyframe:"},
+        Edit{"previousNoneEarlier", "now 0.5 | run animMenuPreviousKeyframe:"},
+        Edit{"nextKeyframeMenuName", "now 0 | run nextKeyframe:"},
+        Edit{"previousNeverBeforeZero",
+             "keys B -1=0; keys A 5=0; now 2 | run animMenuPreviousKeyframe:"},
+        Edit{"nextNoneSelected", "off; now 0 | run animMenuNextKeyframe:"},
+        // Pasted into the one channel shown, spaced as they were from the playhead, the
+        // keypoint listed twice copied once; with their own channel shown they go back to it.
+        Edit{"pasteIntoAnother", kCopied + "select A@1 A@3 A@1; copy; alone B; now 5 | paste"},
+        Edit{"pasteBackWhereTheyCameFrom",
+             kCopied + "select A@1 A@3; copy; alone B; now 5; all | paste"},
+        Edit{"cut", kCopied + "select A@1 A@2 | cut"}),
+    [](const auto& p) { return std::string(p.param.name); });
+
+TEST_F(TwoChannels, interpolation_menu__ticks_its_item_and_skips_channels_that_refuse_it) {
     RWMenu menu;
     for (const int64_t tag : {0, 1, 4, 6})
         menu.addItemWithTitle(std::to_string(tag), "x")->setTag(tag);
@@ -151,27 +238,6 @@ TEST_F(ChannelCommands, interpolation__ticks_its_item_and_skips_channels_that_re
     EXPECT_EQ(a()->getExtrapolation(kTQExtrapolationAfter), 3u);
     for (int64_t i = 0; i < 5; ++i)
         EXPECT_EQ(extrapolation.itemAtIndex(i)->state(), i == 3 ? RWOnState : RWOffState) << i;
-}
-
-TEST_F(ChannelCommands, idle_host__closes_the_mixed_interpolation_step_but_not_a_drag) {
-    const Copy beforeA = copyOf(a()), beforeB = copyOf(b());
-    ASSERT_TRUE(run("animMenuSetCurveInterpolation:", kTQInterpolationMixed));
-    EXPECT_EQ(recorder.captureBalance(), 1) << "the step stays open";
-    EXPECT_EQ(recorder.count("postNotification"), 0u);
-    EXPECT_TRUE(channelsAre(beforeA, beforeB));
-    host.eventLoopDidGoIdle();
-    EXPECT_EQ(host.undoStack().depth(), 0);
-    EXPECT_FALSE(host.canUndo()) << "an empty step leaves no trace";
-
-    ASSERT_TRUE(run("animMenuLockChannel:"));
-    host.eventLoopDidGoIdle();
-    const Copy lockedA = copyOf(a());
-    ASSERT_TRUE(a()->isLocked(true));
-    EXPECT_EQ(host.undoDescription(), TQLocalizedString("Undo Lock Keypoint"));
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(channelsAre(beforeA, beforeB));
-    ASSERT_TRUE(host.redo());
-    EXPECT_TRUE(*a() == *lockedA);
 
     // A drag of the curves is not closed by the idle host.
     recorder.suppressEventCoalescing();
@@ -182,39 +248,65 @@ TEST_F(ChannelCommands, idle_host__closes_the_mixed_interpolation_step_but_not_a
     recorder.unsuppressEventCoalescing();
 }
 
-TEST_F(ChannelCommands, keyframes__the_playhead_jumps_to_the_nearest_on_any_channel) {
-    struct Row {
-        const char* what;
-        const char* action;
-        double from;
-        double expected;  // negative: the playhead stays and nothing is posted
-    } rows[] = {
-        {"next: the earlier of the two channels", "animMenuNextKeyframe:", 0.7, 1},
-        {"next from between", "animMenuNextKeyframe:", 2.5, 3},
-        {"next at the last keyframe of all", "animMenuNextKeyframe:", 4, -1},
-        {"previous: the later of the two", "animMenuPreviousKeyframe:", 3.5, 3},
-        {"previous with none earlier", "animMenuPreviousKeyframe:", 0.5, -1},
-        {"the menu's name for it", "nextKeyframe:", 0, 0.5},
+TEST_F(TwoChannels, refused_paste__changes_nothing_and_says_why) {
+    key(*a(), kHandles);
+    selectKeypoints(a(), {1.0, 2.0});
+    ctrl.copy();
+    const std::string good = *board.stringForType(kTQKeypointClipboardType);
+    auto edited = [&](const std::string& from, const std::string& to) {
+        std::string text = good;
+        return text.replace(text.find(from), from.size(), to);
     };
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.what);
-        host.setCurrentTime(sec(row.from));
+    // What lies under our type (nothing: another program's text only), and the answer.
+    std::vector<std::pair<std::string, TQPasteResult>> rows = {
+        {"", TQPasteResult::kNothingToPaste},
+        {"hello", TQPasteResult::kDamaged},
+        {edited(" 10 ", " nan "), TQPasteResult::kDamaged},
+        {edited(" 4 ", " 100 "), TQPasteResult::kDamaged},  // an unknown interpolation
+        {edited("end 2", "end 3"), TQPasteResult::kDamaged},
+        {good + "key\n", TQPasteResult::kDamaged},
+        {edited(" ./", " ./999999"), TQPasteResult::kNoChannel},  // not shown, none selected
+    };
+    for (size_t cut = 1; cut + 1 < good.size(); cut += 7)
+        rows.push_back({good.substr(0, cut), TQPasteResult::kDamaged});
+    const Copy beforeA = copyOf(a()), beforeB = copyOf(b());
+    ctrl.deselectAllChannels();
+    for (const auto& [ours, result] : rows) {
+        SCOPED_TRACE(ours);
+        board.clearContents();
+        board.setString("1 2 3", "text/plain");
+        if (!ours.empty()) board.setString(ours, kTQKeypointClipboardType);
         recorder.clearCalls();
-        ASSERT_TRUE(run(row.action));
-        const double want = row.expected < 0 ? row.from : row.expected;
-        EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), want);
-        EXPECT_EQ(recorder.count("postNotification"), row.expected < 0 ? 0u : 1u);
+        ctrl.paste();
+        EXPECT_EQ(ctrl.lastPasteResult(), result);
+        EXPECT_TRUE(*a() == *beforeA && *b() == *beforeB && recorder.bracketSequence().empty());
     }
-    key(*b(), {{-1, 0}});
-    key(*a(), {{5, 0}});
-    host.setCurrentTime(sec(2));
-    ASSERT_TRUE(run("animMenuPreviousKeyframe:"));
-    EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), 2.0)
-        << "a keyframe before zero is never the previous one";
-    for (const auto& item : items) item->select(0);
-    host.setCurrentTime(sec(0));
-    ASSERT_TRUE(run("animMenuNextKeyframe:"));
-    EXPECT_DOUBLE_EQ(CMTimeGetSeconds(host.currentTime()), 0.0) << "no channel selected";
+    board.setString(good, kTQKeypointClipboardType);
+    a()->setLocked(true, false);
+    ctrl.paste();
+    EXPECT_EQ(ctrl.lastPasteResult(), TQPasteResult::kLocked);
+    EXPECT_EQ(host.undoStack().undoCount(), 0u);
+}
+
+TEST_F(TwoChannels, validation__by_channels_keypoints_locks_and_the_pasteboard) {
+    ctrl.deselectAllChannels();
+    EXPECT_FALSE(enabled("copy:") || enabled("cut:") || enabled("delete:") || enabled("paste:"))
+        << "no channel selected, nothing to paste";
+    EXPECT_TRUE(enabled("nextKeyframe:") && enabled("previousKeyframe:"));
+    itemA->select(1);
+    selectKeypoints(a(), {1.0, 2.0});
+    ctrl.cut();
+    EXPECT_TRUE(enabled("copy:") && enabled("cut:") && enabled("delete:") && enabled("paste:"));
+
+    // The keypoint menu begins Copy, Cut, Paste, Delete.
+    const RWMenuPtr& keys = ctrl.getKeyframeMenu();
+    selectKeypoints(a(), {3.0});
+    EXPECT_TRUE(enabled(keys, 1) && enabled(keys, 2) && enabled(keys, 3));
+    a()->setKeyframeLocked(a()->getKeyframe(sec(3)), true);
+    EXPECT_TRUE(enabled(keys, 0)) << "a locked keypoint can be copied";
+    EXPECT_FALSE(enabled(keys, 1) || enabled(keys, 2) || enabled(keys, 3));
+    board.clearContents();
+    EXPECT_FALSE(enabled(ctrl.getDefaultMenu(), 2)) << "nothing to paste";
 }
 
 }  // namespace
