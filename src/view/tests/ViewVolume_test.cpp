@@ -114,7 +114,7 @@ TEST_F(ViewVolume, operations__table) {
         // The curve would need 1/50,000: the height stops at 128 times the fixture's, padded.
         {"auto-zoom clamps at 1/128", "A: 1=0 2=100000; due; auto"},
         {"reset zoom", "zoom 2 4; draw; pan -80 -40; clear; reset"},
-        {"reset pan keeps the zoom", "zoom 1 2; draw; pan 0 -40; clear; resetpan"},
+        {"reset pan keeps the zoom", "zoom 1 2; draw; pan -80 -40; clear; resetpan"},
         // 5.0031 s lies at 400.248 px: it snaps back to the pixel at 400.
         {"conversions through the last frame",
          "screen 5 0; world 800 400; size 80 40; snap 5.0031 0"},
