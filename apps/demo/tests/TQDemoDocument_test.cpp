@@ -10,7 +10,6 @@
 #include <QMouseEvent>
 #include <QTemporaryDir>
 
-#include <map>
 #include <string>
 #include <utility>
 
@@ -40,23 +39,6 @@ protected:
         };
     }
 
-    // Every channel of the scene by its path; equal when each compares equal.
-    std::map<std::string, std::shared_ptr<TQChannelBase>> sceneChannels() {
-        std::map<std::string, std::shared_ptr<TQChannelBase>> out;
-        for (TQChannelObjectRootBase* object : window.host().scene().objects()) {
-            std::vector<TQChannelBase*> flat;
-            object->getAllDescendantsFlattened(flat, 0, true);
-            for (TQChannelBase* c : flat)
-                out.emplace(TQChannelRef(c, window.host().sceneChannelRoot()).getText(),
-                            c->cloneChannel());
-        }
-        return out;
-    }
-    static bool same(const auto& a, const auto& b) {
-        return std::equal(a.begin(), a.end(), b.begin(), b.end(), [](const auto& x, const auto& y) {
-            return x.first == y.first && *x.second == *y.second;
-        });
-    }
     TQChannel* channel(const char* objectName, const char* path) {
         return dynamic_cast<TQChannel*>(
             TQChannelRef(path).getChannel(window.host().scene().objectNamed(objectName)));
@@ -104,7 +86,7 @@ TEST_F(DemoDocumentTest, save_new_and_open__the_project_comes_back_with_its_sets
     for (TQChannel* c : {channel("Title", "./1/200/202"), channel("Logo", "./1/100/101/2")})
         controller.appendChannelToCurveSet(c);
     window.autoZoomAction()->trigger();
-    const auto before = sceneChannels();
+    const auto before = sceneCopy();
     const std::vector<std::string> sets = customSets();
     ASSERT_EQ(sets, std::vector<std::string>{"Bounce ./1/1/200/202 ./2/1/100/101/2"});
 
@@ -126,7 +108,7 @@ TEST_F(DemoDocumentTest, save_new_and_open__the_project_comes_back_with_its_sets
     fileToOpen = directory.filePath("piece.vceproj");
     ASSERT_TRUE(window.open());
     EXPECT_EQ(questions, 0) << "nothing was unsaved, nothing asked";
-    EXPECT_TRUE(same(sceneChannels(), before)) << "every channel as it was saved";
+    EXPECT_TRUE(*window.host().sceneChannelRoot() == *before) << "every channel as it was saved";
     EXPECT_EQ(customSets(), sets);
     EXPECT_EQ(controller.selectedCurveSet()->curveSetName(), "Bounce");
     EXPECT_TRUE(window.autoZoomAction()->isChecked()) << "the document's setting";
@@ -145,7 +127,7 @@ TEST_F(DemoDocumentTest, unsaved_changes__asked_about_and_never_lost_to_a_damage
     window.frameAll();
     drawFrame();
     dragKeypoint();
-    const auto edited = sceneChannels();
+    const auto edited = sceneCopy();
 
     answer = QMessageBox::Cancel;
     EXPECT_FALSE(window.newDocument());
@@ -161,7 +143,7 @@ TEST_F(DemoDocumentTest, unsaved_changes__asked_about_and_never_lost_to_a_damage
     EXPECT_NE(errors[0].find("line "), std::string::npos) << "where the file is broken";
     EXPECT_TRUE(window.isVisible());
     EXPECT_FALSE(shownChannels().empty()) << "a cancelled close leaves the editor's sets";
-    EXPECT_TRUE(same(sceneChannels(), edited)) << "nothing lost";
+    EXPECT_TRUE(*window.host().sceneChannelRoot() == *edited) << "nothing lost";
     EXPECT_TRUE(window.isWindowModified());
     EXPECT_TRUE(window.editMenu()->undoAction()->isEnabled()) << "the history neither";
 

@@ -8,8 +8,7 @@
 #include <QLineEdit>
 #include <QListWidget>
 #include <QMenu>
-#include <QPushButton>
-#include <QTimer>
+#include <QToolButton>
 
 #include <set>
 
@@ -18,9 +17,10 @@
 #include "apps/demo/tests/DemoWindowFixture.h"
 #include "host/TQHostSampleScene.h"
 #include "platform/channels/TQChannelRef.h"
-#include "qt/TQQtModal.h"
 #include "qt/TQQtPopUpButton.h"
 #include "qt/TQQtSegmentedControl.h"
+#include "qt/TQQtTableView.h"
+#include "qt/TQQtTextField.h"
 #include "qt/TQQtTimeRuler.h"
 #include "qt/TQQtZoomScroller.h"
 
@@ -96,11 +96,14 @@ TEST_F(DemoWindowTest, shown_object_removed__the_set_follows_and_the_view_still_
 }
 
 TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_channel_exactly) {
-    const auto before = snapshot();
+    const auto before = sceneCopy();
     const QPoint start = keypointInWidget();
     ASSERT_TRUE(window.curveWidget()->rect().contains(start)) << "the keypoint is off screen";
-    TQChannel* channel = shownChannels()[0];
+    const TQCurveEditorItemPtr item = window.controller().selectedCurveSet()->channeItemAtIndex(0);
+    TQChannel* channel = item->channel();
     const TQKeyframeHandle key = channel->getKeyframes(false)[channel->numberOfKeyframes() / 2];
+    const std::vector<std::string> dragged{
+        TQChannelRef(channel, window.host().sceneChannelRoot()).getText()};
     TQQtCurveViewWidget* widget = window.curveWidget();
     QTest::mousePress(widget, Qt::LeftButton, Qt::NoModifier, start);
     for (int step = 1; step <= 10; ++step) {
@@ -119,7 +122,7 @@ TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_c
     EXPECT_NEAR(landed.x(), rest.x(), 2) << "the keypoint stopped short of the pointer";
     EXPECT_NEAR(landed.y(), rest.y(), 2);
 
-    EXPECT_EQ(changedCount(before), 1u) << "the drag must change exactly the dragged channel";
+    EXPECT_EQ(changedSince(*before), dragged) << "the drag must change the dragged channel alone";
     QAction* undo = window.editMenu()->undoAction();
     EXPECT_TRUE(undo->isEnabled())
         << "the Edit menu must follow the host's history without being opened";
@@ -128,61 +131,44 @@ TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_c
 
     // The curves are drawn clean; the undo must leave the restored one to be sampled again.
     drawFrame();
-    const std::vector<TQChannel*> shown = shownChannels();
-    size_t dragged = 0;
-    while (dragged < shown.size() && *shown[dragged] == *before[dragged]) ++dragged;
-    ASSERT_LT(dragged, shown.size());
-    const TQCurveEditorItemPtr item =
-        window.controller().selectedCurveSet()->channeItemAtIndex(static_cast<uint32_t>(dragged));
-
     undo->trigger();
-    EXPECT_EQ(changedCount(before), 0u) << "Undo must give back every channel exactly";
+    EXPECT_TRUE(*window.host().sceneChannelRoot() == *before)
+        << "Undo must give back every channel exactly";
     auto* channelItem = dynamic_cast<TQCurveEditorChannelItem*>(item.get());
     ASSERT_NE(channelItem, nullptr);
     EXPECT_TRUE(channelItem->originalCurveDirty())
         << "the restored curve would be drawn from stale samples";
     EXPECT_EQ(window.editMenu()->redoAction()->text().toStdString(), "Redo Move Keypoint");
     window.editMenu()->redoAction()->trigger();
-    EXPECT_EQ(changedCount(before), 1u) << "Redo must apply the drag again";
+    EXPECT_EQ(changedSince(*before), dragged) << "Redo must apply the drag again";
 }
 
 TEST_F(DemoWindowTest, double_click_on_a_keypoint__types_its_value_in_the_panel_as_one_step) {
-    TQQtModalService modal;
-    modal.install();
-    const auto before = snapshot();
+    const auto before = sceneCopy();
     const QPoint at = keypointInWidget();
     ASSERT_TRUE(window.curveWidget()->rect().contains(at)) << "the keypoint is off screen";
-    bool panelShown = false;
-    QTimer::singleShot(0, [&] {
-        QDialog* dialog = modal.activeDialog();
-        if (!dialog) return;
-        panelShown = true;
-        // Typed over the selected value, then OK.
-        QTest::keyClicks(dialog->findChild<QLineEdit*>(), "12.5");
-        for (QPushButton* button : dialog->findChildren<QPushButton*>())
-            if (button->text() == QLatin1String("OK")) button->click();
-        // Whatever happened, the run must end.
-        if (modal.activeDialog()) modal.abortModal();
-    });
-    QTest::mouseDClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
-    QTest::mouseRelease(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
-
-    ASSERT_TRUE(panelShown) << "a double click on a keypoint must open the value panel";
-    ASSERT_EQ(changedCount(before), 1u)
-        << "the typed value must change the clicked keypoint's channel";
-    bool found = false;
-    for (TQChannel* channel : shownChannels()) {
-        const double scale = channel->getInfo()->displayScale;
-        for (TQKeyframeHandle h : channel->getKeyframes(false)) {
-            double v = 0.0;
-            if (channel->getKeyframe(h, nullptr, &v) && std::fabs(v * scale - 12.5) < 1e-9)
-                found = true;
-        }
-    }
-    EXPECT_TRUE(found) << "no keypoint shows the typed value";
+    TQChannel* channel = shownChannels()[0];
+    const TQKeyframeHandle key = channel->getKeyframes(false)[channel->numberOfKeyframes() / 2];
+    inDialog(
+        [&] {
+            QTest::mouseDClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
+            QTest::mouseRelease(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
+        },
+        [](QDialog& dialog) {
+            // Typed over the selected value, then OK.
+            QTest::keyClicks(dialog.findChild<QLineEdit*>(), "12.5");
+            click(dialog, "OK");
+        });
+    double value = 0.0;
+    ASSERT_TRUE(channel->getKeyframe(key, nullptr, &value));
+    EXPECT_NEAR(value * channel->getInfo()->displayScale, 12.5, 1e-9)
+        << "the clicked keypoint must show the typed value";
+    EXPECT_EQ(changedSince(*before),
+              std::vector<std::string>{
+                  TQChannelRef(channel, window.host().sceneChannelRoot()).getText()});
     EXPECT_EQ(window.editMenu()->undoAction()->text().toStdString(), "Undo Move Keypoint");
     window.editMenu()->undoAction()->trigger();
-    EXPECT_EQ(changedCount(before), 0u) << "Undo must take the typed value back";
+    EXPECT_TRUE(*window.host().sceneChannelRoot() == *before) << "Undo takes the value back";
 }
 
 TEST_F(DemoWindowTest, transport_and_ruler__play_step_and_scrub_on_the_hosts_clock) {
@@ -238,6 +224,58 @@ TEST_F(DemoWindowTest, preview__poses_come_from_the_channels_at_the_playhead) {
     const CMTime now = CMTimeMake(60, 30);
     x->offsetCurve(&now, 250.0);
     EXPECT_NEAR(window.scenePreview()->poseOf(*title).x, 250.0, 1e-6);
+}
+
+// A new set made from the pop-up's entry, undone and redone, then renamed and joined by another
+// in the manager's dialog. The document test saves and opens sets.
+TEST_F(DemoWindowTest, new_and_managed_sets__are_saved_and_opened_with_the_project) {
+    choose("Position");
+    const std::vector<TQChannel*> position = shownChannels();
+    ASSERT_FALSE(position.empty());
+    inDialog([this] { choose("New Curve Set…"); },
+             [](QDialog& dialog) {
+                 TQQtTextField* name = nullptr;
+                 for (TQQtTextField* field : dialog.findChildren<TQQtTextField*>())
+                     if (!field->isReadOnly()) name = field;
+                 ASSERT_NE(name, nullptr);
+                 EXPECT_EQ(name->text(), "Untitled Set");
+                 QTest::keyClicks(name, "Slides");
+                 click(dialog, "OK");
+             });
+    EXPECT_EQ(shownChannels(), position) << "the new set holds what showed";
+    window.host().setSelectedObjects({window.host().scene().objects().back()});
+    EXPECT_EQ(shownChannels(), position) << "and does not follow the selection";
+    EXPECT_EQ(window.curveSetPopUp()->text(), "Slides");
+    emit window.editMenu()->menu()->aboutToShow();
+    EXPECT_EQ(window.editMenu()->undoAction()->text(), "Undo New Curve Set");
+    window.editMenu()->undoAction()->trigger();
+    EXPECT_TRUE(window.controller().curveSets().empty());
+    EXPECT_EQ(window.curveSetPopUp()->text(), "Position");
+    emit window.editMenu()->menu()->aboutToShow();
+    window.editMenu()->redoAction()->trigger();
+    EXPECT_EQ(window.curveSetPopUp()->text(), "Slides");
+    EXPECT_EQ(shownChannels(), position);
+
+    inDialog([this] { choose("Manage Curve Sets…"); },
+             [](QDialog& dialog) {
+                 auto* table = dialog.findChild<TQQtTableView*>();
+                 ASSERT_NE(table, nullptr);
+                 ASSERT_EQ(table->tableModel()->rowCount(), 1);
+                 table->edit(table->tableModel()->index(0, 0));
+                 auto* editor = qobject_cast<QLineEdit*>(table->editor());
+                 ASSERT_NE(editor, nullptr);
+                 editor->setText("Glides");
+                 // The add and remove pair's buttons are the panel's only tool buttons.
+                 const QList<QToolButton*> pair = dialog.findChildren<QToolButton*>();
+                 ASSERT_EQ(pair.size(), 2);
+                 pair[0]->click();
+                 click(dialog, "Done");
+             });
+    const std::vector<std::string> sets = customSets();
+    ASSERT_EQ(sets.size(), 2u);
+    EXPECT_EQ(sets[0].rfind("Glides ./", 0), 0u) << sets[0];
+    EXPECT_EQ(sets[1], "Untitled Set");
+    EXPECT_TRUE(window.isWindowModified()) << "the sets are the document's";
 }
 
 }  // namespace
