@@ -56,21 +56,6 @@ protected:
     TQChannel *x = nullptr, *y = nullptr, *opacity = nullptr;
 };
 
-TEST_F(HostUndo, undoRedo__theWholeSceneComesBackBitIdenticalStepByStep) {
-    const auto start = scene();
-    bracketedEdit("Move Keypoint", {x, y, opacity}, 123.0);
-    const auto afterFirst = scene();
-    ASSERT_FALSE(sceneIs(start)) << "the edit should have changed the scene";
-    bracketedEdit("Nudge", {y}, -4.0);
-    const auto afterSecond = scene();
-    EXPECT_TRUE(undoneTo(afterFirst));
-    EXPECT_TRUE(undoneTo(start));
-    EXPECT_FALSE(host.canUndo());
-    EXPECT_TRUE(redoneTo(afterFirst));
-    EXPECT_TRUE(redoneTo(afterSecond));
-    EXPECT_FALSE(host.canRedo() || host.redo());
-}
-
 TEST_F(HostUndo, brackets__nestedOnesMakeOneStepEmptyOnesNoneAndStrayEndsAreTolerated) {
     const auto before = scene();
     host.startCaptureModifiedChannels("Delete Keypoint");
@@ -111,7 +96,7 @@ TEST_F(HostUndo, brackets__nestedOnesMakeOneStepEmptyOnesNoneAndStrayEndsAreTole
     EXPECT_EQ(history.position(), first) << "an empty step is no position";
     ASSERT_TRUE(host.redo() && history.position() == second && host.undo());
     bracketedEdit("Third", {opacity}, 0.5);
-    EXPECT_FALSE(host.canRedo()) << "a kept step clears redo";
+    EXPECT_FALSE(host.canRedo() || host.redo()) << "a kept step clears redo";
     EXPECT_TRUE(history.position() != first && history.position() != second)
         << "a new step after an undo is a new position";
 
