@@ -1,10 +1,21 @@
-// The scene's object model in both families, selection and change tracking.
+// The reference host's scene: the object model in both families, selection and change
+// tracking; the sample piece moves as an animator keyed it, and the dense scene has the size it
+// was asked for and is the same scene for the same seed; the owner-ticked playback clock; the
+// delivery of words to receivers, re-entrant posts and registration changes during delivery.
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstdint>
+#include <functional>
+#include <numbers>
+#include <vector>
 
 #include "host/TQHostAppDelegate.h"
 #include "host/TQHostDenseScene.h"
+#include "host/TQHostNotificationCenter.h"
+#include "host/TQHostPlaybackClock.h"
+#include "host/TQHostSampleScene.h"
+#include "platform/channels/TQChannel.h"
 #include "platform/channels/TQChannelTypes.h"
 
 namespace {
@@ -224,6 +235,218 @@ TEST_F(HostDelegate, transport__movesOnFramesInsideThePlayRangeAndTellsTheTime) 
     host.setFirstFrameNumber(1);
     EXPECT_EQ(host.timeText(frame12), "13");
     host.removeNotificationReceiver(&words);
+}
+
+constexpr double kTolerance = 1e-6;
+
+std::vector<TQChannel*> channelsOf(const TQHostScene& scene) {
+    std::vector<TQChannel*> out;
+    for (TQChannelObjectRootBase* object : scene.objects()) {
+        std::vector<TQChannelBase*> channels;
+        object->getAllDescendantsFlattened(channels, 0, true);
+        for (TQChannelBase* c : channels) out.push_back(static_cast<TQChannel*>(c));
+    }
+    return out;
+}
+
+class SamplePiece : public ::testing::TestWithParam<TQHostObjectFamily> {
+protected:
+    TQChannel* channel(const char* object, TQHostProperty property, size_t axis = 0) {
+        return dynamic_cast<TQChannel*>(
+            TQChannelRef(TQHostPropertyPaths(GetParam(), property).at(axis))
+                .getChannel(host.scene().objectNamed(object)));
+    }
+    static double at(const TQChannel* c, double seconds) {
+        return c->getCurveValue(CMTimeMakeWithSeconds(seconds, 0x40000));
+    }
+    // The largest (sign 1) or smallest (sign -1) value over a span, sampled finely.
+    static double peak(const TQChannel* c, double from, double to, double sign) {
+        double best = -INFINITY;
+        for (double t = from; t <= to; t += 1.0 / 240.0) best = std::max(best, sign * at(c, t));
+        return sign * best;
+    }
+    TQHostAppDelegate host;
+};
+
+TEST_P(SamplePiece, piece__titleFliesInAndPopsLogoBouncesAndSpinsOneBehaviour) {
+    TQHostLoadSampleScene(host, GetParam());
+    EXPECT_EQ(CMTimeGetSeconds(host.displayRange().duration), 6.0);
+    EXPECT_EQ(host.selectedObjectsRootChannels(),
+              std::vector<TQChannelBase*>{host.scene().objectNamed(kTQHostSampleTitleObject)});
+    EXPECT_FALSE(host.canUndo());
+    size_t behaviours = 0;
+    for (TQChannel* c : channelsOf(host.scene())) behaviours += c->numberOfBehaviors();
+    EXPECT_EQ(behaviours, 1u) << "the logo's sway is the one behaviour";
+
+    const TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
+    const TQChannel* scale = channel(kTQHostSampleTitleObject, TQHostProperty::Scale);
+    EXPECT_LT(at(x, 0.0), -960.0) << "the title starts outside a 1920-wide picture";
+    EXPECT_GT(at(x, 0.75), -25.0) << "and slows into its rest";
+    EXPECT_NEAR(peak(x, 0.8, 5.0, 1), 0.0, kTolerance) << "where it stays";
+    EXPECT_GT(peak(scale, 0.3, 0.8, 1), 1.1) << "its scale overshoots";
+    EXPECT_NEAR(at(scale, 1.2), 1.0, kTolerance);
+
+    const TQChannel* y = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
+    const double floor = at(y, 3.0);
+    EXPECT_GE(peak(y, 1.0, 6.0, -1), floor - kTolerance) << "the logo never sinks through";
+    EXPECT_GT(peak(y, 1.5, 2.0, 1), peak(y, 2.0, 2.3, 1)) << "each bounce lower";
+    const auto& rotation = TQHostPropertyPaths(GetParam(), TQHostProperty::Rotation);
+    const TQChannel* spin =
+        channel(kTQHostSampleBehaviorObject, TQHostProperty::Rotation, rotation.size() - 1);
+    EXPECT_NEAR(at(spin, 2.0), std::numbers::pi, 1e-9);
+    EXPECT_NEAR(at(spin, 5.9), at(spin, 3.9), 1e-9) << "the turn repeats past its keys";
+}
+
+INSTANTIATE_TEST_SUITE_P(BothFamilies, SamplePiece,
+                         ::testing::Values(TQHostObjectFamily::Kestrel, TQHostObjectFamily::Other));
+
+TEST(DenseScene, sizeAndSeed__asAskedAndTheSameForTheSameSeed) {
+    const struct {
+        TQHostObjectFamily family;
+        TQHostDenseSceneSpec spec;
+        size_t channels;  // in the objects, animated or not
+        size_t keyframes;
+    } cases[] = {
+        {TQHostObjectFamily::Other, {.objects = 3, .keyframesPerChannel = 7}, 90, 630},
+        {TQHostObjectFamily::Kestrel, {.objects = 2, .channelsPerObject = 4}, 58, 800},
+        {TQHostObjectFamily::Kestrel, {.objects = 2, .totalKeyframes = 1001}, 60, 1001},
+        {TQHostObjectFamily::Other,
+         {.objects = 1, .channelsPerObject = 50, .channels = TQHostDenseChannels::Plain},
+         50,
+         5000},
+    };
+    for (const auto& c : cases) {
+        TQHostScene scene(c.family), again(c.family);
+        TQHostPopulateDenseScene(scene, c.spec);
+        TQHostPopulateDenseScene(again, c.spec);
+        const auto channels = channelsOf(scene), twins = channelsOf(again);
+        ASSERT_EQ(channels.size(), c.channels);
+        size_t keyframes = 0;
+        for (size_t i = 0; i < channels.size(); ++i) {
+            keyframes += channels[i]->numberOfKeyframes();
+            EXPECT_TRUE(*channels[i] == *twins[i]) << "channel " << i << " differs, same seed";
+        }
+        EXPECT_EQ(keyframes, c.keyframes);
+    }
+    const TQHostDenseSceneSpec stress = TQHostStressSceneSpec();
+    EXPECT_EQ(stress.objects * stress.channelsPerObject, 3000u);
+    EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 0), 334u) << "the remainder goes first";
+    EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 2999), 333u);
+}
+
+constexpr double kTimeTolerance = 1.0 / TQHostPlaybackClock::kTimescale;
+
+class PlaybackClock : public ::testing::Test {
+protected:
+    void SetUp() override {
+        ASSERT_TRUE(clock.setPlayRange(CMTimeRangeMake(CMTimeMake(1, 1), CMTimeMake(2, 1))));
+    }
+    double seconds() const { return CMTimeGetSeconds(clock.currentTime()); }
+    TQHostPlaybackClock clock;
+};
+
+TEST_F(PlaybackClock, tick__movesOnlyWhilePlayingAndRefusesBadInput) {
+    EXPECT_FALSE(clock.tick(CMTimeMake(1, 2))) << "a stopped clock must not move";
+    clock.play();
+    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "play starts at the range when outside it";
+    EXPECT_TRUE(clock.tick(CMTimeMake(1, 4)));
+    EXPECT_NEAR(seconds(), 1.25, kTimeTolerance);
+    EXPECT_FALSE(clock.tick(CMTimeMake(-1, 4))) << "negative elapsed time is ignored";
+    EXPECT_FALSE(clock.tick(kCMTimeInvalid));
+    EXPECT_FALSE(clock.setCurrentTime(kCMTimeInvalid));
+    EXPECT_FALSE(clock.setPlayRange(CMTimeRangeMake(kCMTimeZero, kCMTimeZero)));
+    EXPECT_FALSE(clock.setPlayRange(CMTimeRangeMake(kCMTimeIndefinite, CMTimeMake(1, 1))));
+    EXPECT_NEAR(CMTimeGetSeconds(clock.playRange().duration), 2.0, kTimeTolerance);
+    EXPECT_NEAR(seconds(), 1.25, kTimeTolerance);
+}
+
+TEST_F(PlaybackClock, tick__loopsExactlyInTheRangeOrRestsOnItsEnd) {
+    clock.play();
+    for (int i = 0; i < 1000; ++i) clock.tick(CMTimeMake(1, 24));
+    // 1000/24 s = 41.666.. s from 1 s, in a 2 s loop: 1 + (41.666.. mod 2) = 2.666..
+    EXPECT_NEAR(seconds(), 1.0 + std::fmod(1000.0 / 24.0, 2.0), 1000 * kTimeTolerance);
+    clock.setCurrentTime(CMTimeMake(5, 2));
+    clock.tick(CMTimeMake(1, 2));
+    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "reaching the end exactly wraps to the start";
+
+    clock.setLooping(false);
+    clock.tick(CMTimeMake(7, 1));
+    EXPECT_NEAR(seconds(), 3.0, kTimeTolerance);
+    EXPECT_FALSE(clock.isPlaying());
+    clock.play();
+    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "playing again starts over";
+}
+
+// Logs every word with its own tag, and runs an action on the first word it hears.
+struct Receiver : TQNotificationReceiver {
+    Receiver(std::vector<std::pair<char, TQNotificationWord>>& log, char tag)
+        : log(log), tag(tag) {}
+    void notify(TQNotificationWord word) override {
+        log.emplace_back(tag, word);
+        if (onFirst) {
+            auto action = std::move(onFirst);
+            onFirst = nullptr;
+            action(word);
+        }
+    }
+    std::vector<std::pair<char, TQNotificationWord>>& log;
+    char tag;
+    std::function<void(TQNotificationWord)> onFirst;
+};
+
+class NotificationCenter : public ::testing::Test {
+protected:
+    using Log = std::vector<std::pair<char, TQNotificationWord>>;
+    TQHostNotificationCenter center;
+    Log log;
+    Receiver a{log, 'a'}, b{log, 'b'}, c{log, 'c'};
+};
+
+TEST_F(NotificationCenter, post__reachesEveryReceiverInRegistrationOrder) {
+    center.addReceiver(&a);
+    center.addReceiver(&b);
+    center.addReceiver(&a);  // twice: still one registration
+    center.addReceiver(nullptr);
+    center.post(kTQNotifyChannelsChanged);
+    EXPECT_EQ(log, (Log{{'a', 0x8}, {'b', 0x8}}));
+    EXPECT_EQ(center.receiverCount(), 2u);
+}
+
+TEST_F(NotificationCenter, reentrantPost__waitsUntilTheCurrentWordReachedEveryone) {
+    center.addReceiver(&a);
+    center.addReceiver(&b);
+    a.onFirst = [&](TQNotificationWord) {
+        center.post(kTQNotifyCurveSetContentChanged);
+        EXPECT_EQ(log.size(), 1u) << "a nested post must not be delivered inside notify";
+    };
+    center.post(kTQNotifyChannelsChanging);
+    EXPECT_EQ(log, (Log{{'a', 0x4}, {'b', 0x4}, {'a', 0x20000}, {'b', 0x20000}}));
+    EXPECT_FALSE(center.isDelivering());
+    EXPECT_EQ(center.deliveredWordCount(), 2u);
+}
+
+TEST_F(NotificationCenter, unregisterDuringDelivery__isSafeAndTakesEffectAtOnce) {
+    center.addReceiver(&a);
+    center.addReceiver(&b);
+    center.addReceiver(&c);
+    // a removes b, which has not heard the word yet, and itself.
+    a.onFirst = [&](TQNotificationWord) {
+        center.removeReceiver(&b);
+        center.removeReceiver(&a);
+    };
+    center.post(0x8);
+    EXPECT_EQ(log, (Log{{'a', 0x8}, {'c', 0x8}}));
+    EXPECT_EQ(center.receiverCount(), 1u);
+    // c registers b again from inside notify: b hears the next word, not this one.
+    log.clear();
+    c.onFirst = [&](TQNotificationWord) {
+        center.addReceiver(&b);
+        center.post(0x2);
+    };
+    center.post(0x10);
+    EXPECT_EQ(log, (Log{{'c', 0x10}, {'c', 0x2}, {'b', 0x2}}));
+    center.removeReceiver(&a);  // unknown now: ignored
+    EXPECT_TRUE(center.hasReceiver(&b));
 }
 
 }  // namespace
