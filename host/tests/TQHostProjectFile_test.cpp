@@ -28,25 +28,46 @@ std::string written(TQHostProject& project) {
     return text;
 }
 
-// Identity is not part of operator==: name, id, class, own offset, extent and label, and a
-// channel's default, slider maximum and rig flag, of every node, as text (times with all
-// their fields); the state of the whole tree is compared by operator==.
-std::string identity(const TQChannelBase* node) {
-    if (!node) return "(empty)\n";
+// What the document holds beside its objects' state (operator== leaves identity out), as text:
+// every node's name, id, class, own offset, extent and label, and a channel's default, slider
+// maximum and rig flag; the host's times in their own timescales, numbers and flags; the
+// editor's settings and the curve sets with their items.
+std::string documentText(TQHostAppDelegate& h, TQHostProject& p) {
     std::ostringstream out;
     out.precision(17);
-    const TQFactoryId factory = TQChannelFactoryIdOf(node);
-    out << node->getName() << " " << node->getChannelId() << " " << factory.word0 << "-"
-        << factory.word1 << " " << node->getXAxisLabel();
-    for (const CMTime& t :
-         {node->ownTimeOffset(), node->timeExtent().start, node->timeExtent().duration})
+    const auto time = [&](const CMTime& t) {
         out << " " << t.value << "/" << t.timescale << "/" << t.flags << "@" << t.epoch;
-    if (const auto* c = dynamic_cast<const TQChannel*>(node))
-        out << " " << c->getDefaultValue() << " " << c->sliderMaximum() << " " << c->isRigged();
-    out << "\n";
-    if (const auto* folder = dynamic_cast<const TQChannelFolder*>(node))
-        for (size_t i = 0; i < folder->numberOfChildren(); ++i)
-            out << identity(folder->getChild(i));
+    };
+    const std::function<void(const TQChannelBase*)> identity = [&](const TQChannelBase* node) {
+        if (!node) return void(out << "(empty)\n");
+        const TQFactoryId factory = TQChannelFactoryIdOf(node);
+        out << node->getName() << " " << node->getChannelId() << " " << factory.word0 << "-"
+            << factory.word1 << " " << node->getXAxisLabel();
+        for (const CMTime& t :
+             {node->ownTimeOffset(), node->timeExtent().start, node->timeExtent().duration})
+            time(t);
+        if (const auto* c = dynamic_cast<const TQChannel*>(node))
+            out << " " << c->getDefaultValue() << " " << c->sliderMaximum() << " " << c->isRigged();
+        out << "\n";
+        if (const auto* folder = dynamic_cast<const TQChannelFolder*>(node))
+            for (size_t i = 0; i < folder->numberOfChildren(); ++i) identity(folder->getChild(i));
+    };
+    for (const TQChannelBase* object : h.scene().objects()) identity(object);
+    for (const CMTime& t : {h.getFrameDuration(), h.displayRange().start, h.displayRange().duration,
+                            h.currentTime(), h.secondsPerTextStep()})
+        time(t);
+    const TQCurveEditorState& s = p.editorState();
+    out << " " << h.firstFrameNumber() << " " << h.startTimecode() << " "
+        << h.shouldDisplayTimeAsFrames() << s.autoZoom() << s.snapping() << s.snapshotChannels()
+        << s.displayAudioWaveform() << s.lockKeyframesInTime();
+    for (const TQChannelBase* object : h.selectedObjectsRootChannels())
+        out << " selected " << object->getChannelId();
+    out << " sets, selected " << p.curveSets().getSelectedCurveSet();
+    for (const TQCurveSetSerializer* set : p.curveSets().curveSets()) {
+        out << "\n" << set->_name << "|" << set->_shortcut << "|" << set->_relative;
+        for (const TQCurveEditorItemSerializer* item : set->_channels)
+            out << " " << item->getChannelRef() << ":" << item->getColorIndex();
+    }
     return out.str();
 }
 
@@ -139,32 +160,9 @@ TEST(TQHostProjectFileTest, roundTrip__everyChannelFieldTimeSettingAndBothTrees)
     const auto a = host.scene().objects();
     const auto b = other.scene().objects();
     ASSERT_EQ(b.size(), a.size());
-    for (size_t i = 0; i < a.size(); ++i) {
+    for (size_t i = 0; i < a.size(); ++i)
         EXPECT_TRUE(*b[i] == *a[i]) << "object " << a[i]->getName() << " changed on the way";
-        EXPECT_EQ(identity(b[i]), identity(a[i]));
-    }
-    // Everything else the file holds, as text: times in their own timescales, the numbers and
-    // flags, the editor's settings and the curve sets with their items.
-    const auto rendered = [](TQHostAppDelegate& h, TQHostProject& p) {
-        std::ostringstream out;
-        const TQCurveEditorState& s = p.editorState();
-        for (const CMTime& t : {h.getFrameDuration(), h.displayRange().start,
-                                h.displayRange().duration, h.currentTime(), h.secondsPerTextStep()})
-            out << t.value << "/" << t.timescale << " ";
-        out << h.firstFrameNumber() << " " << h.startTimecode() << " "
-            << h.shouldDisplayTimeAsFrames() << s.autoZoom() << s.snapping() << s.snapshotChannels()
-            << s.displayAudioWaveform() << s.lockKeyframesInTime();
-        for (const TQChannelBase* object : h.selectedObjectsRootChannels())
-            out << " selected " << object->getChannelId();
-        out << " sets, selected " << p.curveSets().getSelectedCurveSet();
-        for (const TQCurveSetSerializer* set : p.curveSets().curveSets()) {
-            out << "\n" << set->_name << "|" << set->_shortcut << "|" << set->_relative;
-            for (const TQCurveEditorItemSerializer* item : set->_channels)
-                out << " " << item->getChannelRef() << ":" << item->getColorIndex();
-        }
-        return out.str();
-    };
-    EXPECT_EQ(rendered(other, reopened), rendered(host, project));
+    EXPECT_EQ(documentText(other, reopened), documentText(host, project));
     EXPECT_EQ(other.version(), kTQHostProjectVersion);
     EXPECT_EQ(other.getCurveSetListSerializer(), &reopened.curveSets());
     EXPECT_FALSE(other.undoStack().canUndo()) << "loading is no undoable step";

@@ -1,10 +1,24 @@
-// The scene's object model in both families, selection and change tracking.
+// The reference host: the scene's object model in both families, selection and change
+// tracking; the sample piece moves as an animator keyed it, and the dense scene has the size it
+// was asked for and is the same scene for the same seed; the owner-ticked playback clock; the
+// delivery of words to receivers, re-entrant posts and registration changes during delivery.
+// Undo and redo through the delegate operations, as the framework drives them; every check
+// compares the whole scene, so a step that restores one channel and breaks another shows.
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstdint>
+#include <functional>
+#include <memory>
+#include <numbers>
+#include <vector>
 
 #include "host/TQHostAppDelegate.h"
 #include "host/TQHostDenseScene.h"
+#include "host/TQHostNotificationCenter.h"
+#include "host/TQHostPlaybackClock.h"
+#include "host/TQHostSampleScene.h"
+#include "platform/channels/TQChannel.h"
 #include "platform/channels/TQChannelTypes.h"
 
 namespace {
@@ -224,6 +238,419 @@ TEST_F(HostDelegate, transport__movesOnFramesInsideThePlayRangeAndTellsTheTime) 
     host.setFirstFrameNumber(1);
     EXPECT_EQ(host.timeText(frame12), "13");
     host.removeNotificationReceiver(&words);
+}
+
+constexpr double kTolerance = 1e-6;
+
+std::vector<TQChannel*> channelsOf(const TQHostScene& scene) {
+    std::vector<TQChannel*> out;
+    for (TQChannelObjectRootBase* object : scene.objects()) {
+        std::vector<TQChannelBase*> channels;
+        object->getAllDescendantsFlattened(channels, 0, true);
+        for (TQChannelBase* c : channels) out.push_back(static_cast<TQChannel*>(c));
+    }
+    return out;
+}
+
+class SamplePiece : public ::testing::TestWithParam<TQHostObjectFamily> {
+protected:
+    TQChannel* channel(const char* object, TQHostProperty property, size_t axis = 0) {
+        return dynamic_cast<TQChannel*>(
+            TQChannelRef(TQHostPropertyPaths(GetParam(), property).at(axis))
+                .getChannel(host.scene().objectNamed(object)));
+    }
+    static double at(const TQChannel* c, double seconds) {
+        return c->getCurveValue(CMTimeMakeWithSeconds(seconds, 0x40000));
+    }
+    // The largest (sign 1) or smallest (sign -1) value over a span, sampled finely.
+    static double peak(const TQChannel* c, double from, double to, double sign) {
+        double best = -INFINITY;
+        for (double t = from; t <= to; t += 1.0 / 240.0) best = std::max(best, sign * at(c, t));
+        return sign * best;
+    }
+    TQHostAppDelegate host;
+};
+
+TEST_P(SamplePiece, piece__titleFliesInAndPopsLogoBouncesAndSpinsOneBehaviour) {
+    TQHostLoadSampleScene(host, GetParam());
+    EXPECT_EQ(CMTimeGetSeconds(host.displayRange().duration), 6.0);
+    EXPECT_EQ(host.selectedObjectsRootChannels(),
+              std::vector<TQChannelBase*>{host.scene().objectNamed(kTQHostSampleTitleObject)});
+    EXPECT_FALSE(host.canUndo());
+    size_t behaviours = 0;
+    for (TQChannel* c : channelsOf(host.scene())) behaviours += c->numberOfBehaviors();
+    EXPECT_EQ(behaviours, 1u) << "the logo's sway is the one behaviour";
+
+    const TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
+    const TQChannel* scale = channel(kTQHostSampleTitleObject, TQHostProperty::Scale);
+    EXPECT_LT(at(x, 0.0), -960.0) << "the title starts outside a 1920-wide picture";
+    EXPECT_GT(at(x, 0.75), -25.0) << "and slows into its rest";
+    EXPECT_NEAR(peak(x, 0.8, 5.0, 1), 0.0, kTolerance) << "where it stays";
+    EXPECT_GT(peak(scale, 0.3, 0.8, 1), 1.1) << "its scale overshoots";
+    EXPECT_NEAR(at(scale, 1.2), 1.0, kTolerance);
+
+    const TQChannel* y = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
+    const double floor = at(y, 3.0);
+    EXPECT_GE(peak(y, 1.0, 6.0, -1), floor - kTolerance) << "the logo never sinks through";
+    EXPECT_GT(peak(y, 1.5, 2.0, 1), peak(y, 2.0, 2.3, 1)) << "each bounce lower";
+    const auto& rotation = TQHostPropertyPaths(GetParam(), TQHostProperty::Rotation);
+    const TQChannel* spin =
+        channel(kTQHostSampleBehaviorObject, TQHostProperty::Rotation, rotation.size() - 1);
+    EXPECT_NEAR(at(spin, 2.0), std::numbers::pi, 1e-9);
+    EXPECT_NEAR(at(spin, 5.9), at(spin, 3.9), 1e-9) << "the turn repeats past its keys";
+}
+
+INSTANTIATE_TEST_SUITE_P(BothFamilies, SamplePiece,
+                         ::testing::Values(TQHostObjectFamily::Kestrel, TQHostObjectFamily::Other));
+
+TEST(DenseScene, sizeAndSeed__asAskedAndTheSameForTheSameSeed) {
+    const struct {
+        TQHostObjectFamily family;
+        TQHostDenseSceneSpec spec;
+        size_t channels;  // in the objects, animated or not
+        size_t keyframes;
+    } cases[] = {
+        {TQHostObjectFamily::Other, {.objects = 3, .keyframesPerChannel = 7}, 90, 630},
+        {TQHostObjectFamily::Kestrel, {.objects = 2, .channelsPerObject = 4}, 58, 800},
+        {TQHostObjectFamily::Kestrel, {.objects = 2, .totalKeyframes = 1001}, 60, 1001},
+        {TQHostObjectFamily::Other,
+         {.objects = 1, .channelsPerObject = 50, .channels = TQHostDenseChannels::Plain},
+         50,
+         5000},
+    };
+    for (const auto& c : cases) {
+        TQHostScene scene(c.family), again(c.family);
+        TQHostPopulateDenseScene(scene, c.spec);
+        TQHostPopulateDenseScene(again, c.spec);
+        const auto channels = channelsOf(scene), twins = channelsOf(again);
+        ASSERT_EQ(channels.size(), c.channels);
+        size_t keyframes = 0;
+        for (size_t i = 0; i < channels.size(); ++i) {
+            keyframes += channels[i]->numberOfKeyframes();
+            EXPECT_TRUE(*channels[i] == *twins[i]) << "channel " << i << " differs, same seed";
+        }
+        EXPECT_EQ(keyframes, c.keyframes);
+    }
+    const TQHostDenseSceneSpec stress = TQHostStressSceneSpec();
+    EXPECT_EQ(stress.objects * stress.channelsPerObject, 3000u);
+    EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 0), 334u) << "the remainder goes first";
+    EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 2999), 333u);
+}
+
+constexpr double kTimeTolerance = 1.0 / TQHostPlaybackClock::kTimescale;
+
+class PlaybackClock : public ::testing::Test {
+protected:
+    void SetUp() override {
+        ASSERT_TRUE(clock.setPlayRange(CMTimeRangeMake(CMTimeMake(1, 1), CMTimeMake(2, 1))));
+    }
+    double seconds() const { return CMTimeGetSeconds(clock.currentTime()); }
+    TQHostPlaybackClock clock;
+};
+
+TEST_F(PlaybackClock, tick__movesOnlyWhilePlayingAndRefusesBadInput) {
+    EXPECT_FALSE(clock.tick(CMTimeMake(1, 2))) << "a stopped clock must not move";
+    clock.play();
+    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "play starts at the range when outside it";
+    EXPECT_TRUE(clock.tick(CMTimeMake(1, 4)));
+    EXPECT_NEAR(seconds(), 1.25, kTimeTolerance);
+    EXPECT_FALSE(clock.tick(CMTimeMake(-1, 4))) << "negative elapsed time is ignored";
+    EXPECT_FALSE(clock.tick(kCMTimeInvalid));
+    EXPECT_FALSE(clock.setCurrentTime(kCMTimeInvalid));
+    EXPECT_FALSE(clock.setPlayRange(CMTimeRangeMake(kCMTimeZero, kCMTimeZero)));
+    EXPECT_FALSE(clock.setPlayRange(CMTimeRangeMake(kCMTimeIndefinite, CMTimeMake(1, 1))));
+    EXPECT_NEAR(CMTimeGetSeconds(clock.playRange().duration), 2.0, kTimeTolerance);
+    EXPECT_NEAR(seconds(), 1.25, kTimeTolerance);
+}
+
+TEST_F(PlaybackClock, tick__loopsExactlyInTheRangeOrRestsOnItsEnd) {
+    clock.play();
+    for (int i = 0; i < 1000; ++i) clock.tick(CMTimeMake(1, 24));
+    // 1000/24 s = 41.666.. s from 1 s, in a 2 s loop: 1 + (41.666.. mod 2) = 2.666..
+    EXPECT_NEAR(seconds(), 1.0 + std::fmod(1000.0 / 24.0, 2.0), 1000 * kTimeTolerance);
+    clock.setCurrentTime(CMTimeMake(5, 2));
+    clock.tick(CMTimeMake(1, 2));
+    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "reaching the end exactly wraps to the start";
+
+    clock.setLooping(false);
+    clock.tick(CMTimeMake(7, 1));
+    EXPECT_NEAR(seconds(), 3.0, kTimeTolerance);
+    EXPECT_FALSE(clock.isPlaying());
+    clock.play();
+    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "playing again starts over";
+}
+
+// Logs every word with its own tag, and runs an action on the first word it hears.
+struct Receiver : TQNotificationReceiver {
+    Receiver(std::vector<std::pair<char, TQNotificationWord>>& log, char tag)
+        : log(log), tag(tag) {}
+    void notify(TQNotificationWord word) override {
+        log.emplace_back(tag, word);
+        if (onFirst) {
+            auto action = std::move(onFirst);
+            onFirst = nullptr;
+            action(word);
+        }
+    }
+    std::vector<std::pair<char, TQNotificationWord>>& log;
+    char tag;
+    std::function<void(TQNotificationWord)> onFirst;
+};
+
+class NotificationCenter : public ::testing::Test {
+protected:
+    using Log = std::vector<std::pair<char, TQNotificationWord>>;
+    TQHostNotificationCenter center;
+    Log log;
+    Receiver a{log, 'a'}, b{log, 'b'}, c{log, 'c'};
+};
+
+TEST_F(NotificationCenter, post__reachesEveryReceiverInRegistrationOrder) {
+    center.addReceiver(&a);
+    center.addReceiver(&b);
+    center.addReceiver(&a);  // twice: still one registration
+    center.addReceiver(nullptr);
+    center.post(kTQNotifyChannelsChanged);
+    EXPECT_EQ(log, (Log{{'a', 0x8}, {'b', 0x8}}));
+    EXPECT_EQ(center.receiverCount(), 2u);
+}
+
+TEST_F(NotificationCenter, reentrantPost__waitsUntilTheCurrentWordReachedEveryone) {
+    center.addReceiver(&a);
+    center.addReceiver(&b);
+    a.onFirst = [&](TQNotificationWord) {
+        center.post(kTQNotifyCurveSetContentChanged);
+        EXPECT_EQ(log.size(), 1u) << "a nested post must not be delivered inside notify";
+    };
+    center.post(kTQNotifyChannelsChanging);
+    EXPECT_EQ(log, (Log{{'a', 0x4}, {'b', 0x4}, {'a', 0x20000}, {'b', 0x20000}}));
+    EXPECT_FALSE(center.isDelivering());
+    EXPECT_EQ(center.deliveredWordCount(), 2u);
+}
+
+TEST_F(NotificationCenter, unregisterDuringDelivery__isSafeAndTakesEffectAtOnce) {
+    center.addReceiver(&a);
+    center.addReceiver(&b);
+    center.addReceiver(&c);
+    // a removes b, which has not heard the word yet, and itself.
+    a.onFirst = [&](TQNotificationWord) {
+        center.removeReceiver(&b);
+        center.removeReceiver(&a);
+    };
+    center.post(0x8);
+    EXPECT_EQ(log, (Log{{'a', 0x8}, {'c', 0x8}}));
+    EXPECT_EQ(center.receiverCount(), 1u);
+    // c registers b again from inside notify: b hears the next word, not this one.
+    log.clear();
+    c.onFirst = [&](TQNotificationWord) {
+        center.addReceiver(&b);
+        center.post(0x2);
+    };
+    center.post(0x10);
+    EXPECT_EQ(log, (Log{{'c', 0x10}, {'c', 0x2}, {'b', 0x2}}));
+    center.removeReceiver(&a);  // unknown now: ignored
+    EXPECT_TRUE(center.hasReceiver(&b));
+}
+
+class HostUndo : public ::testing::Test {
+protected:
+    void SetUp() override {
+        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
+        object = host.scene().objects().front();
+        const auto& positions =
+            TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
+        x = channel(positions[0]);
+        y = channel(positions[1]);
+        opacity =
+            channel(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Opacity)[0]);
+        ASSERT_TRUE(x && y && opacity) << "the sample object lacks its position or opacity";
+    }
+    TQChannel* channel(const BNString& path) {
+        return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(object));
+    }
+    std::unique_ptr<TQChannelBase> scene() {
+        return std::unique_ptr<TQChannelBase>(host.sceneChannelRoot()->cloneChannel());
+    }
+    bool sceneIs(const std::unique_ptr<TQChannelBase>& expected) {
+        return *host.sceneChannelRoot() == *expected;
+    }
+    // A step back (or forward) through the history, after which the scene is `expected`.
+    bool undoneTo(const std::unique_ptr<TQChannelBase>& s) { return host.undo() && sceneIs(s); }
+    bool redoneTo(const std::unique_ptr<TQChannelBase>& s) { return host.redo() && sceneIs(s); }
+
+    // One framework-style edit: every channel gets a keyframe at 4.5 s with a new value.
+    void bracketedEdit(const BNString& description, std::initializer_list<TQChannel*> channels,
+                       double value) {
+        host.startCaptureModifiedChannels(description);
+        for (TQChannel* c : channels) host.willChangeChannel(c);
+        for (TQChannel* c : channels) host.willSetChannelValue(c);
+        for (TQChannel* c : channels) {
+            c->noteWillChange(true);
+            c->setKeyframe(CMTimeMake(9, 2), value);
+        }
+        for (TQChannel* c : channels) host.didSetChannelValue(c);
+        for (TQChannel* c : channels) host.didChangeChannel(c);
+        host.endCaptureModifiedChannels();
+    }
+
+    TQHostAppDelegate host;
+    TQChannelObjectRootBase* object = nullptr;
+    TQChannel *x = nullptr, *y = nullptr, *opacity = nullptr;
+};
+
+TEST_F(HostUndo, brackets__nestedOnesMakeOneStepEmptyOnesNoneAndStrayEndsAreTolerated) {
+    const auto before = scene();
+    host.startCaptureModifiedChannels("Delete Keypoint");
+    host.startCaptureModifiedChannels("Inner");
+    host.willChangeChannel(x);
+    x->noteWillChange(true);
+    x->deleteKeyframe(x->getKeyframes(false).front());
+    host.endCaptureModifiedChannels();
+    EXPECT_TRUE(host.undoStack().isStepOpen()) << "the inner end must not close the step";
+    EXPECT_FALSE(host.canUndo()) << "no undo while a step is open";
+    host.endCaptureModifiedChannels();
+    EXPECT_EQ(host.undoDescription(), "Delete Keypoint");
+    EXPECT_TRUE(undoneTo(before));
+    host.endCaptureModifiedChannels();  // nothing open: changes nothing
+    EXPECT_EQ(host.undoStack().redoCount(), 1u);
+
+    TQHostUndoStack& history = host.undoStack();
+    bracketedEdit("First", {x}, 1.0);
+    const uint64_t first = history.position();
+    bracketedEdit("Second", {y}, 2.0);
+    const uint64_t second = history.position();
+    ASSERT_TRUE(host.undo());  // "Second" waits on the redo side
+    EXPECT_EQ(history.position(), first) << "undo goes back to where First left the history";
+    // A click that announces a channel but moves nothing.
+    host.startCaptureModifiedChannels("Move Keypoint");
+    host.willChangeChannel(x);
+    host.willSetChannelValue(x);
+    host.didSetChannelValue(x);
+    host.didChangeChannel(x);
+    host.endCaptureModifiedChannels();
+    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "an empty step must not be kept";
+    EXPECT_EQ(host.undoDescription() + "/" + host.redoDescription(), "First/Second")
+        << "nor clear redo";
+    // The time-move key command closes its step and then announces again with no did.
+    host.willSetChannelValue(x);
+    host.willChangeChannel(x);
+    EXPECT_FALSE(host.undoStack().isStepOpen());
+    EXPECT_EQ(history.position(), first) << "an empty step is no position";
+    ASSERT_TRUE(host.redo() && history.position() == second && host.undo());
+    bracketedEdit("Third", {opacity}, 0.5);
+    EXPECT_FALSE(host.canRedo() || host.redo()) << "a kept step clears redo";
+    EXPECT_TRUE(history.position() != first && history.position() != second)
+        << "a new step after an undo is a new position";
+
+    host.undoStack().setLevelsOfUndo(2);
+    bracketedEdit("Fourth", {x}, 4.0);
+    EXPECT_EQ(host.undoStack().undoCount(), 2u) << "the oldest steps are forgotten";
+    ASSERT_TRUE(host.undo() && host.undo());
+    EXPECT_FALSE(host.canUndo());
+    EXPECT_EQ(host.redoDescription(), "Third");
+}
+
+TEST_F(HostUndo, capture__anUnannouncedChangeAndAChannelAddedLaterAreTakenWhenTheyChange) {
+    const auto before = scene();
+    host.startCaptureModifiedChannels("Nudge");
+    opacity->noteWillChange(true);  // no willChangeChannel: the key sentry announces nothing
+    opacity->setKeyframe(CMTimeMake(1, 1), 0.25);
+    host.endCaptureModifiedChannels();
+    const auto nudged = scene();
+    host.addChannelToUndo(y, "Add keypoint");
+    host.willChangeChannel(y);
+    y->noteWillChange(true);
+    const CMTime at = CMTimeMake(7, 3);
+    y->addKeyframe(&at);
+    host.didChangeChannel(y);
+    const auto added = scene();
+    EXPECT_EQ(host.undoDescription(), "Add keypoint");
+    EXPECT_TRUE(undoneTo(nudged));
+    EXPECT_TRUE(undoneTo(before));
+    ASSERT_TRUE(host.redo() && host.redo());
+    EXPECT_TRUE(sceneIs(added)) << "the after state is taken lazily";
+    host.addChannelToUndo(x, "Add keypoint");
+    EXPECT_EQ(host.undoStack().undoCount(), 2u) << "recorded but never changed: dropped";
+}
+
+// A change announced with no bracket (a Control band's flatten) is a step of its own; the
+// channels announced after it join it until the history is read.
+TEST_F(HostUndo, unbracketedChanges__becomeOneStepThatUndoes) {
+    const auto before = scene();
+    for (TQChannel* c : {x, y}) {
+        c->noteWillChange(true);
+        c->setKeyframe(CMTimeMake(1, 1), -3.0);
+    }
+    const auto changed = scene();
+    EXPECT_EQ(host.undoDescription(), TQHostUndoStack::kImplicitStepDescription);
+    EXPECT_TRUE(undoneTo(before));
+    EXPECT_FALSE(host.canUndo()) << "both channels in one step";
+    EXPECT_TRUE(redoneTo(changed));
+}
+
+TEST_F(HostUndo, replacedChannel__isFoundByItsReferenceAndAVanishedOneIsSkipped) {
+    const std::unique_ptr<TQChannelBase> before(object->cloneChannel());
+    bracketedEdit("Edit", {x}, 77.0);
+    // Replace the whole object by a copy with the same id: the channel objects are new.
+    std::unique_ptr<TQChannelObjectRootBase> copy(
+        static_cast<TQChannelObjectRootBase*>(object->cloneChannel()));
+    host.scene().removeObject(object);
+    object = host.scene().adoptObject(std::move(copy));
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(*object == *before)
+        << "undo must reach the channel that now lives at the reference";
+    host.scene().removeObject(object);
+    EXPECT_TRUE(host.redo()) << "gone altogether: redo skips it without harm";
+}
+
+TEST_F(HostUndo, clientStep__restoresThroughItsOwnerJoinsAnOpenStepAndDiesWithIt) {
+    struct Client : TQHostUndoClient {
+        int value = 0;
+        std::any captureUndoState(uint32_t, uint32_t) override { return value; }
+        void restoreUndoState(uint32_t, uint32_t, const std::any& state) override {
+            value = std::any_cast<int>(state);
+        }
+    } client;
+    int owner = 0;  // any object's address names the owner
+    host.registerUndoClient(&owner, &client);
+    client.value = 1;
+    host.addToUndo(&owner, 2, 0, "Curve Editor Undo Remove Channel");
+    client.value = 2;
+    EXPECT_EQ(host.undoDescription(), "Curve Editor Undo Remove Channel");
+    ASSERT_TRUE(host.undo());
+    EXPECT_EQ(client.value, 1);
+    ASSERT_TRUE(host.redo());
+    EXPECT_EQ(client.value, 2);
+
+    const auto before = scene();
+    host.startCaptureModifiedChannels("Box Edit");
+    host.addToUndo(&owner, 1, 0, "Curve Editor Undo Box Edit");
+    client.value = 3;
+    host.willChangeChannel(x);
+    x->noteWillChange(true);
+    x->setKeyframe(CMTimeMake(3, 1), -9.0);
+    host.endCaptureModifiedChannels();
+    EXPECT_EQ(host.undoStack().undoCount(), 2u);
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(client.value == 2 && sceneIs(before));
+
+    host.unregisterUndoClient(&owner);
+    EXPECT_EQ(host.undoStack().undoCount(), 0u) << "the client's own step goes with it";
+    EXPECT_EQ(host.undoStack().redoCount(), 1u) << "a step with channels stays, without the client";
+    int stranger = 0;
+    host.addToUndo(&stranger, 2, 1, "Curve Editor Undo New Curve Set");
+    EXPECT_EQ(host.undoStack().undoCount(), 0u) << "no registered owner: nothing to restore";
+}
+
+TEST_F(HostUndo, undo__marksRestoredChannelsModifiedAndPosts) {
+    Words counter;
+    host.addNotificationReceiver(&counter);
+    bracketedEdit("Edit", {opacity}, 0.1);
+    host.resetModifiedChannels();
+    ASSERT_TRUE(host.undo());
+    EXPECT_TRUE(host.wasChannelModified(opacity) && !host.wasChannelModified(x));
+    EXPECT_EQ(counter.seen.back(), kTQNotifyChannelsChanged);
+    host.removeNotificationReceiver(&counter);
 }
 
 }  // namespace

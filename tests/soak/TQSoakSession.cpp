@@ -189,24 +189,22 @@ void TQSoakSession::chooseCurveSet() {
 
 void TQSoakSession::click() {
     const CGPoint at = pressPoint();
-    const uint64_t modifiers = below(4) == 0 ? uint64_t{RWEventModifierFlagShift} : 0;
-    mouse(RWEventType::LeftMouseDown, at, modifiers);
-    mouse(RWEventType::LeftMouseUp, at, modifiers);
+    clickAt(at, below(4) == 0 ? uint64_t{RWEventModifierFlagShift} : 0);
 }
 
 void TQSoakSession::drag() {
-    static const uint64_t kModifiers[] = {0,
-                                          0,
-                                          0,
-                                          RWEventModifierFlagShift,
-                                          RWEventModifierFlagControl,
-                                          RWEventModifierFlagOption | RWEventModifierFlagCommand};
-    static const char* const kNames[] = {"", "", "", "shift", "control", "option-command"};
+    static const std::pair<const char*, uint64_t> kModifiers[] = {
+        {"", 0},
+        {"", 0},
+        {"", 0},
+        {"shift", RWEventModifierFlagShift},
+        {"control", RWEventModifierFlagControl},
+        {"option-command", RWEventModifierFlagOption | RWEventModifierFlagCommand}};
     const CGPoint from = pressPoint();
     const CGPoint to = CGPointMake(from.x + uniform(-120.0, 120.0), from.y + uniform(-90.0, 90.0));
-    const size_t m = below(std::size(kModifiers));
-    _lastDetail = kNames[m];
-    dragPath(from, to, kModifiers[m], 2 + static_cast<int>(below(6)));
+    const auto& [name, modifiers] = kModifiers[below(std::size(kModifiers))];
+    _lastDetail = name;
+    dragPath(from, to, modifiers, 2 + static_cast<int>(below(6)));
 }
 
 void TQSoakSession::band() {
@@ -215,10 +213,8 @@ void TQSoakSession::band() {
 
 void TQSoakSession::doubleClick() {
     const CGPoint at = below(2) == 0 ? pressPoint() : anyPoint();
-    mouse(RWEventType::LeftMouseDown, at, 0, 1);
-    mouse(RWEventType::LeftMouseUp, at, 0, 1);
-    mouse(RWEventType::LeftMouseDown, at, 0, 2);
-    mouse(RWEventType::LeftMouseUp, at, 0, 2);
+    clickAt(at, 0, 1);
+    clickAt(at, 0, 2);
     // A double-click on a keypoint asks for its value: the modal service is not installed,
     // so the question goes unanswered and nothing changes.
 }
@@ -536,6 +532,11 @@ void TQSoakSession::dragPath(const CGPoint& from, const CGPoint& to, uint64_t mo
               CGPointMake(from.x + (to.x - from.x) * f, from.y + (to.y - from.y) * f), modifiers);
     }
     mouse(RWEventType::LeftMouseUp, to, modifiers);
+}
+
+void TQSoakSession::clickAt(const CGPoint& at, uint64_t modifiers, int64_t clicks) {
+    mouse(RWEventType::LeftMouseDown, at, modifiers, clicks);
+    mouse(RWEventType::LeftMouseUp, at, modifiers, clicks);
 }
 
 double TQSoakSession::uniform(double low, double high) {

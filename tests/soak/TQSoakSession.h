@@ -76,6 +76,7 @@ private:
     CGPoint pressPoint();
     void frame();
     void mouse(RWEventType type, const CGPoint& at, uint64_t modifiers, int64_t clicks = 1);
+    void clickAt(const CGPoint& at, uint64_t modifiers, int64_t clicks = 1);
     void dragPath(const CGPoint& from, const CGPoint& to, uint64_t modifiers, int steps);
     double uniform(double low, double high);
     size_t below(size_t count);

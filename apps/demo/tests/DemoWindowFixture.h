@@ -6,16 +6,21 @@
 
 #include <QMenu>
 #include <QPoint>
+#include <QPushButton>
 #include <QTest>
+#include <QTimer>
 
 #include <cmath>
+#include <functional>
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "apps/demo/TQDemoWindow.h"
 #include "platform/ui/RWServices.h"
 #include "platform/ui/testing/RWTestDoubles.h"
 #include "qt/TQQtCurveViewWidget.h"
+#include "qt/TQQtModal.h"
 #include "qt/TQQtPopUpButton.h"
 
 namespace demo_test {
@@ -44,6 +49,7 @@ private:
 class DemoWindowTest : public ::testing::Test {
 protected:
     void SetUp() override {
+        modal.install();
         window.curveView().setClock(&clock);
         window.curveView().setTimer(&timer);
         window.show();
@@ -63,11 +69,41 @@ protected:
         window.curveWidget()->repaint();
     }
 
-    // Copies of the channels the view shows, in the set's order.
-    std::vector<std::unique_ptr<TQChannelBase>> snapshot() {
-        std::vector<std::unique_ptr<TQChannelBase>> out;
-        for (TQChannel* channel : shownChannels()) out.emplace_back(channel->cloneChannel());
+    // A copy of the whole scene, to compare with operator== later.
+    std::unique_ptr<TQChannelBase> sceneCopy() {
+        return std::unique_ptr<TQChannelBase>(window.host().sceneChannelRoot()->cloneChannel());
+    }
+    // The paths of the scene's channels that differ from their copies in `before`.
+    std::vector<std::string> changedSince(TQChannelBase& before) {
+        TQChannelBase* root = window.host().sceneChannelRoot();
+        std::vector<TQChannelBase*> all;
+        static_cast<TQChannelFolder*>(root)->getAllDescendantsFlattened(all, 0, false);
+        std::vector<std::string> out;
+        for (TQChannelBase* c : all) {
+            const TQChannelRef ref(c, root);
+            const TQChannelBase* was = ref.getChannel(&before);
+            if (dynamic_cast<TQChannel*>(c) && !(was && *was == *c)) out.push_back(ref.getText());
+        }
         return out;
+    }
+    // Works the dialog of the modal run that `open` starts, once it is up; a dialog left open
+    // is aborted.
+    void inDialog(const std::function<void()>& open, const std::function<void(QDialog&)>& user) {
+        bool shown = false;
+        QTimer::singleShot(0, [&] {
+            if (QDialog* dialog = modal.activeDialog()) {
+                shown = true;
+                user(*dialog);
+            }
+            if (modal.activeDialog()) modal.abortModal();
+        });
+        open();
+        EXPECT_TRUE(shown) << "no dialog showed";
+    }
+    static void click(QDialog& dialog, const char* title) {
+        for (QPushButton* button : dialog.findChildren<QPushButton*>())
+            if (button->text() == QLatin1String(title)) return button->click();
+        ADD_FAILURE() << "no button " << title;
     }
     std::vector<TQChannel*> shownChannels() {
         std::vector<TQChannel*> out;
@@ -76,14 +112,6 @@ protected:
             if (TQChannel* c = controller.selectedCurveSet()->channeItemAtIndex(i)->channel())
                 out.push_back(c);
         return out;
-    }
-    // How many shown channels differ from the snapshot (a channel gone counts as different).
-    size_t changedCount(const std::vector<std::unique_ptr<TQChannelBase>>& before) {
-        const std::vector<TQChannel*> now = shownChannels();
-        size_t changed = now.size() == before.size() ? 0 : 1;
-        for (size_t i = 0; i < std::min(now.size(), before.size()); ++i)
-            if (!(*now[i] == *before[i])) ++changed;
-        return changed;
     }
     // A world point of the curve view in the curve widget's coordinates.
     QPoint toWidget(const CGPoint& world) {
@@ -130,6 +158,7 @@ protected:
     RWManualClock clock;
     RWManualTimer timer{clock};
     TQDemoWindow window;
+    TQQtModalService modal;
 };
 
 }  // namespace demo_test
