@@ -95,6 +95,7 @@ TEST_F(ItemFixture, folderItem__flattensSubfoldersIntoChannelItemsWithTheirState
     auto again = std::make_shared<TQCurveEditorFolderItem>();
     again->initWithChannel(cube, 10, &host, 1);
     EXPECT_EQ(again->numberOfChildren(), 3u) << "hidden channels are excluded";
+    deep->resetFlag(kTQChannelFlagHidden);
 
     // Enabled states, selection and animation.
     auto empty = std::make_shared<TQCurveEditorFolderItem>();
