@@ -234,7 +234,8 @@ INSTANTIATE_TEST_SUITE_P(
                 "segment 0 nan; shift 10; offset 11.5 40; offset 11.5 40; offset 14 0; "
                 "offset 11.5 nan; offset nan 5; delat nan"},
         // Without keyframes both move the initial value.
-        KeyEdit{"offsetsWithoutKeyframes", "delall 0; initial 3; offset 1 -2; segment 1 -4"},
+        KeyEdit{"offsetsWithoutKeyframes",
+                "delall 0; initial 3; curve? 1; offset 1 -2; curve? 1; segment 1 -4; curve? 1"},
         // Without animation the initial value is shown and a value edit sets it; deleting every
         // keyframe keeps the value shown; without keyframes a value edit sets the initial value.
         KeyEdit{"valuesAndAnimation",

@@ -135,6 +135,9 @@ TEST_F(CurveSetFixture, mutable__appendInsertAndRemoveKeepOneItemPerChannel) {
     set->appendItem(itemFor(ball, "./1/200/202"));
     set->insertItem(x, z->channelId());
     EXPECT_EQ(text(*set), "Cube[X Y Z] Ball[Opacity]") << "present: not inserted again";
+    set->insertItem(nullptr, z->channelId());
+    set->insertItem(itemFor(ball, "./1/100/101/1"), z->channelId());
+    EXPECT_EQ(text(*set), "Cube[X Y Z] Ball[Opacity]") << "only before a child of its own object";
     EXPECT_EQ(std::tuple(set->channeItemAtIndex(2), set->channeItemAtIndex(4),
                          set->itemWithIdentifier(y->channelId())),
               std::tuple(z, nullptr, y));

@@ -139,7 +139,8 @@ INSTANTIATE_TEST_SUITE_P(
         // also when only the lowest dragged keypoint is in it.
         Gesture{"intoTheTopBand", kEnds, "", "d 2 0|m 2 .5|m 2 .95|u 2 .95|r 9 .9"},
         Gesture{"pastTheRightEdge", kEnds, "", "z|d 9.5 0|m 10.5 0|u 10.5 0"},
-        Gesture{"pastTheLeftEdge", kEnds, "", "z|d 9.5 0|m 10.5 0|u 10.5 0|f|d 2 0|m .25 0|u .25 0"},
+        Gesture{"pastTheLeftEdge", kEnds, "",
+                "z|d 9.5 0|m 10.5 0|u 10.5 0|f|d 2 0|m .25 0|u .25 0"},
         Gesture{"intoTheBottomBand", kEnds, "", "z|d 2 0|m 2 -.95|u 2 -.95"},
         Gesture{"lowestKeyIntoTheBottomBand", kLinear, "A@5 A@2 A@8", "z|d 5 .5|m 5 -.45|u 5 -.45"},
         // With the space bar a drag on nothing pans the display range by the pointer's
