@@ -155,8 +155,11 @@ private:
         std::string out;
         const auto handles = c.getKeyframes(false);
         size_t i = 0;
-        for (std::string k; keys >> k; ++i)
-            out += (out.empty() ? "" : " ") + (i < handles.size() ? label(handles[i]) : "") + k;
+        for (std::string k; keys >> k; ++i) {
+            if (!out.empty()) out += ' ';
+            if (i < handles.size()) out += label(handles[i]);
+            out += k;
+        }
         return out;
     }
 

@@ -411,7 +411,7 @@ TEST_P(TreeCompoundEdits, edit__as_recorded) {
         record += step.substr(step.find_first_not_of(' ')) + ": " + keys() + " | s " +
                   keyText(stranger) + (collided ? " collided" : "") + ";";
         for (const TQChannelBase* c : observer.told)
-            record += " " + (c == &stranger ? "s" : std::to_string(c->getChannelId()));
+            record.append(" ").append(c == &stranger ? "s" : std::to_string(c->getChannelId()));
         record += "\n";
     }
     EXPECT_TRUE(tests_support::matchesBaselineBlock("compound-edits", GetParam().name, record,

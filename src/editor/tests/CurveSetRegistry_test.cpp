@@ -198,18 +198,20 @@ protected:
         const TQChannelBase* c = item.channelBase();
         if (!c || !c->getChannelRoot()) return "(vanished)";
         const auto* shown = dynamic_cast<const TQCurveEditorChannelItem*>(&item);
-        return c->getChannelRoot()->getName() + ":" + c->getParent()->getName() + "." +
-               c->getName() + (shown ? "#" + std::to_string(shown->colorIndex()) : "") +
-               (item.isEnabledItem() ? "" : "-") + (item.isSelected() ? "*" : "");
+        std::string out =
+            c->getChannelRoot()->getName() + ":" + c->getParent()->getName() + "." + c->getName();
+        if (shown) out.append("#").append(std::to_string(shown->colorIndex()));
+        return out + (item.isEnabledItem() ? "" : "-") + (item.isSelected() ? "*" : "");
     }
     std::string form(const TQCurveSet& set) {
         const auto [at, added] = letters.emplace(set.curveSetId(), char('a' + letters.size()));
-        std::string out = "[" + std::string(1, at->second) + "]" + set.curveSetName();
+        std::string out = {'[', at->second, ']'};
+        out += set.curveSetName();
         if (!set.curveSetShortcut().empty()) out += ":" + set.curveSetShortcut();
         if (set.isRelative())
             out +=
                 "/relative of " + std::to_string(set.references() ? set.references()->size() : 0);
-        for (const TQCurveEditorItemPtr& item : set.allItems()) out += " " + name(*item);
+        for (const TQCurveEditorItemPtr& item : set.allItems()) out.append(" ").append(name(*item));
         return out;
     }
     std::string state() {
