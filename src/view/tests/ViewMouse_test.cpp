@@ -154,8 +154,10 @@ INSTANTIATE_TEST_SUITE_P(
         Gesture{"nudges", "A: 10/30=0.25 20/30=0.5", "",
                 "a selectAll:|a nudgeRight:|a nudgeRight:|a nudgeLeft:|a nudgeUp:|"
                 "a nudgeUpFinished:|a nudgeDown:|a nudgeSideways:"},
-        // Delete takes the selected keypoints; with the box tool only the box.
+        // Delete takes the selected keypoints; with the box tool only the box. Select All
+        // starts the selection afresh.
         Gesture{"deleteKeys", kBezier, "A@5 A@8", "a delete:"},
+        Gesture{"selectAllReplaces", kLinear, "A@5", "a selectAll:"},
         Gesture{"deleteTheBox", kBezier, "", "b|d 1 .9|m 6 -.2|u 6 -.2|?|a delete:"},
         // A free distortion of the box's top-right corner in five steps is one undo step, each
         // drag step and the release announced per channel.
