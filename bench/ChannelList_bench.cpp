@@ -34,7 +34,7 @@ struct ListEditor {
     int64_t cellsDrawn = 0;
 
     ListEditor() {
-        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneSpec());
+        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneLayout());
         view.setViewHost(&viewHost);
         const CMTimeRange range = host.displayRange();
         view.setTotalRange(&range.start, &range.duration);

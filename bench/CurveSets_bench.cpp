@@ -20,7 +20,7 @@ namespace {
 TQHostAppDelegate& stressHost() {
     static TQHostAppDelegate host;
     static const bool loaded = [] {
-        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneSpec());
+        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneLayout());
         return true;
     }();
     (void)loaded;

@@ -35,7 +35,7 @@ struct Editor {
     std::vector<TQChannelObjectRootBase*> objects;
 
     Editor() {
-        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneSpec());
+        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneLayout());
         objects = host.scene().objects();
         view.setViewHost(&viewHost);
         const CMTimeRange range = host.displayRange();

@@ -32,7 +32,7 @@ CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTimescale); }
 // curve's samples.
 struct FrameScene : TQBenchGestureView {
     FrameScene()
-        : TQBenchGestureView(TQBenchStackedCurvesSpec(), kViewWidthPoints, kViewHeightPoints,
+        : TQBenchGestureView(TQBenchStackedCurvesLayout(), kViewWidthPoints, kViewHeightPoints,
                              kTQBenchStackedBand * kTQBenchStackedCurves + 1.0) {}
 };
 
@@ -54,7 +54,7 @@ public:
 
 struct TimelineFrameScene : TQBenchViewScene<TQCurveEditorView, TimelineBenchCtrl> {
     TimelineFrameScene()
-        : TQBenchViewScene(TQBenchStackedCurvesSpec(), kViewWidthPoints, kViewHeightPoints,
+        : TQBenchViewScene(TQBenchStackedCurvesLayout(), kViewWidthPoints, kViewHeightPoints,
                            kTQBenchStackedBand * kTQBenchStackedCurves + 1.0) {
         // One curve selected, its middle keypoint being dragged (its label shows).
         const TQCurveEditorItemPtr item = set->channeItemAtIndex(kTQBenchStackedCurves / 2);

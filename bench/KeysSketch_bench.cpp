@@ -21,7 +21,7 @@ struct KeyAction final : RWActionSender {
 };
 
 void BM_NudgeStep(benchmark::State& state) {
-    TQBenchGestureView scene(TQBenchStackedCurvesSpec(), 2000.0, 600.0,
+    TQBenchGestureView scene(TQBenchStackedCurvesLayout(), 2000.0, 600.0,
                              kTQBenchStackedBand * kTQBenchStackedCurves + 1.0);
     scene.view.selectAll();
     KeyAction key;

@@ -63,7 +63,7 @@ namespace {
 // The stress scene: 100 objects of the kestrel family with 30 animated channels each (the
 // modelled ones, then plain ones), a million keyframes in all.
 void buildStressScene(TQHostAppDelegate& host) {
-    TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneSpec());
+    TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneLayout());
 }
 
 std::string projectPath() {

@@ -15,7 +15,7 @@ inline constexpr size_t kTQBenchStackedKeyframes = 20;
 inline constexpr double kTQBenchStackedSeconds = 20.0;
 inline constexpr double kTQBenchStackedBand = 0.2;
 
-inline TQHostDenseSceneSpec TQBenchStackedCurvesSpec() {
+inline TQHostDenseSceneLayout TQBenchStackedCurvesLayout() {
     return {.objects = 1,
             .channelsPerObject = kTQBenchStackedCurves,
             .keyframesPerChannel = kTQBenchStackedKeyframes,

@@ -47,7 +47,7 @@ private:
     } _target;
 };
 
-// The dense scene of `spec` in a view of width x height points at scale 1 that shows its whole
+// The dense scene of `layout` in a view of width x height points at scale 1 that shows its whole
 // span by the world height from -1 to `top`, through the reference host. Every channel is in
 // the controller's set, auto-zoom and auto-pan are off so that gestures leave the volume
 // alone, and one frame has been drawn, so that hit tests have primitives. The view and the
@@ -67,7 +67,7 @@ struct TQBenchViewScene {
     // Past the view's 1/30 s gate on drag steps.
     static constexpr double kStep = 0.05;
 
-    TQBenchViewScene(const TQHostDenseSceneSpec& spec, double width, double height, double top)
+    TQBenchViewScene(const TQHostDenseSceneLayout& layout, double width, double height, double top)
         : viewHost(width, height, 1.0), encoder(width, height) {
         ctrl.init();
         ctrl.setAppDelegate(&host);
@@ -78,15 +78,16 @@ struct TQBenchViewScene {
         view.setController(&ctrl);
         ctrl.setView(&view);
         const CMTime start = TQTarnTimeForChannelSeconds(0.0, kTQCurveEditorTimescale);
-        const CMTime duration = TQTarnTimeForChannelSeconds(spec.seconds, kTQCurveEditorTimescale);
+        const CMTime duration =
+            TQTarnTimeForChannelSeconds(layout.seconds, kTQCurveEditorTimescale);
         view.setDisplayRange(&start, &duration);
         view.setTotalRange(&start, &duration);
-        view.setCurrentViewVolume(CGRectMake(0.0, -1.0, spec.seconds, top + 1.0));
+        view.setCurrentViewVolume(CGRectMake(0.0, -1.0, layout.seconds, top + 1.0));
         view.setOriginalViewVolume(view.getCurrentViewVolume());
         view.setAutoZoom(0);
         view.setAutoPan(0);
         ctrl.setSelectedCurveSet(set);
-        TQHostPopulateDenseScene(host.scene(), spec);
+        TQHostPopulateDenseScene(host.scene(), layout);
         channels = TQBenchAppendAllChannels(ctrl, host.scene(), set);
         frame();
     }

@@ -25,7 +25,7 @@ constexpr double kTop = kTQBenchStackedBand * kTQBenchStackedCurves + 0.5;
 // that start on nothing.
 struct GestureScene : TQBenchGestureView {
     GestureScene()
-        : TQBenchGestureView(TQBenchStackedCurvesSpec(), 2000.0, 600.0,
+        : TQBenchGestureView(TQBenchStackedCurvesLayout(), 2000.0, 600.0,
                              kTQBenchStackedBand * kTQBenchStackedCurves + 1.0) {}
 };
 

@@ -58,7 +58,7 @@ struct WholeEditor {
 
     WholeEditor() {
         ensureGuiApplication();
-        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneSpec());
+        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel, TQHostStressSceneLayout());
         view.setViewHost(&viewHost);
         view.setClock(&clock);
         view.setTimer(&timer);

@@ -45,31 +45,31 @@ TQChannel* addPlainChannel(TQChannelFolder& folder, size_t index) {
 
 // The channels of one new object that get keyframes, in order.
 std::vector<TQChannel*> makeObject(TQHostScene& scene, const BNString& name,
-                                   const TQHostDenseSceneSpec& spec) {
+                                   const TQHostDenseSceneLayout& layout) {
     std::vector<TQChannel*> animated;
     TQChannelObjectRootBase* object = nullptr;
-    if (spec.channels == TQHostDenseChannels::Plain) {
+    if (layout.channels == TQHostDenseChannels::Plain) {
         object = scene.adoptObject(std::make_unique<TQChannelObjectRootBase>(
             name, static_cast<TQChannelId>(scene.numberOfObjects() + 1)));
-        for (size_t c = 0; c < spec.channelsPerObject; ++c)
+        for (size_t c = 0; c < layout.channelsPerObject; ++c)
             animated.push_back(addPlainChannel(*object, c));
     } else {
         object = scene.addObject(name);
         std::vector<TQChannelBase*> modelled;
         object->getAllDescendantsFlattened(modelled, 0, true);
         for (TQChannelBase* channel : modelled) {
-            if (animated.size() == spec.channelsPerObject) break;
+            if (animated.size() == layout.channelsPerObject) break;
             if (auto* c = dynamic_cast<TQChannel*>(channel)) animated.push_back(c);
         }
-        if (animated.size() < spec.channelsPerObject) {
+        if (animated.size() < layout.channelsPerObject) {
             auto* extra = static_cast<TQChannelFolder*>(
                 object->addChild(std::make_unique<TQChannelFolder>("Dense", kDenseFolderId)));
-            for (size_t c = 0; animated.size() < spec.channelsPerObject; ++c)
+            for (size_t c = 0; animated.size() < layout.channelsPerObject; ++c)
                 animated.push_back(addPlainChannel(*extra, c));
         }
     }
     object->setTimeExtent(
-        {kCMTimeZero, TQTarnTimeForChannelSeconds(spec.seconds, kChannelTimescale)});
+        {kCMTimeZero, TQTarnTimeForChannelSeconds(layout.seconds, kChannelTimescale)});
     return animated;
 }
 
@@ -80,56 +80,58 @@ bool isOverRangeComponent(const TQChannel& channel) {
 }
 
 void addKeyframes(TQChannel& channel, size_t count, size_t bandIndex,
-                  const TQHostDenseSceneSpec& spec, Generator& random) {
+                  const TQHostDenseSceneLayout& layout, Generator& random) {
     if (count == 0) return;
     channel.setInterpolation(kTQInterpolationBezier);  // what new keyframes take
     const double span = isOverRangeComponent(channel)
                             ? CMTimeGetSeconds(TQOverRangePositionRange().duration)
-                            : spec.seconds;
+                            : layout.seconds;
     const double phase = random.unit() * 2.0 * std::numbers::pi;
     const double base =
-        channel.getDefaultValue() + spec.bandSpacing * static_cast<double>(bandIndex);
+        channel.getDefaultValue() + layout.bandSpacing * static_cast<double>(bandIndex);
     for (size_t k = 0; k < count; ++k) {
         const double seconds = span * static_cast<double>(k) / static_cast<double>(count);
         const double wave = 0.7 * std::sin(phase + 0.35 * static_cast<double>(k)) +
                             0.3 * (random.unit() * 2.0 - 1.0);
         channel.setKeyframe(TQTarnTimeForChannelSeconds(seconds, kChannelTimescale),
-                            base + spec.amplitude * wave);
+                            base + layout.amplitude * wave);
     }
 }
 
 }  // namespace
 
-TQHostDenseSceneSpec TQHostStressSceneSpec() {
-    TQHostDenseSceneSpec spec;
-    spec.objects = 100;
-    spec.channelsPerObject = 30;
-    spec.totalKeyframes = 1'000'000;
-    return spec;
+TQHostDenseSceneLayout TQHostStressSceneLayout() {
+    TQHostDenseSceneLayout layout;
+    layout.objects = 100;
+    layout.channelsPerObject = 30;
+    layout.totalKeyframes = 1'000'000;
+    return layout;
 }
 
-size_t TQHostDenseKeyframesOfChannel(const TQHostDenseSceneSpec& spec, size_t index) {
-    if (spec.totalKeyframes == 0) return spec.keyframesPerChannel;
-    const size_t channels = spec.objects * spec.channelsPerObject;
+size_t TQHostDenseKeyframesOfChannel(const TQHostDenseSceneLayout& layout, size_t index) {
+    if (layout.totalKeyframes == 0) return layout.keyframesPerChannel;
+    const size_t channels = layout.objects * layout.channelsPerObject;
     if (channels == 0) return 0;
-    return spec.totalKeyframes / channels + (index < spec.totalKeyframes % channels ? 1 : 0);
+    return layout.totalKeyframes / channels + (index < layout.totalKeyframes % channels ? 1 : 0);
 }
 
-void TQHostPopulateDenseScene(TQHostScene& scene, const TQHostDenseSceneSpec& spec) {
-    Generator random(spec.seed);
+void TQHostPopulateDenseScene(TQHostScene& scene, const TQHostDenseSceneLayout& layout) {
+    Generator random(layout.seed);
     size_t index = 0;
-    for (size_t o = 0; o < spec.objects; ++o) {
-        for (TQChannel* channel : makeObject(scene, numbered("Dense ", o + 1), spec)) {
-            addKeyframes(*channel, TQHostDenseKeyframesOfChannel(spec, index), index, spec, random);
+    for (size_t o = 0; o < layout.objects; ++o) {
+        for (TQChannel* channel : makeObject(scene, numbered("Dense ", o + 1), layout)) {
+            addKeyframes(*channel, TQHostDenseKeyframesOfChannel(layout, index), index, layout,
+                         random);
             ++index;
         }
     }
 }
 
 void TQHostLoadDenseScene(TQHostAppDelegate& host, TQHostObjectFamily family,
-                          const TQHostDenseSceneSpec& spec) {
+                          const TQHostDenseSceneLayout& layout) {
     TQHostLoadBuiltScene(
         host, family, CMTimeMake(1, 30),
-        CMTimeRangeMake(kCMTimeZero, TQTarnTimeForChannelSeconds(spec.seconds, kChannelTimescale)),
-        [&spec](TQHostScene& scene) { TQHostPopulateDenseScene(scene, spec); });
+        CMTimeRangeMake(kCMTimeZero,
+                        TQTarnTimeForChannelSeconds(layout.seconds, kChannelTimescale)),
+        [&layout](TQHostScene& scene) { TQHostPopulateDenseScene(scene, layout); });
 }

@@ -31,7 +31,7 @@ class TQHostAppDelegate;
 
 enum class TQHostDenseChannels { Modelled, Plain };
 
-struct TQHostDenseSceneSpec {
+struct TQHostDenseSceneLayout {
     size_t objects = 10;
     size_t channelsPerObject = 30;
     size_t keyframesPerChannel = 100;
@@ -46,16 +46,16 @@ struct TQHostDenseSceneSpec {
 };
 
 // The stress scene: 100 objects of 30 channels, 1,000,000 keyframes in all.
-TQHostDenseSceneSpec TQHostStressSceneSpec();
+TQHostDenseSceneLayout TQHostStressSceneLayout();
 
 // The keyframes channel `index` (over the whole scene, from 0) gets.
-size_t TQHostDenseKeyframesOfChannel(const TQHostDenseSceneSpec& spec, size_t index);
+size_t TQHostDenseKeyframesOfChannel(const TQHostDenseSceneLayout& layout, size_t index);
 
 // Appends the objects ("Dense 1", "Dense 2", ...) to the scene.
-void TQHostPopulateDenseScene(TQHostScene& scene, const TQHostDenseSceneSpec& spec);
+void TQHostPopulateDenseScene(TQHostScene& scene, const TQHostDenseSceneLayout& layout);
 
 // Replaces the host's scene by the dense scene in the given family: display and play range 0 to
 // `seconds`, frame duration 1/30 s, playhead at 0, the first object selected; undo history and
 // modified set start empty, and kTQNotifySceneChanged is posted.
 void TQHostLoadDenseScene(TQHostAppDelegate& host, TQHostObjectFamily family,
-                          const TQHostDenseSceneSpec& spec);
+                          const TQHostDenseSceneLayout& layout);

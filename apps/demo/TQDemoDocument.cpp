@@ -64,7 +64,7 @@ void TQDemoDocument::loadStress() {
     {
         const LoadingScope loading(_loading);
         _project.newDocument(kFamily);
-        TQHostLoadDenseScene(_host, kFamily, TQHostStressSceneSpec());
+        TQHostLoadDenseScene(_host, kFamily, TQHostStressSceneLayout());
         const std::vector<TQChannelObjectRootBase*> objects = _host.scene().objects();
         const std::vector<TQChannelBase*> firstTwo(
             objects.begin(), objects.begin() + std::min<std::ptrdiff_t>(2, std::ssize(objects)));

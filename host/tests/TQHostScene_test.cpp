@@ -306,7 +306,7 @@ INSTANTIATE_TEST_SUITE_P(BothFamilies, SamplePiece,
 TEST(DenseScene, sizeAndSeed__asAskedAndTheSameForTheSameSeed) {
     const struct {
         TQHostObjectFamily family;
-        TQHostDenseSceneSpec spec;
+        TQHostDenseSceneLayout layout;
         size_t channels;  // in the objects, animated or not
         size_t keyframes;
     } cases[] = {
@@ -320,8 +320,8 @@ TEST(DenseScene, sizeAndSeed__asAskedAndTheSameForTheSameSeed) {
     };
     for (const auto& c : cases) {
         TQHostScene scene(c.family), again(c.family);
-        TQHostPopulateDenseScene(scene, c.spec);
-        TQHostPopulateDenseScene(again, c.spec);
+        TQHostPopulateDenseScene(scene, c.layout);
+        TQHostPopulateDenseScene(again, c.layout);
         const auto channels = channelsOf(scene), twins = channelsOf(again);
         ASSERT_EQ(channels.size(), c.channels);
         size_t keyframes = 0;
@@ -331,7 +331,7 @@ TEST(DenseScene, sizeAndSeed__asAskedAndTheSameForTheSameSeed) {
         }
         EXPECT_EQ(keyframes, c.keyframes);
     }
-    const TQHostDenseSceneSpec stress = TQHostStressSceneSpec();
+    const TQHostDenseSceneLayout stress = TQHostStressSceneLayout();
     EXPECT_EQ(stress.objects * stress.channelsPerObject, 3000u);
     EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 0), 334u) << "the remainder goes first";
     EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 2999), 333u);
