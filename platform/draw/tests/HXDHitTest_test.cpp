@@ -61,20 +61,6 @@ protected:
     }
 };
 
-TEST_F(HitTestFixture, mapping__agreesWithTheViewConversion) {
-    const BNMatrix44f& projection = controller.renderingContext()->projection();
-    const HXDScreenMapping mapping(projection, CGSizeMake(200, 100));
-    for (const CGPoint world : {CGPointMake(0, 0), CGPointMake(2.5, -4), CGPointMake(10, 5)}) {
-        const CGPoint expected = BNProjectionWorldToScreen(projection, CGSizeMake(200, 100), world);
-        const CGPoint got = mapping.worldToPixel(world.x, world.y);
-        EXPECT_NEAR(got.x, expected.x, kPixelTolerance) << "world x " << world.x;
-        EXPECT_NEAR(got.y, expected.y, kPixelTolerance) << "world y " << world.y;
-        const CGPoint back = mapping.pixelToWorld(got.x, got.y);
-        EXPECT_NEAR(back.x, world.x, 1e-6);
-        EXPECT_NEAR(back.y, world.y, 1e-6);
-    }
-}
-
 TEST_F(HitTestFixture, multiline__hitOnTheLineWithinTheToleranceAndOnlyAfterAFrame) {
     const HXDPrimitiveArray list{nullptr,
                                  curve({{{0, 0, 0}, {}}, {{5, 2, 0}, {}}, {{10, 2, 0}, {}}})};

@@ -9,7 +9,6 @@
 namespace {
 
 constexpr double kExact = 1e-12;
-constexpr double kFloatUlp = 1.1920928955078125e-7;  // FLT_EPSILON
 
 template <class T>
 ::testing::AssertionResult near(const BNMatrix44Tmpl<T>& a, const BNMatrix44Tmpl<T>& b,
@@ -120,40 +119,6 @@ TEST(Matrix, invert__pivotsRowsAndTurnsSingularMatricesToZero) {
     EXPECT_FALSE(ok) << "a float matrix singular up to rounding must be reported singular";
     EXPECT_TRUE(std::isnan(BNMatrix44d().transformPoint(1.0, 2.0, 3.0).x))
         << "a point through the singular answer has no value";
-}
-
-// The view's mapping: the projection of the last frame, kept column-major in single
-// precision, made row-major and applied to double vectors.
-TEST(ViewProjection, roundTrip__worldToScreenToWorldWithinFloatRounding) {
-    const CGSize drawable = CGSizeMake(1600.0, 900.0);
-    for (const CGRect& volume :
-         {CGRectMake(0.0, -62.5, 100.0, 125.0), CGRectMake(3600.0, -1.0, 10.0, 2.0),
-          CGRectMake(0.25, 1e-3, 0.5, 2e-3)}) {
-        float cm[16];
-        BNViewVolumeProjection(volume).toColumnMajor(cm);
-        const BNMatrix44f p = BNMatrix44f::fromColumnMajor(cm);
-        // A few float ulps of the larger of the volume's edges, in world units.
-        auto tol = [](double origin, double size) {
-            return 16.0 * kFloatUlp * std::fmax(std::fabs(origin), size);
-        };
-        for (double fx : {0.0, 0.125, 0.5, 0.9})
-            for (double fy : {0.0, 0.3, 1.0}) {
-                const CGPoint world{volume.origin.x + fx * volume.size.width,
-                                    volume.origin.y + fy * volume.size.height};
-                const CGPoint screen = BNProjectionWorldToScreen(p, drawable, world);
-                SCOPED_TRACE(testing::Message() << volume.origin.x << " " << fx << " " << fy);
-                EXPECT_NEAR(screen.x, fx * drawable.width, 1e-2);
-                EXPECT_NEAR(screen.y, fy * drawable.height, 1e-2);
-                const CGPoint back = BNProjectionScreenToWorld(p, drawable, screen);
-                EXPECT_NEAR(back.x, world.x, tol(volume.origin.x, volume.size.width));
-                EXPECT_NEAR(back.y, world.y, tol(volume.origin.y, volume.size.height));
-            }
-    }
-    // Before the first frame there is no projection: both ways answer "no point".
-    const CGPoint world = BNProjectionScreenToWorld(BNMatrix44f(), drawable, {10.0, 20.0});
-    const CGPoint screen = BNProjectionWorldToScreen(BNMatrix44f(), drawable, {1.0, 2.0});
-    EXPECT_TRUE(std::isnan(world.x) && std::isnan(world.y) && std::isnan(screen.x) &&
-                std::isnan(screen.y));
 }
 
 }  // namespace
