@@ -50,6 +50,9 @@ void TQMiniCurveEditorView::mouseUp(const RWEvent& event) {
 void TQMiniCurveEditorView::scrollWheel(const RWEvent& event) {
     if (_isEnabled) TQCurveEditorViewBase::scrollWheel(event);
 }
+RWMenuPtr TQMiniCurveEditorView::menuForEvent(const RWEvent& event) {
+    return _isEnabled ? TQCurveEditorViewBase::menuForEvent(event) : nullptr;
+}
 
 void TQMiniCurveEditorView::setCurrentViewVolume(const CGRect& volume) {
     TQCurveEditorViewBase::setCurrentViewVolume(volume);

@@ -9,7 +9,7 @@
 // controller leaves alone: the range shown stays 0 to 1 unless the inspector's horizontal
 // scroller sets a view volume directly.
 //
-// A disabled view ignores the mouse and the wheel.
+// A disabled view ignores the mouse and the wheel, and offers no menu.
 
 #include "src/view/TQCurveEditorViewBase.h"
 
@@ -41,6 +41,8 @@ public:
     void mouseDragged(const RWEvent& event) override;
     void mouseUp(const RWEvent& event) override;
     void scrollWheel(const RWEvent& event) override;
+    // None while disabled: a right click must not select what it lands on either.
+    RWMenuPtr menuForEvent(const RWEvent& event) override;
 
     // Stores the volume; the horizontal zoom follows from the reference width, and every
     // curve is sampled again.

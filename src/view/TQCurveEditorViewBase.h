@@ -338,7 +338,7 @@ public:
     // join the selection as a click does, a curve replaces it), the view redraws, and the
     // controller's menu for the kind hit (keypoint, tangent, curve; else the background's)
     // is the answer. The pick stays in the current selection for the menu's actions.
-    RWMenuPtr menuForEvent(const RWEvent& event);
+    virtual RWMenuPtr menuForEvent(const RWEvent& event);
     // The pointer's shape for what a click would do: the tool's own for the sketch and box
     // tools; for the edit tool, by what lies under the pointer, unchanged while a button or
     // the space bar is down.

@@ -120,7 +120,7 @@ TEST_F(MiniViews, forms__tool_switch_flags_disabled_mouse_and_the_heads_up_fit) 
     editor.modes().userClickSegment(2);
     EXPECT_EQ(ctrl().getCurrentTool(), TQTool::kBox);
 
-    // A disabled editor's view ignores the mouse.
+    // A disabled editor's view ignores the mouse and offers no menu.
     editor.setEnabled(false);
     clock.advance(1.0);
     HXDRecordingEncoder encoder(219, 145);
@@ -128,7 +128,11 @@ TEST_F(MiniViews, forms__tool_switch_flags_disabled_mouse_and_the_heads_up_fit) 
     const CGPoint key = view().getPointScreen(CGPointMake(0.5, 0.0));
     view().mouseDown(RWEvent::mouseEvent(RWEventType::LeftMouseDown, key));
     view().mouseUp(RWEvent::mouseEvent(RWEventType::LeftMouseUp, key));
+    const RWEvent rightClick = RWEvent::mouseEvent(RWEventType::RightMouseDown, key);
+    EXPECT_FALSE(view().menuForEvent(rightClick));
     EXPECT_FALSE(editor.hasSelection() || view().mouseIsDown());
+    editor.setEnabled(true);
+    EXPECT_TRUE(view().menuForEvent(rightClick));
 
     // The heads-up form always fits.
     TQMiniCurveEditorHUD hud(&recorder);
