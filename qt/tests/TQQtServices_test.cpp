@@ -129,20 +129,9 @@ protected:
     TQQtViewHost host{&widget};
 };
 
-TEST_F(QtEventsTest, mouseEvent__types_modifiers_clicks_and_y_up_location) {
+// Presses, modifiers and the y flip reach the views through every gesture test.
+TEST_F(QtEventsTest, mouseEvent__a_right_drag_and_buttons_the_views_do_not_know) {
     const QPointF at(30.0, 10.0);
-    const QMouseEvent press(QEvent::MouseButtonDblClick, at, widget.mapToGlobal(at), Qt::LeftButton,
-                            Qt::LeftButton, Qt::ControlModifier | Qt::ShiftModifier);
-    const auto down = TQQtEvents::mouseEvent(press, host, 2);
-    ASSERT_TRUE(down.has_value());
-    EXPECT_EQ(down->type(), RWEventType::LeftMouseDown) << "a double click is a second press";
-    EXPECT_EQ(down->clickCount(), 2);
-    EXPECT_EQ(down->modifierFlags(),
-              uint64_t{RWEventModifierFlagCommand | RWEventModifierFlagShift})
-        << "Ctrl plays the part of Command";
-    EXPECT_NEAR(down->locationInWindow().y, 90.0, kPointTolerance)
-        << "10 below the top of 100 is y = 90";
-
     const QMouseEvent drag(QEvent::MouseMove, at, widget.mapToGlobal(at), Qt::NoButton,
                            Qt::RightButton, Qt::NoModifier);
     EXPECT_EQ(TQQtEvents::mouseEvent(drag, host)->type(), RWEventType::RightMouseDragged);

@@ -36,7 +36,7 @@
 namespace demo_test {
 namespace {
 
-TEST_F(DemoWindowTest, object_list__drives_the_scene_selection_and_the_automatic_set) {
+TEST_F(DemoWindowTest, object_list__drives_the_scene_selection_and_loses_a_removed_objects_row) {
     const std::vector<TQChannelObjectRootBase*> objects = window.host().scene().objects();
     ASSERT_EQ(window.objectList()->count(), static_cast<int>(objects.size()))
         << "one row per object";
@@ -52,24 +52,32 @@ TEST_F(DemoWindowTest, object_list__drives_the_scene_selection_and_the_automatic
         << "the Animated set must follow the scene's selection";
 
     // And the other way: the scene selects, the list follows.
-    window.host().selectObject(objects[0]);
-    EXPECT_TRUE(window.objectList()->item(0)->isSelected());
+    TQChannelObjectRootBase* title = window.host().scene().objectNamed(kTQHostSampleTitleObject);
+    window.host().selectObject(title);
+    ASSERT_TRUE(window.objectList()->item(0)->isSelected());
     EXPECT_FALSE(window.objectList()->item(1)->isSelected());
+
+    // A keypoint of the shown object is selected when it goes.
+    drawFrame();
+    QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, keypointInWidget());
+    ASSERT_FALSE(window.curveView().getSelection()->empty()) << "the click selected no keypoint";
+    ASSERT_TRUE(window.host().removeObject(title));
+    for (TQChannel* channel : shownChannels())
+        EXPECT_NE(channel->getChannelRoot(), title) << "a curve of a removed object is shown";
+    EXPECT_EQ(window.objectList()->count(), static_cast<int>(objects.size()) - 1)
+        << "the list must lose the removed object's row";
+    const int frames = window.curveWidget()->framesDrawn();
+    drawFrame();
+    EXPECT_GT(window.curveWidget()->framesDrawn(), frames) << "the view must still draw";
+    EXPECT_FALSE(window.host().canUndo());
 }
 
+// Choosing a set from the pop-up, and its title, are the curve set tests' first steps.
 TEST_F(DemoWindowTest, pop_up_tools_and_scroller__work_through_their_models) {
     choose("Position");
-    EXPECT_EQ(window.controller().selectedCurveSet(), window.controller().curveSetPosition());
-    EXPECT_EQ(window.curveSetPopUp()->text(), "Position");
     EXPECT_EQ(window.windowTitle(), "Untitled[*] - Position - VantaCurveEditor Demo");
-    ASSERT_FALSE(shownChannels().empty());
-    for (TQChannel* channel : shownChannels())
-        EXPECT_EQ(channel->getParent()->getName(), "Position") << channel->getName();
-
-    TQQtSegmentedControl* tools = window.toolSwitch();
-    tools->button(1)->click();
+    window.toolSwitch()->button(1)->click();
     EXPECT_EQ(window.controller().getCurrentTool(), TQTool::kSketch);
-    tools->button(0)->click();
 
     // Zoomed in, the knob is shorter than the scroller and a page click pans the view.
     TQQtZoomScroller* scroller = window.verticalScroller();
@@ -83,25 +91,6 @@ TEST_F(DemoWindowTest, pop_up_tools_and_scroller__work_through_their_models) {
     window.autoZoomAction()->trigger();
     EXPECT_TRUE(window.curveView().autoZoom());
     EXPECT_FALSE(scroller->isEnabled()) << "the view fits itself; the scroller waits";
-}
-
-TEST_F(DemoWindowTest, shown_object_removed__the_set_follows_and_the_view_still_draws) {
-    TQChannelObjectRootBase* title = window.host().scene().objectNamed(kTQHostSampleTitleObject);
-    ASSERT_NE(title, nullptr);
-    const int rows = window.objectList()->count();
-    // A keypoint of the object is selected when it goes.
-    const QPoint at = keypointInWidget();
-    QTest::mouseClick(window.curveWidget(), Qt::LeftButton, Qt::NoModifier, at);
-    ASSERT_TRUE(window.host().removeObject(title));
-
-    for (TQChannel* channel : shownChannels())
-        EXPECT_NE(channel->getChannelRoot(), title) << "a curve of a removed object is shown";
-    EXPECT_EQ(window.objectList()->count(), rows - 1)
-        << "the list must lose the removed object's row";
-    const int frames = window.curveWidget()->framesDrawn();
-    drawFrame();
-    EXPECT_GT(window.curveWidget()->framesDrawn(), frames) << "the view must still draw";
-    EXPECT_FALSE(window.host().canUndo());
 }
 
 TEST_F(DemoWindowTest, drag_then_menu_undo__one_named_step_that_restores_every_channel_exactly) {
