@@ -90,12 +90,12 @@ void PrintTo(const Document& d, std::ostream* os) { *os << d.name; }
 
 class SavedDocuments : public SavedTreesTest, public ::testing::WithParamInterface<Document> {};
 
-// Each document read into a state whose volume is (0, 1) by 10 x 5, at 30 frames a second;
+// Each document read into a state whose volume is (1, 1) by 9 x 5, at 30 frames a second;
 // the record (baselines/saved_documents.txt) holds the error, the state's volume, range and
 // flags, and the set list read.
 TEST_P(SavedDocuments, read__as_recorded) {
     TQCurveEditorState state;
-    state.setCurrentViewVolume(BNRect<double>(0, 1, 10, 5));
+    state.setCurrentViewVolume(BNRect<double>(1, 1, 9, 5));
     const std::string error = textOf(
         TQHostReadEditorTrees(GetParam().text, state, list, GetParam().version, CMTimeMake(1, 30)));
     const Rect v = state.currentViewVolume();
