@@ -183,26 +183,9 @@ protected:
             const size_t star = name.find('*');
             auto* c = static_cast<TQChannel*>(parent->addChild(std::make_unique<MoveLoggingChannel>(
                 name.substr(0, star), nextChannelId++, &moves)));
-            for (std::string k; words >> k;) {
-                const size_t slash = k.find('/'), eq = k.find('='), open = k.find('(');
-                const auto h = c->setKeyframe(
-                    slash < eq ? CMTimeMake(std::stoi(k), std::stoi(k.substr(slash + 1)))
-                               : seconds(std::stod(k)),
-                    std::stod(k.substr(eq + 1)));
-                c->setKeyframeLocked(h, k.find('L') != k.npos);
-                c->setKeyframeEnabled(h, k.find('!') == k.npos);
-                if (const size_t code = k.find('/', eq); code != k.npos)
-                    c->setKeyframeInterpolation(h, unsigned(std::stoi(k.substr(code + 1))));
-                if (open == k.npos) continue;
-                double t[4];
-                char sep = 0;
-                std::istringstream(k.substr(open + 1)) >> t[0] >> sep >> t[1] >> sep >> t[2] >>
-                    sep >> t[3];
-                c->setKeyframeInputTangents(h, t[0], t[1], true);
-                c->setKeyframeOutputTangents(h, t[2], t[3], true);
-                c->setKeyframeTangentsBroken(h, k.find(")b") != k.npos);
-                c->setKeyframeTangentsScaled(h, k.back() == 's');
-            }
+            std::string keys;
+            std::getline(words, keys);
+            addKeys(*c, keys, kTimescale);
             items.push_back(addItem(c));
             items.back()->setScaleY(star == name.npos ? 1.0 : std::stod(name.substr(star + 1)));
             items.back()->setOffsetY(0.0);

@@ -47,6 +47,35 @@ inline std::string sceneText(const TQChannelBase& root, bool handles = false) {
     return out;
 }
 
+// Keyframes from keyText's form, added to the channel: "t=v" each, t in seconds (at
+// `timescale`) or a rational time "31/30"; "/code" an interpolation, "!" disabled, "L"
+// locked, and handles "(inU,inV|outU,outV)" with "b" broken and "s" scaled. A keyframe with
+// handles and no code is Bezier.
+inline void addKeys(TQChannel& c, const std::string& text, int32_t timescale) {
+    std::istringstream in(text);
+    for (std::string k; in >> k;) {
+        const size_t slash = k.find('/'), eq = k.find('='), open = k.find('(');
+        const auto h =
+            c.setKeyframe(slash < eq ? CMTimeMake(std::stoi(k), std::stoi(k.substr(slash + 1)))
+                                     : CMTimeMakeWithSeconds(std::stod(k), timescale),
+                          std::stod(k.substr(eq + 1)));
+        c.setKeyframeLocked(h, k.find('L') != k.npos);
+        c.setKeyframeEnabled(h, k.find('!') == k.npos);
+        if (const size_t code = k.find('/', eq); code != k.npos)
+            c.setKeyframeInterpolation(h, unsigned(std::stoi(k.substr(code + 1))));
+        else if (open != k.npos)
+            c.setKeyframeInterpolation(h, kTQInterpolationBezier);
+        if (open == k.npos) continue;
+        double t[4];
+        char sep = 0;
+        std::istringstream(k.substr(open + 1)) >> t[0] >> sep >> t[1] >> sep >> t[2] >> sep >> t[3];
+        c.setKeyframeInputTangents(h, t[0], t[1], true);
+        c.setKeyframeOutputTangents(h, t[2], t[3], true);
+        c.setKeyframeTangentsBroken(h, k.find(")b") != k.npos);
+        c.setKeyframeTangentsScaled(h, k.back() == 's');
+    }
+}
+
 // Keyframe times of the channel in seconds, in order.
 inline std::vector<double> keyTimes(const TQChannel* channel) {
     std::vector<double> out;

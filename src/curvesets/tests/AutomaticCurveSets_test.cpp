@@ -8,6 +8,7 @@
 
 #include "host/TQHostAppDelegate.h"
 #include "host/TQHostSampleScene.h"
+#include "tests/support/TextBaseline.h"
 
 namespace {
 
@@ -29,19 +30,6 @@ protected:
         set->refresh(100, false);
         return set;
     }
-    // Paths of the property table, by the row's shortcut and the axis ("$" the last one):
-    // "p0 r$"; an axis the family lacks is left out.
-    Paths paths(const std::string& slots) const {
-        const std::string rows = "psrhaot";  // in the order of TQHostProperty
-        Paths out;
-        std::istringstream in(slots);
-        for (std::string w; in >> w;) {
-            const auto& row = TQHostPropertyPaths(GetParam(), P(rows.find(w[0])));
-            const size_t axis = w[1] == '$' ? row.size() - 1 : size_t(w[1] - '0');
-            if (axis < row.size()) out.insert(row[axis]);
-        }
-        return out;
-    }
     TQChannel* at(TQChannelBase* object, P property, size_t axis = 0) const {
         const auto& row = TQHostPropertyPaths(GetParam(), property);
         return axis < row.size()
@@ -62,32 +50,30 @@ protected:
     TQChannelObjectRootBase* logo = nullptr;
 };
 
+// What Animated and Modified show of each object alone, as paths below it, and how many items
+// All enables, recorded (baselines/automatic_sets.txt, a block per family): what moves (the
+// logo's sway is a behaviour on a channel without keys), and what was set besides (one
+// keypoint, a value set without keys, resting compound parts).
 TEST_P(AutomaticSets, byState__eachObjectShowsWhatMovesAndWhatWasSet) {
-    Paths backgroundMoves = paths("p0 p1 r$ s0 s1 t0 t1");
-    backgroundMoves.insert(TQHostTypedPaths(GetParam()).volume);
-    const struct {
-        const char* object;
-        Paths animated;
-        Paths modifiedToo;  // one keypoint, a value set without keys, resting compound parts
-    } rows[] = {
-        {kTQHostSampleTitleObject, paths("p0 p1 s0 s1 o0"), paths("p2 s2")},
-        // The sway is a behaviour on a channel without keys.
-        {kTQHostSampleBehaviorObject, paths("p0 p1 r$ s0 s1 o0"), paths("p2 r0 r1 s2 a0 a1 a2")},
-        {kTQHostSampleOffsetObject, paths("p0 h0 o0"), paths("p1 p2 h1")},
-        {kTQHostSampleQuaternionObject, backgroundMoves, paths("p2 r0 r1 s2 o0")},
+    const auto line = [](const char* what, const Paths& paths) {
+        std::string out = std::string("  ") + what;
+        for (const BNString& path : paths) out += " " + path;
+        return out + "\n";
     };
-    const uint32_t channelsPerObject = GetParam() == TQHostObjectFamily::Kestrel ? 29 : 23;
+    std::string record;
     std::vector<TQChannelBase*> everything;
-    for (const auto& r : rows) {
-        SCOPED_TRACE(r.object);
-        TQChannelBase* o = host.scene().objectNamed(r.object);
+    for (const char* name : {kTQHostSampleTitleObject, kTQHostSampleBehaviorObject,
+                             kTQHostSampleOffsetObject, kTQHostSampleQuaternionObject}) {
+        TQChannelBase* o = host.scene().objectNamed(name);
         everything.push_back(o);
-        Paths modified = r.animated;
-        modified.insert(r.modifiedToo.begin(), r.modifiedToo.end());
-        EXPECT_EQ(shown(*refreshed<TQCurveSetAnimated>({o}), o), r.animated);
-        EXPECT_EQ(shown(*refreshed<TQCurveSetModified>({o}), o), modified);
-        EXPECT_EQ(refreshed<TQCurveSetAll>({o})->numberOfEnabledItems(), channelsPerObject);
+        record += name + std::string(":\n") +
+                  line("animated", shown(*refreshed<TQCurveSetAnimated>({o}), o)) +
+                  line("modified", shown(*refreshed<TQCurveSetModified>({o}), o)) + "  all " +
+                  std::to_string(refreshed<TQCurveSetAll>({o})->numberOfEnabledItems()) + "\n";
     }
+    EXPECT_TRUE(tests_support::matchesBaselineBlock(
+        "automatic_sets", GetParam() == TQHostObjectFamily::Kestrel ? "Kestrel" : "Other", record,
+        "src/curvesets/tests/baselines"));
     // Several objects: a root each, in selection order, each starting the colours afresh.
     auto animated = refreshed<TQCurveSetAnimated>(everything);
     ASSERT_EQ(animated->numberOfItems(), 4u);

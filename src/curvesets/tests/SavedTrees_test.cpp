@@ -2,6 +2,7 @@
 // of this and of older versions.
 #include <gtest/gtest.h>
 
+#include <sstream>
 #include <string>
 
 #include "host/TQHostProjectFile.h"
@@ -9,12 +10,18 @@
 #include "platform/ui/RWServices.h"
 #include "src/curvesets/TQCurveEditorState.h"
 #include "src/curvesets/TQCurveSetListSerializer.h"
+#include "tests/support/TextBaseline.h"
 
 namespace {
 
 // The error's text, empty when there is none.
 std::string textOf(const std::optional<BNSerializerError>& error) {
     return error ? error->text() : std::string();
+}
+
+std::string timeText(CMTime t) {
+    return CMTIME_IS_VALID(t) ? std::to_string(t.value) + "/" + std::to_string(t.timescale)
+                              : "unset";
 }
 
 // Every test runs on user defaults of its own.
@@ -50,57 +57,94 @@ auto flags(const TQCurveEditorState& s) {
                       s.lockKeyframesInTime());
 }
 
-TEST_F(SavedTreesTest, state__writesTopEdgeAndEndAndReadsOlderFramesAndPartsOfAVolume) {
+// What a state and a set list write, recorded in baselines/saved_trees.txt: originy is the
+// top edge, out is the start plus the duration, the children in their fixed order; a set's
+// items carry their colour index.
+TEST_F(SavedTreesTest, written__as_recorded) {
     TQCurveEditorState state;
     state.setCurrentViewVolume(BNRect<double>(1, 2, 3, 4));
     state.setDisplayRange(CMTimeRangeMake(CMTimeMake(10, 30), CMTimeMake(5, 30)));
     state.setSnapping(true);
-    const std::string text = write(state);
-
-    EXPECT_NE(text.find("originx=\"1\" originy=\"6\" width=\"3\" height=\"4\""), std::string::npos)
-        << "originy is the top edge:\n"
-        << text;
-    EXPECT_NE(text.find("in=\"10/30\" out=\"15/30\""), std::string::npos)
-        << "out is start plus duration:\n"
-        << text;
-    size_t last = 0;
-    for (const char* child :
-         {"<autozoom>", "<snapping>true", "<displayAudioWaveform>", "<lockKeyframesInTime>",
-          "<displayRange ", "<currentviewvolume ", "<snapshotChannels>"}) {
-        const size_t at = text.find(child);
-        ASSERT_NE(at, std::string::npos) << child;
-        EXPECT_GT(at, last) << child << " is out of order";
-        last = at;
-    }
-
-    // Reading it back is the project file's round trip.
-
-    // From (0, 1) by 10 x 5: the right edge stays at 10; the top edge stays at 6, or moves to 3.
-    for (const auto& [attribute, x, y, w, h] : {std::tuple{"originx='2'", 2, 1, 8, 5},
-                                                {"height='2'", 0, 4, 10, 2},
-                                                {"originy='3'", 0, -2, 10, 5}}) {
-        TQCurveEditorState partial;
-        partial.setCurrentViewVolume(BNRect<double>(0, 1, 10, 5));
-        read(std::string("<curveeditor><currentviewvolume ") + attribute + "/></curveeditor>",
-             partial);
-        EXPECT_EQ(partial.currentViewVolume(), Rect(x, y, w, h)) << attribute;
-    }
-
-    const std::string doc = "<curveeditor><displayRange in='10' out='20'/></curveeditor>";
-    TQCurveEditorState old, refused, noOut;
-    read(doc, old, 4);
-    // The duration is counted from frame 0, not from the start; old files read so.
-    EXPECT_EQ(std::pair(old.displayRange().start, old.displayRange().duration),
-              std::pair(CMTimeMake(10, 30), CMTimeMake(18, 30)));
-    EXPECT_NE(
-        textOf(TQHostReadEditorTrees(doc, refused, list, 5, CMTimeMake(1, 30))).find("\"in\""),
-        std::string::npos)
-        << "from version 5 on, the range holds times, not frame numbers";
-    read("<curveeditor><displayRange in='7/2'/></curveeditor>", noOut);
-    EXPECT_EQ(noOut.displayRange().start, CMTimeMake(7, 2));
-    EXPECT_FALSE(CMTIME_IS_VALID(noOut.displayRange().duration))
-        << "without \"out\" the duration stays as it was";
+    TQCurveSetListSerializer written;
+    auto* set = new TQCurveSetSerializer("Arms");
+    auto* item = new TQCurveEditorItemSerializer;
+    item->setChannelRef(TQChannelRef("./1/100/101/2"));
+    item->setColorIndex(5);
+    set->addChannel(item);
+    written.addCurveSet(set);
+    written.setSelectedCurveSet(13);
+    EXPECT_TRUE(tests_support::matchesBaseline("saved_trees", write(state) + "\n" + write(written),
+                                               "src/curvesets/tests/baselines"));
+    written.clear();
+    EXPECT_TRUE(written.curveSets().empty() && written.getSelectedCurveSet() == 13u)
+        << "clear keeps the selected number";
 }
+
+struct Document {
+    const char* name;
+    const char* text;
+    int32_t version;
+};
+
+void PrintTo(const Document& d, std::ostream* os) { *os << d.name; }
+
+class SavedDocuments : public SavedTreesTest, public ::testing::WithParamInterface<Document> {};
+
+// Each document read into a state whose volume is (1, 1) by 9 x 5, at 30 frames a second;
+// the record (baselines/saved_documents.txt) holds the error, the state's volume, range and
+// flags, and the set list read.
+TEST_P(SavedDocuments, read__as_recorded) {
+    TQCurveEditorState state;
+    state.setCurrentViewVolume(BNRect<double>(1, 1, 9, 5));
+    const std::string error = textOf(
+        TQHostReadEditorTrees(GetParam().text, state, list, GetParam().version, CMTimeMake(1, 30)));
+    const Rect v = state.currentViewVolume();
+    const auto [autoZoom, snapping, ghosts, waveform, locked] = flags(state);
+    std::ostringstream out;
+    out << "error: " << error << "\nvolume " << v.x << "," << v.y << " " << v.width << "x"
+        << v.height << "\nrange " << timeText(state.displayRange().start) << " for "
+        << timeText(state.displayRange().duration) << "\nflags " << autoZoom << snapping << ghosts
+        << waveform << locked << "\nselected set " << list.getSelectedCurveSet() << "\n";
+    for (const TQCurveSetSerializer* set : list.curveSets()) {
+        out << "set " << set->_name << " key '" << set->_shortcut << "' relative " << set->_relative
+            << ":";
+        for (const TQCurveEditorItemSerializer* c : set->_channels)
+            out << " " << c->getChannelRef() << "#" << c->getColorIndex();
+        out << "\n";
+    }
+    EXPECT_TRUE(tests_support::matchesBaselineBlock("saved_documents", GetParam().name, out.str(),
+                                                    "src/curvesets/tests/baselines"));
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Editor, SavedDocuments,
+    ::testing::Values(
+        // Parts of a volume: the right edge stays at 10; the top edge stays at 6, or moves to 3.
+        Document{"originx", "<curveeditor><currentviewvolume originx='2'/></curveeditor>", 5},
+        Document{"height", "<curveeditor><currentviewvolume height='2'/></curveeditor>", 5},
+        Document{"originy", "<curveeditor><currentviewvolume originy='3'/></curveeditor>", 5},
+        // Before version 5 the range holds frame numbers, and the duration is counted from
+        // frame 0, not from the start: old files read so. From 5 on they are refused.
+        Document{"framesBefore5", "<curveeditor><displayRange in='10' out='20'/></curveeditor>", 4},
+        Document{"framesRefused", "<curveeditor><displayRange in='10' out='20'/></curveeditor>", 5},
+        // Without "out" the duration stays as it was.
+        Document{"noOut", "<curveeditor><displayRange in='7/2'/></curveeditor>", 5},
+        // Older files name the colour "enabled"; "colorindex" wins when both are there.
+        // Unknown elements are skipped at every level, a channel inside one still counts; the
+        // shortcut that writing never sets is read; a path is kept as text.
+        Document{"olderList",
+                 "<curvesets selected='4'>"
+                 "  <curveset name='Old' shortcut='q' relative='true'>"
+                 "    <channel enabled='1'><channelref>./2/7</channelref></channel>"
+                 "    <channel enabled='1' colorindex='6'><extra/>"
+                 "<channelref>./2/8</channelref></channel>"
+                 "    <channel><channelref>not a path</channelref></channel>"
+                 "    <unknown><channel colorindex='9'/></unknown>"
+                 "  </curveset>"
+                 "  <somethingelse name='x'/>"
+                 "</curvesets>",
+                 5}),
+    [](const auto& p) { return std::string(p.param.name); });
 
 TEST_F(SavedTreesTest, state__flagsFollowTheDefaultsAndCopiesLeaveTheRangeUnset) {
     _defaults.setBool(true, kTQPreferenceCurveEditorAutoZoom);
@@ -127,53 +171,6 @@ TEST_F(SavedTreesTest, state__flagsFollowTheDefaultsAndCopiesLeaveTheRangeUnset)
     EXPECT_TRUE(CMTimeIdentical(copy.displayRange().start, kCMTimeInvalid));
     EXPECT_EQ(copy.currentViewVolume(), Rect(1, 2, 3, 4));
     EXPECT_EQ(flags(copy), flags(state));
-}
-
-TEST_F(SavedTreesTest, list__writesColourIndexAsItemsAndReadsItAsSets) {
-    TQCurveSetListSerializer written;
-    auto* set = new TQCurveSetSerializer("Arms");
-    auto* item = new TQCurveEditorItemSerializer;
-    item->setChannelRef(TQChannelRef("./1/100/101/2"));
-    item->setColorIndex(5);
-    set->addChannel(item);
-    written.addCurveSet(set);
-    written.setSelectedCurveSet(13);
-    const std::string text = write(written);
-    for (const char* part :
-         {"<curvesets selected=\"13\">",
-          "<curveset name=\"Arms\" shortcut=\"\" relative=\"false\">", "<channel colorindex=\"5\">",
-          "<channelref>./1/100/101/2</channelref>"})
-        EXPECT_NE(text.find(part), std::string::npos) << part << " in\n" << text;
-
-    // Older files name the colour "enabled"; "colorindex" wins when both are there. Unknown
-    // elements are skipped at every level.
-    TQCurveEditorState unused;
-    read(
-        "<curvesets selected='4'>"
-        "  <curveset name='Old' shortcut='q' relative='true'>"
-        "    <channel enabled='1'><channelref>./2/7</channelref></channel>"
-        "    <channel enabled='1' colorindex='6'><extra/><channelref>./2/8</channelref></channel>"
-        "    <channel><channelref>not a path</channelref></channel>"
-        "    <unknown><channel colorindex='9'/></unknown>"
-        "  </curveset>"
-        "  <somethingelse name='x'/>"
-        "</curvesets>",
-        unused);
-    EXPECT_EQ(list.getSelectedCurveSet(), 4u) << "the host reads \"selected\" and hands it on";
-    ASSERT_EQ(list.curveSets().size(), 1u);
-    const TQCurveSetSerializer& old = *list.curveSets()[0];
-    EXPECT_EQ(std::tuple(old._name, old._shortcut, old._relative), std::tuple("Old", "q", true))
-        << "reading takes the shortcut that writing never sets";
-    ASSERT_EQ(old._channels.size(), 4u) << "a channel inside an unknown element still counts";
-    EXPECT_EQ(std::tuple(old._channels[0]->getColorIndex(), old._channels[0]->getChannelRef(),
-                         old._channels[1]->getColorIndex(), old._channels[1]->getChannelRef()),
-              std::tuple(1u, "./2/7", 6u, "./2/8"));
-    EXPECT_EQ(old._channels[2]->getChannelRef(), "not a path") << "kept as text";
-    EXPECT_EQ(old._channels[3]->getColorIndex(), 9u);
-
-    list.clear();
-    EXPECT_TRUE(list.curveSets().empty() && list.getSelectedCurveSet() == 4u)
-        << "clear keeps the selected number";
 }
 
 }  // namespace

@@ -6,7 +6,6 @@
 // the ones it made. Beside the rows: the menus' ticks, what the pasteboard holds that is not
 // ours or is damaged, and which items are enabled.
 
-#include <sstream>
 #include <string>
 
 #include "platform/channels/TQChannelTypes.h"
@@ -44,26 +43,10 @@ protected:
         host.undoStack().clear();
         recorder.clearCalls();
     }
-    // Keyframes from text, "t=v" each, with "(inU,inV|outU,outV)" for broken handles and "s"
-    // for scaled ones.
+    // The channel's keyframes replaced by those of the text, in addKeys' form.
     static void key(TQChannel& c, const std::string& text) {
         c.deleteAllKeyframes(kCMTimeZero);
-        std::istringstream in(text);
-        for (std::string k; in >> k;) {
-            const size_t eq = k.find('='), open = k.find('(');
-            const TQKeyframeHandle h =
-                c.setKeyframe(sec(std::stod(k)), std::stod(k.substr(eq + 1)));
-            if (open == k.npos) continue;
-            double t[4];
-            char sep = 0;
-            std::istringstream(k.substr(open + 1)) >> t[0] >> sep >> t[1] >> sep >> t[2] >> sep >>
-                t[3];
-            c.setKeyframeInterpolation(h, kTQInterpolationBezier);
-            c.setKeyframeTangentsBroken(h, true);
-            c.setKeyframeTangentsScaled(h, k.back() == 's');
-            c.setKeyframeInputTangents(h, t[0], t[1]);
-            c.setKeyframeOutputTangents(h, t[2], t[3]);
-        }
+        addKeys(c, text, 600);
     }
     TQChannel* a() const { return itemA->channel(); }
     TQChannel* b() const { return itemB->channel(); }
@@ -176,7 +159,7 @@ TEST_P(ChannelEdits, edit__as_recorded_and_undone_exactly) {
 
 // Keypoints to copy: broken handles, scaled on the last.
 const std::string kHandles =
-    "1=10(-0.25,4.5|0.4,-6.5) 2=20(-0.5,4.5|0.4,-5.5) 3=30(-0.75,4.5|0.4,-4.5)s";
+    "1=10(-0.25,4.5|0.4,-6.5)b 2=20(-0.5,4.5|0.4,-5.5)b 3=30(-0.75,4.5|0.4,-4.5)bs";
 const std::string kCopied = "keys A " + kHandles + "; keys B 0.5=1; ";
 
 INSTANTIATE_TEST_SUITE_P(

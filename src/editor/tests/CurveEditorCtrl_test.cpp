@@ -1,6 +1,6 @@
 // The full editor's controller on the sample project: its set-up, the update cycle of notify,
 // the vertical scroller, the frame grid, the mirror of the keypoint selection into the list,
-// the sketch tool, and what it does with bad input.
+// the sketch tool, resizing, and what it does with bad input.
 #include <gtest/gtest.h>
 
 #include "host/TQHostObjectModel.h"
@@ -227,7 +227,7 @@ TEST_F(CurveEditorCtrl, vertical_scroller__value_knob_and_auto_zoom_and_what_its
     }
 }
 
-// ---- The frame grid, the sketch tool, bad input ---------------------------------------------
+// ---- The frame grid, the sketch tool, resizing, bad input ----------------------------------
 
 TEST_F(CurveEditorCtrl, frame_grid__nearest_frame_with_a_half_going_up) {
     auto at = [](int64_t value, int32_t scale) { return CMTimeMake(value, scale); };
@@ -248,17 +248,6 @@ TEST_F(CurveEditorCtrl, frame_grid__nearest_frame_with_a_half_going_up) {
     TQCurveEditorCtrl lone;
     EXPECT_EQ(CMTimeCompare(lone.convertToCurveEditorAxis(at(7, 100)), at(7, 100)), 0)
         << "without a host there is no grid";
-}
-
-// A resize fits the curves of every set to the new width: a sample a point, and one more.
-TEST_F(CurveEditorCtrl, resize__every_sets_curves_take_a_sample_a_point) {
-    ctrl.setSelectedCurveSet(ctrl.createCurveSetWithName("Mine"));
-    const auto item = std::dynamic_pointer_cast<TQCurveEditorChannelItem>(
-        ctrl.appendChannelToCurveSet(channel(kTQHostSampleTitleObject, TQHostProperty::Opacity)));
-    ASSERT_TRUE(item);
-    ctrl.viewDidResize();
-    item->refreshOriginalCurve(kCMTimeZero, CMTimeMake(1, 30));
-    EXPECT_EQ(item->numberOfSamples(), uint32_t(view.width()) + 1);
 }
 
 TEST_F(CurveEditorCtrl, sketch__writes_only_on_selected_channels) {
@@ -304,6 +293,11 @@ TEST_F(CurveEditorCtrl, bad_input__unknown_bits_missing_parts_and_vanished_chann
         ctrl.showAll();
         TQCurveSetPtr custom = ctrl.cloneCurveSetWithName("Kept");
         ASSERT_GT(custom->numberOfChannelItems(), 0u);
+        // A resize fits the curves of every set to the new width: a sample a point, and one more.
+        ctrl.viewDidResize();
+        auto& item = static_cast<TQCurveEditorChannelItem&>(*custom->channeItemAtIndex(0));
+        item.refreshOriginalCurve(kCMTimeZero, CMTimeMake(1, 30));
+        EXPECT_EQ(item.numberOfSamples(), uint32_t(view.width()) + 1);
         ASSERT_TRUE(host.removeObject(object(kTQHostSampleTitleObject)));
         ctrl.notify(kEveryWord);
         ctrl.update();

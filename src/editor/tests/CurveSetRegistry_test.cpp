@@ -6,7 +6,6 @@
 
 #include <algorithm>
 #include <map>
-#include <set>
 #include <sstream>
 
 #include "src/curvesets/TQCurveSetListSerializer.h"
@@ -19,145 +18,6 @@
 namespace editor_test {
 namespace {
 
-class CurveSetRegistry : public EditorFixture {
-protected:
-    // The list built into the controller as the editor's start builds it.
-    void construct(TQCurveSetListSerializer& saved, double version = 5.0) {
-        host.setCurveSetListSerializer(&saved);
-        host.setVersion(version);
-        ctrl.removeAllCurveSets();
-        ctrl.viewDidLoad();
-        host.setCurveSetListSerializer(nullptr);
-    }
-    std::vector<TQChannelBase*> allObjects() {
-        const auto objects = host.scene().objects();
-        return {objects.begin(), objects.end()};
-    }
-};
-
-TEST_F(CurveSetRegistry, pop_up__each_automatic_set_shows_what_it_finds_for_the_selection) {
-    host.setSelectedObjects(allObjects());
-    std::set<const TQCurveSet*> chosen;
-    for (const char* title : {"All", "Animated", "Modified", "Position", "Rotation", "Scale",
-                              "Shear", "Pivot", "Opacity", "Retiming"}) {
-        SCOPED_TRACE(title);
-        choose(title);
-        const TQCurveSetPtr set = ctrl.selectedCurveSet();
-        ASSERT_TRUE(ctrl.isAutomaticCurveSet(set.get()));
-        EXPECT_EQ(set->curveSetName() + ctrl.curveSetsPopUp()->title(), title + std::string(title));
-        const TQCurveSetPtr fresh = set->copy();
-        fresh->refresh(100, false);
-        EXPECT_FALSE(set->allItems().empty()) << "the piece has something for every set";
-        EXPECT_EQ(shownChannels(), channelsOf(*fresh)) << "refreshed for the selection";
-        chosen.insert(set.get());
-    }
-    // Active follows what changes: a step of a drag on the title's opacity.
-    choose("Active");
-    chosen.insert(ctrl.selectedCurveSet().get());
-    EXPECT_EQ(chosen.size(), 11u) << "one set of its own for each item";
-    EXPECT_EQ(ctrl.curveSetsPopUp()->title(), "Active");
-    TQChannelBase* opacity = TQChannelRef("./1/200/202").getChannel(object("Title"));
-    opacity->noteWillChange(true);
-    host.postNotification(kTQNotifyChannelsChanging);
-    EXPECT_EQ(shownChannels(), std::vector<const TQChannelBase*>{opacity});
-
-    // The host's selection word re-filters the shown set.
-    choose("Position");
-    TQChannelObjectRootBase* logo = object(kTQHostSampleBehaviorObject);
-    host.setSelectedObjects({logo});
-    ASSERT_FALSE(shownChannels().empty());
-    for (const TQChannelBase* c : shownChannels()) EXPECT_EQ(c->getChannelRoot(), logo);
-}
-
-TEST_F(CurveSetRegistry, unique_names__numbers_go_on_from_a_single_trailing_digit) {
-    const struct {
-        const char* name;
-        std::vector<std::string> taken;
-        const char* expected;
-    } rows[] = {
-        {"Foo", {}, "Foo"},
-        {"Foo", {"Foo"}, "Foo 1"},
-        {"Foo", {"Foo", "Foo 1"}, "Foo 2"},
-        {"Foo 1", {}, "Foo"},  // the number 1 is dropped
-        {"Foo 3", {}, "Foo 3"},
-        {"Foo 3", {"Foo 3"}, "Foo 4"},
-        {"Foo 12", {"Foo 12"}, "Foo 12 1"},  // two digits stay in the base
-        {"All", {}, "All 1"},                // automatic names are reserved
-        {"Retiming 2", {"Retiming 2"}, "Retiming 3"},
-        {"7", {}, "7"},
-    };
-    for (const auto& row : rows) {
-        ctrl.removeAllCurveSets();
-        for (const std::string& name : row.taken) {
-            auto set = std::make_shared<TQCurveSetMutable>();
-            set->initWithName(name, &host);
-            ctrl.addCurveSet(set);
-        }
-        EXPECT_EQ(ctrl.findUniqueCurveSetNameForName(row.name), row.expected)
-            << row.name << " with " << row.taken.size() << " taken";
-    }
-}
-
-TEST_F(CurveSetRegistry, saved__the_selected_sets_number_with_no_number_for_pivot) {
-    ctrl.createCurveSetWithName("One");
-    ctrl.createCurveSetWithName("Two");
-    // Numbered in this order; Pivot has none (8 is nobody's).
-    const TQCurveSetPtr numbered[] = {
-        ctrl.curveSetAll(),      ctrl.curveSetAnimated(), ctrl.curveSetCurrent(),
-        ctrl.curveSetModified(), ctrl.curveSetPosition(), ctrl.curveSetRotation(),
-        ctrl.curveSetScale(),    ctrl.curveSetShear(),    nullptr,
-        ctrl.curveSetOpacity(),  ctrl.curveSetRetiming(), ctrl.curveSets()[0],
-        ctrl.curveSets()[1]};
-    TQCurveSetListSerializer saved;
-    for (uint32_t n = 0; n < std::size(numbered); ++n) {
-        if (!numbered[n]) continue;
-        saved.setSelectedCurveSet(n + 1);
-        ctrl.setSelectedCurveSet(numbered[n]);
-        ctrl.saveCurveSets(&saved);
-        EXPECT_EQ(saved.getSelectedCurveSet(), n) << numbered[n]->curveSetName();
-    }
-    saved.setSelectedCurveSet(7);
-    ctrl.setSelectedCurveSet(ctrl.curveSetPivot());
-    ctrl.saveCurveSets(&saved);
-    EXPECT_EQ(saved.getSelectedCurveSet(), 7u) << "the list's number stays";
-    saved.setSelectedCurveSet(1);
-    ctrl.saveCurveSets(&saved);
-    construct(saved);
-    EXPECT_EQ(ctrl.selectedCurveSet(), ctrl.curveSetAnimated()) << "Pivot reopens so";
-}
-
-TEST_F(CurveSetRegistry, saved__construct_numbers_by_document_version_and_past_the_end) {
-    TQCurveSetListSerializer saved;
-    saved.addCurveSet(new TQCurveSetSerializer("First"));
-    saved.addCurveSet(new TQCurveSetSerializer("Second"));
-    const struct {
-        double version;
-        uint32_t number;
-        const char* expected;
-    } rows[] = {
-        {2.0, 2, "Active"},
-        {2.0, 3, "First"},
-        {2.0, 5, "Animated"},
-        {2.9, 10, "Animated"},
-        {3.0, 3, "Modified"},
-        {3.0, 8, "Pivot"},
-        {4.0, 10, "First"},
-        {4.0, 12, "Animated"},
-        {5.0, 0, "All"},
-        {5.0, 10, "Retiming"},
-        {5.0, 12, "Second"},
-        {5.0, 13, "Animated"},
-        {5.0, 4000000000u, "Animated"},
-    };
-    for (const auto& row : rows) {
-        SCOPED_TRACE(std::to_string(row.version) + " #" + std::to_string(row.number));
-        saved.setSelectedCurveSet(row.number);
-        construct(saved, row.version);
-        EXPECT_EQ(ctrl.selectedCurveSet()->curveSetName(), row.expected);
-        EXPECT_EQ(ctrl.curveSetsPopUp()->title(), row.expected);
-    }
-}
-
 struct Script {
     const char* name;
     std::string script;   // steps separated by ";", see steps()
@@ -168,9 +28,9 @@ void PrintTo(const Script& s, std::ostream* os) { *os << s.name; }
 
 // Scripts of what a user does with sets, each step followed in the recorded baseline
 // (baselines/curve_sets.txt) by what the pop-up, the shown set, the custom sets and the
-// manager then hold. Sets are lettered in the order they are first seen, so that the record
-// tells a set from a copy of it.
-class CurveSetScripts : public CurveSetRegistry, public ::testing::WithParamInterface<Script> {
+// manager then hold. Sets are lettered in the order they are first seen (numbered past the
+// 26th), so that the record tells a set from a copy of it.
+class CurveSetScripts : public EditorFixture, public ::testing::WithParamInterface<Script> {
 protected:
     void connect(TQCurveEditorOutlets& outlets) override {
         if (!GetParam().panels) return;
@@ -204,8 +64,8 @@ protected:
         return out + (item.isEnabledItem() ? "" : "-") + (item.isSelected() ? "*" : "");
     }
     std::string form(const TQCurveSet& set) {
-        const auto [at, added] = letters.emplace(set.curveSetId(), char('a' + letters.size()));
-        std::string out = {'[', at->second, ']'};
+        const size_t n = letters.emplace(set.curveSetId(), letters.size()).first->second;
+        std::string out = "[" + (n < 26 ? std::string(1, char('a' + n)) : std::to_string(n)) + "]";
         out += set.curveSetName();
         if (!set.curveSetShortcut().empty()) out += ":" + set.curveSetShortcut();
         if (set.isRelative())
@@ -250,11 +110,13 @@ protected:
     }
 
     // Steps: objects (names, or "everything"), choose (a pop-up title), active, all, index
-    // (the next new set's number), add and inlist (object and path), folder, create (name and
-    // key), clone (the shown set), copy, merge, solo, disable and pick (by index in the shown
-    // set), relative (the shown set), close (the window), menu (the pop-up's items), absolute (no relative sets);
-    // colour (index, colour), remove (an object), save, read (name, "relative" or not, saved
-    // paths), construct, rebuild (without a list); and inside "manage ... end" the manager:
+    // (the next new set's number), add and inlist (object and path), folder, create (name with
+    // "_" for a space, and key), forget (every custom set), clone (the shown set), copy, merge,
+    // solo, disable and pick (by index in the shown set), relative (the shown set), close (the
+    // window), menu (the pop-up's items), absolute (no relative sets); change (a step of a drag
+    // on an object's channel); colour (index, colour), remove (an object), save, read (name,
+    // "relative" or not, saved paths), construct (at a document version and selected number,
+    // or as the list stands), rebuild (without a list); and inside "manage ... end" the manager:
     // type (name or key, row, text with "_" for a space), drag and dragended (rows), row,
     // plus, minus, press (a button), absolutize (a row), deletekey, posted (the last word).
     tests_support::Steps steps() {
@@ -269,7 +131,9 @@ protected:
              [&] {
                  std::vector<TQChannelBase*> objects;
                  for (const std::string& w : s.words) objects.push_back(objectNamed(w));
-                 host.setSelectedObjects(s.rest == "everything" ? allObjects() : objects);
+                 const auto all = host.scene().objects();
+                 if (s.rest == "everything") objects.assign(all.begin(), all.end());
+                 host.setSelectedObjects(objects);
              }},
             {"choose", [&] { choose(s.rest); }},
             {"active", [&] { ctrl.showActive(); }},
@@ -279,7 +143,12 @@ protected:
             {"inlist", [&] { ctrl.setChannelInList(channelAt(s.word(0), s.word(1))); }},
             {"folder", [&] { ctrl.appendFolderToCurveSet(object(s.rest.c_str())); }},
             {"create",
-             [&] { ctrl.createCurveSetWithName(s.word(0))->setCurveSetShortcut(s.word(1)); }},
+             [&] {
+                 std::string name = s.word(0);
+                 std::replace(name.begin(), name.end(), '_', ' ');
+                 ctrl.createCurveSetWithName(name)->setCurveSetShortcut(s.word(1));
+             }},
+            {"forget", [&] { ctrl.removeAllCurveSets(); }},
             {"clone", [&] { ctrl.cloneCurveSetWithName(s.rest); }},
             {"copy", [&] { ctrl.cloneCurveSet(*named(s.rest)); }},
             {"merge", [&] { ctrl.addCurveSetToCurrent(named(s.rest)); }},
@@ -342,7 +211,21 @@ protected:
                  }
                  saved.addCurveSet(set.release());
              }},
-            {"construct", [&] { construct(saved); }},
+            {"construct",
+             [&] {
+                 // The list built into the controller as the editor's start builds it.
+                 if (!s.words.empty()) saved.setSelectedCurveSet(uint32_t(s.number(1)));
+                 host.setCurveSetListSerializer(&saved);
+                 host.setVersion(s.words.empty() ? 5.0 : s.number(0));
+                 ctrl.removeAllCurveSets();
+                 ctrl.viewDidLoad();
+                 host.setCurveSetListSerializer(nullptr);
+             }},
+            {"change",
+             [&] {
+                 channelAt(s.word(0), s.word(1))->noteWillChange(true);
+                 host.postNotification(kTQNotifyChannelsChanging);
+             }},
             {"rebuild",
              [&] {
                  ctrl.constructCurveSets();
@@ -404,7 +287,7 @@ protected:
     tests_support::StepArgs s;
     tests_support::Steps table = steps();
     std::string record;
-    std::map<uint32_t, char> letters;
+    std::map<uint32_t, size_t> letters;
     size_t runs = 0;
 };
 
@@ -484,6 +367,29 @@ INSTANTIATE_TEST_SUITE_P(
                        "type key 2 B; type key 1; press Done; end; choose Twirl; manage; row 0; "
                        "deletekey; posted; press Done; end",
                true},
+        // Numbers go on from a single trailing digit (a number 1 is dropped, two digits stay
+        // in the base); automatic names are reserved.
+        Script{"uniqueNames",
+               "create Foo; create Foo; create Foo; forget; create Foo_1; forget; create Foo_3; "
+               "create Foo_3; forget; create Foo_12; create Foo_12; create All; "
+               "create Retiming_2; create Retiming_2; create 7"},
+        // Each set chosen, saved under its number and built again from it; Pivot has no number
+        // when saved, so the list keeps the one it had. Active follows a drag; the selection
+        // re-filters the shown set.
+        Script{"eachSetSavedAndBuilt",
+               "objects Title; create One; create Two; choose All; save; construct; "
+               "choose Animated; save; construct; choose Active; save; construct; "
+               "choose Modified; save; construct; choose Position; save; construct; "
+               "choose Rotation; save; construct; choose Scale; save; construct; choose Shear; "
+               "save; construct; choose Pivot; save; construct; choose Opacity; save; construct; "
+               "choose Retiming; save; construct; choose One; save; construct; choose Two; save; "
+               "construct; active; change Title ./1/200/202; choose Position; objects Logo"},
+        // The selected number of documents of each version, and past the end of the list.
+        Script{"numbersByVersion",
+               "read First absolute; read Second absolute; construct 2 2; construct 2 3; "
+               "construct 2 5; construct 2.9 10; construct 3 3; construct 3 8; construct 4 10; "
+               "construct 4 12; construct 5 0; construct 5 10; construct 5 12; construct 5 13; "
+               "construct 5 4000000000"},
         // Saved and built again: a vanished channel is not saved, shortcuts are not, a path
         // to nothing or to a folder is skipped, a relative set's paths come from the channels
         // found; without a list nothing changes.
