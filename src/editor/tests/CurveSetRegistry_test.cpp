@@ -65,7 +65,8 @@ protected:
     }
     std::string form(const TQCurveSet& set) {
         const size_t n = letters.emplace(set.curveSetId(), letters.size()).first->second;
-        std::string out = "[" + (n < 26 ? std::string(1, char('a' + n)) : std::to_string(n)) + "]";
+        std::string out("[");
+        out.append(n < 26 ? std::string(1, char('a' + n)) : std::to_string(n)).append("]");
         out += set.curveSetName();
         if (!set.curveSetShortcut().empty()) out += ":" + set.curveSetShortcut();
         if (set.isRelative())
