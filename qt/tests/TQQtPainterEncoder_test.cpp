@@ -10,6 +10,7 @@
 #include <cmath>
 #include <memory>
 #include <span>
+#include <string>
 #include <vector>
 
 #include "platform/draw/HXDPrimitives.h"
@@ -17,17 +18,41 @@
 #include "platform/geometry/BNViewProjection.h"
 #include "qt/TQQtPainterEncoder.h"
 #include "qt/internal/TQQtDirectRaster.h"
+#include "tests/support/TextBaseline.h"
 
 namespace {
-
-// Colour components read back from an 8-bit image are off by rounding and by blending.
-constexpr int kChannelTolerance = 3;
 
 const HXDColor kBackground{0.0f, 0.0f, 0.0f, 1.0f};
 const HXDColor kRed{1.0f, 0.0f, 0.0f, 1.0f};
 const HXDColor kBlue{0.0f, 0.0f, 1.0f, 1.0f};
 
 using Primitives = std::vector<std::shared_ptr<HXDDrawPrimitive>>;
+
+// One frame on `encoder` whose world coordinates are the pixels of `world` (y up), drawn at
+// backing scale `scale`. The primitives go to the encoder `chunk` at a time (a view hands over
+// each curve as it builds it); 0: all in one call.
+QImage paint(TQQtPainterEncoder& encoder, const Primitives& primitives, QSize world,
+             HXDColor background, float scale = 1.0f, size_t chunk = 0) {
+    encoder.setDrawableSize(world * scale);
+    HXDTexture* target = encoder.nextDrawable();
+    const HXDRenderingContext context(
+        target, scale, BNViewVolumeProjection(CGRectMake(0, 0, world.width(), world.height())),
+        HXDFloat2{1.0f / scale, 1.0f / scale});
+    encoder.beginEncoding(*target, background);
+    const std::span<const std::shared_ptr<HXDDrawPrimitive>> all(primitives);
+    const size_t step = chunk ? chunk : all.size();
+    for (size_t at = 0; at < all.size(); at += step)
+        encoder.encodePrimitives(all.subspan(at, std::min(step, all.size() - at)), context);
+    encoder.endEncoding();
+    return encoder.image();
+}
+
+// Where a probe walks: from a pixel (y up) in steps of (dx, dy), `count` pixels.
+struct Probe {
+    int x, y, dx, dy, count;
+};
+Probe row(int x, int y, int count, int step = 1) { return {x, y, step, 0, count}; }
+Probe column(int x, int y, int count) { return {x, y, 0, 1, count}; }
 
 // A 200 x 100 drawable whose world coordinates are its pixels (y up), so that primitives
 // can be placed on exact pixel centres.
@@ -36,35 +61,31 @@ protected:
     static constexpr int kWidth = 200;
     static constexpr int kHeight = 100;
 
-    // One frame at backing scale `scale` (the drawable grows with it).
-    void render(const Primitives& primitives, float scale = 1.0f) {
-        encoder.setDrawableSize(
-            QSize(static_cast<int>(kWidth * scale), static_cast<int>(kHeight * scale)));
-        HXDTexture* target = encoder.nextDrawable();
-        ASSERT_NE(target, nullptr);
-        const HXDRenderingContext context(target, scale,
-                                          BNViewVolumeProjection(CGRectMake(0, 0, kWidth, kHeight)),
-                                          HXDFloat2{1.0f / scale, 1.0f / scale});
-        encoder.beginEncoding(*target, kBackground);
-        for (const auto& p : primitives) p->encodeWithEncoder(encoder, context);
-        encoder.endEncoding();
-    }
-
     // The pixel whose centre is (x + 0.5, y + 0.5) in drawable pixels, y up.
     QColor pixel(int x, int yUp) const {
         return encoder.image().pixelColor(x, encoder.image().height() - 1 - yUp);
     }
 
-    static ::testing::AssertionResult near(const QColor& got, const HXDColor& want,
-                                           int tolerance = kChannelTolerance) {
-        const QColor w = TQQtPainterEncoder::qColor(want);
-        if (std::abs(got.red() - w.red()) <= tolerance &&
-            std::abs(got.green() - w.green()) <= tolerance &&
-            std::abs(got.blue() - w.blue()) <= tolerance)
-            return ::testing::AssertionSuccess();
-        return ::testing::AssertionFailure()
-               << "got rgb(" << got.red() << "," << got.green() << "," << got.blue()
-               << "), want rgb(" << w.red() << "," << w.green() << "," << w.blue() << ")";
+    // What a probe saw (">" along a row, every dx-th pixel; "^" up a column), as runs of one
+    // colour: "rrggbb" for one pixel, "rrggbb*n" for n.
+    std::string runs(const Probe& p) const {
+        const auto at = [&](int i) { return pixel(p.x + i * p.dx, p.y + i * p.dy); };
+        std::string out = "(" + std::to_string(p.x) + "," + std::to_string(p.y) + ")" +
+                          (p.dy ? "^" : ">") + (p.dx > 1 ? std::to_string(p.dx) : "") + ":";
+        for (int i = 0, n = 1; i < p.count; i += n) {
+            for (n = 1; i + n < p.count && at(i + n) == at(i);) ++n;
+            out += " " + at(i).name().mid(1).toStdString() + (n > 1 ? "*" + std::to_string(n) : "");
+        }
+        return out;
+    }
+
+    // Renders a frame at backing scale `scale` (the drawable grows with it) and records, under
+    // the heading `what`, what each probe saw.
+    void shoot(const std::string& what, const Primitives& primitives,
+               std::initializer_list<Probe> probes, float scale = 1.0f) {
+        paint(encoder, primitives, QSize(kWidth, kHeight), kBackground, scale);
+        record += what + "\n";
+        for (const Probe& probe : probes) record += "  " + runs(probe) + "\n";
     }
 
     static std::shared_ptr<HXDMultiline> line(std::vector<HXDLineVertex> v) {
@@ -82,6 +103,7 @@ protected:
     }
 
     TQQtPainterEncoder encoder;
+    std::string record;
 };
 
 TEST_F(PainterEncoderTest, nextDrawable__null_without_a_size_and_foreign_targets_are_refused) {
@@ -92,76 +114,63 @@ TEST_F(PainterEncoderTest, nextDrawable__null_without_a_size_and_foreign_targets
     EXPECT_EQ(encoder.framesPresented(), 0) << "a frame on a foreign target must not be presented";
 }
 
-TEST_F(PainterEncoderTest, multiline__per_vertex_colours_blend_along_the_segment) {
-    render({horizontal(50.5f, kRed, kBlue)});
-    EXPECT_GT(pixel(12, 50).red(), 230);
-    EXPECT_GT(pixel(188, 50).blue(), 230);
-    EXPECT_NEAR(pixel(100, 50).red(), 128, 12) << "halfway the colour is half of each";
-    EXPECT_TRUE(near(pixel(100, 52), kBackground)) << "two rows above the line";
-}
-
-TEST_F(PainterEncoderTest, multiline__stipple_phase_runs_on_across_vertices_and_offscreen) {
-    // Checked in the middle of each 4-pixel step: aliased lines may round by one pixel.
-    // A corner at x = 16 lies inside a gap: dashes 10..13, 18..21; restarting there would
-    // ink 16..19.
-    render({stippled(line({{{10.0f, 20.5f, 0.0f}, kRed},
-                           {{16.0f, 20.5f, 0.0f}, kRed},
-                           {{60.0f, 20.5f, 0.0f}, kRed}}))});
-    EXPECT_TRUE(near(pixel(12, 20), kRed));
-    EXPECT_TRUE(near(pixel(16, 20), kBackground)) << "the gap must run on past the vertex";
-    EXPECT_TRUE(near(pixel(20, 20), kRed));
-    // 2^20 pattern periods (64 pixels) left of x = 16: the visible part is in phase, as if
-    // every step had been walked (and it is not walked: this would take minutes).
-    render({stippled(horizontal(50.5f, kRed, kRed, 16.0f - 64.0f * 1048576.0f))});
-    EXPECT_TRUE(near(pixel(18, 50), kRed)) << "a dash starts at x = 16";
-    EXPECT_TRUE(near(pixel(22, 50), kBackground));
-    EXPECT_TRUE(near(pixel(2, 50), kRed)) << "the part left of x = 16 is in phase too";
-}
-
-TEST_F(PainterEncoderTest, multiline__width_in_points_times_backing_scale) {
-    auto thick = horizontal(50.0f, kRed, kRed);
+// Frames of lines, quads and textures, each read back along a few rows or columns of pixels.
+TEST_F(PainterEncoderTest, frames__read_back_along_probes_as_recorded) {
+    shoot("per-vertex colours blend along the segment", {horizontal(50.5f, kRed, kBlue)},
+          {row(4, 50, 25, 8), column(100, 47, 7)});
+    // A corner at x = 16 lies inside a gap: restarting the pattern there would ink 16..19.
+    shoot("the stipple runs on across a vertex",
+          {stippled(line({{{10.0f, 20.5f, 0.0f}, kRed},
+                          {{16.0f, 20.5f, 0.0f}, kRed},
+                          {{60.0f, 20.5f, 0.0f}, kRed}}))},
+          {row(6, 20, 28)});
+    // 2^20 periods left of x = 16 (never walked: that would take minutes), in phase.
+    shoot("the stipple runs on from far offscreen",
+          {stippled(horizontal(50.5f, kRed, kRed, 16.0f - 64.0f * 1048576.0f))}, {row(0, 50, 28)});
+    auto thick = horizontal(50.0f, kRed, kRed), thin = horizontal(50.5f, kRed, kRed);
     thick->setWidth(4.0f);
-    render({thick}, 2.0f);
-    EXPECT_TRUE(near(pixel(200, 102), kRed)) << "4 points at scale 2 cover rows 96..103";
-    EXPECT_TRUE(near(pixel(200, 106), kBackground));
-    auto thin = horizontal(50.5f, kRed, kRed);
     thin->setWidth(0.5f);
-    render({thin});
-    EXPECT_NEAR(pixel(100, 50).red(), 128, 8) << "half a pixel wide covers half the pixel";
-}
-
-TEST_F(PainterEncoderTest, multiline__gamma_raises_partial_coverage) {
+    shoot("4 points wide at scale 2 cover 8 rows", {thick}, {column(200, 92, 18)}, 2.0f);
+    shoot("half a pixel wide covers half the pixel", {thin}, {column(100, 48, 5)});
     // On a pixel boundary a one-pixel line covers two rows by half each.
     auto edge = horizontal(50.0f, kRed, kRed);
     edge->setAntialiased(true);
-    render({edge});
-    const int linear = pixel(100, 50).red();
+    shoot("an edge between rows", {edge}, {column(100, 47, 7)});
     edge->setGamma(2.0f);
-    render({edge});
-    EXPECT_NEAR(pixel(100, 50).red(), 255.0 * std::sqrt(linear / 255.0), 6.0) << "coverage^(1/2)";
-    EXPECT_TRUE(near(pixel(100, 53), kBackground)) << "no coverage stays none";
-}
-
-TEST_F(PainterEncoderTest, multiline__join_and_loop) {
+    shoot("an edge between rows at gamma 2: coverage^(1/2)", {edge}, {column(100, 47, 7)});
     // A V of width 8 with its corner at (100, 80): a mitre reaches about 6 pixels past it.
     auto corner = line({{{50.0f, 20.0f, 0.0f}, kRed},
                         {{100.0f, 80.0f, 0.0f}, kRed},
                         {{150.0f, 20.0f, 0.0f}, kRed}});
     corner->setWidth(8.0f);
     corner->setLineJoin(0);
-    render({corner});
-    EXPECT_TRUE(near(pixel(99, 84), kRed)) << "join 0 is a mitre";
+    shoot("join 0 is a mitre", {corner}, {column(99, 76, 14)});
     corner->setLineJoin(2);
-    render({corner});
-    EXPECT_TRUE(near(pixel(99, 84), kBackground)) << "join 2 is a bevel";
+    shoot("join 2 is a bevel", {corner}, {column(99, 76, 14)});
     corner->setLoop(true);
     corner->setWidth(1.0f);
-    render({corner});
-    EXPECT_GT(std::max(pixel(100, 19).red(), pixel(100, 20).red()), 200)
-        << "the loop closes the run along the bottom";
-}
+    shoot("the loop closes the run along the bottom", {corner}, {column(100, 16, 7)});
 
-TEST_F(PainterEncoderTest, quadTexture__alpha_kept_and_texel_for_pixel_on_whole_pixels) {
+    // A quarter of blue over red and over black, a blue triangle, and a curve's dimmed end:
+    // everything times 0.3, stippled, one pixel wide (30 % of red, not 9 %).
+    auto under = std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, 0, 100, 100), 0);
+    under->setColor(kRed);
+    auto band = std::make_shared<HXDScreenspaceQuad>(CGRectMake(50, 0, 100, 100), 0);
+    band->setColor(kBlue.scaled(0.25f));
+    auto mesh = std::make_shared<HXDMesh>(
+        9, HXDBrush{0, kBlue},
+        std::vector<HXDSubmesh>{HXDSubmesh({{160, 20}, {190, 20}, {190, 80}})});
+    auto dim = stippled(horizontal(90.5f, kRed.scaled(0.3f), kRed.scaled(0.3f)));
+    shoot("premultiplied colours show their share over the target", {under, band, mesh, dim},
+          {row(45, 50, 10), row(95, 70, 60), row(158, 30, 36), row(150, 90, 24)});
+    band->setBlendingInfo(HXDDataType::additiveBlendingInfo());
+    shoot("additive keeps the red", {under, band}, {row(45, 50, 10)});
+    // A blending that multiplies by alpha once more takes the components as straight.
+    HXDBlendingInfo straight = HXDDataType::sourceOneMinusSourceBlendingInfo();
+    straight.sourceRGB = HXDBlendFactor::SourceAlpha;
+    band->setBlendingInfo(straight);
+    shoot("straight components are multiplied once", {band}, {row(140, 70, 15)});
+
     // 4 x 4 texels: left half red, right half blue, the top-left texel transparent and the
     // bottom-right one half transparent (an antialiased edge).
     std::vector<uint8_t> rgba(4 * 4 * 4);
@@ -170,44 +179,14 @@ TEST_F(PainterEncoderTest, quadTexture__alpha_kept_and_texel_for_pixel_on_whole_
         rgba[i * 4 + 3] = i == 0 ? 0 : i == 15 ? 128 : 255;
     }
     auto texture = HXDPixelTexture::textureWithRGBA(4, 4, 1.0f, std::move(rgba));
-    render({std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100, 40, 40, 40), 1.0f)});
-    EXPECT_TRUE(near(pixel(103, 77), kBackground)) << "the transparent top-left texel";
-    EXPECT_TRUE(near(pixel(137, 43), HXDColor{0.0f, 0.0f, 0.5f, 1.0f}))
-        << "half a blue texel over black: half blue, neither darker nor brighter";
-    EXPECT_TRUE(near(pixel(127, 65), kBlue));
-    // Placed 0.3 pixels off the grid at its own size: not resampled.
-    render({std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100.3, 40.2, 4, 4), 1.0f)});
-    EXPECT_TRUE(near(pixel(101, 41), kRed, 0));
-    EXPECT_TRUE(near(pixel(102, 41), kBlue, 0));
+    shoot("a texture keeps its alpha, scaled up",
+          {std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100, 40, 40, 40), 1.0f)},
+          {row(96, 77, 48), row(96, 65, 48), row(96, 43, 48)});
+    shoot("a texture at its own size 0.3 pixels off the grid is not resampled",
+          {std::make_shared<HXDQuadTexture>(0, texture, CGRectMake(100.3, 40.2, 4, 4), 1.0f)},
+          {row(98, 41, 8), row(98, 43, 8)});
     EXPECT_EQ(encoder.cachedTextureCount(), 1u) << "a texture is converted once, not per frame";
-}
-
-TEST_F(PainterEncoderTest, translucent_colours__premultiplied_show_their_share_over_the_target) {
-    auto under = std::make_shared<HXDScreenspaceQuad>(CGRectMake(0, 0, 100, 100), 0);
-    under->setColor(kRed);
-    auto band = std::make_shared<HXDScreenspaceQuad>(CGRectMake(50, 0, 100, 100), 0);
-    band->setColor(kBlue.scaled(0.25f));
-    auto mesh = std::make_shared<HXDMesh>(
-        9, HXDBrush{0, kBlue},
-        std::vector<HXDSubmesh>{HXDSubmesh({{160, 20}, {190, 20}, {190, 80}})});
-    // A curve's dimmed end: everything times 0.3, stippled, one pixel wide.
-    auto dim = stippled(horizontal(90.5f, kRed.scaled(0.3f), kRed.scaled(0.3f)));
-    render({under, band, mesh, dim});
-    EXPECT_TRUE(near(pixel(75, 50), HXDColor{0.75f, 0.0f, 0.25f, 1.0f}))
-        << "a quarter of blue over red";
-    EXPECT_TRUE(near(pixel(185, 30), kBlue)) << "inside the triangle";
-    EXPECT_TRUE(near(pixel(145, 70), HXDColor{0.0f, 0.0f, 0.25f, 1.0f})) << "the band over black";
-    EXPECT_TRUE(near(pixel(155, 90), HXDColor{0.3f, 0.0f, 0.0f, 1.0f}))
-        << "a dimmed line shows 30 % of its colour, not 9 %";
-    band->setBlendingInfo(HXDDataType::additiveBlendingInfo());
-    render({under, band});
-    EXPECT_TRUE(near(pixel(75, 50), HXDColor{1.0f, 0.0f, 0.25f, 1.0f})) << "additive keeps the red";
-    // A blending that multiplies by alpha once more takes the components as straight.
-    HXDBlendingInfo straight = HXDDataType::sourceOneMinusSourceBlendingInfo();
-    straight.sourceRGB = HXDBlendFactor::SourceAlpha;
-    band->setBlendingInfo(straight);
-    render({band});
-    EXPECT_TRUE(near(pixel(145, 70), HXDColor{0.0f, 0.0f, 0.0625f, 1.0f}));
+    EXPECT_TRUE(tests_support::matchesBaseline("painted-runs", record, "qt/tests/baselines"));
 }
 
 TEST_F(PainterEncoderTest, text__paints_inside_its_measured_box_in_its_colour) {
@@ -217,7 +196,7 @@ TEST_F(PainterEncoderTest, text__paints_inside_its_measured_box_in_its_colour) {
     s.attributes.color = kRed;
     auto text = std::make_shared<HXDText>(s, HXDTextLayoutAnchor::BottomLeft, CGPointMake(40, 40));
     HXDTextMetrics::setShared(nullptr);
-    render({text});
+    paint(encoder, {text}, QSize(kWidth, kHeight), kBackground);
     const CGSize size = text->size();
     int inked = 0, outside = 0;
     for (int y = 0; y < kHeight; ++y)
@@ -240,22 +219,11 @@ const HXDColor kOrange{0.9f, 0.5f, 0.1f, 1.0f};
 const HXDColor kGreen{0.2f, 0.8f, 0.3f, 1.0f};
 const HXDColor kHalfBlue{0.0f, 0.1f, 0.4f, 0.4f};  // premultiplied: 40 % of a blue
 
-// World coordinates are drawable pixels, y up. The primitives go to the encoder `chunk` at a
-// time (a view hands over each curve as it builds it); 0: all in one call.
 QImage render(const Primitives& primitives, bool direct, size_t chunk = 0) {
-    TQQtPainterEncoder encoder(QSize(kWidth, kHeight));
+    TQQtPainterEncoder encoder;
     encoder.setDirectRaster(direct);
-    HXDTexture* target = encoder.nextDrawable();
-    const HXDRenderingContext context(target, 1.0f,
-                                      BNViewVolumeProjection(CGRectMake(0, 0, kWidth, kHeight)),
-                                      HXDFloat2{1.0f, 1.0f});
-    encoder.beginEncoding(*target, HXDColor{0.1f, 0.1f, 0.12f, 1.0f});
-    const std::span<const std::shared_ptr<HXDDrawPrimitive>> all(primitives);
-    const size_t step = chunk ? chunk : all.size();
-    for (size_t at = 0; at < all.size(); at += step)
-        encoder.encodePrimitives(all.subspan(at, std::min(step, all.size() - at)), context);
-    encoder.endEncoding();
-    return encoder.image();
+    return paint(encoder, primitives, QSize(kWidth, kHeight), HXDColor{0.1f, 0.1f, 0.12f, 1.0f},
+                 1.0f, chunk);
 }
 
 std::shared_ptr<HXDMultiline> polyline(const std::vector<CGPoint>& points, HXDColor color,

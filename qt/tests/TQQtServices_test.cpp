@@ -121,16 +121,12 @@ TEST(QtUserDefaultsTest, valuesOutliveTheSettingsObjectAndSitAboveRegisteredOnes
     QFile::remove(path);
 }
 
-// A 200 x 100 window that is the view itself.
-class QtEventsTest : public ::testing::Test {
-protected:
-    void SetUp() override { widget.resize(200, 100); }
-    QWidget widget;
+// Presses, modifiers and the y flip reach the views through every gesture test; here a right
+// drag, a button the views do not know, wheel notches against precise deltas, and keys.
+TEST(QtEventsTest, mouse_wheel_and_key_events__as_the_views_know_them) {
+    QWidget widget;  // a 200 x 100 window that is the view itself
+    widget.resize(200, 100);
     TQQtViewHost host{&widget};
-};
-
-// Presses, modifiers and the y flip reach the views through every gesture test.
-TEST_F(QtEventsTest, mouseEvent__a_right_drag_and_buttons_the_views_do_not_know) {
     const QPointF at(30.0, 10.0);
     const QMouseEvent drag(QEvent::MouseMove, at, widget.mapToGlobal(at), Qt::NoButton,
                            Qt::RightButton, Qt::NoModifier);
@@ -139,10 +135,7 @@ TEST_F(QtEventsTest, mouseEvent__a_right_drag_and_buttons_the_views_do_not_know)
                            Qt::BackButton, Qt::NoModifier);
     EXPECT_FALSE(TQQtEvents::mouseEvent(back, host))
         << "buttons the views do not know are not translated";
-}
 
-TEST_F(QtEventsTest, wheelEvent__notches_are_lines_precise_deltas_points) {
-    const QPointF at(10.0, 10.0);
     const QWheelEvent notches(at, widget.mapToGlobal(at), QPoint(), QPoint(0, 240), Qt::NoButton,
                               Qt::NoModifier, Qt::NoScrollPhase, false);
     EXPECT_NEAR(TQQtEvents::wheelEvent(notches, host).deltaY(), 2.0, kPointTolerance);
@@ -150,9 +143,7 @@ TEST_F(QtEventsTest, wheelEvent__notches_are_lines_precise_deltas_points) {
                               Qt::NoButton, Qt::NoModifier, Qt::ScrollUpdate, true);
     EXPECT_NEAR(TQQtEvents::wheelEvent(precise, host).deltaX(), 7.0, kPointTolerance)
         << "pixel deltas win, and natural scrolling is turned back";
-}
 
-TEST_F(QtEventsTest, keyEvent__function_keys_own_characters_and_modifier_keys) {
     EXPECT_EQ(
         TQQtEvents::keyEvent(QKeyEvent(QEvent::KeyPress, Qt::Key_Up, Qt::NoModifier)).characters(),
         "\xEF\x9C\x80")
