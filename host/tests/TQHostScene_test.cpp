@@ -184,6 +184,9 @@ protected:
 
     // Every field a step may change, as name and value.
     std::vector<std::pair<std::string, std::string>> state() {
+        // The titles first: reading the history settles a step waiting for its after state,
+        // and the Edit menu's title is what a host reads first.
+        const std::string undoTitle = host.undoDescription(), redoTitle = host.redoDescription();
         TQHostUndoStack& history = host.undoStack();
         const TQHostNotificationCenter& words = host.notificationCenter();
         std::string receivers = std::to_string(words.receiverCount());
@@ -212,8 +215,8 @@ protected:
         return {
             {"open", std::to_string(history.depth())},
             {"can", std::string(host.canUndo() ? "u" : "") + (host.canRedo() ? "r" : "-")},
-            {"undo", std::to_string(history.undoCount()) + " " + host.undoDescription()},
-            {"redo", std::to_string(history.redoCount()) + " " + host.redoDescription()},
+            {"undo", std::to_string(history.undoCount()) + " " + undoTitle},
+            {"redo", std::to_string(history.redoCount()) + " " + redoTitle},
             {"at", std::to_string(history.position())},
             {"scene", std::to_string(scene)},
             {"modified", modified.empty() ? "-" : modified},
@@ -281,6 +284,7 @@ TEST_P(HostScript, steps) {
         {"unregister", [&] { host.unregisterUndoClient(&owner); }},
         {"undo", [&] { refused(host.undo()); }},
         {"redo", [&] { refused(host.redo()); }},
+        {"redotitle", [&] { note = host.redoDescription(); }},
         {"levels", [&] { host.undoStack().setLevelsOfUndo(static_cast<size_t>(args.number(0))); }},
         {"reset", [&] { host.resetModifiedChannels(); }},
         // A node loses its name, and the nodes below it theirs, before it goes.
@@ -398,8 +402,9 @@ const HostRow kHostRows[] = {
     {"capture",
      "begin Nudge & key op 1 0.25 & end; addstep y Add keypoint & will y & add y 7/3; "
      "undo; undo; redo; redo; addstep x Add keypoint"},
-    // Changes with no bracket (a Control band's flatten) are one step until the history is read.
-    {"unbracketed", "key x 1 -3 & key y 1 -3; undo; redo"},
+    // Changes with no bracket (a Control band's flatten) are one step until the history is read,
+    // by any of its readers.
+    {"unbracketed", "key x 1 -3 & key y 1 -3; undo; redo; undo; key z 2 1 & redotitle"},
     // A client's step restores through its owner, joins an open bracket, and goes with the
     // client; a bracket with channels stays without it; a stranger's step is not taken.
     {"clientStep",
