@@ -2,15 +2,21 @@
 // tracking; the sample piece moves as an animator keyed it, and the dense scene has the size it
 // was asked for and is the same scene for the same seed; the owner-ticked playback clock; the
 // delivery of words to receivers, re-entrant posts and registration changes during delivery.
-// Undo and redo through the delegate operations, as the framework drives them; every check
-// compares the whole scene, so a step that restores one channel and breaks another shows.
+// Undo and redo through the delegate operations, as the framework drives them; the records
+// number every distinct whole scene, so a step that restores one channel and breaks another
+// shows.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
 #include <functional>
+#include <map>
 #include <memory>
 #include <numbers>
+#include <sstream>
+#include <string>
+#include <utility>
 #include <vector>
 
 #include "host/TQHostAppDelegate.h"
@@ -20,6 +26,8 @@
 #include "host/TQHostSampleScene.h"
 #include "platform/channels/TQChannel.h"
 #include "platform/channels/TQChannelTypes.h"
+#include "tests/support/StepScript.h"
+#include "tests/support/TextBaseline.h"
 
 namespace {
 
@@ -41,6 +49,7 @@ public:
         else
             ::operator delete(p);
     }
+    static bool inSlot(const void* p) { return p == slot; }
     // Of this class, so that undo can assign the snapshot back.
     TQChannelBase* cloneChannel() const override {
         auto* clone = new ReusedAddressChannel(getName(), getChannelId());
@@ -77,142 +86,363 @@ TEST_P(SceneFamilies, typedChannels__giveEveryDowncastSomethingToFind) {
 INSTANTIATE_TEST_SUITE_P(BothFamilies, SceneFamilies,
                          ::testing::Values(TQHostObjectFamily::Kestrel, TQHostObjectFamily::Other));
 
-class HostDelegate : public ::testing::Test {
-protected:
-    void SetUp() override {
-        // Three objects of the family, a few keyframes on their first channels.
-        TQHostLoadDenseScene(host, TQHostObjectFamily::Kestrel,
-                             {.objects = 3, .channelsPerObject = 3, .keyframesPerChannel = 4});
-        objects = host.scene().objects();
-        const auto& positions =
-            TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
-        x = TQChannelRef(positions[0]).getChannel(objects[0]);
-        z = TQChannelRef(positions[2]).getChannel(objects[0]);
-        otherX = TQChannelRef(positions[0]).getChannel(objects[1]);
-    }
-    // The modified channels as the host answers them: where each reference leads now.
-    std::vector<const TQChannelBase*> modified() {
-        std::vector<const TQChannelBase*> out;
-        for (const TQChannelRef& ref : host.modifiedChannels())
-            out.push_back(ref.getChannel(host.sceneChannelRoot()));
-        return out;
-    }
-    TQHostAppDelegate host;
-    std::vector<TQChannelObjectRootBase*> objects;
-    TQChannelBase* x = nullptr;
-    TQChannelBase* z = nullptr;
-    TQChannelBase* otherX = nullptr;
-};
-
-TEST_F(HostDelegate, modifiedSet__isExactlyWhatChangedSinceTheLastReset) {
-    EXPECT_TRUE(modified().empty()) << "loading must start with a clean set";
-    x->noteWillChange(true);
-    z->noteWillChange(true);
-    x->noteWillChange(true);  // a drag announces again at every step
-    EXPECT_EQ(modified(), (std::vector<const TQChannelBase*>{x, z}));
-    EXPECT_TRUE(host.wasChannelModified(x) && host.wasChannelModified(objects[0]))
-        << "and the object holding it";
-    EXPECT_FALSE(host.wasChannelModified(otherX) || host.wasChannelModified(objects[1]) ||
-                 host.wasChannelModified(nullptr))
-        << "same place, other object: not modified";
-    host.resetModifiedChannels();
-    EXPECT_FALSE(host.wasChannelModified(x) || !modified().empty());
-    x->getParent()->noteWillChange(true);
-    EXPECT_TRUE(host.wasChannelModified(z))
-        << "a compound announced as a whole covers its components";
-    EXPECT_EQ(modified(), (std::vector<const TQChannelBase*>{x->getParent()}));
-    ASSERT_TRUE(host.removeObject(objects[0]));
-    EXPECT_EQ(modified(), (std::vector<const TQChannelBase*>{nullptr}))
-        << "a removed channel's reference leads nowhere";
-    EXPECT_FALSE(host.wasChannelModified(otherX) || host.wasChannelModified(objects[1]));
-}
-
-TEST_F(HostDelegate, channelAtAReusedAddress__isTrackedAndUndoneAsAChannelOfItsOwn) {
-    TQChannelBase* first =
-        objects[0]->addChild(std::unique_ptr<TQChannelBase>(new ReusedAddressChannel("A", 9000)));
-    const auto firstAddress = reinterpret_cast<std::uintptr_t>(first);
-    host.startCaptureModifiedChannels("Replace");
-    first->noteWillChange(true);
-    ASSERT_TRUE(objects[0]->removeChild(first));
-    auto* second = static_cast<TQChannel*>(
-        objects[1]->addChild(std::unique_ptr<TQChannelBase>(new ReusedAddressChannel("B", 9001))));
-    ASSERT_EQ(reinterpret_cast<std::uintptr_t>(second), firstAddress);
-    EXPECT_FALSE(host.wasChannelModified(second)) << "not announced yet";
-
-    second->noteWillChange(true);
-    second->setKeyframe(CMTimeMake(1, 1), 5.0);
-    host.endCaptureModifiedChannels();
-
-    EXPECT_TRUE(host.wasChannelModified(second) && host.wasChannelModified(objects[1]));
-    EXPECT_EQ(modified(), (std::vector<const TQChannelBase*>{nullptr, second}));
-    ASSERT_TRUE(host.undo());
-    EXPECT_EQ(second->numberOfKeyframes(), 0u) << "the step captured the new channel too";
-}
-
 // The words the host posts, in order.
 struct Words : TQNotificationReceiver {
     std::vector<TQNotificationWord> seen;
     void notify(TQNotificationWord word) override { seen.push_back(word); }
 };
 
-TEST_F(HostDelegate, selectionAndTime__answerAndPostTheHostWords) {
+constexpr TQHostObjectFamily kFamily = TQHostObjectFamily::Kestrel;
+
+// Logs every word with its own tag, and runs a script of steps (joined by ",") on the first
+// word it hears.
+struct Receiver : TQNotificationReceiver {
+    Receiver(std::string& log, char tag, std::function<void(std::string)>& run)
+        : log(log), tag(tag), run(run) {}
+    void notify(TQNotificationWord word) override {
+        log += (std::ostringstream() << " " << tag << std::hex << word).str();
+        if (!onFirst.empty()) run(std::exchange(onFirst, std::string()));
+    }
+    std::string& log;
+    char tag;
+    std::function<void(std::string)>& run;
+    std::string onFirst;
+};
+
+struct HostRow {
+    const char* name;
+    const char* script;
+};
+
+// A script of the calls the framework and a user make ("begin Move; will x; key x 1 2; end;
+// undo") on the sample piece, and after each step what an Edit menu and the host's listeners
+// see; a line shows only what changed. Steps joined by "&" are one line, so that no read of
+// the history between them settles a step waiting for its "after" state. Short names for the
+// nodes: the objects o0..o3, the first object's position x y z, their compound p and its
+// opacity op, the second's x1.
+class HostScript : public ::testing::TestWithParam<HostRow> {
+protected:
+    void SetUp() override {
+        TQHostLoadSampleScene(host, kFamily);
+        host.addNotificationReceiver(&words);
+        host.registerUndoClient(&owner, &client);
+        const auto objects = host.scene().objects();
+        const auto& positions = TQHostPropertyPaths(kFamily, TQHostProperty::Position);
+        for (size_t i = 0; i < objects.size(); ++i) named["o" + std::to_string(i)] = objects[i];
+        named["x"] = TQChannelRef(positions[0]).getChannel(objects[0]);
+        named["y"] = TQChannelRef(positions[1]).getChannel(objects[0]);
+        named["z"] = TQChannelRef(positions[2]).getChannel(objects[0]);
+        named["p"] = named["x"]->getParent();
+        named["op"] = TQChannelRef(TQHostPropertyPaths(kFamily, TQHostProperty::Opacity)[0])
+                          .getChannel(objects[0]);
+        named["x1"] = TQChannelRef(positions[0]).getChannel(objects[1]);
+        named["null"] = nullptr;
+    }
+    void TearDown() override {
+        host.unregisterUndoClient(&owner);
+        for (Receiver* r : {&a, &b, &c}) host.notificationCenter().removeReceiver(r);
+        host.removeNotificationReceiver(&words);
+    }
+    struct Client : TQHostUndoClient {
+        int value = 0;
+        std::any captureUndoState(uint32_t, uint32_t) override { return value; }
+        void restoreUndoState(uint32_t, uint32_t, const std::any& state) override {
+            value = std::any_cast<int>(state);
+        }
+    };
+
+    // "3" seconds, "1/24" exactly, "invalid", "indefinite".
+    CMTime when(size_t i) const {
+        const std::string w = args.word(i);
+        if (w == "invalid" || w == "indefinite")
+            return w == "invalid" ? kCMTimeInvalid : kCMTimeIndefinite;
+        const size_t slash = w.find('/');
+        return CMTimeMake(std::stoll(w),
+                          slash == std::string::npos ? 1 : std::stoi(w.substr(slash + 1)));
+    }
+    Receiver* receiver(const std::string& tag) {
+        return tag == "a" ? &a : tag == "b" ? &b : tag == "c" ? &c : nullptr;
+    }
+    TQChannel* channel(size_t i) { return static_cast<TQChannel*>(named.at(args.word(i))); }
+    std::string nameOf(const TQChannelBase* node) const {
+        for (const auto& [name, known] : named)
+            if (known == node) return name;
+        return node->getName();
+    }
+    // The step's text after its first n words.
+    std::string after(size_t n) const {
+        std::string out = args.rest;
+        for (; n > 0; --n) out.erase(0, out.find(' ') + 1);
+        return out;
+    }
+    static std::string seconds(const CMTime& t) {
+        std::ostringstream out;
+        out.precision(12);
+        out << CMTimeGetSeconds(t);
+        return out.str();
+    }
+
+    // Every field a step may change, as name and value.
+    std::vector<std::pair<std::string, std::string>> state() {
+        // The titles first: reading the history settles a step waiting for its after state,
+        // and the Edit menu's title is what a host reads first.
+        const std::string undoTitle = host.undoDescription(), redoTitle = host.redoDescription();
+        TQHostUndoStack& history = host.undoStack();
+        const TQHostNotificationCenter& words = host.notificationCenter();
+        std::string receivers = std::to_string(words.receiverCount());
+        for (const char* tag : {"a", "b", "c"})
+            if (words.hasReceiver(receiver(tag))) receivers += std::string(" ") + tag;
+        if (words.isDelivering()) receivers += ", delivering";
+        std::string was, selected = " -", asked, times = seconds(host.currentTime()), modified;
+        // The modified channels as the host answers them: where each reference leads now.
+        for (const TQChannelRef& ref : host.modifiedChannels())
+            modified += " " + nameOf(ref.getChannel(host.sceneChannelRoot()));
+        for (const auto& [name, node] : named) {
+            if (host.wasChannelModified(node)) was += " " + name;
+            if (host.isObjectSelected(node)) asked += " " + name;
+        }
+        if (!host.selectedObjectsRootChannels().empty()) selected.clear();
+        for (TQChannelBase* object : host.selectedObjectsRootChannels())
+            selected += " " + nameOf(object);
+        if (host.isPlaying()) times += " playing";
+        for (TQChannelObjectRootBase* object : host.scene().objects())
+            if (CMTimeCompare(object->getRootCurrentTime(false), host.currentTime()) != 0)
+                times +=
+                    ", " + nameOf(object) + " at " + seconds(object->getRootCurrentTime(false));
+        size_t scene = 0;
+        while (scene < scenes.size() && !(*scenes[scene] == *host.sceneChannelRoot())) ++scene;
+        if (scene == scenes.size()) scenes.emplace_back(host.sceneChannelRoot()->cloneChannel());
+        return {
+            {"open", std::to_string(history.depth())},
+            {"can", std::string(host.canUndo() ? "u" : "") + (host.canRedo() ? "r" : "-")},
+            {"undo", std::to_string(history.undoCount()) + " " + undoTitle},
+            {"redo", std::to_string(history.redoCount()) + " " + redoTitle},
+            {"at", std::to_string(history.position())},
+            {"scene", std::to_string(scene)},
+            {"modified", modified.empty() ? "-" : modified},
+            {"was", was.empty() ? " -" : was},
+            {"sel", selected + " /" + asked + (host.objectsSelectedInScene() ? "" : " none")},
+            {"time", times},
+            {"range", seconds(host.playRange().start) + "+" + seconds(host.playRange().duration)},
+            {"client", std::to_string(client.value)},
+            {"receivers", receivers},
+            {"delivered", std::to_string(words.deliveredWordCount())}};
+    }
+
+    TQHostAppDelegate host;
     Words words;
-    host.addNotificationReceiver(&words);
+    std::map<std::string, TQChannelBase*> named;
+    tests_support::StepArgs args;
+    Client client;
+    int owner = 0, stranger = 0;  // any object's address names an undo client's owner
+    std::vector<std::unique_ptr<TQChannelBase>> scenes;  // equal scenes share a number
+    std::string note;                                    // what a step answered
+    std::string heard;
+    std::function<void(std::string)> run;
+    Receiver a{heard, 'a', run}, b{heard, 'b', run}, c{heard, 'c', run};
+};
 
-    EXPECT_TRUE(host.objectsSelectedInScene());
-    host.selectObject(objects[1], true);
-    host.selectObject(objects[1], true);  // no change, no word
-    EXPECT_EQ(host.selectedObjectsRootChannels(),
-              (std::vector<TQChannelBase*>{objects[0], objects[1]}));
-    EXPECT_TRUE(host.isObjectSelected(objects[1]));
-    EXPECT_FALSE(host.isObjectSelected(x)) << "only object roots are objects";
-    host.clearObjectSelection();
-    EXPECT_FALSE(host.objectsSelectedInScene());
-
-    host.setCurrentTime(CMTimeMake(3, 1));
-    EXPECT_EQ(CMTimeGetSeconds(objects[2]->getRootCurrentTime(false)), 3.0);
-    host.play();
-    host.tick(CMTimeMake(1, 30));
-    EXPECT_TRUE(host.isPlaying());
-    host.abort();
-    EXPECT_FALSE(host.isPlaying()) << "abort stops playback";
-
-    EXPECT_EQ(words.seen, (std::vector<TQNotificationWord>{kTQNotifyObjectSelectionChanged,
-                                                           kTQNotifyObjectSelectionChanged,
-                                                           kTQNotifyHostTimeChanged}));
-    host.removeNotificationReceiver(&words);
+TEST_P(HostScript, steps) {
+    auto refused = [&](bool done) { note = done ? "" : "refused"; };
+    const tests_support::Steps steps = {
+        {"begin", [&] { host.startCaptureModifiedChannels(args.rest); }},
+        {"end", [&] { host.endCaptureModifiedChannels(); }},
+        {"will", [&] { host.willChangeChannel(channel(0)); }},
+        {"willset", [&] { host.willSetChannelValue(channel(0)); }},
+        // Channel changes as the channels announce them, with no call to the host.
+        {"note", [&] { named.at(args.word(0))->noteWillChange(true); }},
+        {"key",
+         [&] {
+             channel(0)->noteWillChange(true);
+             channel(0)->setKeyframe(when(1), args.number(2));
+         }},
+        {"add",
+         [&] {
+             const CMTime at = when(1);
+             channel(0)->noteWillChange(true);
+             channel(0)->addKeyframe(&at);
+         }},
+        {"del",
+         [&] {
+             channel(0)->noteWillChange(true);
+             channel(0)->deleteKeyframe(channel(0)->getKeyframes(false).front());
+         }},
+        // One framework-style edit: a keyframe at 4.5 s with a value, in a bracket of its own.
+        {"edit",
+         [&] {
+             host.startCaptureModifiedChannels(after(2));
+             host.willChangeChannel(channel(0));
+             host.willSetChannelValue(channel(0));
+             channel(0)->noteWillChange(true);
+             channel(0)->setKeyframe(CMTimeMake(9, 2), args.number(1));
+             host.endCaptureModifiedChannels();
+         }},
+        {"addstep", [&] { host.addChannelToUndo(channel(0), after(1)); }},
+        {"client", [&] { client.value = static_cast<int>(args.number(0)); }},
+        {"clientstep", [&] { host.addToUndo(&owner, 1, 0, args.rest); }},
+        {"stranger", [&] { host.addToUndo(&stranger, 2, 1, args.rest); }},
+        {"unregister", [&] { host.unregisterUndoClient(&owner); }},
+        {"undo", [&] { refused(host.undo()); }},
+        {"redo", [&] { refused(host.redo()); }},
+        {"redotitle", [&] { note = host.redoDescription(); }},
+        {"levels", [&] { host.undoStack().setLevelsOfUndo(static_cast<size_t>(args.number(0))); }},
+        {"reset", [&] { host.resetModifiedChannels(); }},
+        // A node loses its name, and the nodes below it theirs, before it goes.
+        {"remove",
+         [&] {
+             TQChannelBase* node = named.at(args.word(0));
+             std::erase_if(named, [&](const auto& entry) {
+                 const TQChannelBase* below = entry.second;
+                 while (below && below != node) below = below->getParent();
+                 return below != nullptr;
+             });
+             auto* folder = static_cast<TQChannelFolder*>(node->getParent());
+             refused(folder == host.sceneChannelRoot() ? host.removeObject(node)
+                                                       : folder->removeChild(node));
+         }},
+        // A channel of the class that hands the next channel the last freed address.
+        {"child",
+         [&] {
+             TQChannelBase* made =
+                 static_cast<TQChannelFolder*>(named.at(args.word(0)))
+                     ->addChild(std::unique_ptr<TQChannelBase>(new ReusedAddressChannel(
+                         args.word(1), static_cast<TQChannelId>(args.number(2)))));
+             named[args.word(1)] = made;
+             note = ReusedAddressChannel::inSlot(made) ? "at the reused address" : "";
+         }},
+        {"listen",
+         [&] {
+             for (const std::string& tag : args.words)
+                 host.notificationCenter().addReceiver(receiver(tag));
+         }},
+        {"unlisten",
+         [&] {
+             for (const std::string& tag : args.words)
+                 host.notificationCenter().removeReceiver(receiver(tag));
+         }},
+        {"then", [&] { receiver(args.word(0))->onFirst = after(1); }},
+        {"post",
+         [&] {
+             host.postNotification(
+                 static_cast<TQNotificationWord>(std::stoul(args.word(0), nullptr, 16)));
+         }},
+        {"select", [&] { host.selectObject(named.at(args.word(0)), args.word(1) == "extend"); }},
+        {"clear", [&] { host.clearObjectSelection(); }},
+        {"time", [&] { host.setCurrentTime(when(0)); }},
+        {"play", [&] { host.play(); }},
+        {"abort", [&] { host.abort(); }},
+        {"loop", [&] { host.clock().setLooping(args.word(0) == "on"); }},
+        {"tick",
+         [&] {
+             for (int n = args.words.size() > 1 ? static_cast<int>(args.number(1)) : 1; n > 0; --n)
+                 host.tick(when(0));
+         }},
+        {"range", [&] { refused(host.setPlayRange(CMTimeRangeMake(when(0), when(1)))); }},
+        {"display", [&] { refused(host.setDisplayRange(CMTimeRangeMake(when(0), when(1)))); }},
+        {"step", [&] { refused(host.stepFrames(static_cast<int64_t>(args.number(0)))); }},
+        {"toend", [&] { refused(host.goToEnd()); }},
+        {"text", [&] { note = host.timeText(when(0)); }},
+        {"timecode", [&] { host.setStartTimecode(static_cast<uint32_t>(args.number(0))); }},
+        {"asframes", [&] { host.setDisplayTimeAsFrames(true); }},
+        {"firstframe", [&] { host.setFirstFrameNumber(static_cast<uint32_t>(args.number(0))); }},
+    };
+    run = [&](std::string script) {
+        std::ranges::replace(script, ',', ';');
+        tests_support::runSteps(script, args, steps);
+    };
+    std::map<std::string, std::string> shown;
+    std::string record;
+    auto line = [&](const std::string& label) {
+        record += label + (note.empty() ? "" : " -> " + note) + ":";
+        for (auto [field, value] : state()) {
+            value.erase(0, value.find_first_not_of(' '));
+            value.erase(value.find_last_not_of(' ') + 1);
+            if (std::exchange(shown[field], value) != value) record += " | " + field + " " + value;
+        }
+        // The words posted, a run of one word as "word*count".
+        std::ostringstream said;
+        for (size_t i = 0, n = 1; i < words.seen.size(); i += n, n = 1) {
+            while (i + n < words.seen.size() && words.seen[i + n] == words.seen[i]) ++n;
+            said << " 0x" << std::hex << words.seen[i] << std::dec;
+            if (n > 1) said << "*" << n;
+        }
+        if (!said.str().empty()) record += " | words" + said.str();
+        if (!heard.empty()) record += " | heard" + std::exchange(heard, std::string());
+        record += "\n";
+        words.seen.clear();
+        note.clear();
+    };
+    line("load");
+    std::istringstream script(GetParam().script);
+    for (std::string step; std::getline(script, step, ';');) {
+        step.erase(0, step.find_first_not_of(' '));
+        std::string joined = step;
+        std::ranges::replace(joined, '&', ';');
+        tests_support::runSteps(joined, args, steps);
+        line(step);
+    }
+    EXPECT_TRUE(tests_support::matchesBaselineBlock("host-steps", GetParam().name, record,
+                                                    "host/tests/baselines"));
 }
 
-TEST_F(HostDelegate, transport__movesOnFramesInsideThePlayRangeAndTellsTheTime) {
-    Words words;
-    host.addNotificationReceiver(&words);
-    // The editor's range is a zoom into the piece; playback keeps to the piece.
-    ASSERT_TRUE(host.setPlayRange(CMTimeRangeMake(kCMTimeZero, CMTimeMake(2, 1))));
-    ASSERT_TRUE(host.setDisplayRange(CMTimeRangeMake(CMTimeMake(1, 2), CMTimeMake(1, 2))));
-    EXPECT_EQ(CMTimeGetSeconds(host.playRange().duration), 2.0);
-    words.seen.clear();
+// Each row pins what a careless change to the history, the tracker or the clock would break.
+const HostRow kHostRows[] = {
+    // The inner end must not close the step, and no undo while one is open; a stray end is
+    // tolerated. An empty step is neither kept nor a position, and does not clear redo; a kept
+    // one does, and is a new position. The oldest steps go past the levels of undo.
+    {"brackets",
+     "begin Delete Keypoint; begin Inner; will x; del x; end; end; undo; end; "
+     "edit x 1 First; edit y 2 Second; undo; "
+     "begin Move Keypoint & will x & willset x & end; willset x & will x; redo; undo; "
+     "begin Open; undo; end; edit op 0.5 Third; redo; "
+     "levels 2; edit x 4 Fourth; undo; undo; undo"},
+    // A change inside a bracket that never announced itself to the host is still taken; a
+    // channel added to undo outside one takes its after state when the history is next read,
+    // and is dropped when it never changed.
+    {"capture",
+     "begin Nudge & key op 1 0.25 & end; addstep y Add keypoint & will y & add y 7/3; "
+     "undo; undo; redo; redo; addstep x Add keypoint"},
+    // Changes with no bracket (a Control band's flatten) are one step until the history is read,
+    // by any of its readers.
+    {"unbracketed", "key x 1 -3 & key y 1 -3; undo; redo; undo; key z 2 1 & redotitle"},
+    // A client's step restores through its owner, joins an open bracket, and goes with the
+    // client; a bracket with channels stays without it; a stranger's step is not taken.
+    {"clientStep",
+     "client 1; clientstep Curve Editor Undo Remove Channel; client 2; undo; redo; "
+     "begin Box Edit & clientstep Curve Editor Undo Box Edit & client 3 & will x & "
+     "key x 3 -9 & end; undo; unregister; stranger Curve Editor Undo New Curve Set"},
+    // Undo marks what it restored modified and posts that channels changed.
+    {"undoMarksAndPosts", "edit op 0.1 Edit; reset; undo"},
+    // Exactly what changed since the last reset, the object holding it too; a compound
+    // announced as a whole covers its components; a removed channel's reference leads nowhere.
+    {"modifiedSet", "note x & note z & note x; reset; note p; remove o0"},
+    // Selection words only for a change; abort stops playback.
+    {"selectionAndTime",
+     "select o1 extend; select o1 extend; clear; time 3; play & tick 1/30; abort"},
+    // A channel at the address another had is tracked and undone as a channel of its own.
+    {"reusedAddress",
+     "begin Replace & child o0 A 9000 & note A & remove A; child o1 B 9001; key B 1 5 & end; "
+     "undo"},
+    // A word posted inside a delivery waits until the current one reached everyone; receivers
+    // removed during a delivery hear nothing more of it, and one added hears the next word.
+    {"notifications",
+     "listen a b a null; then a post 20000; post 4; unlisten a b; listen a b c; "
+     "then a unlisten b a; post 8; then c listen b, post 2; post 10; unlisten a"},
+    // Frames inside the play range, which is not the display range: 1/30 s in the clock's
+    // timescale is just short of it, and in frame 1 all the same. A word for each move but the
+    // step past the end; the time as timecode or frame numbers.
+    {"transport",
+     "range 0 2; display 1/2 1/2; time 8738/262144; step 1; step -100; toend; step 1; "
+     "text 12/30; timecode 108000; text 12/30; asframes & firstframe 1; text 12/30"},
+    // A stopped clock does not move, bad input is refused, play starts at the range; the loop
+    // is exact, reaching the end wraps to the start, and without looping it rests on the end.
+    {"clock",
+     "range 1 2; tick 1/2; play; tick 1/4; tick -1/4; tick invalid; time invalid; range 0 0; "
+     "range indefinite 1; tick 1/24 1000; time 5/2; tick 1/2; loop off; tick 7; play"},
+};
 
-    // 1/30 s cannot be held by the clock's timescale: the playhead is in frame 1 all the same.
-    host.setCurrentTime(TQTarnTimeForChannelSeconds(1.0 / 30.0, TQHostPlaybackClock::kTimescale));
-    EXPECT_TRUE(host.stepFrames(1));
-    EXPECT_EQ(host.currentTime(), CMTimeMake(2, 30));
-    EXPECT_TRUE(host.stepFrames(-100));
-    EXPECT_EQ(host.currentTime(), kCMTimeZero) << "not before the play range";
-    EXPECT_TRUE(host.goToEnd());
-    EXPECT_EQ(host.currentTime(), CMTimeMake(59, 30)) << "the last frame of the play range";
-    EXPECT_TRUE(host.stepFrames(1));
-    EXPECT_EQ(words.seen, (std::vector<TQNotificationWord>(3, kTQNotifyHostTimeChanged)))
-        << "a word for each move but the step past the end";
-
-    const CMTime frame12 = CMTimeMake(12, 30);
-    EXPECT_EQ(host.timeText(frame12), "00:00:00:12");
-    host.setStartTimecode(30 * 3600);
-    EXPECT_EQ(host.timeText(frame12), "01:00:00:12");
-    host.setDisplayTimeAsFrames(true);
-    host.setFirstFrameNumber(1);
-    EXPECT_EQ(host.timeText(frame12), "13");
-    host.removeNotificationReceiver(&words);
-}
+INSTANTIATE_TEST_SUITE_P(Rows, HostScript, ::testing::ValuesIn(kHostRows),
+                         [](const auto& row) { return std::string(row.param.name); });
 
 constexpr double kTolerance = 1e-6;
 
@@ -309,299 +539,6 @@ TEST(DenseScene, sizeAndSeed__asAskedAndTheSameForTheSameSeed) {
     EXPECT_EQ(stress.objects * stress.channelsPerObject, 3000u);
     EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 0), 334u) << "the remainder goes first";
     EXPECT_EQ(TQHostDenseKeyframesOfChannel(stress, 2999), 333u);
-}
-
-constexpr double kTimeTolerance = 1.0 / TQHostPlaybackClock::kTimescale;
-
-class PlaybackClock : public ::testing::Test {
-protected:
-    void SetUp() override {
-        ASSERT_TRUE(clock.setPlayRange(CMTimeRangeMake(CMTimeMake(1, 1), CMTimeMake(2, 1))));
-    }
-    double seconds() const { return CMTimeGetSeconds(clock.currentTime()); }
-    TQHostPlaybackClock clock;
-};
-
-TEST_F(PlaybackClock, tick__movesOnlyWhilePlayingAndRefusesBadInput) {
-    EXPECT_FALSE(clock.tick(CMTimeMake(1, 2))) << "a stopped clock must not move";
-    clock.play();
-    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "play starts at the range when outside it";
-    EXPECT_TRUE(clock.tick(CMTimeMake(1, 4)));
-    EXPECT_NEAR(seconds(), 1.25, kTimeTolerance);
-    EXPECT_FALSE(clock.tick(CMTimeMake(-1, 4))) << "negative elapsed time is ignored";
-    EXPECT_FALSE(clock.tick(kCMTimeInvalid));
-    EXPECT_FALSE(clock.setCurrentTime(kCMTimeInvalid));
-    EXPECT_FALSE(clock.setPlayRange(CMTimeRangeMake(kCMTimeZero, kCMTimeZero)));
-    EXPECT_FALSE(clock.setPlayRange(CMTimeRangeMake(kCMTimeIndefinite, CMTimeMake(1, 1))));
-    EXPECT_NEAR(CMTimeGetSeconds(clock.playRange().duration), 2.0, kTimeTolerance);
-    EXPECT_NEAR(seconds(), 1.25, kTimeTolerance);
-}
-
-TEST_F(PlaybackClock, tick__loopsExactlyInTheRangeOrRestsOnItsEnd) {
-    clock.play();
-    for (int i = 0; i < 1000; ++i) clock.tick(CMTimeMake(1, 24));
-    // 1000/24 s = 41.666.. s from 1 s, in a 2 s loop: 1 + (41.666.. mod 2) = 2.666..
-    EXPECT_NEAR(seconds(), 1.0 + std::fmod(1000.0 / 24.0, 2.0), 1000 * kTimeTolerance);
-    clock.setCurrentTime(CMTimeMake(5, 2));
-    clock.tick(CMTimeMake(1, 2));
-    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "reaching the end exactly wraps to the start";
-
-    clock.setLooping(false);
-    clock.tick(CMTimeMake(7, 1));
-    EXPECT_NEAR(seconds(), 3.0, kTimeTolerance);
-    EXPECT_FALSE(clock.isPlaying());
-    clock.play();
-    EXPECT_NEAR(seconds(), 1.0, kTimeTolerance) << "playing again starts over";
-}
-
-// Logs every word with its own tag, and runs an action on the first word it hears.
-struct Receiver : TQNotificationReceiver {
-    Receiver(std::vector<std::pair<char, TQNotificationWord>>& log, char tag)
-        : log(log), tag(tag) {}
-    void notify(TQNotificationWord word) override {
-        log.emplace_back(tag, word);
-        if (onFirst) {
-            auto action = std::move(onFirst);
-            onFirst = nullptr;
-            action(word);
-        }
-    }
-    std::vector<std::pair<char, TQNotificationWord>>& log;
-    char tag;
-    std::function<void(TQNotificationWord)> onFirst;
-};
-
-class NotificationCenter : public ::testing::Test {
-protected:
-    using Log = std::vector<std::pair<char, TQNotificationWord>>;
-    TQHostNotificationCenter center;
-    Log log;
-    Receiver a{log, 'a'}, b{log, 'b'}, c{log, 'c'};
-};
-
-TEST_F(NotificationCenter, reentrantPost__waitsUntilTheCurrentWordReachedEveryone) {
-    center.addReceiver(&a);
-    center.addReceiver(&b);
-    center.addReceiver(&a);  // twice: still one registration
-    center.addReceiver(nullptr);
-    a.onFirst = [&](TQNotificationWord) {
-        center.post(kTQNotifyCurveSetContentChanged);
-        EXPECT_EQ(log.size(), 1u) << "a nested post must not be delivered inside notify";
-    };
-    center.post(kTQNotifyChannelsChanging);
-    EXPECT_EQ(log, (Log{{'a', 0x4}, {'b', 0x4}, {'a', 0x20000}, {'b', 0x20000}}));
-    EXPECT_FALSE(center.isDelivering());
-    EXPECT_EQ(center.deliveredWordCount(), 2u);
-}
-
-TEST_F(NotificationCenter, unregisterDuringDelivery__isSafeAndTakesEffectAtOnce) {
-    center.addReceiver(&a);
-    center.addReceiver(&b);
-    center.addReceiver(&c);
-    // a removes b, which has not heard the word yet, and itself.
-    a.onFirst = [&](TQNotificationWord) {
-        center.removeReceiver(&b);
-        center.removeReceiver(&a);
-    };
-    center.post(0x8);
-    EXPECT_EQ(log, (Log{{'a', 0x8}, {'c', 0x8}}));
-    EXPECT_EQ(center.receiverCount(), 1u);
-    // c registers b again from inside notify: b hears the next word, not this one.
-    log.clear();
-    c.onFirst = [&](TQNotificationWord) {
-        center.addReceiver(&b);
-        center.post(0x2);
-    };
-    center.post(0x10);
-    EXPECT_EQ(log, (Log{{'c', 0x10}, {'c', 0x2}, {'b', 0x2}}));
-    center.removeReceiver(&a);  // unknown now: ignored
-    EXPECT_TRUE(center.hasReceiver(&b));
-}
-
-class HostUndo : public ::testing::Test {
-protected:
-    void SetUp() override {
-        TQHostLoadSampleScene(host, TQHostObjectFamily::Kestrel);
-        object = host.scene().objects().front();
-        const auto& positions =
-            TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position);
-        x = channel(positions[0]);
-        y = channel(positions[1]);
-        opacity =
-            channel(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Opacity)[0]);
-        ASSERT_TRUE(x && y && opacity) << "the sample object lacks its position or opacity";
-    }
-    TQChannel* channel(const BNString& path) {
-        return dynamic_cast<TQChannel*>(TQChannelRef(path).getChannel(object));
-    }
-    std::unique_ptr<TQChannelBase> scene() {
-        return std::unique_ptr<TQChannelBase>(host.sceneChannelRoot()->cloneChannel());
-    }
-    bool sceneIs(const std::unique_ptr<TQChannelBase>& expected) {
-        return *host.sceneChannelRoot() == *expected;
-    }
-    // A step back (or forward) through the history, after which the scene is `expected`.
-    bool undoneTo(const std::unique_ptr<TQChannelBase>& s) { return host.undo() && sceneIs(s); }
-    bool redoneTo(const std::unique_ptr<TQChannelBase>& s) { return host.redo() && sceneIs(s); }
-
-    // One framework-style edit: every channel gets a keyframe at 4.5 s with a new value.
-    void bracketedEdit(const BNString& description, std::initializer_list<TQChannel*> channels,
-                       double value) {
-        host.startCaptureModifiedChannels(description);
-        for (TQChannel* c : channels) host.willChangeChannel(c);
-        for (TQChannel* c : channels) host.willSetChannelValue(c);
-        for (TQChannel* c : channels) {
-            c->noteWillChange(true);
-            c->setKeyframe(CMTimeMake(9, 2), value);
-        }
-        for (TQChannel* c : channels) host.didSetChannelValue(c);
-        for (TQChannel* c : channels) host.didChangeChannel(c);
-        host.endCaptureModifiedChannels();
-    }
-
-    TQHostAppDelegate host;
-    TQChannelObjectRootBase* object = nullptr;
-    TQChannel *x = nullptr, *y = nullptr, *opacity = nullptr;
-};
-
-TEST_F(HostUndo, brackets__nestedOnesMakeOneStepEmptyOnesNoneAndStrayEndsAreTolerated) {
-    const auto before = scene();
-    host.startCaptureModifiedChannels("Delete Keypoint");
-    host.startCaptureModifiedChannels("Inner");
-    host.willChangeChannel(x);
-    x->noteWillChange(true);
-    x->deleteKeyframe(x->getKeyframes(false).front());
-    host.endCaptureModifiedChannels();
-    EXPECT_TRUE(host.undoStack().isStepOpen()) << "the inner end must not close the step";
-    EXPECT_FALSE(host.canUndo()) << "no undo while a step is open";
-    host.endCaptureModifiedChannels();
-    EXPECT_EQ(host.undoDescription(), "Delete Keypoint");
-    EXPECT_TRUE(undoneTo(before));
-    host.endCaptureModifiedChannels();  // nothing open: changes nothing
-    EXPECT_EQ(host.undoStack().redoCount(), 1u);
-
-    TQHostUndoStack& history = host.undoStack();
-    bracketedEdit("First", {x}, 1.0);
-    const uint64_t first = history.position();
-    bracketedEdit("Second", {y}, 2.0);
-    const uint64_t second = history.position();
-    ASSERT_TRUE(host.undo());  // "Second" waits on the redo side
-    EXPECT_EQ(history.position(), first) << "undo goes back to where First left the history";
-    // A click that announces a channel but moves nothing.
-    host.startCaptureModifiedChannels("Move Keypoint");
-    host.willChangeChannel(x);
-    host.willSetChannelValue(x);
-    host.didSetChannelValue(x);
-    host.didChangeChannel(x);
-    host.endCaptureModifiedChannels();
-    EXPECT_EQ(host.undoStack().undoCount(), 1u) << "an empty step must not be kept";
-    EXPECT_EQ(host.undoDescription() + "/" + host.redoDescription(), "First/Second")
-        << "nor clear redo";
-    // The time-move key command closes its step and then announces again with no did.
-    host.willSetChannelValue(x);
-    host.willChangeChannel(x);
-    EXPECT_FALSE(host.undoStack().isStepOpen());
-    EXPECT_EQ(history.position(), first) << "an empty step is no position";
-    ASSERT_TRUE(host.redo() && history.position() == second && host.undo());
-    bracketedEdit("Third", {opacity}, 0.5);
-    EXPECT_FALSE(host.canRedo() || host.redo()) << "a kept step clears redo";
-    EXPECT_TRUE(history.position() != first && history.position() != second)
-        << "a new step after an undo is a new position";
-
-    host.undoStack().setLevelsOfUndo(2);
-    bracketedEdit("Fourth", {x}, 4.0);
-    EXPECT_EQ(host.undoStack().undoCount(), 2u) << "the oldest steps are forgotten";
-    ASSERT_TRUE(host.undo() && host.undo());
-    EXPECT_FALSE(host.canUndo());
-    EXPECT_EQ(host.redoDescription(), "Third");
-}
-
-TEST_F(HostUndo, capture__anUnannouncedChangeAndAChannelAddedLaterAreTakenWhenTheyChange) {
-    const auto before = scene();
-    host.startCaptureModifiedChannels("Nudge");
-    opacity->noteWillChange(true);  // no willChangeChannel: the key sentry announces nothing
-    opacity->setKeyframe(CMTimeMake(1, 1), 0.25);
-    host.endCaptureModifiedChannels();
-    const auto nudged = scene();
-    host.addChannelToUndo(y, "Add keypoint");
-    host.willChangeChannel(y);
-    y->noteWillChange(true);
-    const CMTime at = CMTimeMake(7, 3);
-    y->addKeyframe(&at);
-    host.didChangeChannel(y);
-    const auto added = scene();
-    EXPECT_EQ(host.undoDescription(), "Add keypoint");
-    EXPECT_TRUE(undoneTo(nudged));
-    EXPECT_TRUE(undoneTo(before));
-    ASSERT_TRUE(host.redo() && host.redo());
-    EXPECT_TRUE(sceneIs(added)) << "the after state is taken lazily";
-    host.addChannelToUndo(x, "Add keypoint");
-    EXPECT_EQ(host.undoStack().undoCount(), 2u) << "recorded but never changed: dropped";
-}
-
-// A change announced with no bracket (a Control band's flatten) is a step of its own; the
-// channels announced after it join it until the history is read.
-TEST_F(HostUndo, unbracketedChanges__becomeOneStepThatUndoes) {
-    const auto before = scene();
-    for (TQChannel* c : {x, y}) {
-        c->noteWillChange(true);
-        c->setKeyframe(CMTimeMake(1, 1), -3.0);
-    }
-    const auto changed = scene();
-    EXPECT_EQ(host.undoDescription(), TQHostUndoStack::kImplicitStepDescription);
-    EXPECT_TRUE(undoneTo(before));
-    EXPECT_FALSE(host.canUndo()) << "both channels in one step";
-    EXPECT_TRUE(redoneTo(changed));
-}
-
-TEST_F(HostUndo, clientStep__restoresThroughItsOwnerJoinsAnOpenStepAndDiesWithIt) {
-    struct Client : TQHostUndoClient {
-        int value = 0;
-        std::any captureUndoState(uint32_t, uint32_t) override { return value; }
-        void restoreUndoState(uint32_t, uint32_t, const std::any& state) override {
-            value = std::any_cast<int>(state);
-        }
-    } client;
-    int owner = 0;  // any object's address names the owner
-    host.registerUndoClient(&owner, &client);
-    client.value = 1;
-    host.addToUndo(&owner, 2, 0, "Curve Editor Undo Remove Channel");
-    client.value = 2;
-    EXPECT_EQ(host.undoDescription(), "Curve Editor Undo Remove Channel");
-    ASSERT_TRUE(host.undo());
-    EXPECT_EQ(client.value, 1);
-    ASSERT_TRUE(host.redo());
-    EXPECT_EQ(client.value, 2);
-
-    const auto before = scene();
-    host.startCaptureModifiedChannels("Box Edit");
-    host.addToUndo(&owner, 1, 0, "Curve Editor Undo Box Edit");
-    client.value = 3;
-    host.willChangeChannel(x);
-    x->noteWillChange(true);
-    x->setKeyframe(CMTimeMake(3, 1), -9.0);
-    host.endCaptureModifiedChannels();
-    EXPECT_EQ(host.undoStack().undoCount(), 2u);
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(client.value == 2 && sceneIs(before));
-
-    host.unregisterUndoClient(&owner);
-    EXPECT_EQ(host.undoStack().undoCount(), 0u) << "the client's own step goes with it";
-    EXPECT_EQ(host.undoStack().redoCount(), 1u) << "a step with channels stays, without the client";
-    int stranger = 0;
-    host.addToUndo(&stranger, 2, 1, "Curve Editor Undo New Curve Set");
-    EXPECT_EQ(host.undoStack().undoCount(), 0u) << "no registered owner: nothing to restore";
-}
-
-TEST_F(HostUndo, undo__marksRestoredChannelsModifiedAndPosts) {
-    Words counter;
-    host.addNotificationReceiver(&counter);
-    bracketedEdit("Edit", {opacity}, 0.1);
-    host.resetModifiedChannels();
-    ASSERT_TRUE(host.undo());
-    EXPECT_TRUE(host.wasChannelModified(opacity) && !host.wasChannelModified(x));
-    EXPECT_EQ(counter.seen.back(), kTQNotifyChannelsChanged);
-    host.removeNotificationReceiver(&counter);
 }
 
 }  // namespace
