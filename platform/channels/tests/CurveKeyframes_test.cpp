@@ -63,8 +63,10 @@ TEST_F(CurveKeyframes, handles__staleAfterDeleteNeverReissuedAndIgnoredEverywher
     EXPECT_FALSE(c->hasKeyframeAtTime(&t) || c->keyframeExistsAtTime(&t) ||
                  c->nextKeyframeTime(&invalid) || c->nextKeyframeTime(nullptr) ||
                  c->previousKeyframeTime(nullptr) || c->addKeyframe(nullptr) ||
-                 c->addKeyframeAtAxisTime(nullptr))
+                 c->addKeyframeAtAxisTime(nullptr) || c->keyframeExistsAtTime(nullptr) ||
+                 c->hasKeyframeAtTime(nullptr, 1.0))
         << "no keyframe there, or no time to look at";
+    EXPECT_TRUE(CMTIME_IS_INVALID(c->toChannelTime(nullptr)));
     c->offsetCurve(nullptr, 5.0);  // no time: nothing moves or goes
     c->deleteKeyframeAtTime(nullptr);
     EXPECT_TRUE(*c == *before) << keyText(*c, true);
@@ -127,7 +129,13 @@ TEST_F(CurveKeyframes, cloneAssignCompareAndReset__roundTripEveryPartOfTheState)
     c->setInterpolation(kTQInterpolationLinear);
     c->setAnimationEnabled(false);
     c->setInitialValue(3.0);
+    curve_catalogue::AnnouncementCounter told;
+    c->setChangeObserver(&told);
     c->reset();
+    EXPECT_EQ(told.count, 0) << "a quiet reset";
+    c->reset(true);
+    EXPECT_EQ(told.count, 1);
+    c->setChangeObserver(nullptr);
     const auto fresh = makeChannel("fresh");
     fresh->addBehavior(std::make_unique<TQNoiseBehavior>(1.0, 2.0, 3));
     EXPECT_TRUE(*c == *fresh) << "a new channel's state, its behaviours kept";

@@ -124,12 +124,14 @@ TEST_F(CtrlCore, sets__append_remove_refresh_and_first_channel) {
     EXPECT_TRUE(last->channelBase() == pos->getChild(1) && ctrl().numberOfChannelItems() == 3u);
     EXPECT_EQ(recorder.bracketText(), "2*[!20000]") << "once per level, nothing per item";
     EXPECT_EQ(ctrl().appendFolder(nullptr, set), nullptr);
-    // A refresh drops the items of channels that went, and the view's selection.
+    // A refresh drops the items of channels that went, and the view's selection and box.
     selectInView({keypointEntry(std::dynamic_pointer_cast<TQCurveEditorChannelItem>(last), 1)});
+    view.setEditBox(CGRectMake(0, 0, 1, 1));
     pos->removeChild(pos->getChild(1));
     ctrl().refreshSelectedCurveSet();
     EXPECT_EQ(ctrl().numberOfChannelItems(), 2u);
     EXPECT_EQ(selectionText(), "");
+    EXPECT_FALSE(view.fourCornerBoxInitialized());
     // Selected but disabled items are passed over.
     set->channeItemAtIndex(0)->select(1);
     set->channeItemAtIndex(0)->enableItem(0);

@@ -78,6 +78,7 @@ protected:
             << recorder.bracketText() << " ";
         for (double o : range().offsets) out << ">" << o << " ";
         for (double p : range().panned) out << "~" << p << " ";
+        out << "v" << range().volumeChanges;
         return out.str();
     }
 };
