@@ -3,9 +3,14 @@
 // the sketch tool, resizing, and what it does with bad input.
 #include <gtest/gtest.h>
 
+#include <cmath>
+#include <sstream>
+#include <utility>
+
 #include "host/TQHostObjectModel.h"
 #include "src/editor/tests/EditorFixture.h"
 #include "src/panels/TQEditorControls.h"
+#include "tests/support/TextBaseline.h"
 
 namespace editor_test {
 namespace {
@@ -166,22 +171,23 @@ TEST_F(CurveEditorCtrl, vertical_scroller__value_knob_and_auto_zoom_and_what_its
     host.clearObjectSelection();
     ctrl.refreshSelectedCurveSet();
     ASSERT_EQ(ctrl.numberOfChannelItems(), 0u);
+    auto& scroller = *ctrl.verticalScroller();
     auto viewAt = [&](double y, double h) { view.setCurrentViewVolume(CGRectMake(0, y, 6, h)); };
-    const struct {
-        double y, height, value, knob;
-    } updates[] = {
-        {-1.0, 2.0, 0.0, 1.0},          // as high as the range: top, full knob
-        {5.0, 2.0, 0.0, 2.0 / 7.1},     // at the top of a taller range
-        {-10.0, 2.0, 1.0, 2.0 / 10.1},  // at the bottom
-        {0.0, 0.0, 0.0, 0.0},           // zero height: no knob
+    std::ostringstream notes;
+    notes.precision(10);
+    // Nine decimals, so that rounding residue does not show.
+    auto r = [](double x) { return std::round(x * 1e9) / 1e9 + 0.0; };
+    auto note = [&](const std::string& step) {
+        const CGRect v = view.getCurrentViewVolume();
+        notes << step << ": view " << r(v.origin.y) << "+" << r(v.size.height) << ", value "
+              << r(scroller.floatValue()) << " (kept " << r(ctrl.oldKnobValue()) << "), knob "
+              << r(scroller.knobProportion()) << " (kept " << r(ctrl.oldKnobProportion()) << ")\n";
     };
-    for (const auto& row : updates) {
-        SCOPED_TRACE(row.y);
-        viewAt(row.y, row.height);
+    // As high as the range, at the top of a taller range, at the bottom, no height.
+    for (const auto& [y, height] : {std::pair{-1.0, 2.0}, {5.0, 2.0}, {-10.0, 2.0}, {0.0, 0.0}}) {
+        viewAt(y, height);
         ctrl.updateVerticalZoomScroller();
-        EXPECT_NEAR(ctrl.verticalScroller()->floatValue(), row.value, kTolerance);
-        EXPECT_NEAR(ctrl.verticalScroller()->knobProportion(), row.knob, kTolerance);
-        EXPECT_FLOAT_EQ(ctrl.oldKnobProportion(), static_cast<float>(row.knob));
+        note("update");
     }
     viewAt(5.0, 2.0);
     ctrl.updateVerticalZoomScroller();
@@ -189,42 +195,23 @@ TEST_F(CurveEditorCtrl, vertical_scroller__value_knob_and_auto_zoom_and_what_its
     viewAt(5.0, 1.0);
     EXPECT_TRUE(ctrl.shouldAutoZoom()) << "the knob no longer matches";
     ctrl.setAutoZoom(nullptr);
-    EXPECT_TRUE(view.autoZoom() && !ctrl.verticalScroller()->isEnabled());
+    EXPECT_TRUE(view.autoZoom() && !scroller.isEnabled());
     ctrl.setAutoZoom(nullptr);
-    EXPECT_TRUE(ctrl.verticalScroller()->isEnabled());
+    EXPECT_TRUE(scroller.isEnabled());
 
-    // A view of 2 at y 3: the range is -0.1 .. 5 (5.1 high, 3.1 to pan over); the knob 0.5 at
-    // 0.25 is 2.55 high, a quarter of the 2.55 left below the top.
-    const double slack = 3.1, knobY = 5.0 - 2.55 - 0.25 * 2.55;
-    const struct {
-        RWScrollerPart part;
-        double y, height;  // the view afterwards
-    } rows[] = {
-        {kRWScrollerDecrementPage, 3.0 - slack, 2.0},
-        {kRWScrollerIncrementPage, 3.0 + slack, 2.0},
-        {kRWScrollerDecrementLine, 3.0 - 0.2 * slack, 2.0},
-        {kRWScrollerIncrementLine, 3.0 + 0.2 * slack, 2.0},
-        {kRWScrollerKnob, knobY, 2.55},
-        {kRWScrollerKnobEndEdge, knobY, 2.55},
-        {kRWScrollerNoPart, 3.0, 2.0},
-    };
-    auto& scroller = *ctrl.verticalScroller();
-    scroller.setEnabled(true);
-    for (const auto& row : rows) {
-        SCOPED_TRACE(row.part);
+    // Each part clicked on a view of 2 at y 3 (the range is -0.1 .. 5), the knob 0.5 at 0.25.
+    for (const RWScrollerPart part :
+         {kRWScrollerDecrementPage, kRWScrollerIncrementPage, kRWScrollerDecrementLine,
+          kRWScrollerIncrementLine, kRWScrollerKnob, kRWScrollerKnobEndEdge, kRWScrollerNoPart}) {
         viewAt(3.0, 2.0);
         ASSERT_NEAR(ctrl.getMaxViewVolume().size.height, 5.1, kTolerance);
         scroller.setKnobProportion(0.5);
         scroller.setFloatValue(0.25);
-        scroller.userClickPart(row.part);
-        EXPECT_NEAR(view.getCurrentViewVolume().origin.y, row.y, kTolerance);
-        EXPECT_NEAR(view.getCurrentViewVolume().size.height, row.height, kTolerance);
-        if (row.part == kRWScrollerDecrementPage) {
-            // The view was at the top, which updateVerticalZoomScroller puts at 0.
-            EXPECT_NEAR(scroller.floatValue(), 1.0, kTolerance) << "from the volumes before it";
-            EXPECT_FLOAT_EQ(ctrl.oldKnobValue(), 1.0f);
-        }
+        scroller.userClickPart(part);
+        note("part " + std::to_string(part));
     }
+    EXPECT_TRUE(tests_support::matchesBaselineBlock("controller", "vertical_scroller", notes.str(),
+                                                    "src/editor/tests/baselines"));
 }
 
 // ---- The frame grid, the sketch tool, resizing, bad input ----------------------------------

@@ -1,11 +1,15 @@
 // The full editor's timeline view on the sample project: the display range as the view's
 // horizontal volume, the time grid, the value labels, the extent lines, the keypoint label's
-// time text, and typed numbers that move keypoints in time as one undo step.
+// time text, and typed numbers that move keypoints in time as one undo step. Each test notes
+// what the view holds and draws after its steps; the notes are recorded in
+// baselines/timeline.txt (see TextBaseline.h).
 #include <gtest/gtest.h>
 
 #include <cmath>
 #include <memory>
 #include <set>
+#include <sstream>
+#include <string>
 #include <vector>
 
 #include "host/TQHostSampleScene.h"
@@ -13,11 +17,11 @@
 #include "platform/draw/testing/HXDRecordingEncoder.h"
 #include "platform/ui/RWButton.h"
 #include "src/editor/tests/EditorFixture.h"
+#include "tests/support/TextBaseline.h"
 
 namespace {
 
 using namespace editor_test;
-constexpr double kPixelTolerance = 1.5;
 
 CMTime seconds(double s) { return TQTarnTimeForChannelSeconds(s, kTQCurveEditorTimescale); }
 
@@ -41,6 +45,12 @@ protected:
         ASSERT_TRUE(frame());
         ctrl.ranges.clear();
     }
+    void TearDown() override {
+        EXPECT_TRUE(tests_support::matchesBaselineBlock(
+            "timeline", ::testing::UnitTest::GetInstance()->current_test_info()->name(),
+            notes.str(), "src/editor/tests/baselines"));
+        EditorFixture::TearDown();
+    }
 
     bool frame() {
         clock.advance(1.0);
@@ -50,15 +60,25 @@ protected:
         const CMTime s = seconds(start), d = seconds(duration);
         view.setDisplayRange(&s, &d);
     }
-    // The world x of the last frame's lines: stippled (the grid) or in the extent colour.
-    std::multiset<double> lines(bool grid) const {
+    // The world x of the last frame's lines: stippled (the grid) or in the extent colour. Grid
+    // lines not in the grid colour or not spanning the view from bottom to top are counted.
+    std::string lines(bool grid) const {
         const HXDColor extent = TQCurveEditorViewBase::drawingColor(view.endpointsColor());
+        const HXDColor gridColor = TQCurveEditorViewBase::drawingColor(view.gridColor());
+        auto screenY = [&](double y) { return std::lround(view.getPointScreen({0.0, y}).y); };
         std::multiset<double> xs;
+        int odd = 0;
         for (const auto& p : view.primitives())
             if (const auto* line = dynamic_cast<const HXDLine*>(p.get());
-                line && line->stippled() == grid && (grid || line->color() == extent))
+                line && line->stippled() == grid && (grid || line->color() == extent)) {
                 xs.insert(std::round(line->start().x * 3000.0) / 3000.0);
-        return xs;
+                odd += grid && (line->color() != gridColor || screenY(line->start().y) != 400 ||
+                                screenY(line->end().y) != 0);
+            }
+        std::ostringstream out;
+        for (double x : xs) out << " " << x;
+        if (odd) out << " (" << odd << " odd)";
+        return out.str();
     }
     std::vector<const HXDText*> texts() const {
         std::vector<const HXDText*> out;
@@ -66,11 +86,31 @@ protected:
             if (const auto* t = dynamic_cast<const HXDText*>(p.get())) out.push_back(t);
         return out;
     }
+    // A frame drawn: the view's volume, zoom and time grid step, the display ranges it reported
+    // since the last note, its grid and extent lines, and each text where it sits on screen.
+    void note(const std::string& step) {
+        ASSERT_TRUE(frame());
+        const CGRect v = view.getCurrentViewVolume();
+        notes << step << ": x " << v.origin.x << " w " << v.size.width << " zoom " << view.zoomX()
+              << " step " << view.gridSpacingX();
+        for (const CMTimeRange& r : ctrl.ranges)
+            notes << " reported " << r.start.value << "/" << r.start.timescale << "+"
+                  << r.duration.value << "/" << r.duration.timescale;
+        ctrl.ranges.clear();
+        notes << " | grid" << lines(true) << " | extent" << lines(false) << " |";
+        for (const HXDText* text : texts()) {
+            const CGPoint at = view.getPointScreen(text->position());
+            notes << " " << text->string() << "@" << std::lround(at.x) << "," << std::lround(at.y);
+        }
+        notes << "\n";
+    }
     // Opens the typing panel with a key; the script types more and ends with a button.
     bool type(const char* key, const char* more, const char* button) {
         modal.pushScript([=, this](RWWindow& panel, RWModalService&) {
-            shown = panel.contentView()->subview<RWTextField>()->stringValue();
-            panelFrame = panel.frame();
+            const CGRect frame = panel.frame();
+            notes << "panel shows " << panel.contentView()->subview<RWTextField>()->stringValue()
+                  << " centred at " << CGRectGetMidX(frame) << " hanging from "
+                  << CGRectGetMaxY(frame) << "\n";
             panel.contentView()->subview<RWTextField>()->insertText(more);
             panel.contentView()
                 ->subview<RWButton>([&](const RWButton& b) { return b.title() == button; })
@@ -80,8 +120,7 @@ protected:
     }
 
     HXDRecordingEncoder encoder{800, 400};
-    std::string shown;
-    CGRect panelFrame = CGRectZero;
+    std::ostringstream notes;
 };
 
 TEST_F(TimelineTest, display_range__drives_the_volume_and_the_grid_of_whole_seconds) {
@@ -93,51 +132,29 @@ TEST_F(TimelineTest, display_range__drives_the_volume_and_the_grid_of_whole_seco
     viewHost.resetRedrawRequests();
     host.setSecondsPerTextStep(CMTimeMake(1, 2));
     showRange(-1.5, 4.0);
-    EXPECT_NEAR(view.getCurrentViewVolume().origin.x, -1.5, 1e-6);
-    EXPECT_NEAR(view.getCurrentViewVolume().size.width, 4.0, 1e-6);
-    EXPECT_NEAR(view.zoomX(), 800.0 / 4.0, 1e-9) << "points per second of the view";
-    EXPECT_EQ(view.gridSpacingX(), 0.5) << "the host's text step";
     EXPECT_EQ(view.getSelectionViewVolume(), CGRectZero) << "a rubber band is forgotten";
     EXPECT_EQ(item->originalCurveDirty(), 1) << "every curve is sampled again";
     EXPECT_GE(viewHost.redrawRequests(), 1);
-    EXPECT_TRUE(ctrl.ranges.size() == 1 && ctrl.ranges[0].start == seconds(-1.5) &&
-                ctrl.ranges[0].duration == seconds(4.0));
+    note("-1.5 s + 4 s, a text step of 0.5 s");
     const CMTime two = seconds(2.0);
     view.setDisplayRange(nullptr, &two);
-    EXPECT_NEAR(view.getCurrentViewVolume().origin.x, -1.5, 1e-6) << "a missing part stays";
-    EXPECT_NEAR(view.getCurrentViewVolume().size.width, 2.0, 1e-6);
+    note("a length of 2 s alone");
 
     // From a start before zero, lines begin at 0 and run to the right edge (4.2 s); a closer
-    // step lands on the same whole seconds.
-    const struct {
-        CMTime step;
-        std::multiset<double> lines;
-    } cases[] = {{CMTimeMake(1, 1), {0, 1, 2, 3, 4}},
-                 {CMTimeMake(2, 1), {0, 2, 4}},
-                 {CMTimeMake(1, 30), {0, 1, 2, 3, 4}}};
-    for (const auto& c : cases) {
-        ASSERT_TRUE(host.setSecondsPerTextStep(c.step));
+    // step lands on the same whole seconds. A view that ends before zero has none.
+    for (const CMTime step : {CMTimeMake(1, 1), CMTimeMake(2, 1), CMTimeMake(1, 30)}) {
+        ASSERT_TRUE(host.setSecondsPerTextStep(step));
         showRange(-1.8, 6.0);
-        ASSERT_TRUE(frame());
-        EXPECT_EQ(lines(true), c.lines) << "step " << CMTimeGetSeconds(c.step);
+        note(std::to_string(step.value) + "/" + std::to_string(step.timescale) + " s a step");
     }
-    // Each line spans the view, in the grid colour.
-    const auto* line = dynamic_cast<const HXDLine*>(view.primitives().front().get());
-    ASSERT_TRUE(line && line->stippled());
-    EXPECT_EQ(line->color(), TQCurveEditorViewBase::drawingColor(view.gridColor()));
-    EXPECT_NEAR(view.getPointScreen(CGPointMake(0.0, line->start().y)).y, 400.0, kPixelTolerance);
-    EXPECT_NEAR(view.getPointScreen(CGPointMake(0.0, line->end().y)).y, 0.0, kPixelTolerance);
     showRange(-6.0, 4.0);
-    ASSERT_TRUE(frame());
-    EXPECT_TRUE(lines(true).empty()) << "a view that ends before zero has no lines";
+    note("-6 s + 4 s");
 
     SCOPED_TRACE("a zero frame duration and text step neither divide nor loop");
     ZeroTimeHost zero(&host);
     ctrl.setAppDelegate(&zero);
     showRange(0.0, 6.0);
-    EXPECT_EQ(view.gridSpacingX(), 0.0);
-    ASSERT_TRUE(frame());
-    EXPECT_TRUE(lines(true).empty());
+    note("zero steps");
     EXPECT_EQ(view.getCoordinates(nullptr, seconds(0.4), 0.5),
               view.TQCurveEditorViewBase::getCoordinates(nullptr, seconds(0.4), 0.5));
     TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
@@ -152,27 +169,20 @@ TEST_F(TimelineTest, text__time_as_frames_or_timecode_value_labels_and_the_keypo
     const CMTime frame12 = CMTimeMake(12, 30);
     host.setDisplayTimeAsFrames(true);
     host.setFirstFrameNumber(1);
-    EXPECT_EQ(view.getCoordinates(nullptr, frame12, 0.5), "(13.0, 0.5)");
+    notes << view.getCoordinates(nullptr, frame12, 0.5) << "\n";
     host.setDisplayTimeAsFrames(false);
     host.setStartTimecode(30);
-    EXPECT_EQ(view.getCoordinates(nullptr, frame12, 0.5), "(00:00:01:12, 0.5)");
+    notes << view.getCoordinates(nullptr, frame12, 0.5) << "\n";
     // An amplitude channel's value in decibels, without decimals.
     TQChannel* volume = channel(kTQHostSampleQuaternionObject, TQHostTypedPaths(family()).volume);
     auto decibels = std::make_shared<TQCurveEditorChannelItem>();
     decibels->initWithChannel(volume, 10, &host, 0);
-    EXPECT_EQ(view.getCoordinates(decibels.get(), frame12, 0.5), "(00:00:01:12,-6)");
+    notes << view.getCoordinates(decibels.get(), frame12, 0.5) << "\n";
 
-    EXPECT_TRUE(texts().empty()) << "no value labels while no single channel is shown";
+    // Value labels only while a single channel is shown, each naming its row's value.
+    note("two objects");
     ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Opacity), true);
-    ASSERT_TRUE(frame());
-    // Each names the value of its row, from the bottom up, five points in.
-    std::string labels;
-    for (const HXDText* label : texts()) {
-        const CGPoint at = view.getPointScreen(label->position());
-        labels.append(label->string()).append("@").append(std::to_string(std::lround(at.x)));
-        labels.append(",").append(std::to_string(std::lround(at.y))).append(" ");
-    }
-    EXPECT_EQ(labels, "-5.00@5,46 22.50@5,126 50.00@5,206 77.50@5,286 105.00@5,366 ");
+    note("the opacity");
 
     // The logo's last bounce, at 2.47 s: its label stays beside it through every zoom.
     ctrl.deselectAllChannels();
@@ -187,71 +197,61 @@ TEST_F(TimelineTest, text__time_as_frames_or_timecode_value_labels_and_the_keypo
         return view.getPointScreen(
             CGPointMake(CMTimeGetSeconds(t), ctrl.convertFromChannelCoords(bounce.get(), v)));
     };
-    auto expectBeside = [&](const char* after) {
+    // The keypoint on screen and its label's offset from it.
+    auto noteBeside = [&](const char* after) {
         ASSERT_TRUE(frame());
         const CGPoint keypoint = keypointOnScreen();
-        ASSERT_TRUE(CGRectContainsPoint(CGRectMake(0, 0, 700, 350), keypoint)) << after;
-        const HXDText* label = nullptr;
+        notes << after << ": keypoint at " << std::lround(keypoint.x) << ","
+              << std::lround(keypoint.y);
         for (const HXDText* text : texts())
-            if (text->string().rfind("(", 0) == 0) label = text;
-        ASSERT_TRUE(label) << after;
-        const CGPoint at = view.getPointScreen(label->position());
-        EXPECT_NEAR(at.x - keypoint.x, 5.0 + 1.0, 2.0) << after;
-        EXPECT_NEAR(at.y - keypoint.y, 5.0, 5.0) << after;
+            if (text->string().rfind("(", 0) == 0) {
+                const CGPoint at = view.getPointScreen(text->position());
+                notes << ", " << text->string() << " at +" << std::lround(at.x - keypoint.x) << ",+"
+                      << std::lround(at.y - keypoint.y);
+            }
+        notes << "\n";
     };
-    expectBeside("the first frame");
+    noteBeside("the first frame");
     view.zoomWithFactor(3.0, 1.0);
-    expectBeside("a zoom by a factor");
+    noteBeside("a zoom by a factor");
     view.setMouseOrigin(keypointOnScreen());
     view.zoom(-120.0, 0.0);
-    expectBeside("a drag zoom");
+    noteBeside("a drag zoom");
 }
 
 TEST_F(TimelineTest, extent_lines__one_pair_per_object_of_the_selected_channels) {
-    const double last = std::round((6.0 - 1.0 / 30.0) * 3000) / 3000;
     ctrl.showAll();
-    ASSERT_TRUE(frame());
-    EXPECT_TRUE(lines(false).empty()) << "nothing selected among two objects";
+    note("nothing selected among two objects");
     ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Position, 0), true);
     ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Position, 1), true);
-    ASSERT_TRUE(frame());
-    EXPECT_EQ(lines(false), (std::multiset<double>{0.0, last})) << "two channels of one object";
+    note("two channels of one object");
     // The lower third starts a second in: its extent adds its own pair.
     host.setSelectedObjects({object(kTQHostSampleTitleObject), object(kTQHostSampleOffsetObject)});
     ctrl.showAll();
     ctrl.selectChannel(channel(kTQHostSampleTitleObject, TQHostProperty::Opacity), true);
     ctrl.selectChannel(channel(kTQHostSampleOffsetObject, TQHostProperty::Opacity), true);
-    ASSERT_TRUE(frame());
-    EXPECT_EQ(lines(false), (std::multiset<double>{0.0, 1.0, last, last}));
+    note("the opacities of two objects");
 }
 
 TEST_F(TimelineTest, typed_numbers__move_the_selected_keypoints_as_one_undo_step) {
     TQChannel* x = channel(kTQHostSampleTitleObject, TQHostProperty::Position);
     const std::unique_ptr<TQChannelBase> before(x->cloneChannel());
-    const std::vector<double> times = keyTimes(x);
+    notes << "x " << keyText(*x) << "\n";
     selectKeypoints(x);
     viewHost.setScreenOrigin(CGPointMake(100.0, 200.0));
-    EXPECT_TRUE(type("1", "2", "OK"));  // the user goes on typing: "12"
-    EXPECT_EQ(shown, "1") << "the key that opened the panel is in its field";
-    // Centred on the view's top edge, hanging below it.
-    EXPECT_EQ(CGPointMake(CGRectGetMidX(panelFrame), CGRectGetMaxY(panelFrame)),
-              CGPointMake(100.0 + 400.0, 200.0 + 400.0));
-    // A digit puts the earliest keypoint on that frame; the others keep their distance.
-    const std::vector<double> after = keyTimes(x);
-    ASSERT_EQ(after.size(), times.size());
-    for (size_t i = 0; i < times.size(); ++i)
-        EXPECT_NEAR(after[i], times[i] + 12.0 / 30.0 - times[0], 1.0 / 60.0) << "keypoint " << i;
-    EXPECT_EQ(host.undoDescription(), "Move Keypoint");
+    // The user goes on typing, "12": the earliest keypoint goes to that frame, the others keep
+    // their distance.
+    EXPECT_TRUE(type("1", "2", "OK"));
+    notes << "x " << keyText(*x) << ", undo " << host.undoDescription() << "\n";
     ASSERT_TRUE(host.undo());
     EXPECT_TRUE(*x == *before) << "one undo step takes the move back exactly";
 
     // A sign moves each keypoint onto the frame so many frames later.
     TQChannel* y = channel(kTQHostSampleBehaviorObject, TQHostProperty::Position, 1);
-    const std::vector<double> yTimes = keyTimes(y);
+    notes << "y " << keyText(*y, false, 9) << "\n";
     selectKeypoints(y);
     EXPECT_TRUE(type("+", "6", "OK"));
-    for (size_t i = 0; i < yTimes.size(); ++i)
-        EXPECT_NEAR(keyTimes(y)[i], std::round(yTimes[i] * 30.0 + 6.0) / 30.0, 1e-9) << i;
+    notes << "y " << keyText(*y, false, 9) << "\n";
 
     // Text that is no number cannot end the edit; the panel stays until Cancel.
     const std::unique_ptr<TQChannelBase> moved(y->cloneChannel());
