@@ -104,7 +104,8 @@ protected:
     // Records what the window shows after `name`; the test's steps are compared with their
     // recorded block when it ends.
     void step(const std::string& name) { _record += "-- " + name + "\n" + shows(); }
-    // From here on, the recorded steps name the channels that differ from the scene as it is now.
+    // From here on, the recorded steps name the channels that differ from the scene as it is now,
+    // and say when the whole scene equals it again.
     void markScene() { mark.reset(window.host().sceneChannelRoot()->cloneChannel()); }
     // The title with its modified mark, the pop-up, the tool, the Edit menu's titles as they
     // stand (unopened), the history, auto zoom, the playhead and the preview's poses, the object
@@ -176,6 +177,7 @@ protected:
                 if (dynamic_cast<TQChannel*>(c) && !(was && *was == *c))
                     out << " " << ref.getText();
             }
+            if (*root == *mark) out << " (every channel as marked)";
         }
         out << "\nasked: " << questions << ", errors:" << errors << "\n";
         return out.str();
