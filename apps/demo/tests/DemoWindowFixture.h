@@ -66,7 +66,7 @@ protected:
         window.curveView().setClock(&clock);
         window.curveView().setTimer(&timer);
         window.show();
-        settle();
+        for (int i = 0; i < 20; ++i) QCoreApplication::processEvents();
         drawFrame();
         ASSERT_GE(window.curveWidget()->framesDrawn(), 1) << "the window drew no frame";
         ASSERT_TRUE(directory.isValid());
@@ -92,9 +92,6 @@ protected:
         EXPECT_TRUE(tests_support::matchesBaselineBlock(
             "window_steps", ::testing::UnitTest::GetInstance()->current_test_info()->name(),
             _record, "apps/demo/tests/baselines"));
-    }
-    static void settle() {
-        for (int i = 0; i < 20; ++i) QCoreApplication::processEvents();
     }
     void drawFrame() {
         clock.advance(kStepSeconds);

@@ -158,12 +158,8 @@ TEST_F(DemoWindowTest, transport_ruler_and_preview__follow_the_hosts_playhead) {
     step("frame 60: the lower third's keys are in its own time, a second later");
 
     // An edit of the curve moves the picture.
-    TQChannelObjectRootBase* title = host.scene().objectNamed(kTQHostSampleTitleObject);
-    auto* titleX = dynamic_cast<TQChannel*>(
-        TQChannelRef(TQHostPropertyPaths(TQHostObjectFamily::Kestrel, TQHostProperty::Position)[0])
-            .getChannel(static_cast<TQChannelBase*>(title)));
     const CMTime now = CMTimeMake(60, 30);
-    titleX->offsetCurve(&now, 250.0);
+    channel(kTQHostSampleTitleObject, "./1/100/101/1")->offsetCurve(&now, 250.0);
     step("the title's x curve moved to 250 there");
 }
 
