@@ -128,11 +128,7 @@ public:
             k1 = keyframe(1, t1);
         };
         std::string record, before = table();
-        std::istringstream in(script);
-        for (std::string step; std::getline(in, step, ';');) {
-            read.str("");
-            tests_support::runSteps(step, a, steps, {}, each);
-            step.erase(0, step.find_first_not_of(' '));
+        const auto note = [&](const std::string& step) {
             const std::string after = table();
             if (step.substr(0, step.find(' ')).back() == '?')
                 record += step + ": " + read.str() + "\n";
@@ -140,7 +136,9 @@ public:
                 record += step + ": " + (after == before ? "same" : after) +
                           (read.str().empty() ? "" : "; " + read.str()) + "\n";
             before = after;
-        }
+            read.str("");
+        };
+        tests_support::runSteps(script, a, steps, {}, each, note);
         return record;
     }
 

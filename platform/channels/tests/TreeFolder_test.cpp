@@ -391,17 +391,17 @@ TEST_P(TreeCompoundEdits, edit__as_recorded) {
         {"nointerp", [&] { C(0)->setFlag(kTQChannelFlagNoInterpolationChange, false); }},
     };
     std::string record;
-    std::istringstream in(GetParam().script);
-    for (std::string step; std::getline(in, step, ';');) {
+    const auto fresh = [&] {
         observer.told.clear();
         collided = false;
-        tests_support::runSteps(step, a, steps);
-        record += step.substr(step.find_first_not_of(' ')) + ": " + keys() + " | s " +
-                  keyText(stranger) + (collided ? " collided" : "") + ";";
+    };
+    tests_support::runSteps(GetParam().script, a, steps, {}, fresh, [&](const std::string& step) {
+        record += step + ": " + keys() + " | s " + keyText(stranger) +
+                  (collided ? " collided" : "") + ";";
         for (const TQChannelBase* c : observer.told)
             record.append(" ").append(c == &stranger ? "s" : std::to_string(c->getChannelId()));
         record += "\n";
-    }
+    });
     EXPECT_TRUE(tests_support::matchesBaselineBlock("compound-edits", GetParam().name, record,
                                                     "platform/channels/tests/baselines"));
 }
