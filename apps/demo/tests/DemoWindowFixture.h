@@ -81,8 +81,8 @@ protected:
             return std::exchange(fileToSave, QString());
         };
         prompts.showError = [this](const QString& text, const QString& detail) {
-            errors +=
-                " " + QString(text + " " + detail).replace(directory.path(), "<dir>").toStdString();
+            errors.append(" ").append(
+                QString(text + " " + detail).replace(directory.path(), "<dir>").toStdString());
         };
     }
     void TearDown() override {
