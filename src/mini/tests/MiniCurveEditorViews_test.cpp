@@ -101,6 +101,15 @@ TEST_F(MiniViews, inspector__auto_fit_toggles_the_scrollers_which_zoom_within_th
     editor.updateHorizontalZoomScroller();
     EXPECT_NEAR(h.floatValue(), 1.0, 1e-6);
     EXPECT_NEAR(h.knobProportion(), 0.5, 1e-6);
+
+    // A page back would pass the range's start: the view stays, the knob steps back a fifth.
+    h.userClickPart(kRWScrollerDecrementPage);
+    EXPECT_NEAR(v.origin.x, 0.5, 1e-6);
+    EXPECT_NEAR(h.floatValue(), 0.8, 1e-6);
+    // A vertical page moves by the slack between the largest volume and the view.
+    const double y = v.origin.y, slack = ctrl().getMaxViewVolume().size.height - v.size.height;
+    editor.verticalZoomScroller().userClickPart(kRWScrollerIncrementPage);
+    EXPECT_NEAR(v.origin.y, y + slack, 1e-6);
 }
 
 TEST_F(MiniViews, forms__tool_switch_flags_disabled_mouse_and_the_heads_up_fit) {
