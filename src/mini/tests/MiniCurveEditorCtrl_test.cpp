@@ -18,13 +18,14 @@ namespace {
 class MiniCtrl : public MiniFixture {};
 
 TEST_F(MiniCtrl, setChannel__a_channel_or_a_folder_fills_the_private_set) {
+    gain->setXAxisLabel("Position");
     editor.setChannel(gain);
     EXPECT_EQ(
         std::tuple(ctrl().numberOfChannelItems(), ctrl()._linked, ctrl().getCurrentTool(),
                    ctrl().selectedCurveSet()->curveSetName(), editor.axisY().stringValue(),
-                   view().getController()),
+                   editor.axisX().stringValue(), view().getController(), view().curveEditor()),
         std::tuple(1u, true, TQTool::kEdit, TQLocalizedString("Curve Editor Curve Set Untitled"),
-                   "Gain", editor.controller()));
+                   "Gain", "Position", editor.controller(), &editor));
     editor.setChannel(gradient);
     EXPECT_EQ(ctrl().numberOfChannelItems(), 2u) << "both components of the pair";
     const auto item = ctrl().selectedCurveSet()->itemWithChannel(gradient->getXChannel());

@@ -77,7 +77,8 @@ TEST_F(MiniViews, view__grid_columns_every_tenth_rows_every_fifth_of_the_height)
 TEST_F(MiniViews, inspector__auto_fit_toggles_the_scrollers_which_zoom_within_the_range) {
     editor.setChannel(gain);
     const CGRect frame = editor.curveEditorViewFrame();
-    EXPECT_TRUE(editor.verticalZoomScroller().isHidden());
+    EXPECT_TRUE(editor.verticalZoomScroller().isHidden() &&
+                editor.horizontalZoomScrollerControl().isHidden());
     editor.autoFitButton().userClick();
     EXPECT_FALSE(editor.autoFitButton().state() || editor.verticalZoomScroller().isHidden() ||
                  editor.horizontalZoomScrollerControl().isHidden() || view().autoZoom());
